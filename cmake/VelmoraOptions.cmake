@@ -1,0 +1,33 @@
+# Options that every target of the project shares, on one interface target.
+
+set(CMAKE_CXX_STANDARD 20)
+set(CMAKE_CXX_STANDARD_REQUIRED ON)
+set(CMAKE_CXX_EXTENSIONS OFF)
+set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+set(CMAKE_CXX_VISIBILITY_PRESET hidden)
+set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
+
+option(VELMORA_SANITIZE "Build with address and undefined-behaviour sanitizers" OFF)
+option(VELMORA_PLAIN_ROAD "Render stage by stage with the plain pixel forms only" OFF)
+set(VELMORA_DIST ${CMAKE_BINARY_DIR}/dist)
+
+add_library(velmora_options INTERFACE)
+target_include_directories(velmora_options INTERFACE ${CMAKE_SOURCE_DIR})
+target_compile_options(velmora_options INTERFACE
+  -Wall -Wextra -Wconversion -Wshadow -Wnon-virtual-dtor -Wold-style-cast -Werror
+  # Bytes must not depend on the build: no contraction into fused operations, no relaxed maths.
+  -ffp-contract=off -fno-fast-math)
+if(VELMORA_PLAIN_ROAD)
+  target_compile_definitions(velmora_options INTERFACE VELMORA_PLAIN_ROAD=1)
+endif()
+if(VELMORA_SANITIZE)
+  target_compile_options(velmora_options INTERFACE
+    -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer)
+  target_link_options(velmora_options INTERFACE -fsanitize=address,undefined)
+endif()
+if(WIN32)
+  target_compile_definitions(velmora_options INTERFACE
+    UNICODE _UNICODE NOMINMAX WIN32_LEAN_AND_MEAN STRICT _WIN32_WINNT=0x0601)
+  # Runtime libraries are linked in: the product depends on Windows' own modules only.
+  target_link_options(velmora_options INTERFACE -static -static-libgcc -static-libstdc++)
+endif()

@@ -1,0 +1,21 @@
+# velmora_add_test(NAME SOURCES... LIBS ...) builds one GoogleTest program and registers it with CTest
+# under its name. A program is one CTest entry: starting a program under Wine costs seconds.
+
+include(CTest)
+
+if(BUILD_TESTING)
+  # GoogleTest comes as source from the system's package, so that both builds use the same one.
+  set(INSTALL_GTEST OFF)
+  add_subdirectory(/usr/src/googletest ${CMAKE_BINARY_DIR}/googletest EXCLUDE_FROM_ALL)
+endif()
+
+function(velmora_add_test name)
+  cmake_parse_arguments(ARG "" "" "SOURCES;LIBS;LABELS;ARGS" ${ARGN})
+  add_executable(${name} ${ARG_SOURCES})
+  target_link_libraries(${name} PRIVATE velmora_options ${ARG_LIBS} GTest::gtest_main GTest::gmock)
+  add_test(NAME ${name} COMMAND ${name} ${ARG_ARGS})
+  set_tests_properties(${name} PROPERTIES TIMEOUT 600)
+  if(ARG_LABELS)
+    set_tests_properties(${name} PROPERTIES LABELS "${ARG_LABELS}")
+  endif()
+endfunction()
