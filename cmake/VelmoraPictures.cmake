@@ -1,0 +1,24 @@
+# velmora_embed_pictures(TARGET) compiles the grey pictures of render/pictures into TARGET. They are checked
+# while they are embedded: a wrong size, format or key fails the build and names the file.
+
+find_package(Python3 REQUIRED COMPONENTS Interpreter)
+
+function(velmora_embed_pictures target)
+  set(folder ${PROJECT_SOURCE_DIR}/render/pictures)
+  set(script ${PROJECT_SOURCE_DIR}/cmake/embed_pictures.py)
+  set(source ${CMAKE_CURRENT_BINARY_DIR}/embedded_pictures.cpp)
+  set(pictures)
+  foreach(value RANGE 2000 2006)
+    list(APPEND pictures ${folder}/wear-${value}.pgm)
+  endforeach()
+  foreach(index RANGE 10)
+    list(APPEND pictures ${folder}/spot-${index}.pgm)
+  endforeach()
+  add_custom_command(
+    OUTPUT ${source}
+    COMMAND ${Python3_EXECUTABLE} ${script} ${folder} ${source}
+    DEPENDS ${script} ${pictures}
+    COMMENT "Embedding the wear pictures and spots"
+    VERBATIM)
+  target_sources(${target} PRIVATE ${source} ${PROJECT_SOURCE_DIR}/render/pictures.cpp)
+endfunction()

@@ -1,0 +1,21 @@
+#pragma once
+
+// The tables that the build generates from the files in render/pictures.
+
+#include <cstdint>
+
+#include "render/pictures.h"
+
+namespace velmora::render {
+
+struct WearEntry {
+    std::int32_t menuValue;
+    GreyPicture picture;
+};
+
+// In menu order, ended by an entry with the value 0.
+extern const WearEntry kWearTable[];
+
+extern const GreyPicture kSpotTable[kSpotCount];
+
+}  // namespace velmora::render
