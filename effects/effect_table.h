@@ -1,0 +1,75 @@
+// What tells one effect from another: its parameters, its presets and how each of the renderer's settings is
+// answered. An effect is these tables and nothing else; they are constant and shared by all its instances.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <span>
+
+#include "plugin/host_api.h"
+
+namespace velmora::effects {
+
+// The renderer's settings in the order in which it asks for them.
+enum class Master : std::uint32_t {
+    kYJitter, kXJitter, kBorder,
+    kFlicker, kFlickerSpeed, kBrightness, kContrast,
+    kSaturation, kTintColour, kTint, kFilmGamma,
+    kGlow,
+    kWear, kPattern, kBlueChannelOnly,
+    kSpots, kScratches, kDepth, kBlack, kWhite, kThick,
+};
+inline constexpr std::uint32_t kMasterCount = 21;
+
+struct Layout {
+    std::int32_t x, y, width, height;
+};
+
+// One parameter as the host sees it.
+struct ParamRow {
+    const char* name;
+    ParamKind kind;
+    float minimum;           // shown range of a slider
+    float maximum;
+    ValueWord defaultValue;  // stored form: normalised number, colour word, item index, flag
+    Layout layout;
+    bool isGroupEnd;         // group markers only
+};
+
+// How a setting of the renderer is answered: from one of the effect's own parameters or by a fixed value in
+// the form of the setting's kind.
+struct MasterAnswer {
+    enum class Source : std::uint8_t {
+        kOwn,      // own parameter `own`
+        kWord,     // fixed: a number, a colour or an item index
+        kFlag,     // fixed: only the first byte is written
+        kDepthOf,  // 1 - (1 - s)^2 of own parameter `own`
+    };
+    Source source;
+    std::uint32_t own;
+    ValueWord fixed;
+};
+
+struct EffectTable {
+    const char* name;
+    std::span<const ParamRow> params;
+    std::span<const char* const> presetNames;      // alphabetical
+    std::span<const PresetCell> presetCells;       // preset major: [preset * params.size() + parameter]
+    std::array<MasterAnswer, kMasterCount> answers;
+    bool marksSliders;  // writes 1 behind a slider's maximum
+};
+
+// The five effects in the order in which the library offers them.
+extern const EffectTable kFilmCamera;
+extern const EffectTable kFilmLook;
+extern const EffectTable kFilmDamage;
+extern const EffectTable kFilmExpress;
+extern const EffectTable kFilmPro;
+inline constexpr std::array<const EffectTable*, 5> kAllEffects = {&kFilmCamera, &kFilmLook, &kFilmDamage,
+                                                                  &kFilmExpress, &kFilmPro};
+
+// The texts of the "Pattern" menu, in item order.
+inline constexpr std::array<const char*, 7> kPatternItems = {"Wavy",     "Blotchy", "Grainy", "Fine",
+                                                             "Splotchy", "Lite",    "Crackly"};
+
+}  // namespace velmora::effects

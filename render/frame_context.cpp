@@ -1,0 +1,77 @@
+#include "render/frame_context.h"
+
+#include <algorithm>
+#include <cstring>
+#include <limits>
+#include <new>
+
+#include "render/rounding.h"
+#include "render/stage_settings.h"
+
+namespace velmora::render {
+
+FrameContext::FrameContext(const FrameDescription& source, const FrameDescription& destination) noexcept
+    : m_width(std::min(source.width, destination.width)),
+      m_height(std::min(source.height, destination.height)),
+      m_source(ViewOf(source, m_width, m_height)),
+      m_destination(ViewOf(destination, m_width, m_height)) {}
+
+void FrameContext::SetTime(double seconds) noexcept {
+    m_time = seconds == seconds ? seconds : 0.0;
+    m_frameNumber = TruncateTolerant(m_time * kFramesPerSecond);
+}
+
+bool FrameContext::FramesOverlap() const noexcept {
+    const auto first = [](const ImageView& v) { return reinterpret_cast<std::uintptr_t>(v.Row(0)); };
+    const auto last = [this](const ImageView& v) {
+        return reinterpret_cast<std::uintptr_t>(v.Row(m_height - 1) + m_width);
+    };
+    return first(m_source) < last(m_destination) && first(m_destination) < last(m_source);
+}
+
+const ImageView& FrameContext::ClaimDestination() noexcept {
+    m_outputWritten = true;
+    return m_destination;
+}
+
+const ImageView* FrameContext::CurrentInput(bool allowSource) noexcept {
+    if (m_outputWritten) return m_copies[1].Take(m_destination) ? &m_copies[1].view : nullptr;
+    if (allowSource) return &m_source;
+    return m_copies[0].Take(m_source) ? &m_copies[0].view : nullptr;
+}
+
+bool FrameContext::DetachSource() noexcept {
+    if (!m_copies[0].Take(m_source)) return false;
+    m_source = m_copies[0].view;
+    return true;
+}
+
+void FrameContext::Finish() noexcept {
+    if (m_outputWritten) return;
+    m_outputWritten = true;
+    const std::size_t rowBytes = static_cast<std::size_t>(m_width) * sizeof(Bgra);
+    for (std::int32_t y = 0; y < m_height; ++y) {
+        std::memmove(m_destination.Row(y), m_source.Row(y), rowBytes);
+    }
+}
+
+// Copies the processed rectangle only: nothing of a stage looks beyond it.
+bool FrameContext::Copy::Take(const ImageView& picture) noexcept {
+    const std::size_t width = static_cast<std::size_t>(picture.Region().Width());
+    const std::size_t height = static_cast<std::size_t>(picture.Region().Height());
+    const std::size_t rowBytes = width * sizeof(Bgra);
+    if (rowBytes > static_cast<std::size_t>(std::numeric_limits<std::int32_t>::max())) return false;
+    if (height > std::numeric_limits<std::size_t>::max() / 2 / rowBytes) return false;
+    if (pixels == nullptr) pixels.reset(new (std::nothrow) std::uint8_t[rowBytes * height]);
+    if (pixels == nullptr) return false;
+    for (std::int32_t y = 0; y < picture.Region().Height(); ++y) {
+        std::memcpy(pixels.get() + rowBytes * static_cast<std::size_t>(y), picture.Row(y), rowBytes);
+    }
+    view.bufferWidth = view.right = picture.Region().Width();
+    view.bufferHeight = view.bottom = picture.Region().Height();
+    view.rowStep = static_cast<std::int32_t>(rowBytes);
+    view.base = pixels.get();
+    return true;
+}
+
+}  // namespace velmora::render

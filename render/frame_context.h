@@ -1,0 +1,68 @@
+// One frame on its way through the stages: the source, the destination and what is known of the frame.
+//
+// A stage reads the current input and writes the destination: the input is the source until a stage has
+// claimed the destination, and a copy of the destination from then on, so that no stage reads and writes one
+// buffer at once unless it works in place on purpose. Lives for one frame.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+
+#include "render/image.h"
+
+namespace velmora::render {
+
+enum class Slot : std::int32_t { kSource = 1, kDestination = 3 };
+
+class FrameContext {
+  public:
+    // Attaches the two frames; the processed size is the smaller of the two regions in each direction.
+    FrameContext(const FrameDescription& source, const FrameDescription& destination) noexcept;
+
+    // Seconds from the start of the clip. Not a number counts as 0; the frame number saturates.
+    void SetTime(double seconds) noexcept;
+
+    [[nodiscard]] double Time() const noexcept { return m_time; }
+    [[nodiscard]] std::int32_t FrameNumber() const noexcept { return m_frameNumber; }
+    [[nodiscard]] std::int32_t Width() const noexcept { return m_width; }
+    [[nodiscard]] std::int32_t Height() const noexcept { return m_height; }
+    [[nodiscard]] bool IsValid(Slot slot) const noexcept { return View(slot).IsValid(); }
+    [[nodiscard]] const ImageView& Source() const noexcept { return m_source; }
+    [[nodiscard]] const ImageView& Destination() const noexcept { return m_destination; }
+    [[nodiscard]] bool OutputWritten() const noexcept { return m_outputWritten; }
+    // The two pictures share memory (a host that processes in place).
+    [[nodiscard]] bool FramesOverlap() const noexcept;
+
+    // Marks the output as written and returns the destination.
+    const ImageView& ClaimDestination() noexcept;
+    // The picture as the stages before left it, or null when a copy cannot be made. With `allowSource` the
+    // source itself may be returned, else always a private copy. Valid until the next call.
+    const ImageView* CurrentInput(bool allowSource) noexcept;
+    // Replaces the source by a private copy; false when it cannot be made.
+    [[nodiscard]] bool DetachSource() noexcept;
+    // Copies the source through when no stage has written the destination.
+    void Finish() noexcept;
+
+  private:
+    struct Copy {
+        std::unique_ptr<std::uint8_t[]> pixels;
+        ImageView view;
+        bool Take(const ImageView& picture) noexcept;
+    };
+
+    [[nodiscard]] const ImageView& View(Slot slot) const noexcept {
+        return slot == Slot::kSource ? m_source : m_destination;
+    }
+
+    double m_time = -1.0;
+    std::int32_t m_frameNumber = 0;
+    std::int32_t m_width = 0;
+    std::int32_t m_height = 0;
+    ImageView m_source;
+    ImageView m_destination;
+    Copy m_copies[2];
+    bool m_outputWritten = false;
+};
+
+}  // namespace velmora::render

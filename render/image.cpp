@@ -1,0 +1,44 @@
+#include "render/image.h"
+
+#include <algorithm>
+#include <cstddef>
+#include <limits>
+
+namespace velmora::render {
+
+Rectangle Rectangle::Clipped(const Rectangle& bounds) const noexcept {
+    return {std::max(top, bounds.top), std::min(bottom, bounds.bottom), std::max(left, bounds.left),
+            std::min(right, bounds.right)};
+}
+
+bool ImageView::IsValid() const noexcept {
+    return base != nullptr && format->bytesPerPixel != 0 && bufferWidth >= 1 && bufferHeight >= 1 &&
+           format->RowBytes(bufferWidth) <= rowStep && top >= 0 && left >= 0 && top < bufferHeight &&
+           left < bufferWidth;
+}
+
+ImageView ViewOf(const FrameDescription& frame, std::int32_t width, std::int32_t height) noexcept {
+    constexpr std::int64_t kMost = std::numeric_limits<std::int32_t>::max();
+    const std::int64_t bufferWidth = std::int64_t{frame.xOrigin} + frame.width;
+    const std::int64_t bufferHeight = std::int64_t{frame.yOrigin} + frame.height;
+    const std::int64_t step = std::abs(std::int64_t{frame.rowStep});
+    // The buffer must also lie within what a pointer can reach.
+    if (frame.pixels == nullptr || bufferWidth > kMost || bufferHeight > kMost || step > kMost ||
+        frame.xOrigin < 0 || frame.yOrigin < 0 || width < 1 || height < 1 ||
+        step * bufferHeight > std::numeric_limits<std::ptrdiff_t>::max()) {
+        return {};
+    }
+    ImageView view;
+    view.bufferWidth = static_cast<std::int32_t>(bufferWidth);
+    view.bufferHeight = static_cast<std::int32_t>(bufferHeight);
+    view.rowStep = static_cast<std::int32_t>(step);
+    view.base = static_cast<std::uint8_t*>(frame.pixels);
+    if (frame.rowStep < 0) view.base -= static_cast<std::ptrdiff_t>(step * (bufferHeight - 1));
+    view.top = frame.yOrigin;
+    view.bottom = frame.yOrigin + height;
+    view.left = frame.xOrigin;
+    view.right = frame.xOrigin + width;
+    return view;
+}
+
+}  // namespace velmora::render

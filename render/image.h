@@ -1,0 +1,82 @@
+// Pixels and the views through which the stages read and write them.
+#pragma once
+
+#include <cstdint>
+
+namespace velmora::render {
+
+// One pixel, 32 bits: bytes blue, green, red, alpha in memory, that is 0xAARRGGBB as a little-endian word.
+struct Bgra {
+    std::uint8_t blue;
+    std::uint8_t green;
+    std::uint8_t red;
+    std::uint8_t alpha;
+};
+static_assert(sizeof(Bgra) == 4 && alignof(Bgra) == 1);
+
+struct PixelFormat {
+    std::int32_t code;
+    std::int32_t secondCode;
+    std::int32_t bitsPerPixel;
+    std::int32_t bytesPerPixel;
+    std::int32_t planeCount;
+
+    [[nodiscard]] constexpr std::int64_t RowBytes(std::int32_t width) const noexcept {
+        return std::int64_t{width} * bytesPerPixel;
+    }
+};
+inline constexpr std::int32_t kFormatBgra32 = 1002;
+inline constexpr PixelFormat kBgra32 = {kFormatBgra32, 1100, 32, 4, 1};
+
+// Rows and columns of a buffer; bottom and right are exclusive.
+struct Rectangle {
+    std::int32_t top;
+    std::int32_t bottom;
+    std::int32_t left;
+    std::int32_t right;
+
+    [[nodiscard]] constexpr bool IsEmpty() const noexcept { return bottom <= top || right <= left; }
+    [[nodiscard]] constexpr std::int32_t Width() const noexcept { return right - left; }
+    [[nodiscard]] constexpr std::int32_t Height() const noexcept { return bottom - top; }
+    [[nodiscard]] Rectangle Clipped(const Rectangle& bounds) const noexcept;
+    bool operator==(const Rectangle&) const = default;
+};
+
+// A picture as a caller hands it over. Not owned. The region to process is width x height pixels whose left
+// top corner lies at (xOrigin, yOrigin) of the buffer; a negative row step tells that the buffer's rows lie
+// bottom-up in memory, with `pixels` at the first stored one.
+struct FrameDescription {
+    void* pixels = nullptr;
+    std::int32_t width = 0;
+    std::int32_t height = 0;
+    std::int32_t rowStep = 0;
+    std::int32_t xOrigin = 0;
+    std::int32_t yOrigin = 0;
+};
+
+// The descriptor that stages read and write through. Rows, origins and shifts count from the lowest address,
+// also for a buffer stored bottom-up. Does not own the pixels. Empty views are not valid.
+struct ImageView {
+    const PixelFormat* format = &kBgra32;
+    std::int32_t bufferWidth = 0;
+    std::int32_t bufferHeight = 0;
+    std::int32_t rowStep = 0;  // bytes, positive when valid; need not be a multiple of 4
+    std::uint8_t* base = nullptr;
+    std::int32_t top = 0;
+    std::int32_t bottom = 0;
+    std::int32_t left = 0;
+    std::int32_t right = 0;
+
+    // First pixel of the processed part of a row; `row` counts from the top of the processed rectangle.
+    [[nodiscard]] Bgra* Row(std::int32_t row) const noexcept {
+        return reinterpret_cast<Bgra*>(base + std::ptrdiff_t{rowStep} * (top + row)) + left;
+    }
+    [[nodiscard]] constexpr Rectangle Region() const noexcept { return {top, bottom, left, right}; }
+    [[nodiscard]] bool IsValid() const noexcept;
+};
+
+// A view of a frame whose processed rectangle is width x height pixels. A description whose numbers overflow
+// or that has no pixels gives a view that is not valid.
+[[nodiscard]] ImageView ViewOf(const FrameDescription& frame, std::int32_t width, std::int32_t height) noexcept;
+
+}  // namespace velmora::render

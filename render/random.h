@@ -1,0 +1,50 @@
+// Random numbers of the renderer: a linear congruential generator whose state is one 32-bit word that the
+// caller owns. Draws are integer arithmetic only, so that a state gives the same numbers on every build.
+#pragma once
+
+#include <cstdint>
+
+namespace velmora::render {
+
+class Random {
+  public:
+    constexpr Random() noexcept = default;
+    constexpr explicit Random(std::uint32_t state) noexcept : m_state(state) {}
+
+    [[nodiscard]] constexpr std::uint32_t State() const noexcept { return m_state; }
+
+    // Advances once; 0..32767.
+    constexpr std::uint32_t Next() noexcept {
+        m_state = m_state * kMultiplier + kIncrement;
+        return (m_state >> 16) & 0x7FFFu;
+    }
+
+    // A draw between two integers, ends included, given in either order. The upper end comes once in 32768
+    // draws, since the division truncates. The span must not exceed 131073 (the product is 32 bits wide).
+    constexpr std::int32_t Draw(std::int32_t a, std::int32_t b) noexcept {
+        const std::uint32_t low = static_cast<std::uint32_t>(a < b ? a : b);
+        const std::uint32_t high = static_cast<std::uint32_t>(a < b ? b : a);
+        return static_cast<std::int32_t>(Next() * (high - low) / 32767u + low);
+    }
+
+    // A draw between `low` and `high` with `decimals` digits after the point, clamped to the two.
+    double DrawDecimal(float low, float high, int decimals) noexcept;
+
+    // As `count` draws would: the generator's step applied `count` times, in at most 32 rounds.
+    constexpr void Skip(std::uint32_t count) noexcept {
+        std::uint32_t multiplier = kMultiplier, increment = kIncrement;
+        for (; count != 0; count >>= 1) {
+            if (count & 1u) m_state = m_state * multiplier + increment;
+            increment *= multiplier + 1u;
+            multiplier *= multiplier;
+        }
+    }
+
+  private:
+    static constexpr std::uint32_t kMultiplier = 1103515245u;
+    static constexpr std::uint32_t kIncrement = 12345u;
+
+    std::uint32_t m_state = 0;
+};
+
+}  // namespace velmora::render

@@ -1,0 +1,4 @@
+#pragma once
+namespace velmora::render {
+class ScratchMemory {};
+}
