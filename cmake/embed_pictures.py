@@ -52,7 +52,7 @@ def read_grey(path, width, height):
     try:
         content = path.read_bytes()
     except OSError as error:
-        raise Refused(f"{path}: found no readable file ({error.strerror}), expected a binary grey PGM") from None
+        raise Refused(f"{path}: found no readable file ({error.strerror}), expected a P5 picture") from None
     header = HEADER.match(content)
     expect(path, "format", content[:2].decode("latin-1"), "P5")
     if not header:

@@ -23,7 +23,8 @@ const GreyPicture& WearPicture(std::int32_t menuValue) noexcept;
 inline constexpr int kSpotCount = 11;
 
 // The spot at `index`, which must be in 0..kSpotCount − 1. Its first byte is its key, the level that leaves
-// the frame as it is (between 1 and 254): darker bytes are dirt, brighter ones clear specks. The whole border holds the key.
+// the frame as it is (between 1 and 254): darker bytes are dirt, brighter ones clear specks. The whole
+// border holds the key.
 const GreyPicture& SpotPicture(std::int32_t index) noexcept;
 
 }  // namespace velmora::render

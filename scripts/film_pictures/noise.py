@@ -18,7 +18,7 @@ def smoothstep(low, high, v):
 
 
 def lattice(seed, width, height, cell_width, cells_high):
-    """A function (x, y) of smooth noise: cells `cell_width` pixels wide, `cells_high` of them in the height."""
+    """Smooth noise, a function (x, y): cells `cell_width` pixels wide, `cells_high` of them in the height."""
     source = random.Random(seed)
     columns = math.ceil(width / cell_width) + 2
     knots = [[source.random() for _ in range(columns)] for _ in range(cells_high)]
@@ -37,7 +37,7 @@ def lattice(seed, width, height, cell_width, cells_high):
 
 
 def octaves(seed, width, height, cell_width, cells_high, count, gain=0.5):
-    """Sum of `count` lattices, each half as coarse and `gain` times as strong as the one before, about 0..1."""
+    """Sum of `count` lattices, each half as coarse and `gain` times as strong as the last, about 0..1."""
     layers = [(lattice(seed * 101 + i, width, height, cell_width / 2**i, cells_high * 2**i), gain**i)
               for i in range(count)]
     total = sum(weight for _, weight in layers)
@@ -65,6 +65,26 @@ def blurred(values):
         return row[x - 1] + 2 * row[x] + row[(x + 1) % width]
 
     return field(width, height, lambda x, y: (sum121(x, y - 1) + 2 * sum121(x, y) + sum121(x, y + 1)) / 16)
+
+
+def clouds(seed, width, height, size):
+    """Noise whose hills are about `size` pixels wide and round (a lattice's are square), of deviation 1."""
+    values = white(seed, width, height)
+    for _ in range(round(size * size / 4)):
+        values = blurred(values)
+    mean = sum(map(sum, values)) / (width * height)
+    deviation = math.sqrt(sum((v - mean)**2 for row in values for v in row) / (width * height))
+    return [[(v - mean) / deviation for v in row] for row in values]
+
+
+def evened(values, radius):
+    """Less the mean of the surroundings: no place stands out, which would show when the strips repeat it."""
+    height, width = len(values), len(values[0])
+    side = range(-radius, radius + 1)
+    across = [[sum(row[(x + i) % width] for i in side) for x in range(width)] for row in values]
+    count = len(side)**2
+    return field(width, height, lambda x, y:
+                 values[y][x] - sum(across[(y + j) % height][x] for j in side) / count)
 
 
 def highlights(values, low, high):

@@ -1,9 +1,9 @@
 """The eleven spots: dust, hairs, specks and drops on a background of the picture's key.
 
 A spot is a list of shapes. A shape tells how much of it covers a point (0..1, soft over one pixel); what
-it covers goes from the key towards `target`, 0 for dirt on the print and 255 for dust that lay on the negative.
-Points are in pixels, the middle of the top-left pixel at (0.5, 0.5). Shapes stay a pixel away from the border,
-which keeps the key, so that no rectangle shows.
+it covers goes from the key towards `target`: 0 for dirt on the print, 255 for dust that lay on the
+negative. Points are in pixels, the middle of the top-left pixel at (0.5, 0.5). Shapes stay a pixel away
+from the border, which keeps the key, so that no rectangle shows.
 """
 
 import math
@@ -15,7 +15,8 @@ SUBSAMPLES = 8
 def blob(x, y, radius_x, radius_y, turn=0.0, target=0, strength=1.0, seed=0):
     """An ellipse whose outline wanders by 15 %, turned by `turn` degrees."""
     source = random.Random(seed)
-    waves = [(n, source.uniform(-0.15, 0.15) / math.sqrt(n), source.uniform(0, 2 * math.pi)) for n in (2, 3, 5)]
+    waves = [(n, source.uniform(-0.15, 0.15) / math.sqrt(n), source.uniform(0, 2 * math.pi))
+             for n in (2, 3, 5)]
     c, s = math.cos(math.radians(turn)), math.sin(math.radians(turn))
 
     def covers(px, py):
@@ -45,19 +46,6 @@ def hair(points, thickness=1.2, target=0, strength=1.0):
     return covers, target
 
 
-def ring(x, y, radius, thickness, target=0, strength=1.0, open_towards=None):
-    """A round line, thinning to nothing towards the direction `open_towards` (degrees) when given."""
-    def covers(px, py):
-        half = thickness / 2
-        if open_towards is not None:
-            away = math.atan2(py - y, px - x) - math.radians(open_towards)
-            half *= 0.5 - 0.5 * math.cos(away)
-        inside = half - abs(math.hypot(px - x, py - y) - radius)
-        return min(1.0, max(0.0, 0.5 + inside)) * strength * min(1.0, 2 * half)
-
-    return covers, target
-
-
 # Width, height, key, shapes.
 SPOTS = [
     # dust grain
@@ -73,17 +61,19 @@ SPOTS = [
     (8, 7, 103, [blob(3.9, 3.5, 1.9, 1.4, -12, seed=8)]),
     # splinter
     (5, 10, 110, [hair([(2.1, 1.9), (3.1, 4.0), (2.0, 6.0), (2.9, 8.1)], 1.3)]),
-    # curled fibre
-    (13, 14, 95, [hair([(2.4, 10.6), (1.0, -0.5), (14.5, 0.5), (9.2, 9.8)]),
-                  hair([(9.2, 9.8), (8.3, 12.2), (6.0, 12.2), (5.4, 10.4)], 1.0, strength=0.85)]),
+    # hooked fibre with a crumb of dust on it
+    (13, 14, 95, [hair([(2.2, 11.6), (2.6, 5.0), (5.0, 0.6), (8.4, 2.6)]),
+                  hair([(8.4, 2.6), (11.6, 4.6), (11.4, 7.4), (9.2, 8.0)], 1.1, strength=0.9),
+                  blob(4.0, 6.8, 1.1, 1.4, 30, seed=13)]),
     # bright sliver
     (6, 9, 90, [blob(3.0, 4.5, 1.1, 2.7, 12, 255, 0.9, seed=9)]),
     # short bent hair
     (8, 12, 111, [hair([(5.8, 2.0), (1.0, 3.6), (2.0, 8.0), (5.0, 10.0)], 1.3)]),
     # two specks
     (7, 8, 110, [blob(2.7, 2.9, 1.2, 1.1, 0, seed=10), blob(4.4, 5.3, 0.9, 1.0, 0, strength=0.85, seed=11)]),
-    # dried drop: a dark rim around a lighter middle
-    (13, 11, 118, [ring(6.5, 5.5, 3.3, 1.3, 0, 0.9, open_towards=-50), blob(6.3, 5.7, 2.1, 1.9, 0, 255, 0.45, seed=12)]),
+    # dried drop: a thin rim, darker on one side, around a faintly cleaned middle
+    (13, 11, 118, [blob(6.4, 5.6, 4.0, 3.2, 20, 0, 0.75, seed=14),
+                   blob(7.1, 5.2, 3.0, 2.3, 15, 150, 0.9, seed=15)]),
 ]
 
 

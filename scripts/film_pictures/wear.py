@@ -7,31 +7,36 @@ of the film is intact, else wear would read as fog.
 import math
 import random
 
-from .noise import (blurred, field, highlights, lattice, multiplied, octaves, smoothstep, strip_ends, warped,
-                    white)
+from .noise import (blurred, clouds, evened, field, highlights, lattice, multiplied, octaves, smoothstep,
+                    strip_ends, warped, white)
 
 
 def wavy(width, height):
     """Long soft streaks that sway together along the film, each coming and going slowly."""
     broad = lattice(11, width, height, width / 7, 3)
-    narrow = octaves(12, width, height, width / 15, 6, 2)
-    presence = lattice(13, width, height, width / 3, 5)
-    ends = strip_ends(14, width, height, 4)
+    narrow = octaves(12, width, height, width / 14, 5, 2, 0.6)
+    presence = octaves(13, width, height, width / 4, 5, 2)
+    ends = strip_ends(14, width, height, 3)
 
     def streak(x, y):
         turn = 2 * math.pi * y / height
-        bent = x + 0.07 * width * math.sin(2 * turn) + 0.04 * width * math.sin(5 * turn + 1)
-        return 0.5 * broad(bent, y) + 0.5 * narrow(bent, y) - 0.3 * ends[y][x]
+        bent = x + 0.06 * width * math.sin(2 * turn) + 0.035 * width * math.sin(5 * turn + 1)
+        return 0.35 * broad(bent, y) + 0.65 * narrow(bent, y) - 0.25 * ends[y][x]
 
-    shown = field(width, height, lambda x, y: smoothstep(0.1, 0.5, presence(x, y)))
-    return multiplied(highlights(field(width, height, streak), 0.74, 0.95), shown)
+    shown = field(width, height, lambda x, y: smoothstep(0.15, 0.6, presence(x, y)))
+    return multiplied(highlights(evened(field(width, height, streak), 10), 0.70, 0.97), shown)
 
 
 def blotchy(width, height):
-    """Soft stains of a dozen pixels with uneven borders."""
-    stain = warped(21, octaves(23, width, height, 12, height // 14, 4, 0.6), width, height, 10, 6)
-    ends = strip_ends(24, width, height, 5)
-    return highlights(field(width, height, lambda x, y: stain(x, y) - 0.15 * ends[y][x]), 0.76, 0.98)
+    """Soft stains of a dozen pixels, some hardly begun."""
+    large, small, mottle = (clouds(21 + i, width, height, size) for i, size in enumerate((12, 5, 1.5)))
+    strength = clouds(24, width, height, 10)
+    ends = strip_ends(25, width, height, 4)
+    stains = highlights(field(width, height, lambda x, y:
+                              large[y][x] + 0.4 * small[y][x] + 0.1 * mottle[y][x] - 1.2 * ends[y][x]),
+                        0.70, 0.96)
+    shown = field(width, height, lambda x, y: smoothstep(-2.6, 0.6, strength[y][x]) * (1 - ends[y][x]))
+    return multiplied(stains, shown)
 
 
 def grainy(width, height):
@@ -57,18 +62,17 @@ def fine(width, height):
     return multiplied(worn, field(width, height, lambda x, y: smoothstep(0.05, 0.65, patches(x, y))))
 
 
-def nearest_two(points, width, height):
-    """A function (x, y) of the distances to the two nearest points, counted around by height and width."""
+def cell_border(points, width, height):
+    """The distance from (x, y) to the nearest border between the cells of the points, around the edges."""
+    def offset(a, b, size):
+        return (b - a + size / 2) % size - size / 2
+
     def at(x, y):
-        first = second = math.inf
-        for px, py in points:
-            dx, dy = abs(x - px) % width, abs(y - py) % height
-            distance = math.hypot(min(dx, width - dx), min(dy, height - dy))
-            if distance < first:
-                first, second = distance, first
-            elif distance < second:
-                second = distance
-        return first, second
+        reach = sorted((math.hypot(dx, dy), dx, dy) for dx, dy in
+                       ((offset(x, px, width), offset(y, py, height)) for px, py in points))
+        (first, ax, ay), (second, bx, by) = reach[:2]
+        return (second**2 - first**2) / (2 * math.hypot(ax - bx, ay - by))
+
     return at
 
 
@@ -80,17 +84,26 @@ def scattered(seed, width, height, columns, rows):
 
 
 def splotchy(width, height):
-    """Large stains, worn through in flecks and crumbling at their borders."""
-    near = nearest_two(scattered(51, width, height, 1, height // 22), width, height)
-    closeness = warped(52, lambda x, y: 1 - near(x, y)[0] / 16, width, height, 9, 8)
-    flecks = octaves(54, width, height, 5, height // 5, 2, 0.8)
-    patches = lattice(55, width, height, 25, height // 40)
-    ends = strip_ends(56, width, height, 3)
+    """Large stains drawn out along the film, with lobed borders and mottled inside."""
+    source = random.Random(57)
+    stains = []
+    for i, radius in enumerate((7.5, 2.5, 5.0, 8.5, 3.0, 6.0)):
+        inside = min(radius, width / 2 - 2)
+        y = (i + source.uniform(0.0, 1.0)) * height / 6
+        stains.append((source.uniform(inside, width - inside), y, radius, source.uniform(0.6, 1.0)))
+    lobes, flakes, mottle = (clouds(52 + i, width, height, size) for i, size in enumerate((7, 3, 0)))
+    ends = strip_ends(55, width, height, 2.5)
 
-    def stain(x, y):
-        return 0.3 * closeness(x, y) + 0.25 * patches(x, y) + 0.6 * flecks(x, y) - 0.15 * ends[y][x]
+    def worn(x, y):
+        border = 0.30 * lobes[y][x] + 0.16 * flakes[y][x] + 0.05 * mottle[y][x]
+        most = 0.0
+        for px, py, radius, strength in stains:
+            down = abs(y - py) % height
+            away = math.hypot(x - px, min(down, height - down) / 2) / radius
+            most = max(most, strength * smoothstep(0.1, 0.7, 1 - away + border))
+        return most * (0.75 + 0.25 * smoothstep(-1.5, 1.5, mottle[y][x])) * (1 - ends[y][x])
 
-    return highlights(field(width, height, stain), 0.83, 0.975)
+    return field(width, height, worn)
 
 
 def lite(width, height):
@@ -105,14 +118,14 @@ def lite(width, height):
 def crackly(width, height):
     """A net of cracks in the emulsion, about half of it open."""
     points = scattered(71, width, height, round(width / 13), round(height / 13))
-    gap = warped(72, lambda x, y, near=nearest_two(points, width, height): near(x, y)[1] - near(x, y)[0],
-                 width, height, 7, 4)
-    patches = octaves(74, width, height, 13, height // 13, 3, 0.6)
-    ends = strip_ends(75, width, height, 3)
+    border = warped(72, cell_border(points, width, height), width, height, 6, 3)
+    patches = octaves(74, width, height, 16, height // 16, 2)
+    ends = strip_ends(75, width, height, 2)
+    opening = evened(field(width, height, patches), 14)
 
     def crack(x, y):
-        opened = smoothstep(0.42, 0.62, patches(x, y)) * (1 - 0.6 * ends[y][x])
-        return opened * (1 - smoothstep(0.2, 0.6 + 1.6 * opened, gap(x, y)))
+        opened = smoothstep(-0.08, 0.06, opening[y][x]) * (1 - 0.5 * ends[y][x])
+        return opened * (1 - smoothstep(0.1, 0.4 + 0.6 * opened, border(x, y)))
 
     return field(width, height, crack)
 

@@ -22,7 +22,8 @@ class EmbedPictures(unittest.TestCase):
         shutil.copytree(PICTURES, self.folder)
 
     def embed(self):
-        return subprocess.run([sys.executable, SCRIPT, self.folder, self.output], capture_output=True, text=True)
+        command = [sys.executable, SCRIPT, self.folder, self.output]
+        return subprocess.run(command, capture_output=True, text=True)
 
     def change(self, name, old, new):
         path = self.folder / name
