@@ -1,0 +1,121 @@
+#include "render/colour.h"
+
+#include <algorithm>
+#include <bit>
+#include <cmath>
+#include <iterator>
+
+#include "render/rounding.h"
+
+namespace velmora::render {
+namespace {
+
+bool IsNearZero(float value) noexcept {
+    constexpr float kEpsilon = 0.00001f;
+    return value > -kEpsilon && value < kEpsilon;
+}
+
+// The gain grows in steps with the contrast. The sliders reach 0.5 at most, so only the first step is in
+// use; the others are what the curve continues with.
+double ContrastGain(float contrast) noexcept {
+    if (contrast < 0.0f) return 1.0 + contrast;
+    struct Step {
+        float below;
+        double factor;
+    };
+    constexpr Step kSteps[] = {{0.6f, 10}, {0.7f, 12}, {0.75f, 15}, {0.8f, 19},
+                               {0.85f, 24}, {0.9f, 30}, {0.95f, 40}};
+    const auto step = std::find_if(std::begin(kSteps), std::end(kSteps),
+                                   [contrast](const Step& s) { return contrast < s.below; });
+    const double factor = step == std::end(kSteps) ? 254.0 : step->factor;
+    return factor * contrast * contrast + 1.0;
+}
+
+std::uint8_t Saturate(std::int32_t value) noexcept {
+    return static_cast<std::uint8_t>(std::clamp(value, 0, 255));
+}
+
+}  // namespace
+
+float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds) noexcept {
+    // So much less than a draw that only the error of the product is meant.
+    constexpr double kTolerance = 1e-9;
+    constexpr double kMostDraws = 9007199254740992.0;  // 2^53: beyond it doubles skip whole numbers
+    double draws = std::ceil(seconds * rate - kTolerance);
+    draws = draws >= 1.0 ? std::min(draws, kMostDraws) : 1.0;
+    Random random(std::bit_cast<std::uint32_t>(Narrow(double{saturation} + flicker)));
+    // The generator's period is 2^32, so only the count modulo that matters.
+    random.Skip(static_cast<std::uint32_t>(static_cast<std::uint64_t>(draws) - 1));
+    return Narrow(random.DrawDecimal(0.0f, flicker, 2) - 0.5 * flicker);
+}
+
+ByteTable BrightnessTable(float offset) noexcept {
+    ByteTable table;
+    for (std::int32_t i = 0; i < 256; ++i) {
+        const double room = offset > 0.0f ? 255 - i : i;
+        table[static_cast<std::size_t>(i)] =
+            static_cast<std::uint8_t>(i + RoundHalfAway(Narrow(room * offset)));
+    }
+    return table;
+}
+
+ByteTable ContrastTable(float contrast) noexcept {
+    const double gain = ContrastGain(contrast);
+    ByteTable table;
+    for (std::int32_t i = 0; i < 256; ++i) {
+        const float x = Narrow(((i / 255.0 - 0.5) * gain + 0.5) * 255.0);
+        table[static_cast<std::size_t>(i)] =
+            static_cast<std::uint8_t>(x > 255.0f ? 255 : x < 0.0f ? 0 : Truncate(x));
+    }
+    return table;
+}
+
+ColourStage PrepareColour(const StageSettings& settings, double seconds, ContrastCache& cache) noexcept {
+    const float brightness = 0.5f * settings.brightness;
+    const float contrast = 0.5f * settings.contrast;
+    ColourStage stage;
+    stage.m_mixes = !IsNearZero(settings.saturation);
+    stage.m_active = stage.m_mixes || !IsNearZero(settings.flicker) || !IsNearZero(brightness) ||
+                     !IsNearZero(contrast);
+    if (!stage.m_active) return stage;
+
+    float offset = 0.0f;
+    if (!IsNearZero(settings.flicker)) {
+        offset = FlickerOffset(settings.saturation, settings.flicker, settings.flickerRate, seconds);
+    }
+    if (!IsNearZero(brightness)) {
+        offset = std::clamp(Narrow(double{offset} + brightness), -1.0f, 1.0f);
+    }
+    stage.m_tone = BrightnessTable(offset);
+    if (!IsNearZero(contrast)) {
+        if (cache.contrast != contrast) {
+            cache.contrast = contrast;
+            cache.table = ContrastTable(contrast);
+        }
+        for (std::uint8_t& entry : stage.m_tone) entry = cache.table[entry];
+    }
+    stage.m_weight = static_cast<std::int16_t>(Truncate((0.0f - settings.saturation) * 127.0));
+    return stage;
+}
+
+void ColourStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t) const noexcept {
+    const std::int32_t weight = m_weight;
+    for (std::int32_t x = 0; x < width; ++x) {
+        const std::int32_t red = m_tone[in[x].red];
+        const std::int32_t green = m_tone[in[x].green];
+        const std::int32_t blue = m_tone[in[x].blue];
+        if (!m_mixes) {
+            out[x] = {static_cast<std::uint8_t>(blue), static_cast<std::uint8_t>(green),
+                      static_cast<std::uint8_t>(red), in[x].alpha};
+            continue;
+        }
+        const std::int32_t luma = (76 * red + 149 * green + 30 * blue) >> 8;
+        const std::int32_t grey = static_cast<std::int16_t>(luma * weight);
+        const auto mix = [=](std::int32_t channel) {
+            return Saturate(((127 - weight) * channel + grey) >> 7);
+        };
+        out[x] = {mix(blue), mix(green), mix(red), in[x].alpha};
+    }
+}
+
+}  // namespace velmora::render

@@ -1,0 +1,58 @@
+// Colour, flicker, brightness and contrast.
+//
+// Every channel goes through one table, built for the frame:
+//   brightness and flicker: v = flicker offset + brightness / 2;
+//     table[i] = i + R(i v) for v <= 0 (toward black), i + R((255 - i) v) for v > 0 (toward white);
+//   contrast: ((i / 255 - 0.5) g + 0.5) 255, truncated and clamped, with the gain g from contrast / 2.
+// Then, with saturation s, each pixel moves away from its grey value or toward it:
+//   w = trunc(-127 s); Y = (76 R + 149 G + 30 B) >> 8;
+//   X' = clamp(((127 - w) X + low16(Y w)) >> 7): grey at s = -1, unchanged near 0, about 2 X - Y at 1.
+// Alpha is copied. R rounds halves away from zero.
+#pragma once
+
+#include <array>
+#include <cstdint>
+
+#include "render/cpu.h"
+#include "render/image.h"
+#include "render/render_state.h"
+#include "render/stage_settings.h"
+
+namespace velmora::render {
+
+using ByteTable = std::array<std::uint8_t, 256>;
+
+// The flicker's share of the brightness offset at a time: a value that changes `rate` times a second, the
+// k-th of a sequence that the settings alone seed, so that it is the same on every run. Costs the same at any
+// time. Within +-0.5; single precision.
+[[nodiscard]] float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds) noexcept;
+
+[[nodiscard]] ByteTable BrightnessTable(float offset) noexcept;
+// `contrast` is half of the setting.
+[[nodiscard]] ByteTable ContrastTable(float contrast) noexcept;
+
+class ColourStage {
+  public:
+    [[nodiscard]] bool IsActive() const noexcept { return m_active; }
+    // Pixels are mixed with their grey value: more than a table.
+    [[nodiscard]] bool Mixes() const noexcept { return m_mixes; }
+    [[nodiscard]] const ByteTable& Tone() const noexcept { return m_tone; }
+    [[nodiscard]] std::int16_t Weight() const noexcept { return m_weight; }
+
+    // The plain form. `in` may be `out`.
+    void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
+
+  private:
+    friend ColourStage PrepareColour(const StageSettings&, double, ContrastCache&) noexcept;
+
+    bool m_active = false;
+    bool m_mixes = false;
+    std::int16_t m_weight = 0;  // w above
+    ByteTable m_tone{};
+};
+
+// `seconds`: the frame's time. The contrast table is rebuilt only when its value changes.
+[[nodiscard]] ColourStage PrepareColour(const StageSettings& settings, double seconds,
+                                        ContrastCache& cache) noexcept;
+
+}  // namespace velmora::render

@@ -1,0 +1,66 @@
+// Jitter and border: shakes the whole picture by a random whole-pixel offset, as a film that does not sit
+// still in the gate, and fills the strip that the shift uncovers with the border colour.
+#pragma once
+
+#include <cstdint>
+
+#include "render/frame_context.h"
+#include "render/image.h"
+#include "render/random.h"
+#include "render/row_reader.h"
+#include "render/stage_settings.h"
+
+namespace velmora::render {
+
+// Writes the word to every pixel of a rectangle of the buffer. The rectangle must lie within it.
+void FillRectangle(const ImageView& view, const Rectangle& rectangle, std::uint32_t colour) noexcept;
+
+// Copies a rectangle of `source` to (row, column) of `destination`, clipped to `sourceBounds` and
+// `destinationBounds`: what clipping cuts from the top or left of one side is cut from the other as well.
+// The two must not overlap in memory.
+void CopyRectangle(const ImageView& destination, std::int32_t row, std::int32_t column,
+                   const Rectangle& destinationBounds, const ImageView& source, Rectangle rectangle,
+                   const Rectangle& sourceBounds) noexcept;
+
+class JitterStage {
+  public:
+    JitterStage() noexcept = default;
+    JitterStage(std::int32_t dy, std::int32_t dx, std::uint32_t border) noexcept
+        : m_dy(dy), m_dx(dx), m_border(border) {}
+
+    [[nodiscard]] bool IsActive() const noexcept { return m_dy != 0 || m_dx != 0; }
+    [[nodiscard]] std::int32_t Dy() const noexcept { return m_dy; }  // positive: down
+    [[nodiscard]] std::int32_t Dx() const noexcept { return m_dx; }  // positive: to the right
+
+    // The whole frame: paints the bands, then copies the picture, reading the current input and claiming
+    // the destination.
+    void Apply(FrameContext& context) const noexcept;
+
+    // Row `y` of the shaken picture, width pixels of `source`'s region: written to `out`, or a pointer into
+    // the source where the row lies there as it is wanted.
+    const Bgra* Row(const ImageView& source, Bgra* out, std::int32_t y) const noexcept;
+
+  private:
+    std::int32_t m_dy = 0;
+    std::int32_t m_dx = 0;
+    std::uint32_t m_border = 0;
+};
+
+// Draws the offsets: none when both amplitudes are 0, else the vertical one first, then the horizontal one.
+[[nodiscard]] JitterStage PrepareJitter(const StageSettings& settings, Random& random) noexcept;
+
+// The shaken picture of a frame, for stages that need their neighbours.
+class ShakenRows final : public RowReader {
+  public:
+    ShakenRows(const ImageView& source, const JitterStage& jitter) noexcept
+        : m_source(source), m_jitter(jitter) {}
+    const Bgra* Read(std::int32_t y, Bgra* scratch) const noexcept override {
+        return m_jitter.Row(m_source, scratch, y);
+    }
+
+  private:
+    const ImageView& m_source;
+    const JitterStage& m_jitter;
+};
+
+}  // namespace velmora::render

@@ -1,0 +1,94 @@
+#include "render/renderer.h"
+
+#include <cstring>
+
+namespace velmora::render {
+namespace {
+
+// The chain behind jitter, in its order: what both roads run. `visit` takes a stage.
+template <typename Visit>
+void ForEachActiveStage(const FramePlan& plan, Visit&& visit) {
+    if (plan.colour.IsActive()) visit(plan.colour);
+    if (plan.tint.IsActive()) visit(plan.tint);
+    if (plan.wear.IsActive()) visit(plan.wear);
+    if (plan.spots.IsActive()) visit(plan.spots);
+}
+
+// One stage over the whole picture: from the current input into the destination.
+template <typename Stage>
+void ApplyStage(const Stage& stage, FrameContext& context) noexcept {
+    const ImageView* input = context.CurrentInput(true);
+    if (input == nullptr) return;
+    const ImageView& output = context.ClaimDestination();
+    for (std::int32_t y = 0; y < context.Height(); ++y) {
+        stage.Row(input->Row(y), output.Row(y), context.Width(), y);
+    }
+}
+
+void RenderByStages(FrameContext& context, const FramePlan& plan) noexcept {
+    if (plan.jitter.IsActive()) plan.jitter.Apply(context);
+    ForEachActiveStage(plan, [&context](const auto& stage) { ApplyStage(stage, context); });
+}
+
+void RenderByRows(FrameContext& context, const FramePlan& plan) noexcept {
+    bool isNeutral = !plan.jitter.IsActive();
+    ForEachActiveStage(plan, [&isNeutral](const auto&) { isNeutral = false; });
+    if (isNeutral) return;
+
+    const ImageView& source = context.Source();
+    const ImageView& destination = context.ClaimDestination();
+    const std::int32_t width = context.Width();
+    for (std::int32_t y = 0; y < context.Height(); ++y) {
+        Bgra* out = destination.Row(y);
+        const Bgra* in = plan.jitter.Row(source, out, y);
+        ForEachActiveStage(plan, [&](const auto& stage) {
+            stage.Row(in, out, width, y);
+            in = out;
+        });
+        if (in != out) std::memmove(out, in, static_cast<std::size_t>(width) * sizeof(Bgra));
+    }
+}
+
+// In place the rows can be worked on where they lie, unless the picture moves over itself.
+bool NeedsOwnSource(const FrameContext& context, const FramePlan& plan) noexcept {
+    if (!context.FramesOverlap()) return false;
+    const ImageView& source = context.Source();
+    const ImageView& destination = context.Destination();
+    const bool sameRows =
+        source.Row(0) == destination.Row(0) && source.rowStep == destination.rowStep;
+    return plan.jitter.IsActive() || !sameRows;
+}
+
+}  // namespace
+
+FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings, RenderState& state) noexcept {
+    Random& random = state.random.Numbers();
+    FramePlan plan;
+    plan.jitter = PrepareJitter(settings, random);
+    plan.colour = PrepareColour(settings, context.Time(), state.contrast);
+    plan.tint = PrepareTint(settings);
+    plan.wear = PrepareWear(settings, context.Width(), random);
+    plan.spots = PrepareSpots(settings, context.Destination().Region(), random);
+    return plan;
+}
+
+void RenderStages(FrameContext& context, const StageSettings& settings, RenderState& state,
+                  const RenderOptions& options) noexcept {
+    FramePlan plan = PlanFrame(context, settings, state);
+    // Without memory for the copy the picture stays where it is; the other stages can still work.
+    if (NeedsOwnSource(context, plan) && !context.DetachSource()) plan.jitter = {};
+    if (options.road == Road::kByStages) {
+        RenderByStages(context, plan);
+    } else {
+        RenderByRows(context, plan);
+    }
+}
+
+std::uint32_t DrawsPerFrame(const StageSettings& settings, std::int32_t width) noexcept {
+    constexpr std::uint32_t kDrawsPerSpot = 6;
+    const std::uint32_t jitter = settings.yJitter != 0 || settings.xJitter != 0 ? 2 : 0;
+    const std::uint32_t wear = 1 + (settings.wear != 0.0f ? WearStripCount(settings, width) : 0);
+    return jitter + wear + kDrawsPerSpot * SpotCount(settings);
+}
+
+}  // namespace velmora::render

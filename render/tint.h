@@ -1,0 +1,43 @@
+// Tint and film gamma: a black-level shift for each channel and an S-shaped tone curve, through one table a
+// channel: G[T[G[channel]]].
+//
+// T, from a channel's offset o (-255..255, 0 is neutral): a line from o at 0 to 255 at 255 for o > 0, else 0
+// up to |o| and a line from there to 255; with o = 0 it maps 255 to 254, which only shows with a gamma.
+// G, from the gamma g: g (1 - cos(pi x)) / 2 + (1 - g) x.
+#pragma once
+
+#include <cstdint>
+
+#include "render/colour.h"
+#include "render/image.h"
+#include "render/stage_settings.h"
+
+namespace velmora::render {
+
+// The offset of a channel's tint value t (0..1, 0.5 neutral).
+[[nodiscard]] std::int32_t TintOffset(float tint) noexcept;
+[[nodiscard]] ByteTable TintTable(std::int32_t offset) noexcept;
+[[nodiscard]] ByteTable FilmGammaTable(float gamma) noexcept;
+
+class TintStage {
+  public:
+    [[nodiscard]] bool IsActive() const noexcept { return m_active; }
+    [[nodiscard]] const ByteTable& Red() const noexcept { return m_red; }
+    [[nodiscard]] const ByteTable& Green() const noexcept { return m_green; }
+    [[nodiscard]] const ByteTable& Blue() const noexcept { return m_blue; }
+
+    // The plain form; alpha is kept. `in` may be `out`.
+    void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
+
+  private:
+    friend TintStage PrepareTint(const StageSettings&) noexcept;
+
+    bool m_active = false;
+    ByteTable m_red{};
+    ByteTable m_green{};
+    ByteTable m_blue{};
+};
+
+[[nodiscard]] TintStage PrepareTint(const StageSettings& settings) noexcept;
+
+}  // namespace velmora::render

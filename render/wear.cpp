@@ -1,0 +1,46 @@
+#include "render/wear.h"
+
+#include "render/rounding.h"
+#include "render/shade.h"
+
+namespace velmora::render {
+
+std::uint32_t WearStripCount(const StageSettings& settings, std::int32_t width) noexcept {
+    const std::int32_t stripWidth = WearPicture(settings.wearPattern).width;
+    return static_cast<std::uint32_t>((std::int64_t{width} + stripWidth - 1) / stripWidth);
+}
+
+WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random& random) noexcept {
+    // An orientation that no form of the stage uses: the draw is part of the random sequence.
+    random.Draw(0, 3);
+    WearStage stage;
+    stage.m_active = settings.wear != 0.0f;
+    if (!stage.m_active) return stage;
+    stage.m_picture = &WearPicture(settings.wearPattern);
+    stage.m_channels = settings.wearChannels;
+    stage.m_starts = random;
+    random.Skip(WearStripCount(settings, width));
+    for (std::size_t byte = 0; byte < stage.m_fractions.size(); ++byte) {
+        stage.m_fractions[byte] =
+            Narrow(double{Narrow(static_cast<double>(byte) / 255.0)} * settings.wear);
+    }
+    return stage;
+}
+
+void WearStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
+    ForEachStrip(width, y, [&](std::int32_t start, std::int32_t count, const std::uint8_t* bytes) {
+        for (std::int32_t i = 0; i < count; ++i) {
+            const Bgra pixel = in[start + i];
+            const float fraction = m_fractions[bytes[i]];
+            Bgra& result = out[start + i];
+            if (m_channels == kWearAllChannels) {
+                result = ShadePixel(pixel, fraction);
+            } else {
+                result = pixel;
+                result.blue = ShadeChannel(pixel.blue, fraction);
+            }
+        }
+    });
+}
+
+}  // namespace velmora::render

@@ -1,0 +1,25 @@
+// The few things that the library asks of the operating system outside its dialogs. One implementation per
+// system: platform_win32.cpp, platform_posix.cpp.
+#pragma once
+
+#include <cstdint>
+#include <string>
+
+namespace velmora::support {
+
+// Milliseconds since the system started, modulo 2^32.
+[[nodiscard]] std::uint32_t TickCount() noexcept;
+
+// A module of the system's loader; null when none.
+using ModuleHandle = void*;
+
+// Loads a module by path or bare name (16-bit text); null when it cannot be loaded.
+[[nodiscard]] ModuleHandle LoadModule(const char16_t* name) noexcept;
+void FreeModule(ModuleHandle module) noexcept;
+// The address of an export, or null.
+[[nodiscard]] void* FindExport(ModuleHandle module, const char* name) noexcept;
+// The folder of a module with its trailing separator; null asks for the running program's. Empty when it
+// cannot be told or memory is short.
+[[nodiscard]] std::u16string ModuleFolder(ModuleHandle module) noexcept;
+
+}  // namespace velmora::support
