@@ -186,12 +186,8 @@ static_assert(offsetof(PresetRecord, values) == 780);
 static_assert(offsetof(PresetRecord, count) == 1980);
 
 // ---------------------------------------------------------------------------------------------------------
-// Interfaces. None declares a destructor: compilers lay destructors out differently.
-
-#if defined(__GNUC__)
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wnon-virtual-dtor"
-#endif
+// Interfaces. None has a destructor in its table: compilers lay destructors out differently. The protected
+// ones below only keep a host from deleting what it has to release.
 
 class IUnknown {
   public:
@@ -202,6 +198,9 @@ class IUnknown {
     virtual std::uint32_t VM_CALL AddRef() = 0;
     // Returns the count left; at 0 the object is gone.
     virtual std::uint32_t VM_CALL Release() = 0;
+
+  protected:
+    ~IUnknown() = default;
 };
 
 // What an effect asks the host while it renders. Implemented by the host; not kept beyond Process but for
@@ -218,6 +217,9 @@ class IVideoHost : public IUnknown {
     virtual std::uint32_t VM_CALL HostOperation5(std::intptr_t a, std::intptr_t b) = 0;
     virtual bool VM_CALL HostOperation6(std::intptr_t a, std::intptr_t b) = 0;
     virtual void VM_CALL HostOperation7(std::intptr_t a, std::intptr_t b) = 0;
+
+  protected:
+    ~IVideoHost() = default;
 };
 
 // One effect. QueryInterface answers to IUnknown, IVideoEffect and IVideoHost; other identifiers are passed
@@ -241,6 +243,9 @@ class IVideoEffect : public IUnknown {
     // Copies the value that a built-in preset gives a parameter. False when an index is past its end or
     // `cell` is null.
     virtual bool VM_CALL GetPresetValue(std::uint32_t preset, std::uint32_t parameter, PresetCell* cell) = 0;
+
+  protected:
+    ~IVideoEffect() = default;
 };
 
 // Converts between packed YCbCr 4:2:2 (bytes Y0 Cb Y1 Cr for each started pair of pixels) and 32-bit frames,
@@ -260,6 +265,9 @@ class IFrameProcessor : public IUnknown {
     // 32-bit to 4:2:2; the byte is not read.
     virtual bool VM_CALL ConvertBgraToYcbcr(const FrameRecord* source, const FrameRecord* destination,
                                             std::uint8_t unused) = 0;
+
+  protected:
+    ~IFrameProcessor() = default;
 };
 
 class IEffectLibrary;
@@ -277,6 +285,9 @@ class IPresetSaver : public IUnknown {
     // As above; 0 or 1. Stores the library's and the effect's name in the record; record->name is the host's.
     virtual std::int32_t VM_CALL SavePreset(void* owner, IEffectLibrary* library, std::uint32_t effectIndex,
                                             PresetRecord* record, const char* languageCode) = 0;
+
+  protected:
+    ~IPresetSaver() = default;
 };
 
 // Translated texts. Reached through QueryInterface of the library, when a language file was loaded; shares
@@ -293,6 +304,9 @@ class IMultiLingual : public IUnknown {
     // cut and terminated. Returns the characters written, 0 when there is no such text.
     virtual std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
                                          char16_t* buffer, std::int32_t capacity) = 0;
+
+  protected:
+    ~IMultiLingual() = default;
 };
 
 // The process-wide settings, options dialog and help. Not reference-counted; valid while the library is
@@ -311,6 +325,9 @@ class IShellServices {
     // Opens the help at a numbered topic, in the system's viewer when `externalViewer` is non-zero, else
     // inside the process. Non-zero when it was started.
     virtual std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic, std::int32_t externalViewer) = 0;
+
+  protected:
+    ~IShellServices() = default;
 };
 
 class IEffectLibrary : public IUnknown {
@@ -328,11 +345,10 @@ class IEffectLibrary : public IUnknown {
     virtual IFrameProcessor* VM_CALL CreateFrameProcessor() = 0;
     // A new object with one reference, or null when memory is short.
     virtual IPresetSaver* VM_CALL CreatePresetSaver() = 0;
-};
 
-#if defined(__GNUC__)
-#pragma GCC diagnostic pop
-#endif
+  protected:
+    ~IEffectLibrary() = default;
+};
 
 // ---------------------------------------------------------------------------------------------------------
 // Exports of VMReelEffects.dll, undecorated names.
