@@ -33,7 +33,9 @@ struct ParamRow {
     float maximum;
     ValueWord defaultValue;  // stored form: normalised number, colour word, item index, flag
     Layout layout;
-    bool isGroupEnd;         // group markers only
+    bool isGroupEnd;                     // group markers only
+    std::span<const char* const> items;  // menus only
+    std::uint32_t groupWord;             // group markers only: fills their cells in every preset
 };
 
 // How a setting of the renderer is answered: from one of the effect's own parameters or by a fixed value in

@@ -1,0 +1,193 @@
+// The words in which the effects' tables are written, and what turns them into the stored form: presets and
+// defaults are written as shown to the user, settings are matched to parameters by name. All of it runs
+// while compiling, and a slip in a table (a missing column, a value out of range, an unknown name) does not
+// compile.
+#pragma once
+
+#include <array>
+#include <bit>
+#include <cstddef>
+#include <cstdint>
+#include <span>
+#include <string_view>
+
+#include "effects/effect_table.h"
+
+namespace velmora::effects::tables {
+
+// Values of check boxes and of the "Pattern" menu, in defaults and presets.
+enum Flag : std::uint32_t { kOff = 0, kOn = 1 };
+enum Pattern : std::uint32_t { kWavy, kBlotchy, kGrainy, kFine, kSplotchy, kLite, kCrackly };
+
+// ---------------------------------------------------------------------------------------------------------
+// Parameters
+
+consteval ValueWord StoredSlider(double shown, double minimum, double maximum) {
+    if (shown < minimum || shown > maximum) throw "a slider's value lies outside its range";
+    const double normalised = (shown - minimum) / (maximum - minimum);
+    return {.bits = std::bit_cast<std::uint32_t>(static_cast<float>(normalised))};
+}
+
+consteval ParamRow Slider(const char* name, float minimum, float maximum, double shownDefault,
+                          Layout layout) {
+    return {name,   kKindSlider, minimum, maximum, StoredSlider(shownDefault, minimum, maximum),
+            layout, false,       {},      0};
+}
+
+consteval ParamRow Colour(const char* name, std::uint32_t word, Layout layout) {
+    return {name, kKindColour, 0.0f, 0.0f, {.bits = word}, layout, false, {}, 0};
+}
+
+consteval ParamRow CheckBox(const char* name, Flag flag, Layout layout) {
+    return {name, kKindCheckBox, 0.0f, 0.0f, {.bits = flag}, layout, false, {}, 0};
+}
+
+consteval ParamRow Menu(const char* name, std::span<const char* const> items, std::uint32_t item,
+                        Layout layout) {
+    if (items.size() > kMenuItemCapacity || item >= items.size()) throw "a menu's items or default are wrong";
+    return {name, kKindMenu, 0.0f, 0.0f, {.bits = item}, layout, false, items, 0};
+}
+
+// `presetWord` stands in the marker's cell of every preset. It means nothing and is kept as hosts know it.
+consteval ParamRow GroupBegin(const char* name, std::uint32_t presetWord, Layout layout) {
+    return {name, kKindGroup, 0.0f, 0.0f, {.bits = 0}, layout, false, {}, presetWord};
+}
+
+consteval ParamRow GroupEnd(const char* name, std::uint32_t presetWord, Layout layout) {
+    return {name, kKindGroup, 0.0f, 0.0f, {.bits = 0}, layout, true, {}, presetWord};
+}
+
+// ---------------------------------------------------------------------------------------------------------
+// Presets: one shown value for each parameter that holds one, in the parameters' order. A colour is its word
+// 0x00BBGGRR, a menu its item, a check box kOff or kOn. Doubles hold all of them exactly.
+
+template <std::size_t kValues>
+struct PresetRow {
+    const char* name;
+    std::array<double, kValues> shown;
+};
+
+template <class... Value>
+consteval PresetRow<sizeof...(Value)> Preset(const char* name, Value... shown) {
+    return {name, {static_cast<double>(shown)...}};
+}
+
+consteval std::uint32_t StoredWord(double shown, double limit) {
+    if (shown < 0.0 || shown >= limit) throw "a preset's value lies outside its range";
+    const auto word = static_cast<std::uint32_t>(shown);
+    if (static_cast<double>(word) != shown) throw "a preset's value is not a whole number";
+    return word;
+}
+
+consteval ValueWord Stored(const ParamRow& param, double shown) {
+    switch (param.kind) {
+        case kKindSlider:
+            return StoredSlider(shown, param.minimum, param.maximum);
+        case kKindColour:
+            return {.bits = StoredWord(shown, 4294967296.0)};
+        case kKindMenu:
+            return {.bits = StoredWord(shown, static_cast<double>(param.items.size()))};
+        case kKindCheckBox:
+            return {.bits = StoredWord(shown, 2.0)};
+        default:
+            throw "this parameter holds no value";
+    }
+}
+
+template <std::size_t kParams, std::size_t kPresets, std::size_t kValues>
+consteval std::array<PresetCell, kPresets * kParams> StorePresets(
+    const ParamRow (&params)[kParams], const PresetRow<kValues> (&presets)[kPresets]) {
+    std::array<PresetCell, kPresets * kParams> cells{};
+    std::size_t cell = 0;
+    for (const PresetRow<kValues>& preset : presets) {
+        std::size_t value = 0;
+        for (const ParamRow& param : params) {
+            cells[cell].value = param.kind == kKindGroup ? ValueWord{.bits = param.groupWord}
+                                                         : Stored(param, preset.shown.at(value++));
+            cells[cell++].second = 0;
+        }
+        if (value != kValues) throw "a preset has more values than there are parameters";
+    }
+    return cells;
+}
+
+// The presets' names. Hosts show them in this order, so it must be the alphabet's.
+template <std::size_t kPresets, std::size_t kValues>
+consteval std::array<const char*, kPresets> NamesOf(const PresetRow<kValues> (&presets)[kPresets]) {
+    std::array<const char*, kPresets> names{};
+    for (std::size_t i = 0; i < kPresets; ++i) {
+        names[i] = presets[i].name;
+        if (i > 0 && std::string_view(names[i - 1]) >= names[i]) throw "the presets are out of order";
+    }
+    return names;
+}
+
+// ---------------------------------------------------------------------------------------------------------
+// The setting map: one row for each setting of the renderer, in its order.
+
+struct AnswerRow {
+    Master master;
+    MasterAnswer::Source source;
+    const char* own;  // name of the own parameter
+    std::uint32_t word;
+    ParamKind kind;  // of a fixed value; kKindNone: as the setting's
+};
+
+consteval AnswerRow Own(Master master, const char* name) {
+    return {master, MasterAnswer::Source::kOwn, name, 0, kKindNone};
+}
+consteval AnswerRow DepthOf(Master master, const char* name) {
+    return {master, MasterAnswer::Source::kDepthOf, name, 0, kKindNone};
+}
+consteval AnswerRow Fixed(Master master, double normalised) {
+    return {master, MasterAnswer::Source::kWord, nullptr, StoredSlider(normalised, 0.0, 1.0).bits,
+            kKindSlider};
+}
+consteval AnswerRow FixedColour(Master master, std::uint32_t word) {
+    return {master, MasterAnswer::Source::kWord, nullptr, word, kKindColour};
+}
+consteval AnswerRow FixedItem(Master master, Pattern item) {
+    return {master, MasterAnswer::Source::kWord, nullptr, item, kKindMenu};
+}
+consteval AnswerRow Fixed(Master master, Flag flag) {
+    return {master, MasterAnswer::Source::kFlag, nullptr, flag, kKindCheckBox};
+}
+
+consteval ParamKind KindOf(Master master) {
+    switch (master) {
+        case Master::kBorder:
+        case Master::kTintColour:
+            return kKindColour;
+        case Master::kPattern:
+            return kKindMenu;
+        case Master::kBlueChannelOnly:
+        case Master::kBlack:
+        case Master::kWhite:
+        case Master::kThick:
+            return kKindCheckBox;
+        default:
+            return kKindSlider;
+    }
+}
+
+// Name and kind together find the parameter: a colour and its amount may share a name.
+consteval std::uint32_t OwnIndex(std::span<const ParamRow> params, const AnswerRow& row) {
+    for (std::uint32_t i = 0; i < params.size(); ++i) {
+        if (params[i].kind == KindOf(row.master) && std::string_view(params[i].name) == row.own) return i;
+    }
+    throw "a setting names a parameter that the effect does not have";
+}
+
+consteval std::array<MasterAnswer, kMasterCount> MapSettings(std::span<const ParamRow> params,
+                                                             const AnswerRow (&rows)[kMasterCount]) {
+    std::array<MasterAnswer, kMasterCount> answers{};
+    for (std::uint32_t i = 0; i < kMasterCount; ++i) {
+        const AnswerRow& row = rows[i];
+        if (row.master != Master{i}) throw "the settings are out of order";
+        if (row.own == nullptr && row.kind != KindOf(row.master)) throw "a fixed value is of another kind";
+        answers[i] = {row.source, row.own == nullptr ? 0 : OwnIndex(params, row), {.bits = row.word}};
+    }
+    return answers;
+}
+
+}  // namespace velmora::effects::tables
