@@ -1,0 +1,100 @@
+#include "effects/effect_queries.h"
+
+#include "plugin/params.h"
+#include "render/rounding.h"
+
+namespace velmora::effects {
+namespace {
+
+void DescribeSlider(const ParamRow& param, bool marked, ParamDescriptor& descriptor) noexcept {
+    descriptor.defaultValue = param.defaultValue;
+    descriptor.minimum.number = param.minimum;
+    descriptor.slider.maximum.number = param.maximum;
+    if (marked) descriptor.slider.afterMaximum = 1;
+}
+
+void DescribeMenu(const ParamRow& param, ParamDescriptor& descriptor) noexcept {
+    descriptor.defaultValue = param.defaultValue;
+    descriptor.minimum.count = static_cast<std::uint32_t>(param.items.size());
+    char(*text)[kMenuTextWidth] = descriptor.itemTexts;
+    for (const char* item : param.items) CopyBounded(*text++, kMenuTextWidth, item);
+}
+
+// The fewer scratches, the faster the depth rises with them: the little slider of a simple effect goes from
+// a few faint scratches to many deep ones. The range of the amount is the host's promise, not ours.
+float DepthOfAmount(float amount) noexcept {
+    const float rest = render::Narrow(1.0 - SanitizeNormalised(amount));
+    return render::Narrow(1.0 - double{rest} * rest);
+}
+
+}  // namespace
+
+bool DescribeParam(const EffectTable& effect, std::uint32_t index, ParamDescriptor* descriptor) noexcept {
+    if (index >= effect.params.size() || descriptor == nullptr) return false;
+    const ParamRow& param = effect.params[index];
+    switch (param.kind) {
+        case kKindSlider:
+            DescribeSlider(param, effect.marksSliders, *descriptor);
+            break;
+        case kKindMenu:
+            DescribeMenu(param, *descriptor);
+            break;
+        case kKindColour:
+            descriptor->defaultValue = param.defaultValue;
+            break;
+        case kKindCheckBox:
+            descriptor->defaultValue.flag = param.defaultValue.flag;
+            break;
+        case kKindGroup:
+            descriptor->minimum.flag = param.isGroupEnd ? 1 : 0;
+            break;
+        case kKindNone:
+            break;
+    }
+    descriptor->kind = param.kind;
+    CopyBounded(descriptor->name, kParamNameWidth, param.name);
+    descriptor->x = param.layout.x;
+    descriptor->y = param.layout.y;
+    descriptor->width = param.layout.width;
+    descriptor->height = param.layout.height;
+    descriptor->visible = 1;
+    return true;
+}
+
+const char* PresetName(const EffectTable& effect, std::uint32_t preset) noexcept {
+    return preset < effect.presetNames.size() ? effect.presetNames[preset] : nullptr;
+}
+
+bool CopyPresetValue(const EffectTable& effect, std::uint32_t preset, std::uint32_t parameter,
+                     PresetCell* cell) noexcept {
+    const std::size_t paramCount = effect.params.size();
+    if (cell == nullptr || preset >= effect.presetNames.size() || parameter >= paramCount) return false;
+    *cell = effect.presetCells[preset * paramCount + parameter];
+    return true;
+}
+
+bool AnswerMaster(const EffectTable& effect, IVideoHost* host, std::uint32_t index, ValueCell* cell,
+                  std::uint32_t kind) {
+    if (host == nullptr || cell == nullptr) return false;
+    cell->kind = kind;
+    if (index >= kMasterCount) return false;
+    const MasterAnswer& answer = effect.answers[index];
+    switch (answer.source) {
+        case MasterAnswer::Source::kOwn:
+            return host->GetParamValue(answer.own, cell, kind);
+        case MasterAnswer::Source::kWord:
+            cell->value = answer.fixed;
+            return true;
+        case MasterAnswer::Source::kFlag:
+            cell->value.flag = answer.fixed.flag;
+            return true;
+        case MasterAnswer::Source::kDepthOf:
+            // Whether or not the host answers: the depth follows from what the cell then holds.
+            host->GetParamValue(answer.own, cell, kind);
+            cell->value.number = DepthOfAmount(cell->value.number);
+            return true;
+    }
+    return false;
+}
+
+}  // namespace velmora::effects

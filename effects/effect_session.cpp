@@ -1,0 +1,114 @@
+#include "effects/effect_session.h"
+
+#include <new>
+#include <span>
+
+#include "effects/effect_queries.h"
+#include "plugin/float_guard.h"
+#include "plugin/render_session.h"
+#include "render/renderer.h"
+#include "render/rounding.h"
+
+namespace velmora::effects {
+namespace {
+
+// A host that lives on the stack for one frame: it is not counted and answers nothing but values.
+class LocalHost : public IVideoHost {
+  public:
+    Status VM_CALL QueryInterface(const Guid*, void** out) final {
+        if (out == nullptr) return kStatusFailure;
+        *out = nullptr;
+        return kStatusNoInterface;
+    }
+    std::uint32_t VM_CALL AddRef() final { return 1; }
+    std::uint32_t VM_CALL Release() final { return 1; }
+    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) final { return false; }
+    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) final { return 0; }
+    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) final { return false; }
+    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) final {}
+
+  protected:
+    ~LocalHost() = default;
+};
+
+// Serves the values of the effect's own parameters.
+class OwnValues final : public LocalHost {
+  public:
+    explicit OwnValues(std::span<const ValueWord> values) noexcept : m_values(values) {}
+    bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override {
+        if (index >= m_values.size()) return false;
+        *cell = {m_values[index], 0, kind};
+        return true;
+    }
+
+  private:
+    std::span<const ValueWord> m_values;
+};
+
+// Serves the master settings: what an effect object's host face is to the renderer.
+class MasterFace final : public LocalHost {
+  public:
+    MasterFace(const EffectTable& effect, std::span<const ValueWord> values) noexcept
+        : m_effect(effect), m_own(values) {}
+    bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override {
+        return AnswerMaster(m_effect, &m_own, index, cell, kind);
+    }
+
+  private:
+    const EffectTable& m_effect;
+    OwnValues m_own;
+};
+
+}  // namespace
+
+std::unique_ptr<EffectSession> EffectSession::Create(const EffectTable& effect) noexcept {
+    std::unique_ptr<EffectSession> session(new (std::nothrow) EffectSession(effect));
+    if (session == nullptr || !session->m_settings.Fill()) return nullptr;
+    session->m_settings.ExposeAll();
+    return session;
+}
+
+EffectSession::EffectSession(const EffectTable& effect) noexcept : m_effect(effect) {
+    for (std::size_t i = 0; i < effect.params.size(); ++i) m_values[i] = effect.params[i].defaultValue;
+}
+
+void EffectSession::SetValue(std::uint32_t parameter, ValueWord value) noexcept {
+    if (parameter < m_effect.params.size()) m_values[parameter] = value;
+}
+
+ValueWord EffectSession::Value(std::uint32_t parameter) const noexcept {
+    return parameter < m_effect.params.size() ? m_values[parameter] : ValueWord{.bits = 0};
+}
+
+void EffectSession::ApplyPreset(std::uint32_t preset) noexcept {
+    PresetCell cell;
+    for (std::uint32_t i = 0; CopyPresetValue(m_effect, preset, i, &cell); ++i) m_values[i] = cell.value;
+}
+
+void EffectSession::PinRandom(std::uint32_t seed) noexcept {
+    m_isPinned = true;
+    m_seed = seed;
+}
+
+void EffectSession::StartRandom(std::uint32_t state) noexcept {
+    m_isPinned = false;
+    m_state.random.Seed(state);
+}
+
+std::uint32_t EffectSession::DrawsPerFrame(std::int32_t width) noexcept {
+    const FloatGuard guard;
+    MasterFace face(m_effect, m_values);
+    m_settings.ReadFromHost(face);
+    return render::DrawsPerFrame(ReadStageSettings(m_settings), width);
+}
+
+bool EffectSession::Render(const FrameRecord& source, const FrameRecord& destination,
+                           double seconds) noexcept {
+    const FloatGuard guard;
+    if (m_isPinned) m_state.random.Pin(m_seed, render::TruncateTolerant(seconds * render::kFramesPerSecond));
+    MasterFace face(m_effect, m_values);
+    const TimingRecord timing = {0.0, 0.0, seconds};
+    return RenderFrame({&m_settings, &m_state}, face, &source, &destination, &timing);
+}
+
+}  // namespace velmora::effects

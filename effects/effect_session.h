@@ -1,0 +1,59 @@
+// An effect for hosts that link the core instead of loading the library: its own settings and its own state
+// of the renderer, nothing process-wide. One session per thread; sessions do not know of each other.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <memory>
+
+#include "effects/effect_table.h"
+#include "plugin/host_api.h"
+#include "plugin/master_settings.h"
+#include "render/render_state.h"
+
+namespace velmora::effects {
+
+class EffectSession {
+  public:
+    // A session with the parameters' defaults and with randomness pinned by seed 0. Null when memory is
+    // short.
+    [[nodiscard]] static std::unique_ptr<EffectSession> Create(const EffectTable& effect) noexcept;
+
+    [[nodiscard]] const EffectTable& Effect() const noexcept { return m_effect; }
+
+    // In stored form: a slider normalised to 0..1, a colour 0x00BBGGRR, an item index, a flag. Sliders are
+    // clamped and menu items outside the menu ignored when a frame reads them. Past the last parameter
+    // nothing is set.
+    void SetValue(std::uint32_t parameter, ValueWord value) noexcept;
+    // Past the last parameter: 0.
+    [[nodiscard]] ValueWord Value(std::uint32_t parameter) const noexcept;
+    // Sets all parameters as the built-in preset has them. Past the last preset nothing is set.
+    void ApplyPreset(std::uint32_t preset) noexcept;
+
+    // From now on every frame's randomness follows from the seed and the frame number alone: frames may be
+    // rendered in any order, by any session.
+    void PinRandom(std::uint32_t seed) noexcept;
+    // From now on the randomness is a running sequence from `state`, as in the library: a frame goes on
+    // where the frame before left off, and a frame rendered twice in a row repeats itself.
+    void StartRandom(std::uint32_t state) noexcept;
+    // How many random numbers a frame of this processed width takes with the present values. With it a host
+    // finds the state that a later frame of a sequence starts from.
+    [[nodiscard]] std::uint32_t DrawsPerFrame(std::int32_t width) noexcept;
+
+    // Renders the frame at a clip time: the frame number is seconds * 30, truncated. False, with nothing
+    // written, when a frame record is invalid.
+    [[nodiscard]] bool Render(const FrameRecord& source, const FrameRecord& destination,
+                              double seconds) noexcept;
+
+  private:
+    explicit EffectSession(const EffectTable& effect) noexcept;
+
+    const EffectTable& m_effect;
+    std::array<ValueWord, kPresetCellCapacity> m_values{};  // by parameter
+    MasterSettingsList m_settings;
+    render::RenderState m_state;
+    bool m_isPinned = true;
+    std::uint32_t m_seed = 0;
+};
+
+}  // namespace velmora::effects
