@@ -107,7 +107,9 @@ Status VM_CALL FrameProcessor::QueryInterface(const Guid* iid, void** out) {
     return status;
 }
 
-std::uint32_t VM_CALL FrameProcessor::AddRef() { return m_references.Add(); }
+std::uint32_t VM_CALL FrameProcessor::AddRef() {
+    return m_references.Add();
+}
 
 std::uint32_t VM_CALL FrameProcessor::Release() {
     const std::uint32_t left = m_references.Drop();
@@ -115,9 +117,15 @@ std::uint32_t VM_CALL FrameProcessor::Release() {
     return left;
 }
 
-bool VM_CALL FrameProcessor::Reserved3(const FrameRecord*, const FrameRecord*, std::uint8_t) { return false; }
-bool VM_CALL FrameProcessor::Reserved4(const FrameRecord*, const FrameRecord*, std::uint8_t) { return false; }
-bool VM_CALL FrameProcessor::Reserved5(const FrameRecord*, const FrameRecord*, std::uint8_t) { return false; }
+bool VM_CALL FrameProcessor::Reserved3(const FrameRecord*, const FrameRecord*, std::uint8_t) {
+    return false;
+}
+bool VM_CALL FrameProcessor::Reserved4(const FrameRecord*, const FrameRecord*, std::uint8_t) {
+    return false;
+}
+bool VM_CALL FrameProcessor::Reserved5(const FrameRecord*, const FrameRecord*, std::uint8_t) {
+    return false;
+}
 
 bool VM_CALL FrameProcessor::ConvertYcbcrToBgra(const FrameRecord* source, const FrameRecord* destination,
                                                 std::uint8_t alpha) {

@@ -63,11 +63,11 @@ inline constexpr Guid kIidPresetSaver = {
 
 // One 32-bit word that holds a value in the form of its kind.
 union ValueWord {
-    float number;           // slider: normalised to 0..1
-    std::uint32_t colour;   // colour: 0x00BBGGRR, red in the lowest byte
-    std::uint32_t count;    // menu: number of items
-    std::int32_t item;      // menu: item index, from 0
-    std::uint8_t flag;      // check box: 0 or 1; group marker: 0 begin, 1 end. The other bytes do not count
+    float number;          // slider: normalised to 0..1
+    std::uint32_t colour;  // colour: 0x00BBGGRR, red in the lowest byte
+    std::uint32_t count;   // menu: number of items
+    std::int32_t item;     // menu: item index, from 0
+    std::uint8_t flag;     // check box: 0 or 1; group marker: 0 begin, 1 end. The other bytes do not count
     std::uint32_t bits;
 };
 static_assert(sizeof(ValueWord) == 4);
@@ -140,13 +140,13 @@ static_assert(offsetof(PresetCell, second) == 4);
 // width x height pixels with its left top corner at (xOrigin, yOrigin) of the buffer; the buffer is
 // xOrigin + width pixels wide and yOrigin + height rows high.
 struct FrameRecord {
-    void* pixels;             // first byte of the first stored row
-    std::int32_t width;       // of the region, in pixels, at least 1
-    std::int32_t height;      // of the region, in rows, at least 1
-    std::int32_t rowStep;     // bytes from one row to the next; negative: the buffer is stored bottom-up
-    std::uint32_t reserved;   // not read
-    std::int32_t xOrigin;     // at least 0
-    std::int32_t yOrigin;     // at least 0
+    void* pixels;            // first byte of the first stored row
+    std::int32_t width;      // of the region, in pixels, at least 1
+    std::int32_t height;     // of the region, in rows, at least 1
+    std::int32_t rowStep;    // bytes from one row to the next; negative: the buffer is stored bottom-up
+    std::uint32_t reserved;  // not read
+    std::int32_t xOrigin;    // at least 0
+    std::int32_t yOrigin;    // at least 0
 };
 #if defined(_WIN32) && (defined(__i386__) || defined(_M_IX86))
 static_assert(sizeof(FrameRecord) == 28);

@@ -13,8 +13,12 @@ support::ModuleHandle g_module = nullptr;
 
 }  // namespace
 
-support::ModuleHandle ModuleHandle() noexcept { return g_module; }
-void SetModuleHandle(support::ModuleHandle module) noexcept { g_module = module; }
+support::ModuleHandle ModuleHandle() noexcept {
+    return g_module;
+}
+void SetModuleHandle(support::ModuleHandle module) noexcept {
+    g_module = module;
+}
 
 }  // namespace velmora
 
@@ -25,4 +29,6 @@ velmora::IEffectLibrary* VM_CALL GetEffectsLibrary() {
     return new (std::nothrow) velmora::CRsVelmoraLib;
 }
 
-bool VM_CALL CanUnloadDLLNow() { return velmora::DLLDependentObject::LiveObjectCount() == 0; }
+bool VM_CALL CanUnloadDLLNow() {
+    return velmora::DLLDependentObject::LiveObjectCount() == 0;
+}

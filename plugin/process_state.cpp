@@ -25,12 +25,22 @@ struct SeededState : render::RenderState {
 
 }  // namespace
 
-DLLDependentObject::DLLDependentObject() noexcept { g_liveObjects.fetch_add(1); }
-DLLDependentObject::~DLLDependentObject() { g_liveObjects.fetch_sub(1); }
-std::int32_t DLLDependentObject::LiveObjectCount() noexcept { return g_liveObjects.load(); }
+DLLDependentObject::DLLDependentObject() noexcept {
+    g_liveObjects.fetch_add(1);
+}
+DLLDependentObject::~DLLDependentObject() {
+    g_liveObjects.fetch_sub(1);
+}
+std::int32_t DLLDependentObject::LiveObjectCount() noexcept {
+    return g_liveObjects.load();
+}
 
-void SetBuildMode(std::int32_t mode) noexcept { g_buildMode = mode; }
-std::int32_t BuildMode() noexcept { return g_buildMode; }
+void SetBuildMode(std::int32_t mode) noexcept {
+    g_buildMode = mode;
+}
+std::int32_t BuildMode() noexcept {
+    return g_buildMode;
+}
 
 bool RenewMasterSettings() noexcept {
     std::unique_ptr<KeptList> fresh(new (std::nothrow) KeptList);
@@ -44,6 +54,8 @@ MasterSettingsList* CurrentMasterSettings() noexcept {
     return g_currentList == nullptr ? nullptr : &g_currentList->list;
 }
 
-RenderSession ProcessSession() noexcept { return {CurrentMasterSettings(), &g_state}; }
+RenderSession ProcessSession() noexcept {
+    return {CurrentMasterSettings(), &g_state};
+}
 
 }  // namespace velmora

@@ -31,7 +31,8 @@ bool IsTicked(const MasterSettingsList& list, std::uint32_t id) noexcept {
 void ReadTint(const MasterSettingsList& list, StageSettings& settings) noexcept {
     std::uint32_t colour = 0;
     float amount = 0.0f;
-    if (list.Find(502, kClassColourPicker) == nullptr || list.Find(503, kClassPercentSlider) == nullptr) return;
+    if (list.Find(502, kClassColourPicker) == nullptr || list.Find(503, kClassPercentSlider) == nullptr)
+        return;
     list.GetColour(502, colour);
     list.GetPercentNormalised(503, amount);
     const double strength = 4.0 * amount - 3.0;

@@ -14,7 +14,9 @@ Status VM_CALL CRsVelmoraEffect::QueryInterface(const Guid* iid, void** out) {
     return status;
 }
 
-std::uint32_t VM_CALL CRsVelmoraEffect::AddRef() { return m_references.Add(); }
+std::uint32_t VM_CALL CRsVelmoraEffect::AddRef() {
+    return m_references.Add();
+}
 
 std::uint32_t VM_CALL CRsVelmoraEffect::Release() {
     const std::uint32_t left = m_references.Drop();
@@ -22,8 +24,12 @@ std::uint32_t VM_CALL CRsVelmoraEffect::Release() {
     return left;
 }
 
-const char* VM_CALL CRsVelmoraEffect::GetName() { return "Reel Effects"; }
-std::int32_t VM_CALL CRsVelmoraEffect::GetKind() { return 1; }
+const char* VM_CALL CRsVelmoraEffect::GetName() {
+    return "Reel Effects";
+}
+std::int32_t VM_CALL CRsVelmoraEffect::GetKind() {
+    return 1;
+}
 
 bool VM_CALL CRsVelmoraEffect::GetParamInfo(std::uint32_t index, ParamDescriptor* descriptor) {
     const FloatGuard guard;
@@ -39,7 +45,11 @@ bool VM_CALL CRsVelmoraEffect::Process(IVideoHost* host, const FrameRecord* sour
     return RenderFrame(session, *host, source, destination, timing);
 }
 
-const char* VM_CALL CRsVelmoraEffect::GetPresetName(std::uint32_t) { return nullptr; }
-bool VM_CALL CRsVelmoraEffect::GetPresetValue(std::uint32_t, std::uint32_t, PresetCell*) { return false; }
+const char* VM_CALL CRsVelmoraEffect::GetPresetName(std::uint32_t) {
+    return nullptr;
+}
+bool VM_CALL CRsVelmoraEffect::GetPresetValue(std::uint32_t, std::uint32_t, PresetCell*) {
+    return false;
+}
 
 }  // namespace velmora

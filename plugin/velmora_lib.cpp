@@ -73,8 +73,8 @@ bool CRsVelmoraLib::LoadLanguage(const char16_t* moduleName, const char16_t* fil
     }
     m_languageModule = LoadBesideOrByName(moduleName);
     if (m_languageModule == nullptr) return false;
-    const auto getParser = reinterpret_cast<GetLangXMLParserFunction>(
-        support::FindExport(m_languageModule, "GetLangXMLParser"));
+    const auto getParser =
+        reinterpret_cast<GetLangXMLParserFunction>(support::FindExport(m_languageModule, "GetLangXMLParser"));
     if (getParser == nullptr) return false;
     m_parser = getParser();
     if (m_parser == nullptr) return false;
@@ -95,7 +95,9 @@ Status VM_CALL CRsVelmoraLib::QueryInterface(const Guid* iid, void** out) {
     return status;
 }
 
-std::uint32_t VM_CALL CRsVelmoraLib::AddRef() { return m_references.Add(); }
+std::uint32_t VM_CALL CRsVelmoraLib::AddRef() {
+    return m_references.Add();
+}
 
 std::uint32_t VM_CALL CRsVelmoraLib::Release() {
     const FloatGuard guard;
@@ -104,7 +106,9 @@ std::uint32_t VM_CALL CRsVelmoraLib::Release() {
     return left;
 }
 
-const char* VM_CALL CRsVelmoraLib::GetLibraryName() { return kLibraryName; }
+const char* VM_CALL CRsVelmoraLib::GetLibraryName() {
+    return kLibraryName;
+}
 
 IVideoEffect* VM_CALL CRsVelmoraLib::CreateEffect(std::uint32_t index) {
     return effects::CreateEffectByIndex(index);
@@ -115,15 +119,22 @@ std::int32_t VM_CALL CRsVelmoraLib::ShowHelp(void* owner, std::int32_t topic) {
     return GetShellServices()->ShowHelp(owner, topic, kInViewer);
 }
 
-IShellServices* VM_CALL CRsVelmoraLib::GetShellServices() { return &support::ShellServices(); }
+IShellServices* VM_CALL CRsVelmoraLib::GetShellServices() {
+    return &support::ShellServices();
+}
 
-IFrameProcessor* VM_CALL CRsVelmoraLib::CreateFrameProcessor() { return new (std::nothrow) FrameProcessor; }
+IFrameProcessor* VM_CALL CRsVelmoraLib::CreateFrameProcessor() {
+    return new (std::nothrow) FrameProcessor;
+}
 
-IPresetSaver* VM_CALL CRsVelmoraLib::CreatePresetSaver() { return presets::CreatePresetSaver(); }
+IPresetSaver* VM_CALL CRsVelmoraLib::CreatePresetSaver() {
+    return presets::CreatePresetSaver();
+}
 
 std::int32_t VM_CALL CRsVelmoraLib::LookUpText(std::intptr_t languageCode, std::intptr_t category,
-                                               std::intptr_t key, std::intptr_t fallback, std::intptr_t buffer,
-                                               std::intptr_t capacity, std::intptr_t found) {
+                                               std::intptr_t key, std::intptr_t fallback,
+                                               std::intptr_t buffer, std::intptr_t capacity,
+                                               std::intptr_t found) {
     if (!m_hasLanguage || m_parser == nullptr) return 0;
     return m_parser->LookUpText(languageCode, category, key, fallback, buffer, capacity, found);
 }

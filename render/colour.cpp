@@ -23,7 +23,7 @@ double ContrastGain(float contrast) noexcept {
         float below;
         double factor;
     };
-    constexpr Step kSteps[] = {{0.6f, 10}, {0.7f, 12}, {0.75f, 15}, {0.8f, 19},
+    constexpr Step kSteps[] = {{0.6f, 10},  {0.7f, 12}, {0.75f, 15}, {0.8f, 19},
                                {0.85f, 24}, {0.9f, 30}, {0.95f, 40}};
     const auto step = std::find_if(std::begin(kSteps), std::end(kSteps),
                                    [contrast](const Step& s) { return contrast < s.below; });
@@ -64,8 +64,9 @@ ByteTable ContrastTable(float contrast) noexcept {
     ByteTable table;
     for (std::int32_t i = 0; i < 256; ++i) {
         const float x = Narrow(((i / 255.0 - 0.5) * gain + 0.5) * 255.0);
-        table[static_cast<std::size_t>(i)] =
-            static_cast<std::uint8_t>(x > 255.0f ? 255 : x < 0.0f ? 0 : Truncate(x));
+        table[static_cast<std::size_t>(i)] = static_cast<std::uint8_t>(x > 255.0f ? 255
+                                                                       : x < 0.0f ? 0
+                                                                                  : Truncate(x));
     }
     return table;
 }
@@ -75,8 +76,8 @@ ColourStage PrepareColour(const StageSettings& settings, double seconds, Contras
     const float contrast = 0.5f * settings.contrast;
     ColourStage stage;
     stage.m_mixes = !IsNearZero(settings.saturation);
-    stage.m_active = stage.m_mixes || !IsNearZero(settings.flicker) || !IsNearZero(brightness) ||
-                     !IsNearZero(contrast);
+    stage.m_active =
+        stage.m_mixes || !IsNearZero(settings.flicker) || !IsNearZero(brightness) || !IsNearZero(contrast);
     if (!stage.m_active) return stage;
 
     float offset = 0.0f;

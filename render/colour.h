@@ -25,7 +25,8 @@ using ByteTable = std::array<std::uint8_t, 256>;
 // The flicker's share of the brightness offset at a time: a value that changes `rate` times a second, the
 // k-th of a sequence that the settings alone seed, so that it is the same on every run. Costs the same at any
 // time. Within +-0.5; single precision.
-[[nodiscard]] float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds) noexcept;
+[[nodiscard]] float FlickerOffset(float saturation, float flicker, std::uint32_t rate,
+                                  double seconds) noexcept;
 
 [[nodiscard]] ByteTable BrightnessTable(float offset) noexcept;
 // `contrast` is half of the setting.

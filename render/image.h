@@ -77,6 +77,7 @@ struct ImageView {
 
 // A view of a frame whose processed rectangle is width x height pixels. A description whose numbers overflow
 // or that has no pixels gives a view that is not valid.
-[[nodiscard]] ImageView ViewOf(const FrameDescription& frame, std::int32_t width, std::int32_t height) noexcept;
+[[nodiscard]] ImageView ViewOf(const FrameDescription& frame, std::int32_t width,
+                               std::int32_t height) noexcept;
 
 }  // namespace velmora::render

@@ -54,8 +54,7 @@ bool NeedsOwnSource(const FrameContext& context, const FramePlan& plan) noexcept
     if (!context.FramesOverlap()) return false;
     const ImageView& source = context.Source();
     const ImageView& destination = context.Destination();
-    const bool sameRows =
-        source.Row(0) == destination.Row(0) && source.rowStep == destination.rowStep;
+    const bool sameRows = source.Row(0) == destination.Row(0) && source.rowStep == destination.rowStep;
     return plan.jitter.IsActive() || !sameRows;
 }
 

@@ -8,7 +8,9 @@
 namespace velmora::render {
 
 // Narrows to single precision at the points where the renderer's arithmetic is defined to do so.
-constexpr float Narrow(double value) noexcept { return static_cast<float>(value); }
+constexpr float Narrow(double value) noexcept {
+    return static_cast<float>(value);
+}
 
 // Toward zero. NaN gives 0; values beyond the 32-bit range give its ends.
 constexpr std::int32_t Truncate(double value) noexcept {

@@ -1,4 +1,4 @@
 #pragma once
 namespace velmora::render {
 class ScratchMemory {};
-}
+}  // namespace velmora::render

@@ -18,26 +18,26 @@ struct StageSettings {
 
     float glow = 0.0f;  // 0..1
 
-    float saturation = 0.0f;       // -1 grey .. 0 unchanged .. 1
-    float flicker = 0.0f;          // 0..1
+    float saturation = 0.0f;        // -1 grey .. 0 unchanged .. 1
+    float flicker = 0.0f;           // 0..1
     std::uint32_t flickerRate = 0;  // changes per second, 0..30
-    float brightness = 0.0f;       // -1..1
-    float contrast = 0.0f;         // -1..1
+    float brightness = 0.0f;        // -1..1
+    float contrast = 0.0f;          // -1..1
 
     float filmGamma = 0.0f;  // 0..1
     float tintRed = 0.5f;    // 0..1, 0.5: no tint
     float tintGreen = 0.5f;
     float tintBlue = 0.5f;
 
-    float wear = 0.0f;                 // 0..1
-    std::int32_t wearPattern = 2000;   // menu value of the picture, 2000..2006
+    float wear = 0.0f;                // 0..1
+    std::int32_t wearPattern = 2000;  // menu value of the picture, 2000..2006
     std::int32_t wearChannels = kWearAllChannels;
 
-    std::uint32_t scratchKinds = 0;     // ScratchKinds together; 0: no scratches
-    std::uint32_t scratchCount = 0;     // 0..16
-    std::int32_t scratchConstant = 0;   // bounds range and speed of a scratch's sideways movement, pixels
-    float scratchDepth = 0.0f;          // 0..1
-    float scratchSeed = 0.0f;           // its bits seed the scratches' own generator
+    std::uint32_t scratchKinds = 0;    // ScratchKinds together; 0: no scratches
+    std::uint32_t scratchCount = 0;    // 0..16
+    std::int32_t scratchConstant = 0;  // bounds range and speed of a scratch's sideways movement, pixels
+    float scratchDepth = 0.0f;         // 0..1
+    float scratchSeed = 0.0f;          // its bits seed the scratches' own generator
 
     float spots = 0.0f;  // 0..100
 };

@@ -21,8 +21,7 @@ WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random&
     stage.m_starts = random;
     random.Skip(WearStripCount(settings, width));
     for (std::size_t byte = 0; byte < stage.m_fractions.size(); ++byte) {
-        stage.m_fractions[byte] =
-            Narrow(double{Narrow(static_cast<double>(byte) / 255.0)} * settings.wear);
+        stage.m_fractions[byte] = Narrow(double{Narrow(static_cast<double>(byte) / 255.0)} * settings.wear);
     }
     return stage;
 }

@@ -53,6 +53,7 @@ class WearStage {
 [[nodiscard]] std::uint32_t WearStripCount(const StageSettings& settings, std::int32_t width) noexcept;
 
 // Makes the frame's draws: one always, then one for each strip unless the wear is 0.
-[[nodiscard]] WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random& random) noexcept;
+[[nodiscard]] WearStage PrepareWear(const StageSettings& settings, std::int32_t width,
+                                    Random& random) noexcept;
 
 }  // namespace velmora::render

@@ -46,8 +46,8 @@ bool PackedImage::Reserve(std::int32_t width, std::int32_t height, std::int32_t 
     width = std::max(width, m_width);
     height = std::max(height, m_height);
     *this = {};  // the old image makes room before the new one is asked for
-    const std::uint64_t rowStep = std::uint64_t(static_cast<std::uint32_t>(width)) *
-                                  static_cast<std::uint32_t>(channels);
+    const std::uint64_t rowStep =
+        std::uint64_t(static_cast<std::uint32_t>(width)) * static_cast<std::uint32_t>(channels);
     constexpr std::uint64_t kMost = std::numeric_limits<std::ptrdiff_t>::max();
     if (rowStep > kMost / static_cast<std::uint32_t>(height)) return false;
     m_pixels.reset(new (std::nothrow) std::uint8_t[rowStep * static_cast<std::uint32_t>(height)]);
@@ -80,8 +80,8 @@ void RgbRowToYcbcr(const std::uint8_t* rgb, std::uint8_t* destination, std::int3
     }
     if (x < width) {
         destination[0] = Luma(rgb, kLeftBias);
-        destination[1] = static_cast<std::uint8_t>(
-            (-9699 * rgb[0] - 19071 * rgb[1] + 28770 * rgb[2] - 0x7F8000) >> 16);
+        destination[1] =
+            static_cast<std::uint8_t>((-9699 * rgb[0] - 19071 * rgb[1] + 28770 * rgb[2] - 0x7F8000) >> 16);
     }
 }
 

@@ -47,7 +47,9 @@ void FreeModule(ModuleHandle module) noexcept {
     if (module != nullptr) dlclose(module);
 }
 
-void* FindExport(ModuleHandle module, const char* name) noexcept { return dlsym(module, name); }
+void* FindExport(ModuleHandle module, const char* name) noexcept {
+    return dlsym(module, name);
+}
 
 // The native library is linked into its program, so every module's folder is the program's.
 std::u16string ModuleFolder(ModuleHandle) noexcept try {

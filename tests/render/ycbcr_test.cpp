@@ -1,0 +1,94 @@
+#include "render/ycbcr.h"
+
+#include <gtest/gtest.h>
+
+#include <vector>
+
+namespace velmora::render {
+namespace {
+
+using Bytes = std::vector<std::uint8_t>;
+
+Bytes Decode(const Bytes& row, std::int32_t width) {
+    Bytes rgb(static_cast<std::size_t>(width) * 3 + 1, 0xEE);
+    EXPECT_EQ(YcbcrToRgb(row.data(), 0, rgb.data(), 0, width, 1), ImagingStatus::kDone);
+    EXPECT_EQ(rgb.back(), 0xEE);
+    rgb.pop_back();
+    return rgb;
+}
+
+TEST(Ycbcr, DecodesBlackWhiteAndEveryTriple) {
+    for (const auto& [luma, level] : {std::pair{16, 0}, {235, 255}}) {
+        const auto y = static_cast<std::uint8_t>(luma);
+        for (const std::uint8_t channel : Decode({y, 128, y, 128}, 2)) EXPECT_NEAR(channel, level, 1);
+    }
+    for (std::int64_t y = 0; y < 256; y += 5) {
+        for (std::int64_t cb = 0; cb < 256; cb += 17) {
+            for (std::int64_t cr = 0; cr < 256; cr += 15) {
+                const auto channel = [](std::int64_t sum) {
+                    // Floor of a division by 65536, in whole numbers of either sign.
+                    const std::int64_t v = sum >= 0 ? sum / 65536 : -((-sum + 65535) / 65536);
+                    return static_cast<std::uint8_t>(v < 0 ? 0 : v > 255 ? 255 : v);
+                };
+                const std::int64_t luma = 76284 * y;
+                const Bytes expected = {channel(luma + 104595 * cr - 14608761),
+                                        channel(luma - 25690 * cb - 53281 * cr + 8887730),
+                                        channel(luma + 132186 * cb - 18140365)};
+                const auto byte = [](std::int64_t v) { return static_cast<std::uint8_t>(v); };
+                const Bytes rgb = Decode({byte(y), byte(cb), byte(255 - y), byte(cr)}, 2);
+                ASSERT_EQ(Bytes(rgb.begin(), rgb.begin() + 3), expected) << y << ' ' << cb << ' ' << cr;
+            }
+        }
+    }
+}
+
+TEST(Ycbcr, OddWidthsBorrowTheChromaOfTheGroupBefore) {
+    const Bytes row = {50, 100, 60, 200, 70, 110, 0xFF, 0xFF};
+    const Bytes rgb = Decode(row, 3);
+    EXPECT_EQ(Bytes(rgb.begin() + 6, rgb.end()), Bytes(Decode({70, 110, 0, 200}, 1)));
+    const Bytes alone = Decode({70, 110, 0, 90}, 1), pair = Decode({70, 110, 0, 90}, 2);
+    EXPECT_EQ(alone, Bytes(pair.begin(), pair.begin() + 3)) << "a width of 1 has its own group only";
+}
+
+TEST(Ycbcr, EncodesPairsAndALonePixel) {
+    const Bytes rgb = {255, 0, 0, 10, 200, 30, 1, 2, 3};
+    Bytes packed(8, 0xEE);
+    ASSERT_EQ(RgbToYcbcr(rgb.data(), 9, packed.data(), 8, 3, 1), ImagingStatus::kDone);
+    const auto shift = [](std::int64_t v, int bits) {
+        const std::int64_t unit = std::int64_t{1} << bits;
+        return static_cast<std::uint8_t>((v % unit + unit) % unit == 0 ? v / unit
+                                                                       : (v < 0 ? v / unit - 1 : v / unit));
+    };
+    const Bytes expected = {shift(16843 * 255 + 0x108000, 16),
+                            shift(-9699 * 265 - 19071 * 200 + 28770 * 30 - 0xFF0000, 17),
+                            shift(16843 * 10 + 33030 * 200 + 6423 * 30 + 0x100000, 16),
+                            shift(28770 * 265 - 24117 * 200 - 4653 * 30 - 0xFF0000, 17),
+                            shift(16843 * 1 + 33030 * 2 + 6423 * 3 + 0x108000, 16),
+                            shift(-9699 * 1 - 19071 * 2 + 28770 * 3 - 0x7F8000, 16),
+                            0xEE,
+                            0xEE};
+    EXPECT_EQ(packed, expected);
+}
+
+TEST(Ycbcr, RefusesNothingAndNoSize) {
+    Bytes a(12, 1), b(12, 2);
+    EXPECT_EQ(YcbcrToRgb(nullptr, 0, b.data(), 0, 1, 1), ImagingStatus::kNullPointer);
+    EXPECT_EQ(RgbToYcbcr(a.data(), 0, nullptr, 0, 1, 1), ImagingStatus::kNullPointer);
+    EXPECT_EQ(YcbcrToRgb(a.data(), 0, b.data(), 0, 1, 0), ImagingStatus::kBadSize);
+    EXPECT_EQ(RgbToYcbcr(a.data(), 0, b.data(), 0, 0, 1), ImagingStatus::kBadSize);
+    EXPECT_EQ(b, Bytes(12, 2));
+}
+
+TEST(PackedImage, GrowsInEachDirection) {
+    PackedImage image;
+    EXPECT_FALSE(image.Reserve(0, 1, 3));
+    EXPECT_FALSE(image.Reserve(1, 1, 5));
+    ASSERT_TRUE(image.Reserve(10, 2, 3));
+    ASSERT_TRUE(image.Reserve(4, 7, 3));
+    EXPECT_GE(image.RowStep(), 30u);
+    image.Row(6)[29] = 1;
+    EXPECT_FALSE(image.Reserve(2147483647, 2147483647, 4));
+}
+
+}  // namespace
+}  // namespace velmora::render
