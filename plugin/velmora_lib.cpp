@@ -60,7 +60,7 @@ CRsVelmoraLib::~CRsVelmoraLib() {
 
 bool CRsVelmoraLib::FreeLanguageModule() noexcept {
     if (m_languageModule != nullptr && !AllowsUnload(m_languageModule)) return false;
-    support::FreeModule(m_languageModule);  // also when none is held: freeing nothing does nothing
+    support::UnloadModule(m_languageModule);  // also when none is held: freeing nothing does nothing
     m_languageModule = nullptr;
     return true;
 }

@@ -15,7 +15,7 @@ using ModuleHandle = void*;
 
 // Loads a module by path or bare name (16-bit text); null when it cannot be loaded.
 [[nodiscard]] ModuleHandle LoadModule(const char16_t* name) noexcept;
-void FreeModule(ModuleHandle module) noexcept;
+void UnloadModule(ModuleHandle module) noexcept;
 // The address of an export, or null.
 [[nodiscard]] void* FindExport(ModuleHandle module, const char* name) noexcept;
 // The folder of a module with its trailing separator; null asks for the running program's. Empty when it

@@ -43,7 +43,7 @@ ModuleHandle LoadModule(const char16_t* name) noexcept try {
     return nullptr;
 }
 
-void FreeModule(ModuleHandle module) noexcept {
+void UnloadModule(ModuleHandle module) noexcept {
     if (module != nullptr) dlclose(module);
 }
 

@@ -24,7 +24,7 @@ ModuleHandle LoadModule(const char16_t* name) noexcept {
     return LoadLibraryW(Wide(name));
 }
 
-void FreeModule(ModuleHandle module) noexcept {
+void UnloadModule(ModuleHandle module) noexcept {
     FreeLibrary(static_cast<HMODULE>(module));
 }
 
