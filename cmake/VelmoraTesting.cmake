@@ -19,3 +19,12 @@ function(velmora_add_test name)
     set_tests_properties(${name} PROPERTIES LABELS "${ARG_LABELS}")
   endif()
 endfunction()
+
+# velmora_check_module(TARGET EXPORT...) checks that a Windows module exports exactly the given names and needs nothing
+# but Windows' own modules.
+function(velmora_check_module target)
+  if(WIN32 AND BUILD_TESTING)
+    add_test(NAME ${target}_imports
+      COMMAND ${PROJECT_SOURCE_DIR}/scripts/check-imports $<TARGET_FILE:${target}> ${ARGN})
+  endif()
+endfunction()

@@ -1,0 +1,24 @@
+# velmora_tinyxml: TinyXML 2.6.2 with Debian's patches (std::string in its interface) for both builds. Native code
+# links Debian's library; Debian has none for Windows, so there it is compiled from the sources that
+# scripts/fetch-tinyxml unpacked in the cache folder.
+
+if(NOT WIN32)
+  add_library(velmora_tinyxml INTERFACE)
+  find_path(VELMORA_TINYXML_INCLUDE tinyxml.h REQUIRED)
+  find_library(VELMORA_TINYXML_LIBRARY tinyxml REQUIRED)
+  target_include_directories(velmora_tinyxml SYSTEM INTERFACE ${VELMORA_TINYXML_INCLUDE})
+  target_link_libraries(velmora_tinyxml INTERFACE ${VELMORA_TINYXML_LIBRARY})
+else()
+  execute_process(
+    COMMAND bash -c "source scripts/common.sh && printf %s \"$tinyxmlSource\""
+    WORKING_DIRECTORY ${PROJECT_SOURCE_DIR} OUTPUT_VARIABLE folder COMMAND_ERROR_IS_FATAL ANY)
+  if(NOT EXISTS ${folder}/tinyxml.cpp)
+    message(FATAL_ERROR "The sources of TinyXML are not in ${folder}: run scripts/setup")
+  endif()
+  add_library(velmora_tinyxml STATIC EXCLUDE_FROM_ALL
+    ${folder}/tinyxml.cpp ${folder}/tinyxmlerror.cpp ${folder}/tinyxmlparser.cpp)
+  target_include_directories(velmora_tinyxml SYSTEM PUBLIC ${folder})
+  # Its warnings are not ours to mend.
+  target_compile_options(velmora_tinyxml PRIVATE -w)
+  unset(folder)
+endif()
