@@ -99,23 +99,17 @@ ColourStage PrepareColour(const StageSettings& settings, double seconds, Contras
     return stage;
 }
 
+Bgra MixWithGrey(Bgra pixel, std::int32_t weight) noexcept {
+    const std::int32_t luma = (76 * pixel.red + 149 * pixel.green + 30 * pixel.blue) >> 8;
+    const std::int32_t grey = static_cast<std::int16_t>(luma * weight);
+    const auto mix = [=](std::int32_t channel) { return Saturate(((127 - weight) * channel + grey) >> 7); };
+    return {mix(pixel.blue), mix(pixel.green), mix(pixel.red), pixel.alpha};
+}
+
 void ColourStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t) const noexcept {
-    const std::int32_t weight = m_weight;
     for (std::int32_t x = 0; x < width; ++x) {
-        const std::int32_t red = m_tone[in[x].red];
-        const std::int32_t green = m_tone[in[x].green];
-        const std::int32_t blue = m_tone[in[x].blue];
-        if (!m_mixes) {
-            out[x] = {static_cast<std::uint8_t>(blue), static_cast<std::uint8_t>(green),
-                      static_cast<std::uint8_t>(red), in[x].alpha};
-            continue;
-        }
-        const std::int32_t luma = (76 * red + 149 * green + 30 * blue) >> 8;
-        const std::int32_t grey = static_cast<std::int16_t>(luma * weight);
-        const auto mix = [=](std::int32_t channel) {
-            return Saturate(((127 - weight) * channel + grey) >> 7);
-        };
-        out[x] = {mix(blue), mix(green), mix(red), in[x].alpha};
+        const Bgra toned = {m_tone[in[x].blue], m_tone[in[x].green], m_tone[in[x].red], in[x].alpha};
+        out[x] = m_mixes ? MixWithGrey(toned, m_weight) : toned;
     }
 }
 

@@ -32,6 +32,9 @@ using ByteTable = std::array<std::uint8_t, 256>;
 // `contrast` is half of the setting.
 [[nodiscard]] ByteTable ContrastTable(float contrast) noexcept;
 
+// The saturation mix of one pixel with weight w.
+[[nodiscard]] Bgra MixWithGrey(Bgra pixel, std::int32_t weight) noexcept;
+
 class ColourStage {
   public:
     [[nodiscard]] bool IsActive() const noexcept { return m_active; }

@@ -3,7 +3,13 @@
 
 namespace velmora::render {
 
-enum class Form { kPlain, kSse2, kAvx2 };
+// Each form's processor also runs the forms before it.
+enum class Form {
+    kPlain,
+    kSse2,
+    kAvx2,
+    kAvx512,  // with byte permutations (VBMI)
+};
 
 // The fastest form that this processor and operating system can run.
 [[nodiscard]] Form BestForm() noexcept;

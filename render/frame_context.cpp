@@ -50,7 +50,18 @@ void FrameContext::Finish() noexcept {
     if (m_outputWritten) return;
     m_outputWritten = true;
     const std::size_t rowBytes = static_cast<std::size_t>(m_width) * sizeof(Bgra);
-    for (std::int32_t y = 0; y < m_height; ++y) {
+    const auto isGapless = [rowBytes](const ImageView& view) {
+        return static_cast<std::size_t>(view.rowStep) == rowBytes;
+    };
+    if (isGapless(m_source) && isGapless(m_destination)) {
+        // One long copy is cheaper than many short ones.
+        std::memmove(m_destination.Row(0), m_source.Row(0), rowBytes * static_cast<std::size_t>(m_height));
+        return;
+    }
+    // Rows that overlap the other picture's next ones must be copied away from them.
+    const bool upward = m_destination.Row(0) > m_source.Row(0);
+    for (std::int32_t i = 0; i < m_height; ++i) {
+        const std::int32_t y = upward ? m_height - 1 - i : i;
         std::memmove(m_destination.Row(y), m_source.Row(y), rowBytes);
     }
 }

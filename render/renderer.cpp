@@ -1,6 +1,6 @@
 #include "render/renderer.h"
 
-#include <cstring>
+#include "render/row_program.h"
 
 namespace velmora::render {
 namespace {
@@ -30,22 +30,14 @@ void RenderByStages(FrameContext& context, const FramePlan& plan) noexcept {
     ForEachActiveStage(plan, [&context](const auto& stage) { ApplyStage(stage, context); });
 }
 
-void RenderByRows(FrameContext& context, const FramePlan& plan) noexcept {
-    bool isNeutral = !plan.jitter.IsActive();
-    ForEachActiveStage(plan, [&isNeutral](const auto&) { isNeutral = false; });
-    if (isNeutral) return;
-
+void RenderByRows(FrameContext& context, const FramePlan& plan, Form form) noexcept {
+    const RowProgram program(plan, form);
+    if (!plan.jitter.IsActive() && program.IsEmpty()) return;
     const ImageView& source = context.Source();
     const ImageView& destination = context.ClaimDestination();
-    const std::int32_t width = context.Width();
     for (std::int32_t y = 0; y < context.Height(); ++y) {
         Bgra* out = destination.Row(y);
-        const Bgra* in = plan.jitter.Row(source, out, y);
-        ForEachActiveStage(plan, [&](const auto& stage) {
-            stage.Row(in, out, width, y);
-            in = out;
-        });
-        if (in != out) std::memmove(out, in, static_cast<std::size_t>(width) * sizeof(Bgra));
+        program.Run(plan.jitter.Row(source, out, y), out, context.Width(), y);
     }
 }
 
@@ -79,7 +71,7 @@ void RenderStages(FrameContext& context, const StageSettings& settings, RenderSt
     if (options.road == Road::kByStages) {
         RenderByStages(context, plan);
     } else {
-        RenderByRows(context, plan);
+        RenderByRows(context, plan, options.form);
     }
 }
 

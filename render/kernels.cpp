@@ -1,0 +1,60 @@
+#include "render/kernels.h"
+
+#include <algorithm>
+#include <cstring>
+
+#include "render/shade.h"
+
+namespace velmora::render {
+namespace {
+
+void TablesRow(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept {
+    for (std::int32_t x = 0; x < width; ++x) {
+        out[x] = {tables.blue[in[x].blue], tables.green[in[x].green], tables.red[in[x].red], in[x].alpha};
+    }
+}
+
+void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) noexcept {
+    for (std::int32_t x = 0; x < width; ++x) out[x] = MixWithGrey(in[x], weight);
+}
+
+void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
+             const float* fractions) noexcept {
+    for (std::int32_t x = 0; x < width; ++x) out[x] = ShadePixel(in[x], fractions[bytes[x]]);
+}
+
+void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
+    std::memmove(out, in, static_cast<std::size_t>(width) * sizeof(Bgra));
+}
+
+}  // namespace
+
+const RowKernels kPlainKernels = {TablesRow, MixRow, WearRow, CopyRow};
+
+void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept {
+    blue = b;
+    green = g;
+    red = r;
+    for (std::size_t i = 0; i < 256; ++i) {
+        blueWord[i] = b[i];
+        greenWord[i] = std::uint32_t{g[i]} << 8;
+        redWord[i] = std::uint32_t{r[i]} << 16;
+    }
+}
+
+const RowKernels& KernelsOf(Form form) noexcept {
+    switch (form) {
+#if defined(__i386__) || defined(__x86_64__)
+        case Form::kAvx512:
+            return kAvx512Kernels;
+        case Form::kAvx2:
+            return kAvx2Kernels;
+        case Form::kSse2:
+            return kSse2Kernels;
+#endif
+        default:
+            return kPlainKernels;
+    }
+}
+
+}  // namespace velmora::render

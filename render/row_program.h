@@ -1,0 +1,38 @@
+// What happens to a row of a frame, made from the frame's plan: tables that follow each other are joined into
+// one, tables that change nothing are left out, and the kernels are those of one form.
+#pragma once
+
+#include <cstdint>
+
+#include "render/kernels.h"
+#include "render/renderer.h"
+
+namespace velmora::render {
+
+class RowProgram {
+  public:
+    // Keeps references into `plan`.
+    RowProgram(const FramePlan& plan, Form form) noexcept;
+
+    // True when a row leaves as it came in.
+    [[nodiscard]] bool IsEmpty() const noexcept;
+    // Row `y`: `in` (may be `out`) to `out`.
+    void Run(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
+    void Copy(const Bgra* in, Bgra* out, std::int32_t width) const noexcept {
+        m_kernels.copy(in, out, width);
+    }
+
+  private:
+    void PlanTables() noexcept;
+    void RunWear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
+
+    const FramePlan& m_plan;
+    const RowKernels& m_kernels;
+    bool m_mixes = false;
+    bool m_hasBefore = false;  // tables before the mix
+    bool m_hasAfter = false;   // tables behind it, or in its place
+    ChannelTables m_before;
+    ChannelTables m_after;
+};
+
+}  // namespace velmora::render
