@@ -15,6 +15,8 @@ add_library(velmora_options INTERFACE)
 target_include_directories(velmora_options INTERFACE ${CMAKE_SOURCE_DIR})
 target_compile_options(velmora_options INTERFACE
   -Wall -Wextra -Wconversion -Wshadow -Wnon-virtual-dtor -Wold-style-cast -Werror
+  # GCC 12 sees an overlap in `"text" + string` where there is none.
+  -Wno-restrict
   # Bytes must not depend on the build: no contraction into fused operations, no relaxed maths.
   -ffp-contract=off -fno-fast-math)
 if(VELMORA_PLAIN_ROAD)

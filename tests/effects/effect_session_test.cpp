@@ -1,0 +1,242 @@
+// Rendering through the effects: sessions against each other and against the effect objects.
+
+#include "effects/effect_session.h"
+
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <bit>
+#include <cstring>
+#include <thread>
+#include <vector>
+
+#include "effects/describe.h"
+#include "effects/film_effect.h"
+#include "plugin/process_state.h"
+#include "tests/effects/test_hosts.h"
+
+namespace velmora::tests {
+namespace {
+
+using namespace effects;
+
+constexpr std::int32_t kWidth = 61;
+constexpr std::int32_t kHeight = 44;
+
+// A picture with all kinds of bytes in it, alpha included.
+struct Picture {
+    explicit Picture(std::uint32_t seed = 0) : bytes(std::size_t{kWidth} * kHeight * 4) {
+        for (std::uint8_t& byte : bytes)
+            byte = static_cast<std::uint8_t>((seed = seed * 1664525u + 1013904223u) >> 24);
+    }
+    FrameRecord Record() { return {bytes.data(), kWidth, kHeight, kWidth * 4, 0, 0, 0}; }
+    bool operator==(const Picture&) const = default;
+
+    std::vector<std::uint8_t> bytes;
+};
+
+std::unique_ptr<EffectSession> SessionWith(const EffectTable& effect, std::uint32_t preset) {
+    auto session = EffectSession::Create(effect);
+    session->ApplyPreset(preset);
+    return session;
+}
+
+Picture FrameOf(EffectSession& session, double seconds) {
+    Picture source(7), result;
+    EXPECT_TRUE(session.Render(source.Record(), result.Record(), seconds));
+    return result;
+}
+
+// Frame n in the middle of its time.
+double SecondsOf(int frame) {
+    return (frame + 0.5) / 30.0;
+}
+
+std::uint32_t Neutral(const EffectTable& effect) {
+    return FindPreset(effect, "Reset To None").value();
+}
+
+// The library's own state, as its entry point sets it up.
+class ProcessWide : public testing::Test {
+  protected:
+    void SetUp() override {
+        SetBuildMode(kBuildModeReady);
+        ASSERT_TRUE(RenewMasterSettings());
+        CurrentMasterSettings()->ExposeAll();
+    }
+    static void StartRandom(std::uint32_t state) { ProcessSession().state->random.Seed(state); }
+    static Picture RenderedBy(IVideoEffect& effect, std::uint32_t preset, double seconds) {
+        PresetHost host(effect, preset);
+        Picture source(7), result;
+        const FrameRecord from = source.Record(), to = result.Record();
+        const TimingRecord timing = {0.0, 0.0, seconds};
+        EXPECT_TRUE(effect.Process(&host, &from, nullptr, &to, &timing));
+        return result;
+    }
+};
+
+TEST(EffectSession, ResetToNoneGivesTheSourceBack) {
+    for (const EffectTable* effect : kAllEffects) {
+        auto session = SessionWith(*effect, Neutral(*effect));
+        for (const int frame : {0, 1, 2, 700}) {
+            EXPECT_EQ(FrameOf(*session, SecondsOf(frame)), Picture(7)) << effect->name;
+        }
+    }
+}
+
+TEST(EffectSession, StartsWithTheDefaults) {
+    auto session = EffectSession::Create(kFilmDamage);
+    EXPECT_EQ(session->Value(FindParam(kFilmDamage, "Black").value()).flag, 1);
+    EXPECT_EQ(session->Value(FindParam(kFilmDamage, "Wear").value()).number, 0.0f);
+    EXPECT_EQ(session->Value(FindParam(kFilmDamage, "Pattern").value()).item, 1);
+    EXPECT_EQ(FrameOf(*session, 1.0), Picture(7));
+}
+
+TEST(EffectSession, ValuesAndPresetsPastTheEndChangeNothing) {
+    auto session = EffectSession::Create(kFilmCamera);
+    session->SetValue(5, {.number = 1.0f});
+    session->SetValue(0xFFFFFFFFu, {.number = 1.0f});
+    session->ApplyPreset(8);
+    EXPECT_EQ(session->Value(5).bits, 0u);
+    EXPECT_EQ(FrameOf(*session, 1.0), Picture(7));
+}
+
+TEST(EffectSession, RefusesInvalidFrames) {
+    auto session = SessionWith(kFilmPro, 0);
+    Picture source(7), result;
+    FrameRecord narrow = result.Record();
+    narrow.rowStep = kWidth * 4 - 1;
+    EXPECT_FALSE(session->Render(source.Record(), narrow, 0.0));
+    EXPECT_EQ(result, Picture());
+}
+
+TEST(EffectSession, PinnedFramesDoNotDependOnTheirOrder) {
+    for (const EffectTable* effect : kAllEffects) {
+        const std::uint32_t presets = static_cast<std::uint32_t>(effect->presetNames.size());
+        for (std::uint32_t preset = 0; preset < presets; ++preset) {
+            SCOPED_TRACE(effect->presetNames[preset]);
+            auto forward = SessionWith(*effect, preset);
+            auto backward = SessionWith(*effect, preset);
+            std::vector<Picture> frames;
+            for (int frame = 0; frame < 4; ++frame) frames.push_back(FrameOf(*forward, SecondsOf(frame)));
+            for (int frame = 3; frame >= 0; --frame) {
+                EXPECT_EQ(FrameOf(*backward, SecondsOf(frame)), frames[static_cast<std::size_t>(frame)]);
+            }
+        }
+    }
+}
+
+TEST(EffectSession, SeedsGiveDifferentFrames) {
+    auto session = SessionWith(kFilmCamera, 0);
+    const Picture first = FrameOf(*session, 1.0);
+    session->PinRandom(1);
+    EXPECT_NE(FrameOf(*session, 1.0), first);
+    session->PinRandom(0);
+    EXPECT_EQ(FrameOf(*session, 1.0), first);
+}
+
+TEST(EffectSession, TwoThreadsDoNotDisturbEachOther) {
+    const auto work = [](const EffectTable& effect, std::uint32_t preset, std::vector<Picture>& frames) {
+        auto session = SessionWith(effect, preset);
+        for (int frame = 0; frame < 40; ++frame) frames.push_back(FrameOf(*session, SecondsOf(frame)));
+    };
+    const std::uint32_t super8 = FindPreset(kFilmPro, "Super 8").value();
+    const std::uint32_t newsreel = FindPreset(kFilmExpress, "Newsreel").value();
+    std::vector<Picture> alone[2], together[2];
+    work(kFilmPro, super8, alone[0]);
+    work(kFilmExpress, newsreel, alone[1]);
+    std::thread other([&] { work(kFilmPro, super8, together[0]); });
+    work(kFilmExpress, newsreel, together[1]);
+    other.join();
+    EXPECT_EQ(together[0], alone[0]);
+    EXPECT_EQ(together[1], alone[1]);
+}
+
+// Frame k of a running sequence can be rendered alone: its state is the first one moved on by the draws of
+// the frames before it.
+TEST(EffectSession, ASequenceCanBeEnteredAnywhere) {
+    constexpr std::uint32_t kStart = 0x1234ABCDu;
+    for (const EffectTable* effect : {&kFilmCamera, &kFilmDamage, &kFilmPro, &kFilmExpress}) {
+        for (std::uint32_t preset = 0; preset < effect->presetNames.size(); ++preset) {
+            SCOPED_TRACE(effect->presetNames[preset]);
+            auto running = SessionWith(*effect, preset);
+            auto entering = SessionWith(*effect, preset);
+            running->StartRandom(kStart);
+            for (int frame = 0; frame < 5; ++frame) {
+                const Picture expected = FrameOf(*running, SecondsOf(frame));
+                render::Random random(kStart);
+                random.Skip(static_cast<std::uint32_t>(frame) * entering->DrawsPerFrame(kWidth));
+                entering->StartRandom(random.State());
+                EXPECT_EQ(FrameOf(*entering, SecondsOf(frame)), expected) << "frame " << frame;
+            }
+        }
+    }
+}
+
+TEST_F(ProcessWide, EffectObjectsAndSessionsRenderTheSameBytes) {
+    for (std::uint32_t index = 0; index < kAllEffects.size(); ++index) {
+        IVideoEffect* effect = CreateEffectByIndex(index);
+        for (std::uint32_t preset = 0; effect->GetPresetName(preset) != nullptr; ++preset) {
+            SCOPED_TRACE(std::string(effect->GetName()) + ", " + effect->GetPresetName(preset));
+            auto session = SessionWith(*kAllEffects[index], preset);
+            StartRandom(preset + 99);
+            session->StartRandom(preset + 99);
+            // In order, a repeat, and a jump back.
+            for (const int frame : {0, 1, 2, 2, 1, 90}) {
+                const double seconds = SecondsOf(frame);
+                ASSERT_EQ(RenderedBy(*effect, preset, seconds), FrameOf(*session, seconds));
+            }
+        }
+        effect->Release();
+    }
+}
+
+TEST_F(ProcessWide, ResetToNoneOfEveryObjectGivesTheSourceBack) {
+    for (std::uint32_t index = 0; index < kAllEffects.size(); ++index) {
+        IVideoEffect* effect = CreateEffectByIndex(index);
+        EXPECT_EQ(RenderedBy(*effect, Neutral(*kAllEffects[index]), 1.0), Picture(7)) << effect->GetName();
+        effect->Release();
+    }
+}
+
+// Two effects that share the process read all their values anew for every frame.
+TEST_F(ProcessWide, EffectsThatAlternateKeepTheirOwnValues) {
+    IVideoEffect* camera = CreateEffectByIndex(0);
+    IVideoEffect* look = CreateEffectByIndex(1);
+    const std::uint32_t sepia = FindPreset(kFilmLook, "Sepia").value();
+    auto session = SessionWith(kFilmLook, sepia);
+    const Picture expected = FrameOf(*session, 1.0);
+    for (int round = 0; round < 3; ++round) {
+        EXPECT_NE(RenderedBy(*camera, 0, 1.0), Picture(7));
+        EXPECT_EQ(RenderedBy(*look, sepia, 1.0), expected);
+    }
+    camera->Release();
+    look->Release();
+}
+
+// A host may send anything.
+TEST(EffectSession, WildValuesCountAsTheEndsOfTheirRange) {
+    struct {
+        std::uint32_t wild;
+        float same;
+    } const rows[] = {{0x7FC00000u, 0.0f},  // not a number
+                      {0xFF800000u, 0.0f},  // minus infinity
+                      {0x7F800000u, 1.0f},  // infinity
+                      {std::bit_cast<std::uint32_t>(1e9f), 1.0f},
+                      {std::bit_cast<std::uint32_t>(-0.5f), 0.0f}};
+    for (const EffectTable* effect : kAllEffects) {
+        for (const auto& row : rows) {
+            auto wild = SessionWith(*effect, 0);
+            auto tame = SessionWith(*effect, 0);
+            for (std::uint32_t i = 0; i < effect->params.size(); ++i) {
+                if (effect->params[i].kind != kKindSlider) continue;
+                wild->SetValue(i, {.bits = row.wild});
+                tame->SetValue(i, {.number = row.same});
+            }
+            EXPECT_EQ(FrameOf(*wild, 2.0), FrameOf(*tame, 2.0)) << effect->name << " " << row.same;
+        }
+    }
+}
+
+}  // namespace
+}  // namespace velmora::tests

@@ -1,0 +1,272 @@
+// The effect objects between the host and the renderer: identity, counts, forwarding and the setting map.
+
+#include "effects/film_effect.h"
+
+#include <gtest/gtest.h>
+
+#include <bit>
+#include <limits>
+#include <thread>
+#include <vector>
+
+#include "tests/effects/expected_effects.h"
+#include "tests/effects/test_hosts.h"
+
+namespace velmora::tests {
+namespace {
+
+using effects::CreateEffectByIndex;
+
+// An effect with its host face, released at the end.
+class Effect {
+  public:
+    explicit Effect(std::uint32_t index) : m_effect(CreateEffectByIndex(index)) {
+        void* face = nullptr;
+        if (m_effect->QueryInterface(&kIidVideoHost, &face) == kStatusOk) {
+            m_face = static_cast<IVideoHost*>(face);
+            m_face->Release();
+        }
+    }
+    ~Effect() { m_effect->Release(); }
+    Effect(const Effect&) = delete;
+    Effect& operator=(const Effect&) = delete;
+
+    IVideoEffect* operator->() const { return m_effect; }
+    IVideoHost& Face() const { return *m_face; }
+    // Without frames there is nothing to render, but the host is attached.
+    void Attach(IVideoHost* host) {
+        EXPECT_FALSE(m_effect->Process(host, nullptr, nullptr, nullptr, nullptr));
+    }
+
+  private:
+    IVideoEffect* m_effect;
+    IVideoHost* m_face = nullptr;
+};
+
+constexpr ValueCell kUntouchedCell = {{.bits = 0xCCCCCCCCu}, 0xCCCCCCCCu, 0xCCCCCCCCu};
+
+// The kinds by which the renderer asks for its settings.
+constexpr std::uint32_t kMasterKinds[21] = {2, 2, 3, 2, 2, 2, 2, 2, 3, 2, 2, 2, 2, 1, 4, 2, 2, 2, 4, 4, 4};
+
+TEST(FilmEffect, AnswersToItsThreeIdentifiersFromBothFaces) {
+    for (std::uint32_t i = 0; i < 5; ++i) {
+        Effect effect(i);
+        IUnknown* const faces[] = {static_cast<IUnknown*>(effect.operator->()), &effect.Face()};
+        for (IUnknown* face : faces) {
+            struct {
+                const Guid* iid;
+                Status status;
+                void* pointer;
+            } const rows[] = {
+                {&kIidUnknown, kStatusOk, effect.operator->()},
+                {&kIidVideoEffect, kStatusOk, effect.operator->()},
+                {&kIidVideoHost, kStatusOk, &effect.Face()},
+                {&kIidEffectLibrary, kStatusNoInterface, nullptr},
+                {&kIidPresetSaver, kStatusNoInterface, nullptr},
+            };
+            for (const auto& row : rows) {
+                void* out = &effect;
+                EXPECT_EQ(face->QueryInterface(row.iid, &out), row.status);
+                EXPECT_EQ(out, row.pointer);
+                if (row.status == kStatusOk) {
+                    EXPECT_EQ(face->Release(), 1u);
+                }
+            }
+            EXPECT_EQ(face->QueryInterface(&kIidUnknown, nullptr), kStatusFailure);
+        }
+    }
+}
+
+TEST(FilmEffect, PassesUnknownIdentifiersToTheAttachedHost) {
+    Effect effect(3);
+    TestHost host;
+    effect.Attach(&host);
+    void* out = nullptr;
+    EXPECT_EQ(effect->QueryInterface(&kIidPresetSaver, &out), kStatusOk);
+    EXPECT_EQ(out, &host);
+    EXPECT_EQ(host.references, 2u);
+    out = &host;
+    EXPECT_EQ(effect.Face().QueryInterface(&kIidEffectLibrary, &out), kStatusNoInterface);
+    EXPECT_EQ(out, nullptr);
+    // Its own come first and the host is not counted.
+    EXPECT_EQ(effect->QueryInterface(&kIidVideoHost, &out), kStatusOk);
+    EXPECT_EQ(out, &effect.Face());
+    effect->Release();
+    EXPECT_EQ(host.references, 2u);
+}
+
+TEST(FilmEffect, BothFacesShareOneCount) {
+    IVideoEffect* effect = CreateEffectByIndex(0);
+    void* out = nullptr;
+    ASSERT_EQ(effect->QueryInterface(&kIidVideoHost, &out), kStatusOk);
+    IVideoHost* face = static_cast<IVideoHost*>(out);
+    EXPECT_EQ(effect->AddRef(), 3u);
+    EXPECT_EQ(face->AddRef(), 4u);
+    EXPECT_EQ(effect->Release(), 3u);
+    EXPECT_EQ(effect->Release(), 2u);
+    EXPECT_EQ(effect->Release(), 1u);
+    EXPECT_EQ(face->Release(), 0u);
+}
+
+TEST(FilmEffect, CountsFromManyThreads) {
+    IVideoEffect* effect = CreateEffectByIndex(4);
+    const auto work = [effect] {
+        for (int i = 0; i < 20000; ++i) {
+            effect->AddRef();
+            effect->Release();
+        }
+    };
+    std::thread other(work);
+    work();
+    other.join();
+    EXPECT_EQ(effect->Release(), 0u);
+}
+
+TEST(FilmEffect, TenThousandRounds) {
+    for (std::uint32_t i = 0; i < 10000; ++i) ASSERT_EQ(CreateEffectByIndex(i % 5)->Release(), 0u);
+}
+
+// Hosts see nothing of the layout, but an effect is to store no more than its five members.
+TEST(FilmEffect, StoresItsFiveMembersOnly) {
+    constexpr std::size_t kPointer = sizeof(void*);
+    const std::size_t renderer = sizeof(CRsVelmoraEffect);
+    EXPECT_LE(sizeof(effects::CFilmLook), 2 * kPointer + renderer + kPointer + kPointer);
+    EXPECT_EQ(sizeof(effects::CFilmLook), sizeof(effects::CFilmProjector));
+}
+
+TEST(FilmEffect, AnswersNothingWithoutAHost) {
+    for (std::uint32_t i = 0; i < 5; ++i) {
+        Effect effect(i);
+        for (int round = 0; round < 2; ++round) {
+            for (std::uint32_t index = 0; index <= 21; ++index) {
+                ValueCell cell = kUntouchedCell;
+                EXPECT_FALSE(effect.Face().GetParamValue(index, &cell, 2));
+                EXPECT_EQ(cell.value.bits, kUntouchedCell.value.bits);
+                EXPECT_EQ(cell.kind, kUntouchedCell.kind);
+            }
+            EXPECT_FALSE(effect.Face().HostOperation4(1, 2, 3));
+            EXPECT_EQ(effect.Face().HostOperation5(1, 2), 0u);
+            effect.Attach(nullptr);
+        }
+    }
+}
+
+TEST(FilmEffect, ForwardsTwoOperationsToTheHost) {
+    Effect effect(1);
+    TestHost host;
+    effect.Attach(&host);
+    EXPECT_TRUE(effect.Face().HostOperation4(11, 12, 13));
+    EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{11, 12, 13}));
+    EXPECT_EQ(effect.Face().HostOperation5(21, 22), 0x12345678u);
+    EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{21, 22}));
+    EXPECT_FALSE(effect.Face().HostOperation6(31, 32));
+    effect.Face().HostOperation7(41, 42);
+    EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{21, 22}));
+}
+
+// Splits "own 3" into its two words and checks what the face answered.
+void ExpectAnswer(const std::string& expected, const RecordingHost& host, const ValueCell& cell,
+                  std::uint32_t kind) {
+    const std::size_t blank = expected.find(' ');
+    const std::string source = expected.substr(0, blank);
+    const std::string word = expected.substr(blank + 1);
+    if (source == "own" || source == "depth") {
+        const auto own = static_cast<std::uint32_t>(std::stoul(word));
+        ASSERT_EQ(host.calls, (std::vector<RecordingHost::Call>{{own, kind}}));
+        if (source == "own") {
+            EXPECT_EQ(cell.value.bits, RecordingHost::WordOf(own));
+        }
+        return;
+    }
+    EXPECT_TRUE(host.calls.empty());
+    if (source == "number") {
+        EXPECT_EQ(cell.value.bits, FloatBits(std::stof(word)));
+    }
+    if (source == "colour") {
+        EXPECT_EQ(cell.value.bits, std::stoul(word, nullptr, 16));
+    }
+    if (source == "item") {
+        EXPECT_EQ(cell.value.bits, std::stoul(word));
+    }
+    if (source == "flag") {
+        EXPECT_EQ(cell.value.bits, word == "on" ? 0xCCCCCC01u : 0xCCCCCC00u);
+    }
+}
+
+TEST(FilmEffect, AnswersEachOfTheRenderersSettings) {
+    for (std::uint32_t i = 0; i < 5; ++i) {
+        const ExpectedEffect& expected = ExpectedEffects()[i];
+        SCOPED_TRACE(expected.name);
+        Effect effect(i);
+        ASSERT_EQ(expected.answers.size(), 21u);
+        for (std::uint32_t index = 0; index < 21; ++index) {
+            SCOPED_TRACE("setting " + std::to_string(index) + ": " + expected.answers[index]);
+            RecordingHost host;
+            effect.Attach(&host);
+            ValueCell cell = kUntouchedCell;
+            EXPECT_TRUE(effect.Face().GetParamValue(index, &cell, kMasterKinds[index]));
+            EXPECT_EQ(cell.kind, kMasterKinds[index]);
+            EXPECT_EQ(cell.second, kUntouchedCell.second);
+            ExpectAnswer(expected.answers[index], host, cell, kMasterKinds[index]);
+        }
+    }
+}
+
+TEST(FilmEffect, FailsPastTheLastSettingAndWithoutACell) {
+    Effect effect(4);
+    RecordingHost host;
+    effect.Attach(&host);
+    for (const std::uint32_t index : {21u, 0xFFFFFFFFu}) {
+        ValueCell cell = kUntouchedCell;
+        EXPECT_FALSE(effect.Face().GetParamValue(index, &cell, 2));
+        EXPECT_EQ(cell.value.bits, kUntouchedCell.value.bits);
+        EXPECT_EQ(cell.kind, 2u);
+    }
+    EXPECT_FALSE(effect.Face().GetParamValue(0, nullptr, 2));
+    EXPECT_TRUE(host.calls.empty());
+    host.answers = false;
+    ValueCell cell = kUntouchedCell;
+    EXPECT_FALSE(effect.Face().GetParamValue(0, &cell, 2));
+}
+
+// "Film Express" has one slider for the amount of scratches and derives their depth: 1 - (1 - s)^2.
+TEST(FilmEffect, DerivesTheDepthOfScratches) {
+    class AmountHost final : public TestHost {
+      public:
+        bool VM_CALL GetParamValue(std::uint32_t, ValueCell* cell, std::uint32_t) override {
+            if (answers) cell->value.number = amount;
+            return answers;
+        }
+        float amount = 0.0f;
+        bool answers = true;
+    };
+    constexpr float kNan = std::numeric_limits<float>::quiet_NaN();
+    constexpr float kInfinity = std::numeric_limits<float>::infinity();
+    struct {
+        float amount, depth;
+    } const rows[] = {{0.0f, 0.0f},  {0.25f, 0.4375f}, {0.5f, 0.75f}, {0.75f, 0.9375f},  {1.0f, 1.0f},
+                      {-3.0f, 0.0f}, {7.0f, 1.0f},     {kNan, 0.0f},  {kInfinity, 1.0f}, {-kInfinity, 0.0f}};
+    Effect effect(3);
+    AmountHost host;
+    effect.Attach(&host);
+    for (const auto& row : rows) {
+        host.amount = row.amount;
+        ValueCell cell = {};
+        EXPECT_TRUE(effect.Face().GetParamValue(17, &cell, 2));
+        EXPECT_EQ(cell.value.number, row.depth) << "amount " << row.amount;
+    }
+    // 0.2 is no exact number: 1 - s is narrowed before it is squared.
+    host.amount = 0.2f;
+    ValueCell cell = {};
+    EXPECT_TRUE(effect.Face().GetParamValue(17, &cell, 2));
+    EXPECT_EQ(cell.value.number,
+              static_cast<float>(1.0L - 0.800000011920928955078125L * 0.800000011920928955078125L));
+
+    host.answers = false;
+    cell.value.number = 0.5f;
+    EXPECT_TRUE(effect.Face().GetParamValue(17, &cell, 2));
+    EXPECT_EQ(cell.value.number, 0.75f);
+}
+
+}  // namespace
+}  // namespace velmora::tests
