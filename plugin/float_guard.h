@@ -1,7 +1,8 @@
 // Gives the code behind it the floating-point state that it is compiled for, and the caller its own back.
 //
 // Hosts change rounding, precision, denormal handling and exception masks for their own purposes; results
-// must not depend on that, and a host must find its state as it left it.
+// must not depend on that, and a host must find its state as it left it: x87 environment, vector control word
+// and direction flag.
 #pragma once
 
 #include <cstdint>
@@ -10,23 +11,39 @@ namespace velmora {
 
 class FloatGuard {
   public:
-    FloatGuard() noexcept {
-        __asm__ __volatile__("fnstcw %0" : "=m"(m_control));
+    FloatGuard() noexcept : m_processorFlags(ProcessorFlags()) {
+        // With the environment saved, exceptions that our work raises cannot reach a caller who unmasked them.
+        __asm__ __volatile__("fnstenv %0" : "=m"(m_x87));
         __asm__ __volatile__("stmxcsr %0" : "=m"(m_vectorControl));
-        const std::uint16_t control = 0x037F;        // all exceptions masked, extended precision, to nearest
-        const std::uint32_t vectorControl = 0x1F80;  // all exceptions masked, to nearest, denormals kept
+        const std::uint16_t control = 0x037F;        // exceptions masked, extended precision, to nearest
+        const std::uint32_t vectorControl = 0x1F80;  // exceptions masked, to nearest, denormals kept
         // "cld": string operations upward, as compiled code takes for granted.
-        __asm__ __volatile__("fldcw %0\n\tldmxcsr %1\n\tcld" : : "m"(control), "m"(vectorControl));
+        __asm__ __volatile__("fldcw %0\n\tldmxcsr %1\n\tcld" : : "m"(control), "m"(vectorControl) : "memory");
     }
     ~FloatGuard() {
-        // The sticky exception flags go back too: the state is a whole.
-        __asm__ __volatile__("fldcw %0\n\tldmxcsr %1" : : "m"(m_control), "m"(m_vectorControl));
+        __asm__ __volatile__("fldenv %0\n\tldmxcsr %1" : : "m"(m_x87), "m"(m_vectorControl) : "memory");
+        if ((m_processorFlags & kDirectionFlag) != 0) __asm__ __volatile__("std" : : : "memory");
     }
     FloatGuard(const FloatGuard&) = delete;
     FloatGuard& operator=(const FloatGuard&) = delete;
 
   private:
-    std::uint16_t m_control;
+    static std::uintptr_t ProcessorFlags() noexcept {
+#if defined(__x86_64__)
+        return __builtin_ia32_readeflags_u64();
+#else
+        return __builtin_ia32_readeflags_u32();
+#endif
+    }
+
+    static constexpr std::uintptr_t kDirectionFlag = 0x400;
+
+    struct X87Environment {
+        std::uint32_t words[7];
+    };
+
+    std::uintptr_t m_processorFlags;
+    X87Environment m_x87;
     std::uint32_t m_vectorControl;
 };
 

@@ -19,8 +19,6 @@ constexpr char kHelpFile[] = "VMReelEffects.chm";
 constexpr char16_t kLanguageModule[] = u"VMLang.dll";
 constexpr char16_t kLanguageFile[] = u"VMReelEffectsLang.xml";
 
-using GetLangXMLParserFunction = LangXMLParser*(VM_CALL*)();
-
 // A module without the export may be freed.
 bool AllowsUnload(support::ModuleHandle module) noexcept {
     const auto canUnload =
@@ -128,7 +126,7 @@ IFrameProcessor* VM_CALL CRsVelmoraLib::CreateFrameProcessor() {
 }
 
 IPresetSaver* VM_CALL CRsVelmoraLib::CreatePresetSaver() {
-    return presets::CreatePresetSaver();
+    return velmora::CreatePresetSaver();
 }
 
 std::int32_t VM_CALL CRsVelmoraLib::LookUpText(std::intptr_t languageCode, std::intptr_t category,

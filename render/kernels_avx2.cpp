@@ -33,8 +33,7 @@ VM_AVX2 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
         const __m256i pixels = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x));
         const __m256i mixed = _mm256_packus_epi16(MixFour(_mm256_unpacklo_epi8(pixels, zero), luma, u),
                                                   MixFour(_mm256_unpackhi_epi8(pixels, zero), luma, u));
-        _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x),
-                            _mm256_blendv_epi8(mixed, pixels, alpha));
+        _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), _mm256_blendv_epi8(mixed, pixels, alpha));
     }
     kSse2Kernels.mix(in + x, out + x, width - x, weight);
 }
@@ -42,8 +41,8 @@ VM_AVX2 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
 // Two pixels, as in the 16-byte form.
 VM_AVX2 inline __m256i Lighten(__m128i pixels, __m256 fraction) noexcept {
     const __m256i channels = _mm256_cvtepu8_epi32(pixels);
-    const __m256 product = _mm256_mul_ps(
-        fraction, _mm256_cvtepi32_ps(_mm256_sub_epi32(_mm256_set1_epi32(255), channels)));
+    const __m256 product =
+        _mm256_mul_ps(fraction, _mm256_cvtepi32_ps(_mm256_sub_epi32(_mm256_set1_epi32(255), channels)));
     const __m256i whole = _mm256_cvttps_epi32(product);
     const __m256 rest = _mm256_sub_ps(product, _mm256_cvtepi32_ps(whole));
     const __m256i up = _mm256_castps_si256(_mm256_cmp_ps(rest, _mm256_set1_ps(0.5f), _CMP_GE_OQ));
@@ -61,9 +60,9 @@ VM_AVX2 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::u
         std::memcpy(&worn, bytes + x, sizeof worn);
         __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + x));
         if (worn != 0) {
-            const __m256 four = _mm256_castps128_ps256(
-                _mm_setr_ps(fractions[bytes[x]], fractions[bytes[x + 1]], fractions[bytes[x + 2]],
-                            fractions[bytes[x + 3]]));
+            const __m256 four =
+                _mm256_castps128_ps256(_mm_setr_ps(fractions[bytes[x]], fractions[bytes[x + 1]],
+                                                   fractions[bytes[x + 2]], fractions[bytes[x + 3]]));
             const __m256i low =
                 Lighten(pixels, _mm256_and_ps(colour, _mm256_permutevar8x32_ps(four, firstTwo)));
             const __m256i high = Lighten(_mm_srli_si128(pixels, 8),

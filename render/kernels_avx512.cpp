@@ -17,17 +17,19 @@ VM_AVX512 inline __mmask16 Tail(std::int32_t left) noexcept {
 }
 
 // `result` with the bytes of `mask` replaced by the table's entries for `bytes`.
-VM_AVX512 inline __m512i LookUp(__m512i result, __mmask64 mask, __m512i bytes, const ByteTable& table) noexcept {
+VM_AVX512 inline __m512i LookUp(__m512i result, __mmask64 mask, __m512i bytes,
+                                const ByteTable& table) noexcept {
     const std::uint8_t* entries = table.data();
-    const __m512i low = _mm512_permutex2var_epi8(_mm512_load_si512(entries), bytes,
-                                                 _mm512_load_si512(entries + 64));
-    const __m512i high = _mm512_permutex2var_epi8(_mm512_load_si512(entries + 128), bytes,
-                                                  _mm512_load_si512(entries + 192));
+    const __m512i low =
+        _mm512_permutex2var_epi8(_mm512_load_si512(entries), bytes, _mm512_load_si512(entries + 64));
+    const __m512i high =
+        _mm512_permutex2var_epi8(_mm512_load_si512(entries + 128), bytes, _mm512_load_si512(entries + 192));
     const __mmask64 isHigh = _mm512_movepi8_mask(bytes);
     return _mm512_mask_mov_epi8(result, mask, _mm512_mask_blend_epi8(isHigh, low, high));
 }
 
-VM_AVX512 void TablesRow(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept {
+VM_AVX512 void TablesRow(const Bgra* in, Bgra* out, std::int32_t width,
+                         const ChannelTables& tables) noexcept {
     constexpr __mmask64 kBlue = 0x1111111111111111u, kGreen = kBlue << 1, kRed = kBlue << 2;
     for (std::int32_t x = 0; x < width; x += kPixels) {
         const __mmask16 tail = Tail(width - x);
@@ -42,8 +44,8 @@ VM_AVX512 void TablesRow(const Bgra* in, Bgra* out, std::int32_t width, const Ch
 // As in the 16-byte form, eight pixels at a time.
 VM_AVX512 inline __m512i MixEight(__m512i channels, __m512i luma, __m512i u) noexcept {
     const __m512i products = _mm512_madd_epi16(channels, luma);
-    const __m512i sum = _mm512_srli_epi32(
-        _mm512_add_epi32(products, _mm512_shuffle_epi32(products, _MM_PERM_CDAB)), 8);
+    const __m512i sum =
+        _mm512_srli_epi32(_mm512_add_epi32(products, _mm512_shuffle_epi32(products, _MM_PERM_CDAB)), 8);
     const __m512i grey = _mm512_or_si512(sum, _mm512_slli_epi32(sum, 16));
     const __m512i away = _mm512_mullo_epi16(_mm512_sub_epi16(channels, grey), u);
     const __m512i scaled = _mm512_sub_epi16(_mm512_slli_epi16(channels, 7), channels);

@@ -72,7 +72,9 @@ __m128i Lighten(__m128i channels, __m128 fraction) noexcept {
 }
 
 // Alpha's fraction is 0.
-__m128 PixelFraction(float fraction) noexcept { return _mm_setr_ps(fraction, fraction, fraction, 0.0f); }
+__m128 PixelFraction(float fraction) noexcept {
+    return _mm_setr_ps(fraction, fraction, fraction, 0.0f);
+}
 
 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
              const float* fractions) noexcept {

@@ -19,12 +19,13 @@ ByteTable Joined(const ByteTable& first, const ByteTable& second) noexcept {
 }
 
 // The weights that the kernels' 16-bit arithmetic holds; settings from a slider lie within.
-bool FitsKernel(std::int32_t weight) noexcept { return weight >= -127 && weight <= 127; }
+bool FitsKernel(std::int32_t weight) noexcept {
+    return weight >= -127 && weight <= 127;
+}
 
 }  // namespace
 
-RowProgram::RowProgram(const FramePlan& plan, Form form) noexcept
-    : m_plan(plan), m_kernels(KernelsOf(form)) {
+RowProgram::RowProgram(const FramePlan& plan, Form form) noexcept : m_plan(plan), m_kernels(KernelsOf(form)) {
     PlanTables();
 }
 

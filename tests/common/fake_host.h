@@ -1,0 +1,62 @@
+// A host for tests: answers from a list of values and records what it is asked.
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <vector>
+
+#include "plugin/com_object.h"
+#include "plugin/host_api.h"
+
+namespace velmora::testing {
+
+class FakeHost final : public IVideoHost {
+  public:
+    struct Request {
+        std::uint32_t index;
+        std::uint32_t kind;
+        bool operator==(const Request&) const = default;
+    };
+
+    // Values by parameter index; an index that is missing fails and leaves the cell alone.
+    std::map<std::uint32_t, ValueWord> values;
+    std::vector<Request> requests;
+    std::vector<std::intptr_t> forwarded;  // arguments of operations 4 and 5
+    const Guid* lastQueried = nullptr;
+
+    void SetNumber(std::uint32_t index, float number) { values[index].number = number; }
+    void SetBits(std::uint32_t index, std::uint32_t bits) { values[index].bits = bits; }
+
+    Status VM_CALL QueryInterface(const Guid* iid, void** out) override {
+        lastQueried = iid;
+        *out = nullptr;
+        return kStatusNoInterface;
+    }
+    std::uint32_t VM_CALL AddRef() override { return ++m_count; }
+    std::uint32_t VM_CALL Release() override { return --m_count; }
+    bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override {
+        requests.push_back({index, kind});
+        const auto value = values.find(index);
+        if (value == values.end()) return false;
+        cell->value = value->second;
+        cell->kind = kind;
+        return true;
+    }
+    bool VM_CALL HostOperation4(std::intptr_t a, std::intptr_t b, std::intptr_t c) override {
+        forwarded = {a, b, c};
+        return true;
+    }
+    std::uint32_t VM_CALL HostOperation5(std::intptr_t a, std::intptr_t b) override {
+        forwarded = {a, b};
+        return 55;
+    }
+    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return true; }
+    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
+
+    [[nodiscard]] std::uint32_t Count() const { return m_count; }
+
+  private:
+    std::uint32_t m_count = 1;
+};
+
+}  // namespace velmora::testing
