@@ -6,8 +6,9 @@
 #include <cstdint>
 #include <memory>
 
+#include "render/glow.h"
 #include "render/random.h"
-#include "render/scratch_state.h"
+#include "render/scratches.h"
 
 namespace velmora::render {
 
@@ -41,6 +42,7 @@ struct RenderState {
     FrameRandom random;
     ContrastCache contrast;
     ScratchMemory scratches;
+    GlowMemory glow;
 };
 
 }  // namespace velmora::render

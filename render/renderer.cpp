@@ -8,9 +8,11 @@ namespace {
 // The chain behind jitter, in its order: what both roads run. `visit` takes a stage.
 template <typename Visit>
 void ForEachActiveStage(const FramePlan& plan, Visit&& visit) {
+    if (plan.glow.IsActive()) visit(plan.glow);
     if (plan.colour.IsActive()) visit(plan.colour);
     if (plan.tint.IsActive()) visit(plan.tint);
     if (plan.wear.IsActive()) visit(plan.wear);
+    if (plan.scratches.IsActive()) visit(plan.scratches);
     if (plan.spots.IsActive()) visit(plan.spots);
 }
 
@@ -52,26 +54,31 @@ bool NeedsOwnSource(const FrameContext& context, const FramePlan& plan) noexcept
 
 }  // namespace
 
-FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings, RenderState& state) noexcept {
+FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings, RenderState& state,
+                    Form form) noexcept {
     Random& random = state.random.Numbers();
     FramePlan plan;
     plan.jitter = PrepareJitter(settings, random);
     plan.colour = PrepareColour(settings, context.Time(), state.contrast);
     plan.tint = PrepareTint(settings);
     plan.wear = PrepareWear(settings, context.Width(), random);
+    plan.scratches = PrepareScratches(settings, plan.jitter.Dx(), context, state.scratches, form);
     plan.spots = PrepareSpots(settings, context.Destination().Region(), random);
     return plan;
 }
 
 void RenderStages(FrameContext& context, const StageSettings& settings, RenderState& state,
                   const RenderOptions& options) noexcept {
-    FramePlan plan = PlanFrame(context, settings, state);
+    const Form form = options.road == Road::kByStages ? Form::kPlain : options.form;
+    FramePlan plan = PlanFrame(context, settings, state, form);
     // Without memory for the copy the picture stays where it is; the other stages can still work.
     if (NeedsOwnSource(context, plan) && !context.DetachSource()) plan.jitter = {};
+    const ShakenRows shaken(context.Source(), plan.jitter);
+    plan.glow = PrepareGlow(settings.glow, shaken, context.Width(), context.Height(), state.glow, form);
     if (options.road == Road::kByStages) {
         RenderByStages(context, plan);
     } else {
-        RenderByRows(context, plan, options.form);
+        RenderByRows(context, plan, form);
     }
 }
 

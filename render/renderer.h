@@ -11,8 +11,10 @@
 #include "render/colour.h"
 #include "render/cpu.h"
 #include "render/frame_context.h"
+#include "render/glow.h"
 #include "render/jitter.h"
 #include "render/render_state.h"
+#include "render/scratches.h"
 #include "render/spots.h"
 #include "render/stage_settings.h"
 #include "render/tint.h"
@@ -30,14 +32,17 @@ struct RenderOptions {
 // What the stages do to one frame.
 struct FramePlan {
     JitterStage jitter;
+    GlowStage glow;
     ColourStage colour;
     TintStage tint;
     WearStage wear;
+    ScratchStage scratches;
     SpotStage spots;
 };
 
+// All but glow, which starts from the picture itself. `form` is that of the scratches.
 [[nodiscard]] FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings,
-                                  RenderState& state) noexcept;
+                                  RenderState& state, Form form = BestForm()) noexcept;
 
 // Runs the stages on a frame whose two views are valid and whose random state has been begun. The result is
 // in the destination when a stage had something to do, else FrameContext::Finish copies the source through.

@@ -46,10 +46,15 @@ void RowProgram::PlanTables() noexcept {
 }
 
 bool RowProgram::IsEmpty() const noexcept {
-    return !m_mixes && !m_hasAfter && !m_plan.wear.IsActive() && !m_plan.spots.IsActive();
+    return !m_plan.glow.IsActive() && !m_mixes && !m_hasAfter && !m_plan.wear.IsActive() &&
+           !m_plan.scratches.IsActive() && !m_plan.spots.IsActive();
 }
 
 void RowProgram::Run(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
+    if (m_plan.glow.IsActive()) {
+        m_plan.glow.Row(in, out, width, y);
+        in = out;
+    }
     if (m_hasBefore) {
         m_kernels.tables(in, out, width, m_before);
         in = out;
@@ -65,6 +70,10 @@ void RowProgram::Run(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t
     }
     if (m_plan.wear.IsActive()) {
         RunWear(in, out, width, y);
+        in = out;
+    }
+    if (m_plan.scratches.IsActive()) {
+        m_plan.scratches.Row(in, out, width, y);
         in = out;
     }
     if (m_plan.spots.IsActive()) {

@@ -1,4 +1,116 @@
+// The lives of the scratches: where each one is in a frame, as a function of the settings and the frame
+// number alone.
+//
+// A frame shows what a replay from frame 0 leads to. In the replay every scratch is started in frame 0 and
+// again in the frame in which its life ends; all of them, in order of their index, draw from one generator
+// that the scratch seed starts. Of a life that has passed only the number of its draws matters for those that
+// follow, so a replay steps from restart to restart and only the lives that a frame shows are drawn in full.
 #pragma once
+
+#include <array>
+#include <cstdint>
+
+#include "render/random.h"
+#include "render/stage_settings.h"
+
 namespace velmora::render {
-class ScratchMemory {};
+
+inline constexpr std::uint32_t kMostScratches = 16;
+inline constexpr int kThinScratchProfiles = 3;
+inline constexpr int kScratchProfiles = 5;
+
+struct ScratchProfile {
+    std::int32_t opacity;  // of the core, 0..256
+    std::int32_t width;    // pixels
+};
+
+// The first three entries are thin, the last two thick. An upper end is hardly ever drawn, so the entries
+// that are seen are the first two, and with thick ones the first four.
+inline constexpr ScratchProfile kBlackScratchProfiles[kScratchProfiles] = {
+    {205, 2}, {235, 3}, {250, 4}, {235, 7}, {250, 10},
+};
+inline constexpr ScratchProfile kWhiteScratchProfiles[kScratchProfiles] = {
+    {195, 2}, {225, 3}, {245, 4}, {230, 6}, {245, 9},
+};
+
+// One scratch in one frame. Columns are counted from the left edge of the processed rectangle and name the
+// scratch's left edge; positions and speed are thousandths of a pixel, which makes the movement exact.
+struct ScratchState {
+    bool isWhite = false;
+    std::int32_t profileIndex = 0;
+    std::int32_t opacity = 0;     // of the profile, 0..256
+    std::int32_t width = 0;       // of the profile, pixels
+    std::int32_t firstFrame = 0;  // of this life
+    std::int32_t endFrame = 0;    // the first frame that no longer belongs to it
+    std::int32_t startColumn = 0;
+    std::int32_t wander = 0;  // how far it may move: half of this to the left, all of it to the right
+    std::int64_t leastPosition = 0;
+    std::int64_t mostPosition = 0;
+    std::int64_t position = 0;
+    std::int32_t speed = 0;    // per frame
+    std::uint32_t look = 0;    // seeds waver, breathing and breaks of this life
+    std::int32_t tremble = 0;  // strength in this frame, 218..294 of 256
+};
+
+// What the draws of all lives depend on.
+struct ScratchReplayKey {
+    std::uint32_t seed = 0;
+    std::uint32_t count = 0;
+    bool drawsKind = false;  // one more draw in each life, where both kinds may come
+
+    bool operator==(const ScratchReplayKey&) const = default;
+};
+[[nodiscard]] ScratchReplayKey ReplayKeyOf(const StageSettings& settings) noexcept;
+
+// A replay that stands at some frame and can go on from there.
+class ScratchReplay {
+  public:
+    struct Life {
+        Random numbers;  // before the draws of this life
+        std::int32_t firstFrame = 0;
+        std::int32_t endFrame = 0;
+    };
+
+    void Start(const ScratchReplayKey& key) noexcept;
+    // To `frame`, which must not lie before Frame(). About 5 ms for ten hours of frames.
+    void AdvanceTo(std::int32_t frame) noexcept;
+
+    [[nodiscard]] const ScratchReplayKey& Key() const noexcept { return m_key; }
+    [[nodiscard]] std::int32_t Frame() const noexcept { return m_frame; }  // -1: before the first
+    [[nodiscard]] const Life& LifeOf(std::uint32_t scratch) const noexcept { return m_lives[scratch]; }
+
+  private:
+    static constexpr std::int32_t kRingFrames = 128;  // more than the longest life
+
+    void Restart(std::uint32_t scratch) noexcept;
+
+    ScratchReplayKey m_key;
+    Random m_numbers;
+    std::int32_t m_frame = -1;
+    std::array<Life, kMostScratches> m_lives;
+    std::array<std::uint16_t, kRingFrames> m_endings{};  // by frame modulo ring: a bit for each scratch
+};
+
+// A few replays, so that a frame goes on where one before it stopped, also when clips with different settings
+// are rendered by turns or a host goes back and forth. What is remembered never shows in a result.
+class ScratchReplays {
+  public:
+    [[nodiscard]] const ScratchReplay& At(const ScratchReplayKey& key, std::int32_t frame) noexcept;
+
+  private:
+    std::array<ScratchReplay, 4> m_replays;
+    std::array<std::uint32_t, 4> m_lastUse{};
+    std::uint32_t m_uses = 0;
+};
+
+// The frame whose scratches `frameNumber` shows: 0 before the clip starts; after 2^24 frames (155 hours) they
+// come again from the start, so that no frame number asks for an endless replay.
+[[nodiscard]] constexpr std::int32_t ScratchFrame(std::int32_t frameNumber) noexcept {
+    return frameNumber < 0 ? 0 : frameNumber & 0xFFFFFF;
+}
+
+// The state of a life in `frame`, one of the life's own frames, in a picture `width` pixels wide.
+[[nodiscard]] ScratchState ScratchStateAt(const ScratchReplay::Life& life, std::int32_t frame,
+                                          const StageSettings& settings, std::int32_t width) noexcept;
+
 }  // namespace velmora::render

@@ -1,0 +1,333 @@
+#include "render/glow.h"
+
+#include <algorithm>
+#include <new>
+
+#include "render/rounding.h"
+
+namespace velmora::render {
+namespace {
+
+constexpr std::int32_t kMostVeilRows = 300;
+
+// The veil is the sum of three blurs: the first softens outlines, the second makes halos, the third is the
+// mist. Standard deviations are shares of the picture's height.
+constexpr double kNarrowSigma = 0.004;
+constexpr double kMiddleSigma = 0.020;
+constexpr double kWideSigma = 0.075;
+constexpr double kNarrowShare = 0.30;
+constexpr double kMiddleShare = 0.32;
+constexpr double kWideShare = 0.38;
+constexpr double kStrongest = 0.75;  // of the veil at amount 1
+
+// What two halvings, and two doublings as well, add to a blur's variance, in squares of the coarser cells.
+constexpr double kResamplingVariance = 0.1875 + 0.1875 / 4;
+
+// Half the size, the last cell of an odd one counted whole.
+constexpr std::int32_t Halved(std::int32_t size) noexcept {
+    return size / 2 + size % 2;
+}
+constexpr std::int32_t Reduced(std::int32_t size, int reduction) noexcept {
+    for (; reduction > 0; --reduction) size = Halved(size);
+    return size;
+}
+
+// A filter of about this variance: passes of (t, 1 − 2t, t) run into one.
+GlowTaps MakeTaps(double variance, int passes) noexcept {
+    const double t = std::max(variance, 0.0) / (2.0 * passes);
+    double weights[GlowTaps::kMostPairs + 2] = {1.0};  // from the middle outward
+    for (int pass = 0; pass < passes; ++pass) {
+        double inner = weights[1];
+        for (int i = 0; i <= passes; ++i) {
+            const double own = weights[i];
+            weights[i] = own * (1.0 - 2.0 * t) + (inner + weights[i + 1]) * t;
+            inner = own;
+        }
+    }
+    GlowTaps taps;
+    taps.pairs = passes;
+    taps.middle = static_cast<std::uint16_t>(std::min(Truncate(weights[0] * 65536.0), 65535));
+    for (int i = 0; i < passes; ++i) {
+        taps.pair[static_cast<std::size_t>(i)] =
+            static_cast<std::uint16_t>(Truncate(weights[i + 1] * 65536.0));
+    }
+    return taps;
+}
+
+struct VeilTaps {
+    GlowTaps narrow, middle, wide;
+};
+
+// The filters for a veil whose cells are `cell` pixels wide, in the pyramid's levels 0, 2 and 4. What reducing,
+// halving and doubling blur by themselves is left out of them.
+VeilTaps MakeVeilTaps(double height, double cell) noexcept {
+    const auto square = [](double x) { return x * x; };
+    const double onScreen = 0.25 * (1.0 - 1.0 / square(cell));  // by averaging blocks and by interpolation
+    const double narrow = std::max(square(kNarrowSigma * height / cell) - onScreen, 0.0);
+    const double beforeMiddle = (onScreen + narrow) / 16 + 2 * kResamplingVariance;
+    const double middle = std::max(square(kMiddleSigma * height / cell) / 16 - beforeMiddle, 0.0);
+    const double beforeWide = (beforeMiddle + middle) / 16 + 2 * kResamplingVariance;
+    const double wide = std::max(square(kWideSigma * height / cell) / 256 - beforeWide, 0.0);
+    return {MakeTaps(narrow, 2), MakeTaps(middle, 4), MakeTaps(wide, 4)};
+}
+
+// Continues a row by copies of its end cells.
+void ContinueEnds(CellRow row, std::int32_t width) noexcept {
+    for (std::int32_t i = 1; i <= kCellPad; ++i) {
+        std::copy_n(row, kCellLanes, row - i * kCellLanes);
+        const CellRow last = row + (width - 1) * std::ptrdiff_t{kCellLanes};
+        std::copy_n(last, kCellLanes, last + i * kCellLanes);
+    }
+}
+
+class VeilMaker {
+  public:
+    VeilMaker(const RowReader& input, std::int32_t width, std::int32_t height,
+              const GlowKernels& kernels) noexcept
+        : m_input(input), m_width(width), m_height(height), m_kernels(kernels) {
+        while (Reduced(height, m_reduction) > kMostVeilRows) ++m_reduction;
+    }
+
+    [[nodiscard]] bool Allocate(GlowMemory& memory) noexcept;
+    [[nodiscard]] GlowStage Make(double amount) noexcept;
+
+  private:
+    static constexpr int kLevels = 5;
+    static constexpr int kMostReduction = 24;
+
+    void ReadRow(int reduction, std::int32_t y, CellRow out) noexcept;
+    void ReadBlocks(std::int32_t y, CellRow out) noexcept;
+    void ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept;
+    void BlurAlong(CellRow row, CellRow out, std::int32_t width, const GlowTaps& taps) noexcept;
+    void BlurAcross(const CellPlane& from, const CellPlane& to, const GlowTaps& taps) noexcept;
+    void Blur(int level, const GlowTaps& taps) noexcept;
+    void Halve(int level) noexcept;
+    void AddDoubled(int level, double ownShare, double otherShare) noexcept;
+
+    const RowReader& m_input;
+    std::int32_t m_width;
+    std::int32_t m_height;
+    const GlowKernels& m_kernels;
+    int m_reduction = 0;
+
+    CellPlane m_levels[kLevels];
+    CellPlane m_work[kLevels];           // of the same sizes
+    CellPlane m_halves[kMostReduction];  // two rows each, of pictures reduced by more than four
+    CellPlane m_rows;                    // two rows as wide as the widest
+    Bgra* m_pixels = nullptr;            // four rows
+};
+
+bool VeilMaker::Allocate(GlowMemory& memory) noexcept {
+    std::int32_t width = Reduced(m_width, m_reduction), height = Reduced(m_height, m_reduction);
+    std::uint64_t lanes = static_cast<std::uint64_t>(m_width) * 4 * (sizeof(Bgra) / sizeof(std::uint16_t));
+    for (int level = 0; level < kLevels; ++level) {
+        m_levels[level] = m_work[level] = {nullptr, width, height};
+        lanes += 2 * m_levels[level].Lanes();
+        width = Halved(width);
+        height = Halved(height);
+    }
+    for (int reduction = 2; reduction < m_reduction; ++reduction) {
+        m_halves[reduction] = {nullptr, Reduced(m_width, reduction), 2};
+        lanes += m_halves[reduction].Lanes();
+    }
+    // A doubled row may be a cell wider than what it is for.
+    m_rows = {nullptr, Reduced(m_width, std::min(m_reduction, 2) == 2 ? 2 : 0) + 1, 2};
+    lanes += m_rows.Lanes();
+
+    std::uint16_t* next = memory.Reserve(lanes);
+    if (next == nullptr) return false;
+    const auto take = [&next](CellPlane& plane) {
+        plane.base = next;
+        next += plane.Lanes();
+    };
+    for (int level = 0; level < kLevels; ++level) {
+        take(m_levels[level]);
+        take(m_work[level]);
+    }
+    for (int reduction = 2; reduction < m_reduction; ++reduction) take(m_halves[reduction]);
+    take(m_rows);
+    m_pixels = reinterpret_cast<Bgra*>(next);
+    return true;
+}
+
+// Row `y` of the picture reduced by 2^reduction.
+void VeilMaker::ReadRow(int reduction, std::int32_t y, CellRow out) noexcept {
+    if (reduction < 2) return ReadSmallBlocks(1 << reduction, y, out);
+    if (reduction == 2) return ReadBlocks(y, out);
+    const CellPlane& halves = m_halves[reduction - 1];
+    for (std::int32_t i = 0; i < 2; ++i) {
+        const std::int32_t lastRow = Reduced(m_height, reduction - 1) - 1;
+        ReadRow(reduction - 1, std::min(2 * y + i, lastRow), halves.Row(i));
+        ContinueEnds(halves.Row(i), halves.width);
+    }
+    const std::int32_t lanes = Halved(halves.width) * kCellLanes;
+    for (std::int32_t i = 0; i < lanes; ++i) {
+        const std::int32_t left = i / kCellLanes * 2 * kCellLanes + i % kCellLanes;
+        const int sum = halves.Row(0)[left] + halves.Row(0)[left + kCellLanes] + halves.Row(1)[left] +
+                        halves.Row(1)[left + kCellLanes];
+        out[i] = static_cast<std::uint16_t>((sum + 2) >> 2);
+    }
+}
+
+// Blocks of 4 × 4 pixels; those at the right and lower edges repeat the last pixels that there are.
+void VeilMaker::ReadBlocks(std::int32_t y, CellRow out) noexcept {
+    const Bgra* rows[4];
+    for (std::int32_t i = 0; i < 4; ++i) {
+        const std::int64_t row = std::min(std::int64_t{y} * 4 + i, std::int64_t{m_height} - 1);
+        rows[i] = m_input.Read(static_cast<std::int32_t>(row), m_pixels + std::ptrdiff_t{m_width} * i);
+    }
+    const std::int32_t whole = m_width / 4;
+    m_kernels.averageBlocks(rows, out, whole);
+    if (m_width % 4 == 0) return;
+    Bgra edge[4][4];
+    const Bgra* edges[4] = {edge[0], edge[1], edge[2], edge[3]};
+    for (std::int32_t i = 0; i < 16; ++i) {
+        edge[i / 4][i % 4] = rows[i / 4][std::min(whole * 4 + i % 4, m_width - 1)];
+    }
+    m_kernels.averageBlocks(edges, out + whole * std::ptrdiff_t{kCellLanes}, 1);
+}
+
+// One pixel for a cell, or 2 × 2: in small pictures only.
+void VeilMaker::ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept {
+    const int scale = 128 / (side * side);
+    const Bgra* rows[2];
+    for (std::int32_t i = 0; i < side; ++i) {
+        rows[i] = m_input.Read(std::min(y * side + i, m_height - 1), m_pixels + std::ptrdiff_t{m_width} * i);
+    }
+    for (std::int32_t x = 0; x < m_width; x += side, out += kCellLanes) {
+        int blue = 0, green = 0, red = 0;
+        for (int i = 0; i < side * side; ++i) {
+            const Bgra& pixel = rows[i / side][std::min(x + i % side, m_width - 1)];
+            blue += pixel.blue;
+            green += pixel.green;
+            red += pixel.red;
+        }
+        out[0] = static_cast<std::uint16_t>(blue * scale);
+        out[1] = static_cast<std::uint16_t>(green * scale);
+        out[2] = static_cast<std::uint16_t>(red * scale);
+        out[3] = 0;
+    }
+}
+
+void VeilMaker::BlurAlong(CellRow row, CellRow out, std::int32_t width, const GlowTaps& taps) noexcept {
+    ContinueEnds(row, width);
+    ConstCellRow before[GlowTaps::kMostPairs], after[GlowTaps::kMostPairs];
+    for (int i = 0; i < taps.pairs; ++i) {
+        before[i] = row - (i + 1) * kCellLanes;
+        after[i] = row + (i + 1) * kCellLanes;
+    }
+    m_kernels.filter(row, before, after, out, width, taps);
+}
+
+void VeilMaker::BlurAcross(const CellPlane& from, const CellPlane& to, const GlowTaps& taps) noexcept {
+    for (std::int32_t y = 0; y < to.height; ++y) {
+        ConstCellRow before[GlowTaps::kMostPairs], after[GlowTaps::kMostPairs];
+        for (int i = 0; i < taps.pairs; ++i) {
+            before[i] = from.Row(y - i - 1);
+            after[i] = from.Row(y + i + 1);
+        }
+        m_kernels.filter(from.Row(y), before, after, to.Row(y), to.width, taps);
+    }
+}
+
+void VeilMaker::Blur(int level, const GlowTaps& taps) noexcept {
+    const CellPlane& plane = m_levels[level];
+    for (std::int32_t y = 0; y < plane.height; ++y) {
+        BlurAlong(plane.Row(y), m_work[level].Row(y), plane.width, taps);
+    }
+    BlurAcross(m_work[level], plane, taps);
+}
+
+// Makes the next level from this one.
+void VeilMaker::Halve(int level) noexcept {
+    const CellPlane &from = m_levels[level], &to = m_levels[level + 1];
+    const CellRow narrowed = m_rows.Row(0);
+    for (std::int32_t y = 0; y < to.height; ++y) {
+        const ConstCellRow rows[4] = {from.Row(2 * y - 1), from.Row(2 * y), from.Row(2 * y + 1),
+                                      from.Row(2 * y + 2)};
+        m_kernels.halveRows(rows, narrowed, from.width);
+        ContinueEnds(narrowed, from.width);
+        m_kernels.halveAlong(narrowed, to.Row(y), to.width);
+    }
+}
+
+// Adds the next level to this one.
+void VeilMaker::AddDoubled(int level, double ownShare, double otherShare) noexcept {
+    const CellPlane &fine = m_levels[level], &coarse = m_levels[level + 1];
+    const auto share = [](double x) { return static_cast<std::uint16_t>(RoundHalfAway(x * 65535.0)); };
+    for (std::int32_t y = 0; y < fine.height; ++y) {
+        m_kernels.between(coarse.Row(y / 2), coarse.Row(y % 2 == 0 ? y / 2 - 1 : y / 2 + 1), m_rows.Row(0),
+                          coarse.width);
+        ContinueEnds(m_rows.Row(0), coarse.width);
+        m_kernels.doubleAlong(m_rows.Row(0), m_rows.Row(1), coarse.width);
+        m_kernels.mix(fine.Row(y), m_rows.Row(1), fine.width, share(ownShare), share(otherShare));
+    }
+}
+
+GlowStage VeilMaker::Make(double amount) noexcept {
+    const VeilTaps taps = MakeVeilTaps(m_height, 1 << m_reduction);
+    const CellPlane& veil = m_levels[0];
+    for (std::int32_t y = 0; y < veil.height; ++y) {
+        ReadRow(m_reduction, y, veil.Row(y));
+        m_kernels.keepHighlights(veil.Row(y), veil.width);
+        BlurAlong(veil.Row(y), m_work[0].Row(y), veil.width, taps.narrow);
+    }
+    BlurAcross(m_work[0], veil, taps.narrow);
+    Halve(0);
+    Halve(1);
+    Blur(2, taps.middle);
+    Halve(2);
+    Halve(3);
+    Blur(4, taps.wide);
+    AddDoubled(3, 0.0, 1.0);
+    AddDoubled(2, kMiddleShare, kWideShare);
+    AddDoubled(1, 0.0, 1.0);
+    AddDoubled(0, kNarrowShare, 1.0);
+    const std::uint16_t strength = static_cast<std::uint16_t>(RoundHalfAway(kStrongest * amount * 65535.0));
+    for (std::int32_t y = 0; y < veil.height; ++y) m_kernels.lift(veil.Row(y), veil.width, strength);
+    return {veil, m_reduction, m_rows, m_kernels};
+}
+
+}  // namespace
+
+std::uint16_t* GlowMemory::Reserve(std::uint64_t lanes) noexcept {
+    if (lanes > PTRDIFF_MAX / sizeof(std::uint16_t)) return nullptr;
+    if (lanes > m_size) {
+        m_lanes.reset();
+        m_lanes.reset(new (std::nothrow) std::uint16_t[static_cast<std::size_t>(lanes)]);
+        m_size = m_lanes != nullptr ? lanes : 0;
+    }
+    return m_lanes.get();
+}
+
+void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
+    const std::int32_t side = 1 << m_reduction;
+    const std::int32_t cell = y >> m_reduction;
+    // How far the row lies from the middle of its cells, in half pixels, and so on the way to the next ones.
+    const std::int32_t away = 2 * (y & (side - 1)) + 1 - side;
+    const std::int16_t share = static_cast<std::int16_t>(std::int64_t{std::abs(away)} * 32768 / side);
+    CellRow row = m_rows.Row(0), other = m_rows.Row(1);
+    m_kernels->approach(m_veil.Row(cell), m_veil.Row(away < 0 ? cell - 1 : cell + 1), row, m_veil.width,
+                        share);
+    std::int32_t cells = m_veil.width;
+    const int wanted = m_reduction < 2 ? 0 : 2;  // one cell for each pixel or for four
+    for (int reduction = m_reduction; reduction > wanted; --reduction) {
+        ContinueEnds(row, cells);
+        m_kernels->doubleAlong(row, other, cells);
+        std::swap(row, other);
+        cells = Reduced(width, reduction - 1);
+    }
+    if (wanted == 0) return m_kernels->screen(in, out, row, width);
+    ContinueEnds(row, cells);
+    m_kernels->screenFourfold(in, out, row, width);
+}
+
+GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width, std::int32_t height,
+                      GlowMemory& memory, Form form) noexcept {
+    if (!(amount > 0.0f) || width < 1 || height < 1) return {};
+    VeilMaker maker(input, width, height, GlowKernelsOf(form));
+    if (!maker.Allocate(memory)) return {};
+    return maker.Make(std::min<double>(amount, 1.0));
+}
+
+}  // namespace velmora::render

@@ -1,0 +1,162 @@
+#include "render/glow_kernels.h"
+
+#include <algorithm>
+
+namespace velmora::render {
+namespace {
+
+constexpr std::uint32_t MulHigh(std::uint32_t a, std::uint32_t b) noexcept {
+    return a * b >> 16;
+}
+constexpr std::uint32_t Mean(std::uint32_t a, std::uint32_t b) noexcept {
+    return (a + b + 1) >> 1;
+}
+constexpr std::uint32_t ThreeToOne(std::uint32_t near, std::uint32_t far) noexcept {
+    return Mean(near, Mean(near, far));
+}
+constexpr std::uint16_t Cell(std::uint32_t value) noexcept {
+    return static_cast<std::uint16_t>(value);
+}
+
+void AverageBlocks(const Bgra* const rows[4], CellRow cells, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count; ++i, cells += kCellLanes) {
+        std::uint32_t blue = 0, green = 0, red = 0;
+        for (int y = 0; y < 4; ++y) {
+            for (const Bgra *pixel = rows[y] + i * 4, *end = pixel + 4; pixel != end; ++pixel) {
+                blue += pixel->blue;
+                green += pixel->green;
+                red += pixel->red;
+            }
+        }
+        cells[0] = Cell(blue << 3);
+        cells[1] = Cell(green << 3);
+        cells[2] = Cell(red << 3);
+        cells[3] = 0;
+    }
+}
+
+void KeepHighlights(CellRow cells, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count; ++i, cells += kCellLanes) {
+        const std::int32_t luma = (kLumaBlue * cells[0] + kLumaGreen * cells[1] + kLumaRed * cells[2]) >> 8;
+        const std::uint32_t above = static_cast<std::uint32_t>(std::max(0, luma - kHighlightFloor)) * 2;
+        const std::uint32_t t = std::min(above + MulHigh(above, kHighlightStretch), 65535u);
+        const std::uint32_t share = MulHigh(MulHigh(t, t), 49151 - (t >> 1)) << 2;
+        for (int c = 0; c < 3; ++c) cells[c] = Cell(MulHigh(cells[c], share));
+        cells[3] = 0;
+    }
+}
+
+void Filter(ConstCellRow middle, const ConstCellRow* before, const ConstCellRow* after, CellRow out,
+            std::int32_t count, const GlowTaps& taps) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; ++i) {
+        std::uint32_t sum = MulHigh(middle[i], taps.middle);
+        for (int p = 0; p < taps.pairs; ++p) {
+            sum += MulHigh(std::uint32_t{before[p][i]} + after[p][i], taps.pair[static_cast<std::size_t>(p)]);
+        }
+        out[i] = Cell(sum);
+    }
+}
+
+void HalveRows(const ConstCellRow rows[4], CellRow out, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; ++i) {
+        out[i] = Cell(ThreeToOne(Mean(rows[1][i], rows[2][i]), Mean(rows[0][i], rows[3][i])));
+    }
+}
+
+void HalveAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count; ++i, row += 2 * kCellLanes, out += kCellLanes) {
+        for (int c = 0; c < kCellLanes; ++c) {
+            out[c] = Cell(ThreeToOne(Mean(row[c], row[c + 4]), Mean(row[c - 4], row[c + 8])));
+        }
+    }
+}
+
+void Between(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; ++i) out[i] = Cell(ThreeToOne(near[i], far[i]));
+}
+
+void DoubleAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count; ++i, row += kCellLanes, out += 2 * kCellLanes) {
+        for (int c = 0; c < kCellLanes; ++c) {
+            out[c] = Cell(ThreeToOne(row[c], row[c - 4]));
+            out[c + 4] = Cell(ThreeToOne(row[c], row[c + 4]));
+        }
+    }
+}
+
+void Mix(CellRow out, ConstCellRow other, std::int32_t count, std::uint16_t ownShare,
+         std::uint16_t otherShare) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; ++i) {
+        out[i] = Cell(MulHigh(out[i], ownShare) + MulHigh(other[i], otherShare));
+    }
+}
+
+void Lift(CellRow cells, std::int32_t count, std::uint16_t strength) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; ++i) {
+        const std::uint32_t lifted = cells[i] + MulHigh(cells[i] * 2u, 32767u - cells[i]);
+        cells[i] = Cell(MulHigh(lifted, strength));
+    }
+}
+
+std::int32_t Approached(std::int32_t near, std::int32_t far, std::int32_t share) noexcept {
+    return near + ((far - near) * share >> 16);
+}
+
+void Approach(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t count,
+              std::int16_t share) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; ++i) {
+        out[i] = static_cast<std::uint16_t>(Approached(near[i], far[i], share));
+    }
+}
+
+std::uint8_t Screened(std::uint32_t channel, std::uint32_t veil) noexcept {
+    return static_cast<std::uint8_t>(channel + ((MulHigh((255 - channel) << 8, veil) + 64) >> 7));
+}
+
+Bgra ScreenPixel(Bgra pixel, std::uint32_t blue, std::uint32_t green, std::uint32_t red) noexcept {
+    const std::int32_t level =
+        std::min<std::int32_t>(std::max({pixel.blue, pixel.green, pixel.red}), kBlackRamp);
+    const std::uint32_t share =
+        static_cast<std::uint32_t>(level * (2 * kBlackRamp - level) * kBlackRampScale);
+    return {Screened(pixel.blue, MulHigh(blue * 2, share)), Screened(pixel.green, MulHigh(green * 2, share)),
+            Screened(pixel.red, MulHigh(red * 2, share)), pixel.alpha};
+}
+
+void Screen(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
+    for (std::int32_t x = 0; x < width; ++x, veil += kCellLanes) {
+        out[x] = ScreenPixel(in[x], veil[0], veil[1], veil[2]);
+    }
+}
+
+void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
+    constexpr std::int32_t kShares[4] = {24576, 8192, 8192, 24576};  // 3/8 and 1/8 of the way to a neighbour
+    for (std::int32_t x = 0; x < width; ++x) {
+        const ConstCellRow near = veil + x / 4 * kCellLanes;
+        const ConstCellRow far = x % 4 < 2 ? near - kCellLanes : near + kCellLanes;
+        const auto at = [&](int c) {
+            return static_cast<std::uint32_t>(Approached(near[c], far[c], kShares[x % 4]));
+        };
+        out[x] = ScreenPixel(in[x], at(0), at(1), at(2));
+    }
+}
+
+}  // namespace
+
+const GlowKernels kPlainGlowKernels = {AverageBlocks, KeepHighlights, Filter,      HalveRows,
+                                       HalveAlong,    Between,        DoubleAlong, Mix,
+                                       Lift,          Approach,       Screen,      ScreenFourfold};
+
+const GlowKernels& GlowKernelsOf(Form form) noexcept {
+    switch (form) {
+        case Form::kAvx512:
+        case Form::kAvx2:
+            return kAvx2GlowKernels;
+        case Form::kSse2:
+            return kSse2GlowKernels;
+        case Form::kPlain:
+            break;
+    }
+    return kPlainGlowKernels;
+}
+
+}  // namespace velmora::render

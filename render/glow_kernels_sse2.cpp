@@ -1,0 +1,140 @@
+// The glow's inner loops with SSE2, two cells or pixels at a time.
+#include "render/glow_kernels.h"
+
+#include <emmintrin.h>
+
+namespace velmora::render {
+namespace {
+
+struct Lanes {
+    static constexpr std::int32_t kCells = 2;
+    static constexpr std::int32_t kSize = kCells * kCellLanes;
+
+    __m128i v;
+
+    static Lanes All(std::int32_t value) noexcept { return {_mm_set1_epi16(static_cast<short>(value))}; }
+    static Lanes Load(ConstCellRow cells) noexcept {
+        return {_mm_loadu_si128(reinterpret_cast<const __m128i*>(cells))};
+    }
+    static Lanes LoadPixels(const Bgra* pixels) noexcept {
+        const __m128i bytes = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(pixels));
+        return {_mm_unpacklo_epi8(bytes, _mm_setzero_si128())};
+    }
+    static Lanes Pair(ConstCellRow first, ConstCellRow second) noexcept {
+        return {_mm_unpacklo_epi64(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(first)),
+                                   _mm_loadl_epi64(reinterpret_cast<const __m128i*>(second)))};
+    }
+    // For four pixels under one cell: the cell, the cells on either side of it, and the way towards those.
+    static Lanes Repeat(ConstCellRow cell) noexcept { return Pair(cell, cell); }
+    static Lanes Neighbours(ConstCellRow cell, int half) noexcept {
+        return Repeat(half == 0 ? cell - kCellLanes : cell + kCellLanes);
+    }
+    static Lanes NeighbourShares(int half) noexcept {
+        constexpr short kFar = 24576, kNear = 8192;
+        return {half == 0 ? _mm_setr_epi16(kFar, kFar, kFar, kFar, kNear, kNear, kNear, kNear)
+                          : _mm_setr_epi16(kNear, kNear, kNear, kNear, kFar, kFar, kFar, kFar)};
+    }
+};
+
+Lanes operator+(Lanes a, Lanes b) noexcept {
+    return {_mm_add_epi16(a.v, b.v)};
+}
+Lanes operator-(Lanes a, Lanes b) noexcept {
+    return {_mm_sub_epi16(a.v, b.v)};
+}
+Lanes SaturatingSum(Lanes a, Lanes b) noexcept {
+    return {_mm_adds_epu16(a.v, b.v)};
+}
+Lanes SaturatingDifference(Lanes a, Lanes b) noexcept {
+    return {_mm_subs_epu16(a.v, b.v)};
+}
+Lanes MulHigh(Lanes a, Lanes b) noexcept {
+    return {_mm_mulhi_epu16(a.v, b.v)};
+}
+Lanes MulHighSigned(Lanes a, Lanes b) noexcept {
+    return {_mm_mulhi_epi16(a.v, b.v)};
+}
+Lanes MulLow(Lanes a, Lanes b) noexcept {
+    return {_mm_mullo_epi16(a.v, b.v)};
+}
+Lanes Mean(Lanes a, Lanes b) noexcept {
+    return {_mm_avg_epu16(a.v, b.v)};
+}
+Lanes Min(Lanes a, Lanes b) noexcept {
+    return {_mm_min_epi16(a.v, b.v)};
+}
+template <int bits>
+Lanes ShiftLeft(Lanes a) noexcept {
+    return {_mm_slli_epi16(a.v, bits)};
+}
+template <int bits>
+Lanes ShiftRight(Lanes a) noexcept {
+    return {_mm_srli_epi16(a.v, bits)};
+}
+
+void Store(CellRow cells, Lanes a) noexcept {
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(cells), a.v);
+}
+void StorePixels(Bgra* pixels, Lanes a) noexcept {
+    _mm_storel_epi64(reinterpret_cast<__m128i*>(pixels), _mm_packus_epi16(a.v, a.v));
+}
+
+// In all four lanes of each cell.
+Lanes Luma(Lanes a) noexcept {
+    const __m128i weights =
+        _mm_setr_epi16(kLumaBlue, kLumaGreen, kLumaRed, 0, kLumaBlue, kLumaGreen, kLumaRed, 0);
+    const __m128i halves = _mm_madd_epi16(a.v, weights);
+    const __m128i sums = _mm_add_epi32(halves, _mm_shuffle_epi32(halves, _MM_SHUFFLE(2, 3, 0, 1)));
+    const __m128i luma = _mm_srli_epi32(sums, 8);
+    return {_mm_or_si128(luma, _mm_slli_epi32(luma, 16))};
+}
+
+// In the lanes of blue, green and red.
+Lanes BrightestChannel(Lanes a) noexcept {
+    constexpr int kNext = _MM_SHUFFLE(3, 0, 2, 1), kOther = _MM_SHUFFLE(3, 1, 0, 2);
+    const __m128i next = _mm_shufflehi_epi16(_mm_shufflelo_epi16(a.v, kNext), kNext);
+    const __m128i other = _mm_shufflehi_epi16(_mm_shufflelo_epi16(a.v, kOther), kOther);
+    return {_mm_max_epi16(a.v, _mm_max_epi16(next, other))};
+}
+
+void AverageBlocks(const Bgra* const rows[4], CellRow cells, std::int32_t count) noexcept {
+    const __m128i lowBytes = _mm_set1_epi16(0xFF), noAlpha = _mm_set1_epi32(0xFF);
+    for (std::int32_t i = 0; i < count; ++i, cells += kCellLanes) {
+        __m128i blueRed = _mm_setzero_si128(), green = _mm_setzero_si128();
+        for (int y = 0; y < 4; ++y) {
+            const __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(rows[y] + i * 4));
+            blueRed = _mm_add_epi16(blueRed, _mm_and_si128(pixels, lowBytes));
+            green = _mm_add_epi16(green, _mm_and_si128(_mm_srli_epi16(pixels, 8), noAlpha));
+        }
+        const __m128i pairs =
+            _mm_add_epi16(_mm_unpacklo_epi16(blueRed, green), _mm_unpackhi_epi16(blueRed, green));
+        const __m128i sum = _mm_add_epi16(pairs, _mm_unpackhi_epi64(pairs, pairs));
+        _mm_storel_epi64(reinterpret_cast<__m128i*>(cells), _mm_slli_epi16(sum, 3));
+    }
+}
+
+void HalveAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept;
+void DoubleAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept;
+
+#include "render/glow_kernels_vector.h"
+
+void HalveAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count; i += 2, row += 4 * kCellLanes, out += 2 * kCellLanes) {
+        const auto every2nd = [row](std::int32_t from) {
+            return Lanes::Pair(row + from * kCellLanes, row + (from + 2) * kCellLanes);
+        };
+        Store(out, ThreeToOne(Mean(every2nd(0), every2nd(1)), Mean(every2nd(-1), every2nd(2))));
+    }
+}
+
+void DoubleAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count; ++i, row += kCellLanes, out += 2 * kCellLanes) {
+        Store(out, ThreeToOne(Lanes::Repeat(row), Lanes::Pair(row - kCellLanes, row + kCellLanes)));
+    }
+}
+
+}  // namespace
+
+const GlowKernels kSse2GlowKernels = kKernels;
+
+}  // namespace velmora::render

@@ -1,0 +1,110 @@
+// The glow's inner loops over vectors. Included by one file for each vector type `Lanes`, after the type,
+// within that file's unnamed namespace: the code must not be shared between files that are compiled for
+// different processors.
+//
+// Loops over cells go on to the end of a vector, into the room behind a row; loops over pixels never do.
+
+void KeepHighlights(CellRow cells, std::int32_t count) noexcept {
+    const Lanes floor = Lanes::All(kHighlightFloor);
+    for (std::int32_t i = 0; i < count; i += Lanes::kCells, cells += Lanes::kSize) {
+        const Lanes cell = Lanes::Load(cells);
+        const Lanes half = SaturatingDifference(Luma(cell), floor);
+        const Lanes above = half + half;
+        const Lanes t = SaturatingSum(above, MulHigh(above, Lanes::All(kHighlightStretch)));
+        const Lanes quarter = MulHigh(MulHigh(t, t), Lanes::All(49151) - ShiftRight<1>(t));
+        Store(cells, MulHigh(cell, ShiftLeft<2>(quarter)));
+    }
+}
+
+void Filter(ConstCellRow middle, const ConstCellRow* before, const ConstCellRow* after, CellRow out,
+            std::int32_t count, const GlowTaps& taps) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; i += Lanes::kSize) {
+        Lanes sum = MulHigh(Lanes::Load(middle + i), Lanes::All(taps.middle));
+        for (int p = 0; p < taps.pairs; ++p) {
+            const Lanes pair = Lanes::Load(before[p] + i) + Lanes::Load(after[p] + i);
+            sum = sum + MulHigh(pair, Lanes::All(taps.pair[static_cast<std::size_t>(p)]));
+        }
+        Store(out + i, sum);
+    }
+}
+
+Lanes ThreeToOne(Lanes near, Lanes far) noexcept {
+    return Mean(near, Mean(near, far));
+}
+
+void HalveRows(const ConstCellRow rows[4], CellRow out, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; i += Lanes::kSize) {
+        const Lanes inner = Mean(Lanes::Load(rows[1] + i), Lanes::Load(rows[2] + i));
+        const Lanes outer = Mean(Lanes::Load(rows[0] + i), Lanes::Load(rows[3] + i));
+        Store(out + i, ThreeToOne(inner, outer));
+    }
+}
+
+void Between(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t count) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; i += Lanes::kSize) {
+        Store(out + i, ThreeToOne(Lanes::Load(near + i), Lanes::Load(far + i)));
+    }
+}
+
+void Mix(CellRow out, ConstCellRow other, std::int32_t count, std::uint16_t ownShare,
+         std::uint16_t otherShare) noexcept {
+    const Lanes own = Lanes::All(ownShare), others = Lanes::All(otherShare);
+    for (std::int32_t i = 0; i < count * kCellLanes; i += Lanes::kSize) {
+        Store(out + i, MulHigh(Lanes::Load(out + i), own) + MulHigh(Lanes::Load(other + i), others));
+    }
+}
+
+void Lift(CellRow cells, std::int32_t count, std::uint16_t strength) noexcept {
+    for (std::int32_t i = 0; i < count * kCellLanes; i += Lanes::kSize) {
+        const Lanes v = Lanes::Load(cells + i);
+        Store(cells + i, MulHigh(v + MulHigh(v + v, Lanes::All(32767) - v), Lanes::All(strength)));
+    }
+}
+
+Lanes Approached(Lanes near, Lanes far, Lanes share) noexcept {
+    return near + MulHighSigned(far - near, share);
+}
+
+void Approach(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t count,
+              std::int16_t share) noexcept {
+    const Lanes shares = Lanes::All(share);
+    for (std::int32_t i = 0; i < count * kCellLanes; i += Lanes::kSize) {
+        Store(out + i, Approached(Lanes::Load(near + i), Lanes::Load(far + i), shares));
+    }
+}
+
+// The veil's fourth number is 0, so alpha stays as it is.
+Lanes Screened(Lanes pixels, Lanes veil) noexcept {
+    const Lanes level = Min(BrightestChannel(pixels), Lanes::All(kBlackRamp));
+    const Lanes share =
+        MulLow(MulLow(level, Lanes::All(2 * kBlackRamp) - level), Lanes::All(kBlackRampScale));
+    const Lanes veiled = MulHigh(veil + veil, share);
+    const Lanes change = MulHigh(ShiftLeft<8>(Lanes::All(255) - pixels), veiled);
+    return pixels + ShiftRight<7>(change + Lanes::All(64));
+}
+
+void Screen(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
+    std::int32_t x = 0;
+    for (; x <= width - Lanes::kCells; x += Lanes::kCells, veil += Lanes::kSize) {
+        StorePixels(out + x, Screened(Lanes::LoadPixels(in + x), Lanes::Load(veil)));
+    }
+    kPlainGlowKernels.screen(in + x, out + x, veil, width - x);
+}
+
+void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
+    constexpr int kVectors = 4 / Lanes::kCells;
+    std::int32_t x = 0;
+    for (; x <= width - 4; x += 4, veil += kCellLanes) {
+        for (int i = 0; i < kVectors; ++i) {
+            const std::int32_t at = x + i * Lanes::kCells;
+            const Lanes between =
+                Approached(Lanes::Repeat(veil), Lanes::Neighbours(veil, i), Lanes::NeighbourShares(i));
+            StorePixels(out + at, Screened(Lanes::LoadPixels(in + at), between));
+        }
+    }
+    kPlainGlowKernels.screenFourfold(in + x, out + x, veil, width - x);
+}
+
+constexpr GlowKernels kKernels = {AverageBlocks, KeepHighlights, Filter,      HalveRows,
+                                  HalveAlong,    Between,        DoubleAlong, Mix,
+                                  Lift,          Approach,       Screen,      ScreenFourfold};

@@ -1,0 +1,67 @@
+// Scratches: lines that run down the film, dark where its surface is grazed and bright where the emulsion is
+// gone. Their lives are settled by scratch_state.h; here they are drawn.
+//
+// A scratch runs the whole height of the picture, tilted and wavering a little. Its strength comes and goes
+// along the film and breaks off here and there; from frame to frame it trembles. A black one never makes a
+// channel brighter, a white one never darker; alpha is kept.
+#pragma once
+
+#include <array>
+#include <cstdint>
+
+#include "render/cpu.h"
+#include "render/frame_context.h"
+#include "render/image.h"
+#include "render/scratch_shape.h"
+#include "render/scratch_state.h"
+#include "render/stage_settings.h"
+
+namespace velmora::render {
+
+// A scratch as it lies in one frame: course and strength at knots that divide the height evenly.
+struct ScratchLine {
+    static constexpr std::int32_t kSegments = 64;
+
+    struct Knot {
+        std::int32_t offset = 0;    // of the left edge from `pixel`, 1/256 pixels
+        std::int32_t strength = 0;  // 0..65535
+    };
+
+    const ScratchShape* shape = nullptr;
+    bool isWhite = false;
+    std::int32_t pixel = 0;
+    std::array<Knot, kSegments + 1> knots;
+};
+
+// What the stage keeps from frame to frame, and the room that it works in.
+struct ScratchMemory {
+    ScratchReplays replays;
+    std::array<ScratchLine, kMostScratches> lines;
+};
+
+class ScratchStage {
+  public:
+    ScratchStage() noexcept = default;
+    ScratchStage(const ScratchLine* lines, std::uint32_t count, std::int32_t height, Form form) noexcept;
+
+    [[nodiscard]] bool IsActive() const noexcept { return m_count != 0; }
+    // Draws the scratches' part of row `y` of the processed rectangle; `in` may be `out`.
+    void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
+
+  private:
+    using DrawSpan = void (*)(Bgra* span, const std::uint16_t* weights, std::int32_t pixels,
+                              std::uint32_t strength, bool isWhite) noexcept;
+
+    const ScratchLine* m_lines = nullptr;
+    std::uint32_t m_count = 0;
+    std::uint64_t m_knotStep = 0;  // knots per row, 1/65536
+    DrawSpan m_drawSpan = nullptr;
+};
+
+// The scratches of a frame whose picture was moved sideways by `xOffset`. The stage points into `memory` and
+// serves until the memory's next use.
+[[nodiscard]] ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffset,
+                                            const FrameContext& context, ScratchMemory& memory,
+                                            Form form) noexcept;
+
+}  // namespace velmora::render
