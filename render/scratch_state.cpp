@@ -101,7 +101,7 @@ ScratchState ScratchStateAt(const ScratchReplay::Life& life, std::int32_t frame,
     scratch.endFrame = life.firstFrame + numbers.Draw(kLeastLife, kMostLife);
 
     // A picture narrower than the scratch leaves it the columns from which it still covers the picture.
-    const auto [leftmost, rightmost] = std::minmax(0, width - scratch.width);
+    const auto [leftmost, rightmost] = std::minmax({0, width - scratch.width});
     scratch.startColumn = numbers.Draw(leftmost, rightmost);
     scratch.wander = numbers.Draw(0, settings.scratchConstant);
     const std::int64_t left = std::int64_t{scratch.startColumn} - scratch.wander / 2;
