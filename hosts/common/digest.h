@@ -1,0 +1,22 @@
+// The digest by which frames are compared across programs: MD5 over the picture's rows without padding, the
+// same as `ffmpeg -f framemd5` prints for raw BGRA frames.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <string>
+
+namespace velmora::hosts {
+
+// 32 hexadecimal digits. `pixels` is the first byte of the top row; rows are width * 4 bytes of blue, green,
+// red and alpha, `strideBytes` apart. Throws std::runtime_error when the system has no such digest.
+std::string FrameDigest(const std::uint8_t* pixels, std::int32_t width, std::int32_t height,
+                        std::ptrdiff_t strideBytes);
+
+// The line that both programs print for a frame, without the line's end: "frame 12 md5 9e10...".
+std::string DigestLine(std::int64_t frame, const std::string& digest);
+
+// Shared by the two builds' forms of FrameDigest.
+std::string HexOf(const std::uint8_t* bytes, std::size_t count);
+
+}  // namespace velmora::hosts

@@ -1,0 +1,41 @@
+// Numbers, sizes and rates as they are typed on a command line, read and written without regard to locale.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
+
+namespace velmora::hosts {
+
+struct FrameSize {
+    std::int32_t width = 0;
+    std::int32_t height = 0;
+};
+
+// Frames per second as a fraction.
+struct FrameRate {
+    std::int32_t numerator = 0;
+    std::int32_t denominator = 1;
+
+    // The time of frame `index` of a stream of this rate, in seconds.
+    [[nodiscard]] double SecondsAt(std::int64_t index) const {
+        return static_cast<double>(index) * denominator / numerator;
+    }
+};
+
+// Each reads the whole text or nothing.
+std::optional<double> ParseNumber(std::string_view text);          // finite
+std::optional<std::int64_t> ParseInteger(std::string_view text);   // decimal
+std::optional<std::uint32_t> ParseHexWord(std::string_view text);  // "0x1F" or "1F", at most 32 bits
+std::optional<FrameSize> ParseSize(std::string_view text);         // "1920x1080", each 1..32768
+std::optional<FrameRate> ParseRate(std::string_view text);         // "25", "29.97", "30000/1001"
+std::optional<double> ParseTime(std::string_view text);            // seconds, "MM:SS.s" or "HH:MM:SS.s", >= 0
+
+// The shortest of up to six significant digits: "4", "24.5", "0.2".
+std::string NumberText(double value);
+
+// Eight digits after "0x".
+std::string HexText(std::uint32_t word);
+
+}  // namespace velmora::hosts
