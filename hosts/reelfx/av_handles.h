@@ -1,0 +1,66 @@
+// Owners of the media libraries' objects, and their error codes as text.
+#pragma once
+
+#include <memory>
+#include <new>
+#include <string>
+
+extern "C" {
+#include <libavcodec/avcodec.h>
+#include <libavformat/avformat.h>
+#include <libavutil/frame.h>
+#include <libswresample/swresample.h>
+#include <libswscale/swscale.h>
+}
+
+namespace velmora::hosts {
+
+struct AvDelete {
+    void operator()(AVFrame* frame) const { av_frame_free(&frame); }
+    void operator()(AVPacket* packet) const { av_packet_free(&packet); }
+    void operator()(AVCodecContext* codec) const { avcodec_free_context(&codec); }
+    void operator()(SwsContext* scaler) const { sws_freeContext(scaler); }
+    void operator()(SwrContext* resampler) const { swr_free(&resampler); }
+};
+using FramePtr = std::unique_ptr<AVFrame, AvDelete>;
+using PacketPtr = std::unique_ptr<AVPacket, AvDelete>;
+using CodecPtr = std::unique_ptr<AVCodecContext, AvDelete>;
+using ScalerPtr = std::unique_ptr<SwsContext, AvDelete>;
+using ResamplerPtr = std::unique_ptr<SwrContext, AvDelete>;
+
+// Throws std::bad_alloc for null: the libraries' allocators fail for no other reason.
+template <class Owner>
+Owner Allocated(typename Owner::pointer object) {
+    if (!object) throw std::bad_alloc();
+    return Owner(object);
+}
+
+inline FramePtr NewFrame() {
+    return Allocated<FramePtr>(av_frame_alloc());
+}
+inline PacketPtr NewPacket() {
+    return Allocated<PacketPtr>(av_packet_alloc());
+}
+
+inline std::string AvText(int error) {
+    char text[AV_ERROR_MAX_STRING_SIZE] = {};
+    av_strerror(error, text, sizeof text);
+    return text;
+}
+
+// A dictionary of options; what a call did not take stays in it.
+class AvOptions {
+  public:
+    AvOptions() = default;
+    ~AvOptions() { av_dict_free(&m_entries); }
+    AvOptions(const AvOptions&) = delete;
+    AvOptions& operator=(const AvOptions&) = delete;
+
+    void Set(const char* name, const std::string& value) { av_dict_set(&m_entries, name, value.c_str(), 0); }
+    AVDictionary** Entries() { return &m_entries; }
+
+  private:
+    AVDictionary* m_entries = nullptr;
+};
+
+}  // namespace velmora::hosts

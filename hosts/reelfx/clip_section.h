@@ -1,0 +1,53 @@
+// The part of a clip that is rendered, as a source of pipeline items: its frames, and the packets of other
+// streams that play beside them.
+#pragma once
+
+#include <cstdint>
+#include <deque>
+#include <optional>
+
+#include "hosts/reelfx/frame_pipeline.h"
+#include "hosts/reelfx/media_reader.h"
+
+namespace velmora::hosts {
+
+struct SectionOptions {
+    std::int64_t firstFrame = 0;           // counted from 0
+    std::optional<std::int64_t> endFrame;  // the first that is left out
+    std::optional<double> start;           // seconds since the clip's first frame
+    std::optional<double> duration;        // seconds
+
+    [[nodiscard]] bool IsWholeClip() const { return firstFrame == 0 && !endFrame && !start && !duration; }
+};
+
+class ClipSection {
+  public:
+    // `reader` stands at its start and outlives the section. Jumps ahead where a start is given.
+    ClipSection(MediaReader& reader, const SectionOptions& options);
+
+    // Null at the section's end and when the user interrupts. Unless the section is the whole clip, the first
+    // item is a frame, and packets that lie before it are left out.
+    PipelineItemPtr Next();
+
+    // Frames that will come, as far as can be told; 0 when it cannot.
+    [[nodiscard]] std::int64_t FrameCountGuess() const;
+
+  private:
+    void TakeFrame(FramePtr frame);
+    void TakePacket(PacketPtr packet);
+    [[nodiscard]] bool IsBefore(std::int64_t index, double seconds) const;
+    [[nodiscard]] bool IsBehind(std::int64_t index, double seconds) const;
+    void Put(PacketPtr packet);
+
+    MediaReader& m_reader;
+    SectionOptions m_options;
+    std::deque<PipelineItemPtr> m_ready;
+    std::deque<PacketPtr> m_held;          // packets before the first frame
+    std::optional<double> m_firstSeconds;  // of the first frame in the section
+    std::optional<double> m_endSeconds;    // set when the section's last frame has come
+    std::int64_t m_nextIndex = 0;
+    bool m_hasJumped = false;
+    bool m_isOver = false;
+};
+
+}  // namespace velmora::hosts

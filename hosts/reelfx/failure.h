@@ -1,0 +1,27 @@
+// How a command ends: the exit codes, and the exception that carries one with its single line of text.
+#pragma once
+
+#include <stdexcept>
+#include <string>
+
+namespace velmora::hosts {
+
+enum ExitCode : int {
+    kExitDone = 0,
+    kExitInternal = 1,  // a fault of the program or of the machine, such as no memory
+    kExitUsage = 2,     // the command line: unknown effect, preset, parameter or option, value out of range
+    kExitInput = 3,     // the input cannot be read or holds no picture
+    kExitOutput = 4,    // the output exists already, cannot be written, or the disk is full
+    kExitInterrupted = 130,  // Ctrl-C
+};
+
+class Failure : public std::runtime_error {
+  public:
+    Failure(ExitCode code, const std::string& text) : std::runtime_error(text), m_code(code) {}
+    [[nodiscard]] ExitCode Code() const { return m_code; }
+
+  private:
+    ExitCode m_code;
+};
+
+}  // namespace velmora::hosts

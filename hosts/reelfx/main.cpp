@@ -1,0 +1,34 @@
+// reelfx: the effects on the command line, for any footage that the media libraries read.
+
+#include <cstdio>
+#include <exception>
+#include <new>
+
+#include "hosts/common/usage_error.h"
+#include "hosts/reelfx/command_line.h"
+#include "hosts/reelfx/interrupt.h"
+
+extern "C" {
+#include <libavutil/log.h>
+}
+
+int main(int count, char** arguments) {
+    using namespace velmora::hosts;
+    av_log_set_level(AV_LOG_QUIET);  // one clear line of our own instead
+    WatchInterrupts();
+    try {
+        return RunCommandLine(count, arguments);
+    } catch (const Failure& failure) {
+        std::fprintf(stderr, "reelfx: %s\n", failure.what());
+        return failure.Code();
+    } catch (const UsageError& error) {
+        std::fprintf(stderr, "reelfx: %s\n", error.what());
+        return kExitUsage;
+    } catch (const std::bad_alloc&) {
+        std::fprintf(stderr, "reelfx: memory is short\n");
+        return kExitInternal;
+    } catch (const std::exception& error) {
+        std::fprintf(stderr, "reelfx: %s\n", error.what());
+        return kExitInternal;
+    }
+}

@@ -1,0 +1,168 @@
+#include "hosts/reelfx/media_reader.h"
+
+#include <filesystem>
+
+#include "hosts/reelfx/failure.h"
+
+namespace velmora::hosts {
+namespace {
+
+// A file's name may look like an address ("take:2.mov"); existing files are taken as files.
+std::string AddressOf(const std::string& path) {
+    if (path == "-") return "pipe:0";
+    std::error_code ignored;
+    return std::filesystem::exists(path, ignored) ? "file:" + path : path;
+}
+
+const AVInputFormat* FormatOf(const InputOptions& options) {
+    if (options.rawSize) return av_find_input_format("rawvideo");
+    return options.path == "-" ? av_find_input_format("yuv4mpegpipe") : nullptr;
+}
+
+}  // namespace
+
+MediaReader::MediaReader(const InputOptions& options)
+    : m_name(options.path == "-" ? "standard input" : options.path) {
+    Open(options);
+    OpenDecoder();
+    while (!m_firstFrame && !m_ended) ReadMore();
+    if (!m_firstFrame) {
+        throw Failure(kExitInput, m_damaged > 0 ? m_name + ": no frame can be decoded"
+                                                : m_name + ": there is no frame in it");
+    }
+}
+
+void MediaReader::Open(const InputOptions& options) {
+    std::error_code ignored;
+    if (std::filesystem::is_directory(options.path, ignored)) {
+        throw Failure(kExitInput, m_name + ": is a folder; give a file or a pattern like frames-%03d.png");
+    }
+    AvOptions entries;
+    if (options.rawSize) {
+        entries.Set("pixel_format", "bgra");
+        entries.Set("video_size",
+                    std::to_string(options.rawSize->width) + "x" + std::to_string(options.rawSize->height));
+    }
+    if (options.rate) {
+        entries.Set("framerate", std::to_string(options.rate->numerator) + "/" +
+                                     std::to_string(options.rate->denominator));
+    }
+    AVFormatContext* container = nullptr;
+    const int error = avformat_open_input(&container, AddressOf(options.path).c_str(), FormatOf(options),
+                                          entries.Entries());
+    if (error < 0) throw Failure(kExitInput, m_name + ": cannot be read: " + AvText(error));
+    m_container.reset(container);
+    if (avformat_find_stream_info(container, nullptr) < 0) {
+        throw Failure(kExitInput, m_name + ": cannot be read: no stream is known");
+    }
+}
+
+void MediaReader::OpenDecoder() {
+    const AVCodec* codec = nullptr;
+    const int index = av_find_best_stream(m_container.get(), AVMEDIA_TYPE_VIDEO, -1, -1, &codec, 0);
+    if (index < 0 || !codec) throw Failure(kExitInput, m_name + ": has no picture that can be decoded");
+    m_stream = m_container->streams[index];
+    m_decoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
+    int error = avcodec_parameters_to_context(m_decoder.get(), m_stream->codecpar);
+    m_decoder->pkt_timebase = m_stream->time_base;
+    m_decoder->thread_count = 0;  // as many as the machine has; the decoded frames do not depend on it
+    if (error >= 0) error = avcodec_open2(m_decoder.get(), codec, nullptr);
+    if (error < 0) throw Failure(kExitInput, m_name + ": cannot be decoded: " + AvText(error));
+}
+
+MediaReader::Item MediaReader::Next() {
+    while (m_items.empty() && !m_ended) ReadMore();
+    if (m_items.empty()) return {};
+    Item item = std::move(m_items.front());
+    m_items.pop_front();
+    return item;
+}
+
+void MediaReader::ReadMore() {
+    PacketPtr packet = NewPacket();
+    const int error = av_read_frame(m_container.get(), packet.get());
+    if (error < 0) {
+        // A file that breaks off ends here like a whole one: what was there has been rendered.
+        m_ended = true;
+        if (!m_pictureStopped) Decode(nullptr);
+        return;
+    }
+    if (packet->stream_index != m_stream->index) {
+        m_items.push_back({nullptr, std::move(packet)});
+    } else if (!m_pictureStopped) {
+        Decode(packet.get());
+    }
+}
+
+void MediaReader::Decode(const AVPacket* packet) {
+    int error = avcodec_send_packet(m_decoder.get(), packet);
+    while (error == AVERROR(EAGAIN)) {
+        TakeFrames();
+        error = avcodec_send_packet(m_decoder.get(), packet);
+    }
+    if (error < 0 && error != AVERROR_EOF) ++m_damaged;
+    TakeFrames();
+}
+
+void MediaReader::TakeFrames() {
+    for (;;) {
+        FramePtr frame = NewFrame();
+        const int error = avcodec_receive_frame(m_decoder.get(), frame.get());
+        if (error == AVERROR(EAGAIN) || error == AVERROR_EOF) return;
+        if (error < 0) {
+            ++m_damaged;
+            return;
+        }
+        std::int64_t pts = frame->best_effort_timestamp;
+        if (pts == AV_NOPTS_VALUE || (m_lastPts != AV_NOPTS_VALUE && pts <= m_lastPts)) {
+            // No time, or time that stands still: one frame on by the rate.
+            const AVRational duration = av_inv_q(FrameRateGuess());
+            const std::int64_t step = av_rescale_q(1, duration, m_stream->time_base);
+            pts = m_lastPts == AV_NOPTS_VALUE ? 0 : m_lastPts + std::max<std::int64_t>(step, 1);
+        }
+        frame->pts = m_lastPts = pts;
+        if (!m_firstFrame) m_firstFrame = Allocated<FramePtr>(av_frame_clone(frame.get()));
+        m_items.push_back({std::move(frame), nullptr});
+    }
+}
+
+void MediaReader::SeekBefore(double seconds) {
+    const double tick = av_q2d(m_stream->time_base);
+    const auto target = m_firstFrame->pts + static_cast<std::int64_t>(seconds / tick);
+    if (av_seek_frame(m_container.get(), m_stream->index, target, AVSEEK_FLAG_BACKWARD) < 0) return;
+    avcodec_flush_buffers(m_decoder.get());
+    m_items.clear();
+    m_lastPts = AV_NOPTS_VALUE;
+    m_ended = false;
+}
+
+double MediaReader::SecondsOf(std::int64_t pts) const {
+    const AVRational base = m_stream->time_base;
+    return static_cast<double>(pts - m_firstFrame->pts) * base.num / base.den;
+}
+
+std::optional<double> MediaReader::SecondsOf(const AVPacket& packet) const {
+    const std::int64_t time = packet.pts != AV_NOPTS_VALUE ? packet.pts : packet.dts;
+    if (time == AV_NOPTS_VALUE) return std::nullopt;
+    const AVStream& stream = *m_container->streams[packet.stream_index];
+    return static_cast<double>(time) * av_q2d(stream.time_base) -
+           static_cast<double>(m_firstFrame->pts) * av_q2d(m_stream->time_base);
+}
+
+AVRational MediaReader::FrameRateGuess() const {
+    const AVRational rate = av_guess_frame_rate(m_container.get(), m_stream, nullptr);
+    return rate.num > 0 && rate.den > 0 ? rate : AVRational{25, 1};
+}
+
+std::int64_t MediaReader::FrameCountGuess() const {
+    if (m_stream->nb_frames > 0) return m_stream->nb_frames;
+    double seconds = 0.0;
+    if (m_stream->duration > 0) {
+        seconds = static_cast<double>(m_stream->duration) * av_q2d(m_stream->time_base);
+    } else if (m_container->duration > 0) {
+        seconds = static_cast<double>(m_container->duration) / AV_TIME_BASE;
+    }
+    return static_cast<std::int64_t>(seconds * av_q2d(FrameRateGuess()) + 0.5);
+}
+
+}  // namespace velmora::hosts

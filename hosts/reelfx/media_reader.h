@@ -1,0 +1,82 @@
+// Reads a clip: the frames of its picture in order of presentation, decoded, and the packets of its other
+// streams as they come. Reads whatever the media libraries read: files, image sequences ("frames-%03d.png"),
+// stills, addresses; "-" is YUV4MPEG2 on standard input; raw BGRA where a size is given.
+//
+// Times count in seconds from the presentation of the clip's first frame.
+#pragma once
+
+#include <deque>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "hosts/common/number_text.h"
+#include "hosts/reelfx/av_handles.h"
+
+namespace velmora::hosts {
+
+struct InputOptions {
+    std::string path;
+    std::optional<FrameSize> rawSize;  // the input is raw BGRA of this size
+    std::optional<FrameRate> rate;     // of raw input and image sequences
+};
+
+class MediaReader {
+  public:
+    // One of the two is set; neither at the end.
+    struct Item {
+        FramePtr frame;    // of the picture; pts in the stream's time base, strictly increasing
+        PacketPtr packet;  // of another stream
+    };
+
+    // Opens the input and decodes its first frame. Throws Failure (kExitInput) when it cannot be read or has
+    // no frame.
+    explicit MediaReader(const InputOptions& options);
+
+    Item Next();
+
+    // Goes on reading somewhere before `seconds` if the input can jump; else from where it is. The caller
+    // skips what comes too early.
+    void SeekBefore(double seconds);
+
+    // The picture is not decoded any more; packets of other streams still come.
+    void StopPicture() { m_pictureStopped = true; }
+
+    [[nodiscard]] AVFormatContext& Container() const { return *m_container; }
+    [[nodiscard]] AVStream& Picture() const { return *m_stream; }
+    // Size, pixel format and colours are those of the first frame.
+    [[nodiscard]] const AVFrame& FirstFrame() const { return *m_firstFrame; }
+    [[nodiscard]] double SecondsOf(std::int64_t pts) const;
+    // Time of a packet of any stream, for cutting; nothing when it carries none.
+    [[nodiscard]] std::optional<double> SecondsOf(const AVPacket& packet) const;
+    [[nodiscard]] AVRational FrameRateGuess() const;
+    // Frames in the clip as far as the container tells; 0 when it does not.
+    [[nodiscard]] std::int64_t FrameCountGuess() const;
+    [[nodiscard]] const std::string& Name() const { return m_name; }
+    // Packets that could not be decoded and were left out.
+    [[nodiscard]] std::int64_t DamagedPackets() const { return m_damaged; }
+
+  private:
+    struct CloseInput {
+        void operator()(AVFormatContext* container) const { avformat_close_input(&container); }
+    };
+
+    void Open(const InputOptions& options);
+    void OpenDecoder();
+    void ReadMore();  // moves at least one packet on
+    void Decode(const AVPacket* packet);
+    void TakeFrames();
+
+    std::string m_name;
+    std::unique_ptr<AVFormatContext, CloseInput> m_container;
+    AVStream* m_stream = nullptr;
+    CodecPtr m_decoder;
+    std::deque<Item> m_items;  // read ahead
+    FramePtr m_firstFrame;
+    std::int64_t m_lastPts = AV_NOPTS_VALUE;
+    std::int64_t m_damaged = 0;
+    bool m_pictureStopped = false;
+    bool m_ended = false;
+};
+
+}  // namespace velmora::hosts

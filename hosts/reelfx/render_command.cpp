@@ -1,0 +1,117 @@
+#include "hosts/reelfx/render_command.h"
+
+#include <cstdio>
+#include <thread>
+
+#include "hosts/common/digest.h"
+#include "hosts/reelfx/frame_worker.h"
+#include "hosts/reelfx/interrupt.h"
+#include "hosts/reelfx/output_place.h"
+#include "hosts/reelfx/picture_turn.h"
+#include "hosts/reelfx/progress.h"
+
+namespace velmora::hosts {
+namespace {
+
+class RenderRun {
+  public:
+    explicit RenderRun(const RenderOptions& options)
+        : m_options(options), m_choice(options.effect), m_reader(options.input) {
+        if (options.output) {
+            m_place.emplace(options.output->path, options.mayOverwrite);
+            m_writer.emplace(*options.output, m_place->Address(), m_reader, options.withSound);
+            if (options.section.firstFrame > 0) m_writer->NumberImagesFrom(options.section.firstFrame + 1);
+            m_writer->Begin();
+        }
+    }
+
+    ExitCode Run() {
+        RenderAll();
+        if (m_frames == 0 && Interrupts() == 0) FailEmpty();
+        if (m_reader.DamagedPackets() > 0) {
+            std::fprintf(stderr, "reelfx: %s: damaged in %lld places; what could be decoded was rendered\n",
+                         m_reader.Name().c_str(), static_cast<long long>(m_reader.DamagedPackets()));
+        }
+        if (Interrupts() == 0) {
+            if (m_writer) {
+                m_writer->Finish();
+                m_place->Keep();
+            }
+            return kExitDone;
+        }
+        FinishInterrupted();
+        return kExitInterrupted;
+    }
+
+  private:
+    void RenderAll() {
+        ClipSection section(m_reader, m_options.section);
+        Progress progress(section.FrameCountGuess(), m_options.isQuiet);
+        FramePipeline pipeline([&] { return section.Next(); }, MakeWorkers());
+        while (const PipelineItemPtr item = pipeline.Next()) {
+            if (Interrupts() > 1) throw Failure(kExitInterrupted, "interrupted; nothing was kept");
+            Write(*item);
+            if (!item->packet) progress.Update(++m_frames);
+        }
+    }
+
+    std::vector<FramePipeline::Worker> MakeWorkers() {
+        unsigned count = m_options.threads > 0 ? static_cast<unsigned>(m_options.threads)
+                                               : std::max(1u, std::thread::hardware_concurrency());
+        // A running sequence of random numbers goes through the frames one after the other.
+        if (m_choice.IsSequence()) count = 1;
+        const AVFrame& first = m_reader.FirstFrame();
+        std::vector<FramePipeline::Worker> workers;
+        for (unsigned i = 0; i < count; ++i) {
+            auto worker = std::make_shared<FrameWorker>(
+                m_choice.NewSession(), m_writer ? &*m_writer : nullptr, FrameSize{first.width, first.height},
+                QuarterTurnsOf(m_reader.Picture()), m_options.withDigests);
+            workers.push_back([worker](PipelineItem& item) { worker->Work(item); });
+        }
+        return workers;
+    }
+
+    void Write(PipelineItem& item) {
+        if (item.packet) {
+            if (m_writer) m_writer->WritePacket(*item.packet);
+            return;
+        }
+        if (m_options.withDigests) std::printf("%s\n", DigestLine(item.index, item.digest).c_str());
+        if (!m_writer) return;
+        if (m_frames == 0 && !m_options.section.IsWholeClip()) m_writer->StartAt(item.frame->pts);
+        m_writer->WriteFrame(std::move(item.frame));
+    }
+
+    // A file that stood there before is worth more than a part of its successor.
+    void FinishInterrupted() {
+        if (!m_writer || m_frames == 0 || m_place->ReplacesFile()) {
+            std::fprintf(stderr, "reelfx: interrupted; nothing was written\n");
+            return;
+        }
+        m_writer->Finish();
+        m_place->Keep();
+        std::fprintf(stderr, "reelfx: interrupted; %s holds the first %lld frames\n", m_place->Name().c_str(),
+                     static_cast<long long>(m_frames));
+    }
+
+    [[noreturn]] void FailEmpty() const {
+        throw Failure(kExitInput, m_reader.Name() +
+                                      ": there is no frame in the part asked for; the clip has " +
+                                      std::to_string(m_reader.FrameCountGuess()) + " frames");
+    }
+
+    const RenderOptions& m_options;
+    EffectChoice m_choice;
+    MediaReader m_reader;
+    std::optional<OutputPlace> m_place;
+    std::optional<MediaWriter> m_writer;
+    std::int64_t m_frames = 0;
+};
+
+}  // namespace
+
+ExitCode RunRender(const RenderOptions& options) {
+    return RenderRun(options).Run();
+}
+
+}  // namespace velmora::hosts

@@ -1,0 +1,29 @@
+// `reelfx render`: a clip through an effect.
+#pragma once
+
+#include <optional>
+
+#include "hosts/reelfx/clip_section.h"
+#include "hosts/reelfx/effect_choice.h"
+#include "hosts/reelfx/encoder_choice.h"
+#include "hosts/reelfx/failure.h"
+#include "hosts/reelfx/media_reader.h"
+
+namespace velmora::hosts {
+
+struct RenderOptions {
+    InputOptions input;
+    EffectOptions effect;
+    SectionOptions section;
+    std::optional<OutputOptions> output;  // none: digests only
+    int threads = 0;                      // 0: as many as the machine has
+    bool mayOverwrite = false;
+    bool withSound = true;
+    bool withDigests = false;  // a line for each frame on standard output
+    bool isQuiet = false;      // no progress
+};
+
+// Throws Failure or UsageError.
+ExitCode RunRender(const RenderOptions& options);
+
+}  // namespace velmora::hosts

@@ -1,0 +1,84 @@
+#include "hosts/reelhost/frame_stream.h"
+
+#include <cstdio>
+#include <fcntl.h>
+#include <io.h>
+#include <stdexcept>
+
+#include "hosts/common/usage_error.h"
+
+namespace velmora::hosts {
+
+FrameInput::FrameInput(std::optional<FrameSize> rawSize, std::optional<FrameRate> rate)
+    : m_isRaw(rawSize.has_value()) {
+    _setmode(_fileno(stdin), _O_BINARY);
+    if (m_isRaw) {
+        m_format.size = *rawSize;
+    } else {
+        if (!ReadLine(m_header)) throw UsageError("standard input is empty");
+        m_format = ParseY4mHeader(m_header);
+        m_planes.resize(m_format.FrameBytes());
+    }
+    if (rate) m_format.rate = *rate;
+}
+
+bool FrameInput::ReadLine(std::string& line) {
+    constexpr std::size_t kLongest = 1024;
+    line.clear();
+    for (int c = std::getchar(); c != '\n'; c = std::getchar()) {
+        if (c == EOF) return false;
+        if (line.size() == kLongest) throw UsageError("the input is not a YUV4MPEG2 stream");
+        line += static_cast<char>(c);
+    }
+    return true;
+}
+
+bool FrameInput::ReadBytes(std::vector<std::uint8_t>& bytes) {
+    const std::size_t count = std::fread(bytes.data(), 1, bytes.size(), stdin);
+    if (count != bytes.size() && (count != 0 || !m_isRaw)) {
+        throw UsageError("the input ends inside a frame");
+    }
+    return count != 0;
+}
+
+bool FrameInput::Read(std::vector<std::uint8_t>& bgra) {
+    bgra.resize(static_cast<std::size_t>(m_format.size.width) *
+                static_cast<std::size_t>(m_format.size.height) * 4);
+    if (m_isRaw) return ReadBytes(bgra);
+    std::string line;
+    if (!ReadLine(line)) return false;
+    if (!line.starts_with("FRAME")) throw UsageError("the YUV4MPEG2 stream is damaged");
+    ReadBytes(m_planes);
+    Y4mToBgra(m_format, m_planes.data(), bgra.data());
+    return true;
+}
+
+FrameOutput::FrameOutput(const FrameInput& input) : m_isRaw(input.m_isRaw), m_format(input.m_format) {
+    _setmode(_fileno(stdout), _O_BINARY);
+    if (m_isRaw) return;
+    m_planes.resize(m_format.FrameBytes());
+    WriteBytes(input.m_header.data(), input.m_header.size());
+    WriteBytes("\n", 1);
+}
+
+void FrameOutput::WriteBytes(const void* bytes, std::size_t count) {
+    if (std::fwrite(bytes, 1, count, stdout) != count) {
+        throw std::runtime_error("standard output does not take the frame");
+    }
+}
+
+void FrameOutput::Write(const std::vector<std::uint8_t>& bgra) {
+    if (m_isRaw) {
+        WriteBytes(bgra.data(), bgra.size());
+        return;
+    }
+    BgraToY4m(m_format, bgra.data(), m_planes.data());
+    WriteBytes("FRAME\n", 6);
+    WriteBytes(m_planes.data(), m_planes.size());
+}
+
+void FrameOutput::Finish() {
+    if (std::fflush(stdout) != 0) throw std::runtime_error("standard output does not take the frame");
+}
+
+}  // namespace velmora::hosts

@@ -1,0 +1,52 @@
+// Frames from standard input and to standard output: raw BGRA, or YUV4MPEG2 where no size is given.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "hosts/common/number_text.h"
+#include "hosts/common/y4m.h"
+
+namespace velmora::hosts {
+
+class FrameInput {
+  public:
+    // `rawSize` none: reads a YUV4MPEG2 header, which tells size and rate. Throws UsageError when there is none.
+    FrameInput(std::optional<FrameSize> rawSize, std::optional<FrameRate> rate);
+
+    [[nodiscard]] FrameSize Size() const { return m_format.size; }
+    [[nodiscard]] FrameRate Rate() const { return m_format.rate; }
+
+    // False at the end. Throws UsageError when the stream ends inside a frame.
+    bool Read(std::vector<std::uint8_t>& bgra);
+
+  private:
+    friend class FrameOutput;
+    bool ReadLine(std::string& line);
+    bool ReadBytes(std::vector<std::uint8_t>& bytes);
+
+    bool m_isRaw;
+    Y4mFormat m_format;
+    std::string m_header;
+    std::vector<std::uint8_t> m_planes;
+};
+
+// Writes in the input's format.
+class FrameOutput {
+  public:
+    explicit FrameOutput(const FrameInput& input);
+    // Throws std::runtime_error when standard output does not take the frame.
+    void Write(const std::vector<std::uint8_t>& bgra);
+    void Finish();
+
+  private:
+    void WriteBytes(const void* bytes, std::size_t count);
+
+    bool m_isRaw;
+    Y4mFormat m_format;
+    std::vector<std::uint8_t> m_planes;
+};
+
+}  // namespace velmora::hosts

@@ -1,0 +1,32 @@
+// The command line of reelhost.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "hosts/common/number_text.h"
+
+namespace velmora::hosts {
+
+enum class HostMode { kRender, kList, kAllPresets, kHelp };
+
+struct HostOptions {
+    HostMode mode = HostMode::kRender;
+    std::string dll;     // empty: beside the program
+    std::string effect;  // kAllPresets: may be "all"
+    std::optional<std::string> preset;
+    std::vector<std::string> settings;
+    std::optional<FrameSize> size;  // raw BGRA
+    std::optional<FrameRate> rate;
+    std::optional<std::int64_t> frameLimit;
+    bool withDigests = false;
+};
+
+// Throws UsageError.
+HostOptions ReadHostOptions(int count, char** arguments);
+
+extern const char* const kHostHelp;
+
+}  // namespace velmora::hosts
