@@ -28,12 +28,17 @@ class FloatGuard {
     FloatGuard& operator=(const FloatGuard&) = delete;
 
   private:
+    // By hand: the compiler's own way may pop the flags to another place than it reads them from. A leaf
+    // function's locals can lie below the stack pointer on x86-64, so the push keeps its distance.
     static std::uintptr_t ProcessorFlags() noexcept {
+        std::uintptr_t flags;
 #if defined(__x86_64__)
-        return __builtin_ia32_readeflags_u64();
+        __asm__ __volatile__("lea -128(%%rsp), %%rsp\n\tpushf\n\tpop %0\n\tlea 128(%%rsp), %%rsp"
+                             : "=r"(flags));
 #else
-        return __builtin_ia32_readeflags_u32();
+        __asm__ __volatile__("pushf\n\tpop %0" : "=r"(flags));
 #endif
+        return flags;
     }
 
     static constexpr std::uintptr_t kDirectionFlag = 0x400;

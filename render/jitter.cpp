@@ -10,15 +10,15 @@ namespace {
 
 static_assert(std::endian::native == std::endian::little, "border words are written as bytes");
 
-void FillPixels(Bgra* pixels, std::int32_t count, std::uint32_t colour) noexcept {
-    for (std::int32_t x = 0; x < count; ++x) std::memcpy(pixels + x, &colour, sizeof colour);
-}
-
 Bgra* Pixel(const ImageView& view, std::int32_t row, std::int32_t column) noexcept {
     return reinterpret_cast<Bgra*>(view.base + std::ptrdiff_t{view.rowStep} * row) + column;
 }
 
 }  // namespace
+
+void FillPixels(Bgra* pixels, std::int32_t count, std::uint32_t colour) noexcept {
+    for (std::int32_t x = 0; x < count; ++x) std::memcpy(pixels + x, &colour, sizeof colour);
+}
 
 void FillRectangle(const ImageView& view, const Rectangle& rectangle, std::uint32_t colour) noexcept {
     if (rectangle.IsEmpty()) return;
@@ -88,21 +88,24 @@ void JitterStage::Apply(FrameContext& context) const noexcept {
     CopyRectangle(output, row, column, region, *input, picture, input->Region());
 }
 
+ShiftedRow JitterStage::Shifted(const ImageView& source, std::int32_t y) const noexcept {
+    const std::int32_t width = source.Region().Width();
+    const std::int32_t row = y - m_dy;
+    if (row < 0 || row >= source.Region().Height()) return {nullptr, 0, 0, m_border};
+    const std::int32_t band = std::min(m_dx < 0 ? -m_dx : m_dx, width);
+    const Bgra* pixels = source.Row(row);
+    if (m_dx < 0) return {pixels + band, 0, width - band, m_border};
+    return {pixels, band, width - band, m_border};
+}
+
 const Bgra* JitterStage::Row(const ImageView& source, Bgra* out, std::int32_t y) const noexcept {
     const std::int32_t width = source.Region().Width();
-    const std::int32_t sourceRow = y - m_dy;
-    if (sourceRow < 0 || sourceRow >= source.Region().Height()) {
-        FillPixels(out, width, m_border);
-        return out;
-    }
-    const Bgra* row = source.Row(sourceRow);
-    if (m_dx == 0) return row;
-    const std::int32_t band = std::min(m_dx < 0 ? -m_dx : m_dx, width);
-    const std::int32_t kept = width - band;
-    const std::int32_t bandStart = m_dx < 0 ? kept : 0;
-    std::memcpy(out + (m_dx < 0 ? 0 : band), row + (m_dx < 0 ? band : 0),
-                static_cast<std::size_t>(kept) * sizeof(Bgra));
-    FillPixels(out + bandStart, band, m_border);
+    const ShiftedRow row = Shifted(source, y);
+    if (row.count == width) return row.pixels;
+    FillPixels(out, row.start, row.border);
+    if (row.count != 0)
+        std::memcpy(out + row.start, row.pixels, static_cast<std::size_t>(row.count) * sizeof(Bgra));
+    FillPixels(out + row.start + row.count, width - row.start - row.count, row.border);
     return out;
 }
 

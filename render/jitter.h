@@ -22,6 +22,18 @@ void CopyRectangle(const ImageView& destination, std::int32_t row, std::int32_t 
                    const Rectangle& destinationBounds, const ImageView& source, Rectangle rectangle,
                    const Rectangle& sourceBounds) noexcept;
 
+// A row of the shaken picture as pixels of the source and border: `count` pixels from `pixels` go to column
+// `start`, the border takes the columns beside them.
+struct ShiftedRow {
+    const Bgra* pixels;
+    std::int32_t start;
+    std::int32_t count;
+    std::uint32_t border;
+};
+
+// Writes the word to `count` pixels.
+void FillPixels(Bgra* pixels, std::int32_t count, std::uint32_t colour) noexcept;
+
 class JitterStage {
   public:
     JitterStage() noexcept = default;
@@ -35,6 +47,9 @@ class JitterStage {
     // The whole frame: paints the bands, then copies the picture, reading the current input and claiming
     // the destination.
     void Apply(FrameContext& context) const noexcept;
+
+    // Row `y` of the shaken picture of `source`'s region.
+    ShiftedRow Shifted(const ImageView& source, std::int32_t y) const noexcept;
 
     // Row `y` of the shaken picture, width pixels of `source`'s region: written to `out`, or a pointer into
     // the source where the row lies there as it is wanted.

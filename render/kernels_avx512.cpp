@@ -66,33 +66,37 @@ VM_AVX512 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_
     }
 }
 
-// Four pixels at a time. Adding a half rounded down never lifts a number to the next whole one.
+// One channel of sixteen pixels, at `shift` of their words. Adding a half rounded down never lifts a number to
+// the next whole one.
+template <int kShift>
+VM_AVX512 inline __m512i Lightened(__m512i pixels, __m512 fraction) noexcept {
+    const __m512i byte = _mm512_set1_epi32(255);
+    const __m512i channel = _mm512_and_si512(_mm512_srli_epi32(pixels, kShift), byte);
+    const __m512 product = _mm512_mul_ps(fraction, _mm512_cvtepi32_ps(_mm512_sub_epi32(byte, channel)));
+    const __m512 lifted =
+        _mm512_add_round_ps(product, _mm512_set1_ps(0.5f), _MM_FROUND_TO_NEG_INF | _MM_FROUND_NO_EXC);
+    // The sum stays below 256, so it can be added in place without a carry into the next channel.
+    return _mm512_slli_epi32(_mm512_cvttps_epi32(lifted), kShift);
+}
+
 VM_AVX512 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
                        const float* fractions) noexcept {
-    constexpr __mmask16 kColour = 0x7777;
-    const __m512i pixelOfLane = _mm512_setr_epi32(0, 0, 0, 0, 1, 1, 1, 1, 2, 2, 2, 2, 3, 3, 3, 3);
-    const __m512i white = _mm512_set1_epi32(255);
-    const __m512 half = _mm512_set1_ps(0.5f);
-    std::int32_t x = 0;
-    for (; x + 4 <= width; x += 4) {
-        const __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + x));
-        const __m128i worn = _mm_cvtsi32_si128(static_cast<int>(
-            bytes[x] | bytes[x + 1] << 8 | bytes[x + 2] << 16 | static_cast<unsigned>(bytes[x + 3]) << 24));
-        __m128i result = pixels;
-        if (_mm_cvtsi128_si32(worn) != 0) {
-            const __m128 four = _mm_i32gather_ps(fractions, _mm_cvtepu8_epi32(worn), 4);
-            const __m512 fraction =
-                _mm512_maskz_permutexvar_ps(kColour, pixelOfLane, _mm512_castps128_ps512(four));
-            const __m512i channels = _mm512_cvtepu8_epi32(pixels);
-            const __m512 product =
-                _mm512_mul_ps(fraction, _mm512_cvtepi32_ps(_mm512_sub_epi32(white, channels)));
-            const __m512 lifted =
-                _mm512_add_round_ps(product, half, _MM_FROUND_TO_NEG_INF | _MM_FROUND_NO_EXC);
-            result = _mm512_cvtepi32_epi8(_mm512_add_epi32(channels, _mm512_cvttps_epi32(lifted)));
+    for (std::int32_t x = 0; x < width; x += kPixels) {
+        const __mmask16 tail = Tail(width - x);
+        const __m128i worn = _mm_maskz_loadu_epi8(tail, bytes + x);
+        const __mmask16 touched = _mm_test_epi8_mask(worn, worn);
+        if (touched == 0 && in == out) continue;
+        const __m512i pixels = _mm512_maskz_loadu_epi32(tail, in + x);
+        __m512i result = pixels;
+        if (touched != 0) {
+            const __m512 fraction = _mm512_mask_i32gather_ps(_mm512_setzero_ps(), touched,
+                                                             _mm512_cvtepu8_epi32(worn), fractions, 4);
+            result = _mm512_add_epi32(result, Lightened<0>(pixels, fraction));
+            result = _mm512_add_epi32(result, Lightened<8>(pixels, fraction));
+            result = _mm512_add_epi32(result, Lightened<16>(pixels, fraction));
         }
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), result);
+        _mm512_mask_storeu_epi32(out + x, tail, result);
     }
-    kPlainKernels.wear(in + x, out + x, width - x, bytes + x, fractions);
 }
 
 VM_AVX512 void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {

@@ -38,8 +38,7 @@ void RenderByRows(FrameContext& context, const FramePlan& plan, Form form) noexc
     const ImageView& source = context.Source();
     const ImageView& destination = context.ClaimDestination();
     for (std::int32_t y = 0; y < context.Height(); ++y) {
-        Bgra* out = destination.Row(y);
-        program.Run(plan.jitter.Row(source, out, y), out, context.Width(), y);
+        program.Run(plan.jitter.Shifted(source, y), destination.Row(y), context.Width(), y);
     }
 }
 

@@ -50,43 +50,65 @@ bool RowProgram::IsEmpty() const noexcept {
            !m_plan.scratches.IsActive() && !m_plan.spots.IsActive();
 }
 
-void RowProgram::Run(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
+// Glow needs the pixel at its place; the first step behind the source otherwise takes the row from there.
+void RowProgram::Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     if (m_plan.glow.IsActive()) {
-        m_plan.glow.Row(in, out, width, y);
-        in = out;
+        const bool isWhole = in.count == width;
+        if (!isWhole) FetchThrough(in, out, width, m_kernels.copy);
+        m_plan.glow.Row(isWhole ? in.pixels : out, out, width, y);
+        if (m_hasBefore) m_kernels.tables(out, out, width, m_before);
+        if (m_mixes) Mix(out, out, width);
+        if (m_hasAfter) m_kernels.tables(out, out, width, m_after);
+    } else {
+        FetchThroughTables(in, out, width);
     }
-    if (m_hasBefore) {
-        m_kernels.tables(in, out, width, m_before);
-        in = out;
-    }
-    if (m_mixes) {
-        const std::int32_t weight = m_plan.colour.Weight();
-        (FitsKernel(weight) ? m_kernels : kPlainKernels).mix(in, out, width, weight);
-        in = out;
-    }
-    if (m_hasAfter) {
-        m_kernels.tables(in, out, width, m_after);
-        in = out;
-    }
-    if (m_plan.wear.IsActive()) {
-        RunWear(in, out, width, y);
-        in = out;
-    }
-    if (m_plan.scratches.IsActive()) {
-        m_plan.scratches.Row(in, out, width, y);
-        in = out;
-    }
-    if (m_plan.spots.IsActive()) {
-        m_plan.spots.Row(in, out, width, y);
-        in = out;
-    }
-    if (in != out) m_kernels.copy(in, out, width);
+    if (m_plan.wear.IsActive()) Wear(out, width, y);
+    if (m_plan.scratches.IsActive()) m_plan.scratches.Row(out, out, width, y);
+    if (m_plan.spots.IsActive()) m_plan.spots.Row(out, out, width, y);
 }
 
-void RowProgram::RunWear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
-    if (m_plan.wear.BlueOnly()) return m_plan.wear.Row(in, out, width, y);
+void RowProgram::FetchThroughTables(const ShiftedRow& in, Bgra* out, std::int32_t width) const noexcept {
+    const auto tables = [this](const ChannelTables& t) {
+        return [this, &t](const Bgra* from, Bgra* to, std::int32_t count) {
+            m_kernels.tables(from, to, count, t);
+        };
+    };
+    const auto mix = [this](const Bgra* from, Bgra* to, std::int32_t count) { Mix(from, to, count); };
+    if (m_hasBefore) {
+        FetchThrough(in, out, width, tables(m_before));
+        Mix(out, out, width);
+    } else if (m_mixes) {
+        FetchThrough(in, out, width, mix);
+    } else if (m_hasAfter) {
+        return FetchThrough(in, out, width, tables(m_after));
+    } else if (in.pixels != out || in.count != width) {
+        FetchThrough(in, out, width, m_kernels.copy);
+    }
+    if (m_hasAfter) m_kernels.tables(out, out, width, m_after);
+}
+
+template <typename Step>
+void RowProgram::FetchThrough(const ShiftedRow& in, Bgra* out, std::int32_t width,
+                              Step&& step) const noexcept {
+    if (in.count != 0) step(in.pixels, out + in.start, in.count);
+    const auto border = [&](std::int32_t start, std::int32_t count) {
+        if (count == 0) return;
+        FillPixels(out + start, count, in.border);
+        step(out + start, out + start, count);
+    };
+    border(0, in.start);
+    border(in.start + in.count, width - in.start - in.count);
+}
+
+void RowProgram::Mix(const Bgra* in, Bgra* out, std::int32_t width) const noexcept {
+    const std::int32_t weight = m_plan.colour.Weight();
+    (FitsKernel(weight) ? m_kernels : kPlainKernels).mix(in, out, width, weight);
+}
+
+void RowProgram::Wear(Bgra* row, std::int32_t width, std::int32_t y) const noexcept {
+    if (m_plan.wear.BlueOnly()) return m_plan.wear.Row(row, row, width, y);
     m_plan.wear.ForEachStrip(width, y, [&](std::int32_t x, std::int32_t count, const std::uint8_t* bytes) {
-        m_kernels.wear(in + x, out + x, count, bytes, m_plan.wear.Fractions());
+        m_kernels.wear(row + x, row + x, count, bytes, m_plan.wear.Fractions());
     });
 }
 

@@ -16,15 +16,17 @@ class RowProgram {
 
     // True when a row leaves as it came in.
     [[nodiscard]] bool IsEmpty() const noexcept;
-    // Row `y`: `in` (may be `out`) to `out`.
-    void Run(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
-    void Copy(const Bgra* in, Bgra* out, std::int32_t width) const noexcept {
-        m_kernels.copy(in, out, width);
-    }
+    // Row `y`. The source pixels of the row may lie where they go to, but not overlap it otherwise.
+    void Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
   private:
     void PlanTables() noexcept;
-    void RunWear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
+    // Tables and mix, the first of them straight from the source: the pixels cross the memory once.
+    void FetchThroughTables(const ShiftedRow& in, Bgra* out, std::int32_t width) const noexcept;
+    template <typename Step>
+    void FetchThrough(const ShiftedRow& in, Bgra* out, std::int32_t width, Step&& step) const noexcept;
+    void Mix(const Bgra* in, Bgra* out, std::int32_t width) const noexcept;
+    void Wear(Bgra* row, std::int32_t width, std::int32_t y) const noexcept;
 
     const FramePlan& m_plan;
     const RowKernels& m_kernels;
