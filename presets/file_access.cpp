@@ -1,0 +1,53 @@
+#include "presets/file_access.h"
+
+#include "presets/file_system.h"
+
+namespace velmora {
+
+namespace {
+
+// Reports what buffered writing finds out only at the end: a full disk.
+bool WriteAndClose(std::FILE* file, const TextWriter& write) {
+    const bool isWritten = write(file) && std::fflush(file) == 0 && std::ferror(file) == 0;
+    return std::fclose(file) == 0 && isWritten;
+}
+
+bool WriteInPlace(const NativePath& path, const TextWriter& write) {
+    std::FILE* file = OpenForWriting(path);
+    return file != nullptr && WriteAndClose(file, write);
+}
+
+}  // namespace
+
+bool ReadWholeFile(const char* fileName, std::size_t limit, std::string* content) {
+    NativePath path;
+    if (!MakeNativePath(fileName, &path)) return false;
+    std::FILE* file = OpenForReading(path);
+    if (file == nullptr) return false;
+    content->clear();
+    char block[16384];
+    std::size_t count = 0;
+    while (content->size() <= limit && (count = std::fread(block, 1, sizeof block, file)) > 0) {
+        content->append(block, count);
+    }
+    const bool isRead = std::ferror(file) == 0;
+    std::fclose(file);
+    return isRead && !content->empty() && content->size() <= limit;
+}
+
+bool ReplaceTextFile(const char* fileName, const TextWriter& write) {
+    NativePath path;
+    if (!MakeNativePath(fileName, &path)) return false;
+    NativePath beside;
+    std::FILE* file = CreateBeside(path, &beside);
+    if (file == nullptr) return WriteInPlace(path, write);
+    if (!WriteAndClose(file, write)) {
+        Remove(beside);
+        return false;
+    }
+    if (RenameOver(beside, path)) return true;
+    Remove(beside);
+    return WriteInPlace(path, write);
+}
+
+}  // namespace velmora

@@ -1,0 +1,68 @@
+#include "presets/file_system.h"
+
+#include <fcntl.h>
+#include <io.h>
+#include <sys/stat.h>
+#include <windows.h>
+
+#include <cstring>
+
+#include "support/code_page.h"
+
+namespace velmora {
+
+bool MakeNativePath(const char* fileName, NativePath* path) {
+    // The C library's narrow functions would take the name for the console's code page in some hosts.
+    if (fileName == nullptr) return false;
+    const auto length = static_cast<std::uint32_t>(std::strlen(fileName));
+    const std::uint32_t needed = WidenText(fileName, length, nullptr, 0);
+    if (needed == 0) return false;
+    path->resize(needed);
+    return WidenText(fileName, length, reinterpret_cast<char16_t*>(path->data()), needed) == needed;
+}
+
+std::FILE* OpenForReading(const NativePath& path) {
+    return _wfopen(path.c_str(), L"rb");
+}
+
+// "t", as the host may have made binary files the default.
+std::FILE* OpenForWriting(const NativePath& path) {
+    return _wfopen(path.c_str(), L"wt");
+}
+
+std::FILE* CreateBeside(const NativePath& path, NativePath* beside) {
+    const DWORD attributes = GetFileAttributesW(path.c_str());
+    const DWORD unfit = FILE_ATTRIBUTE_DIRECTORY | FILE_ATTRIBUTE_DEVICE | FILE_ATTRIBUTE_READONLY |
+                        FILE_ATTRIBUTE_REPARSE_POINT;  // the last: a link stays one
+    if (attributes != INVALID_FILE_ATTRIBUTES && (attributes & unfit) != 0) return nullptr;
+    const std::size_t folderEnd = path.find_last_of(L"\\/:");
+    const NativePath folder = folderEnd == NativePath::npos ? L"" : path.substr(0, folderEnd + 1);
+    const DWORD start = GetTickCount() ^ (GetCurrentProcessId() << 16);
+    for (DWORD attempt = 0; attempt < 100; ++attempt) {
+        wchar_t name[16];
+        wsprintfW(name, L"~%08lx.tmp", static_cast<unsigned long>(start + attempt));
+        *beside = folder + name;
+        const int descriptor = _wopen(
+            beside->c_str(), _O_CREAT | _O_EXCL | _O_WRONLY | _O_TEXT | _O_NOINHERIT, _S_IREAD | _S_IWRITE);
+        if (descriptor >= 0) {
+            std::FILE* file = _fdopen(descriptor, "wt");
+            if (file == nullptr) {
+                _close(descriptor);
+                Remove(*beside);
+            }
+            return file;
+        }
+        if (errno != EEXIST) return nullptr;
+    }
+    return nullptr;
+}
+
+bool RenameOver(const NativePath& beside, const NativePath& path) {
+    return MoveFileExW(beside.c_str(), path.c_str(), MOVEFILE_REPLACE_EXISTING | MOVEFILE_WRITE_THROUGH) != 0;
+}
+
+void Remove(const NativePath& path) {
+    DeleteFileW(path.c_str());
+}
+
+}  // namespace velmora

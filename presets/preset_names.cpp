@@ -1,0 +1,67 @@
+#include "presets/preset_names.h"
+
+#include <algorithm>
+#include <cstring>
+#include <string_view>
+
+namespace velmora {
+
+namespace {
+
+struct LibraryCode {
+    const char* libraryName;
+    std::u16string_view code;
+};
+
+// Other libraries of the family would have their rows here.
+constexpr LibraryCode kLibraryCodes[] = {
+    {"Velmora Reel Effects", u"rel"},
+};
+constexpr std::u16string_view kUnknownLibrary = u"unk";
+
+std::u16string_view FindLibraryCode(const char* libraryName) {
+    for (const LibraryCode& row : kLibraryCodes) {
+        if (std::strcmp(row.libraryName, libraryName) == 0) return row.code;
+    }
+    return kUnknownLibrary;
+}
+
+char16_t* Put(char16_t* out, std::u16string_view text) {
+    return std::copy(text.begin(), text.end(), out);
+}
+
+// The part of a label word that leaves `room` characters unexceeded, without half a character at its end.
+std::u16string_view Cut(std::u16string_view word, std::size_t room) {
+    if (word.size() <= room) return word;
+    const bool isSplit = room > 0 && (word[room - 1] & 0xFC00) == 0xD800;
+    return word.substr(0, isSplit ? room - 1 : room);
+}
+
+}  // namespace
+
+PresetExtension MakePresetExtension(const char* libraryName, std::uint32_t effectIndex) noexcept {
+    PresetExtension extension = {};
+    if (libraryName == nullptr) {
+        Put(extension.data(), u"prs");
+        return extension;
+    }
+    char16_t* out = Put(Put(extension.data(), u"fxp"), FindLibraryCode(libraryName));
+    // No library has more effects than there are letters; a host that asks for one gets no letter.
+    if (effectIndex < 26) *out = static_cast<char16_t>(u'a' + effectIndex);
+    return extension;
+}
+
+PresetFilter MakePresetFilter(const char* libraryName, std::uint32_t effectIndex,
+                              const char16_t* labelWord) noexcept {
+    const PresetExtension buffer = MakePresetExtension(libraryName, effectIndex);
+    const std::u16string_view extension(buffer.data());
+    const std::u16string_view word = labelWord != nullptr ? labelWord : u"Preset Files";
+    // Besides the word: " (*." ")" "*." around twice the extension, and three terminators.
+    PresetFilter filter = {};
+    const std::size_t room = filter.size() - (4 + 1 + 2 + 2 * extension.size() + 3);
+    char16_t* out = Put(Put(Put(Put(filter.data(), Cut(word, room)), u" (*."), extension), u")") + 1;
+    Put(Put(out, u"*."), extension);
+    return filter;
+}
+
+}  // namespace velmora

@@ -1,0 +1,36 @@
+// The object through which a host lets the user save an effect's settings and load them back.
+#pragma once
+
+#include "plugin/com_object.h"
+#include "plugin/host_api.h"
+#include "support/translation.h"
+
+namespace velmora {
+
+// See IPresetSaver for the operations. Keeps no state between calls but the last translated call's language
+// and library: the library must be alive while an operation runs, no longer.
+class CPresetSaver final : public IPresetSaver {
+  public:
+    CPresetSaver() noexcept = default;
+    CPresetSaver(const CPresetSaver&) = delete;
+    CPresetSaver& operator=(const CPresetSaver&) = delete;
+
+    Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
+    std::uint32_t VM_CALL AddRef() override;
+    std::uint32_t VM_CALL Release() override;
+    std::int32_t VM_CALL LoadPreset(void* owner, IEffectLibrary* library, std::uint32_t effectIndex,
+                                    PresetRecord* record, const char* languageCode) override;
+    std::int32_t VM_CALL SavePreset(void* owner, IEffectLibrary* library, std::uint32_t effectIndex,
+                                    PresetRecord* record, const char* languageCode) override;
+    // Behind SavePreset, so that the table holds it from slot 5 on.
+    virtual ~CPresetSaver();
+
+  private:
+    ReferenceCount m_references;
+    TranslationHelper m_translation;
+};
+
+// A new saver with one reference; null when memory is short.
+[[nodiscard]] IPresetSaver* CreatePresetSaver() noexcept;
+
+}  // namespace velmora

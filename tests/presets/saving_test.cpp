@@ -1,0 +1,122 @@
+// A user's presets survive whatever goes wrong while a new one is written.
+#include <gtest/gtest.h>
+
+#include <filesystem>
+
+#include "presets/file_access.h"
+#include "tests/presets/temporary_folder.h"
+#ifndef _WIN32
+#include <sys/stat.h>
+#include <unistd.h>
+#endif
+
+namespace velmora {
+namespace {
+
+namespace fs = std::filesystem;
+using tests::TemporaryFolder;
+
+bool WriteHello(std::FILE* file) {
+    return std::fputs("hello\n", file) >= 0;
+}
+bool WriteHalf(std::FILE* file) {
+    std::fputs("he", file);
+    return false;
+}
+
+#ifdef _WIN32
+constexpr const char* kHello = "hello\r\n";
+#else
+constexpr const char* kHello = "hello\n";
+#endif
+
+TEST(ReplaceTextFile, CreatesAndReplaces) {
+    const TemporaryFolder folder;
+    ASSERT_TRUE(ReplaceTextFile(folder.File("a").c_str(), WriteHello));
+    EXPECT_EQ(folder.Read("a"), kHello);
+    folder.Write("a", "much longer than what comes");
+    ASSERT_TRUE(ReplaceTextFile(folder.File("a").c_str(), WriteHello));
+    EXPECT_EQ(folder.Read("a"), kHello);
+    EXPECT_EQ(folder.Count(), 1u);
+}
+
+TEST(ReplaceTextFile, KeepsTheOldFileWhenWritingFails) {
+    const TemporaryFolder folder;
+    folder.Write("a", "old");
+    EXPECT_FALSE(ReplaceTextFile(folder.File("a").c_str(), WriteHalf));
+    EXPECT_EQ(folder.Read("a"), "old");
+    EXPECT_FALSE(ReplaceTextFile(folder.File("b").c_str(), WriteHalf));
+    EXPECT_EQ(folder.Count(), 1u);
+}
+
+TEST(ReplaceTextFile, FailsWhereNothingCanBeWritten) {
+    const TemporaryFolder folder;
+    fs::create_directory(folder.Path() / "sub");
+    EXPECT_FALSE(ReplaceTextFile(folder.File("sub").c_str(), WriteHello));
+    EXPECT_FALSE(ReplaceTextFile(folder.File("missing/a").c_str(), WriteHello));
+    EXPECT_FALSE(ReplaceTextFile("", WriteHello));
+    EXPECT_EQ(folder.Count(), 1u);
+}
+
+#ifdef _WIN32
+TEST(ReplaceTextFile, KeepsAWriteProtectedFile) {
+    const TemporaryFolder folder;
+    const std::string name = folder.Write("a", "old");
+    fs::permissions(name, fs::perms::owner_write, fs::perm_options::remove);
+    EXPECT_FALSE(ReplaceTextFile(name.c_str(), WriteHello));
+    EXPECT_EQ(folder.Read("a"), "old");
+    EXPECT_EQ(folder.Count(), 1u);
+    fs::permissions(name, fs::perms::owner_write, fs::perm_options::add);
+}
+#else
+TEST(ReplaceTextFile, ReportsAFullDisk) {
+    EXPECT_FALSE(ReplaceTextFile("/dev/full", WriteHello));
+}
+
+TEST(ReplaceTextFile, KeepsLinksAndPermissions) {
+    const TemporaryFolder folder;
+    const std::string name = folder.Write("a", "old");
+    ::chmod(name.c_str(), 0640);
+    fs::create_symlink("a", folder.Path() / "link");
+    ASSERT_TRUE(ReplaceTextFile(folder.File("link").c_str(), WriteHello));
+    EXPECT_TRUE(fs::is_symlink(folder.Path() / "link"));
+    EXPECT_EQ(folder.Read("a"), kHello);
+    EXPECT_EQ(fs::status(name).permissions(), fs::perms{0640});
+}
+#endif
+
+#ifdef _WIN32
+TEST(ReplaceTextFile, WritesInPlaceWhereTheFileCannotBeRenamedOver) {
+    const TemporaryFolder folder;
+    const std::ifstream reader(
+        folder.Write("a", "old"));  // opened as programs do: shared, but not for deletion
+    EXPECT_TRUE(ReplaceTextFile(folder.File("a").c_str(), WriteHello));
+    EXPECT_EQ(folder.Read("a"), kHello);
+    EXPECT_EQ(folder.Count(), 1u);
+}
+#else
+TEST(ReplaceTextFile, WritesInPlaceWhereTheFolderTakesNoNewFiles) {
+    const TemporaryFolder folder;
+    const std::string name = folder.Write("a", "old");
+    const bool isAdministrator = ::getuid() == 0;  // who may write everywhere
+    constexpr uid_t kNobody = 65534;
+    if (isAdministrator) {
+        ASSERT_EQ(::chown(name.c_str(), kNobody, kNobody), 0);
+        ASSERT_EQ(::chmod(folder.Path().c_str(), 0555), 0);
+        ASSERT_EQ(::seteuid(kNobody), 0);
+    } else {
+        ASSERT_EQ(::chmod(folder.Path().c_str(), 0555), 0);
+    }
+    EXPECT_TRUE(ReplaceTextFile(name.c_str(), WriteHello));
+    EXPECT_FALSE(ReplaceTextFile(folder.File("b").c_str(), WriteHello));
+    if (isAdministrator) {
+        ASSERT_EQ(::seteuid(0), 0);
+    }
+    ::chmod(folder.Path().c_str(), 0755);
+    EXPECT_EQ(folder.Read("a"), kHello);
+    EXPECT_EQ(folder.Count(), 1u);
+}
+#endif
+
+}  // namespace
+}  // namespace velmora
