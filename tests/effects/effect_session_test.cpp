@@ -4,13 +4,13 @@
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <bit>
-#include <cstring>
+#include <memory>
+#include <string>
+#include <string_view>
 #include <thread>
 #include <vector>
 
-#include "effects/describe.h"
 #include "effects/film_effect.h"
 #include "plugin/process_state.h"
 #include "tests/effects/test_hosts.h"
@@ -52,8 +52,14 @@ double SecondsOf(int frame) {
     return (frame + 0.5) / 30.0;
 }
 
+std::uint32_t PresetNamed(const EffectTable& effect, std::string_view name) {
+    std::uint32_t preset = 0;
+    while (effect.presetNames[preset] != name) ++preset;
+    return preset;
+}
+
 std::uint32_t Neutral(const EffectTable& effect) {
-    return FindPreset(effect, "Reset To None").value();
+    return PresetNamed(effect, "Reset To None");
 }
 
 // The library's own state, as its entry point sets it up.
@@ -84,11 +90,12 @@ TEST(EffectSession, ResetToNoneGivesTheSourceBack) {
     }
 }
 
+// "Film Damage": Wear 0, Pattern Blotchy, Black on.
 TEST(EffectSession, StartsWithTheDefaults) {
     auto session = EffectSession::Create(kFilmDamage);
-    EXPECT_EQ(session->Value(FindParam(kFilmDamage, "Black").value()).flag, 1);
-    EXPECT_EQ(session->Value(FindParam(kFilmDamage, "Wear").value()).number, 0.0f);
-    EXPECT_EQ(session->Value(FindParam(kFilmDamage, "Pattern").value()).item, 1);
+    EXPECT_EQ(session->Value(7).flag, 1);
+    EXPECT_EQ(session->Value(0).number, 0.0f);
+    EXPECT_EQ(session->Value(1).item, 1);
     EXPECT_EQ(FrameOf(*session, 1.0), Picture(7));
 }
 
@@ -140,8 +147,8 @@ TEST(EffectSession, TwoThreadsDoNotDisturbEachOther) {
         auto session = SessionWith(effect, preset);
         for (int frame = 0; frame < 40; ++frame) frames.push_back(FrameOf(*session, SecondsOf(frame)));
     };
-    const std::uint32_t super8 = FindPreset(kFilmPro, "Super 8").value();
-    const std::uint32_t newsreel = FindPreset(kFilmExpress, "Newsreel").value();
+    const std::uint32_t super8 = PresetNamed(kFilmPro, "Super 8");
+    const std::uint32_t newsreel = PresetNamed(kFilmExpress, "Newsreel");
     std::vector<Picture> alone[2], together[2];
     work(kFilmPro, super8, alone[0]);
     work(kFilmExpress, newsreel, alone[1]);
@@ -203,7 +210,7 @@ TEST_F(ProcessWide, ResetToNoneOfEveryObjectGivesTheSourceBack) {
 TEST_F(ProcessWide, EffectsThatAlternateKeepTheirOwnValues) {
     IVideoEffect* camera = CreateEffectByIndex(0);
     IVideoEffect* look = CreateEffectByIndex(1);
-    const std::uint32_t sepia = FindPreset(kFilmLook, "Sepia").value();
+    const std::uint32_t sepia = PresetNamed(kFilmLook, "Sepia");
     auto session = SessionWith(kFilmLook, sepia);
     const Picture expected = FrameOf(*session, 1.0);
     for (int round = 0; round < 3; ++round) {
