@@ -110,16 +110,14 @@ void Approach(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t cou
 }
 
 std::uint8_t Screened(std::uint32_t channel, std::uint32_t veil) noexcept {
-    return static_cast<std::uint8_t>(channel + ((MulHigh((255 - channel) << 8, veil) + 64) >> 7));
+    return static_cast<std::uint8_t>(channel + (((255 - channel) * veil + 0x4000) >> 15));
 }
 
 Bgra ScreenPixel(Bgra pixel, std::uint32_t blue, std::uint32_t green, std::uint32_t red) noexcept {
-    const std::int32_t level =
-        std::min<std::int32_t>(std::max({pixel.blue, pixel.green, pixel.red}), kBlackRamp);
-    const std::uint32_t share =
-        static_cast<std::uint32_t>(level * (2 * kBlackRamp - level) * kBlackRampScale);
-    return {Screened(pixel.blue, MulHigh(blue * 2, share)), Screened(pixel.green, MulHigh(green * 2, share)),
-            Screened(pixel.red, MulHigh(red * 2, share)), pixel.alpha};
+    const std::int32_t level = std::max({pixel.blue, pixel.green, pixel.red});
+    const std::uint32_t share = static_cast<std::uint32_t>(std::min(level, kBlackRamp) * kBlackRampStep);
+    return {Screened(pixel.blue, MulHigh(blue, share)), Screened(pixel.green, MulHigh(green, share)),
+            Screened(pixel.red, MulHigh(red, share)), pixel.alpha};
 }
 
 void Screen(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {

@@ -35,9 +35,9 @@ inline constexpr std::int32_t kHighlightFloor = 3300;
 inline constexpr std::int32_t kHighlightStretch = 35850;
 inline constexpr std::int32_t kLumaBlue = 29, kLumaGreen = 150, kLumaRed = 77;  // of 256
 
-// Below this level of the brightest channel the veil fades; black keeps none of it.
+// Up to this level of the brightest channel the veil comes in evenly; black gets none of it.
 inline constexpr std::int32_t kBlackRamp = 24;
-inline constexpr std::int32_t kBlackRampScale = 32768 / (kBlackRamp * kBlackRamp);
+inline constexpr std::int32_t kBlackRampStep = 65535 / kBlackRamp;
 
 struct GlowKernels {
     // Means of 4 × 4 pixels.

@@ -19,24 +19,6 @@ struct Lanes {
     static Lanes Load(ConstCellRow cells) noexcept {
         return {_mm256_loadu_si256(reinterpret_cast<const __m256i*>(cells))};
     }
-    static Lanes LoadPixels(const Bgra* pixels) noexcept {
-        return {_mm256_cvtepu8_epi16(_mm_loadu_si128(reinterpret_cast<const __m128i*>(pixels)))};
-    }
-    static __m128i Twice(ConstCellRow cell) noexcept {
-        const __m128i single = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(cell));
-        return _mm_unpacklo_epi64(single, single);
-    }
-    // For four pixels under one cell: the cell, the cells on either side of it, and the way towards those.
-    static Lanes Repeat(ConstCellRow cell) noexcept { return {_mm256_broadcastsi128_si256(Twice(cell))}; }
-    static Lanes Neighbours(ConstCellRow cell, int) noexcept {
-        return {_mm256_inserti128_si256(_mm256_castsi128_si256(Twice(cell - kCellLanes)),
-                                        Twice(cell + kCellLanes), 1)};
-    }
-    static Lanes NeighbourShares(int) noexcept {
-        constexpr short kFar = 24576, kNear = 8192;
-        return {_mm256_setr_epi16(kFar, kFar, kFar, kFar, kNear, kNear, kNear, kNear,  //
-                                  kNear, kNear, kNear, kNear, kFar, kFar, kFar, kFar)};
-    }
 };
 
 Lanes operator+(Lanes a, Lanes b) noexcept {
@@ -57,14 +39,8 @@ Lanes MulHigh(Lanes a, Lanes b) noexcept {
 Lanes MulHighSigned(Lanes a, Lanes b) noexcept {
     return {_mm256_mulhi_epi16(a.v, b.v)};
 }
-Lanes MulLow(Lanes a, Lanes b) noexcept {
-    return {_mm256_mullo_epi16(a.v, b.v)};
-}
 Lanes Mean(Lanes a, Lanes b) noexcept {
     return {_mm256_avg_epu16(a.v, b.v)};
-}
-Lanes Min(Lanes a, Lanes b) noexcept {
-    return {_mm256_min_epi16(a.v, b.v)};
 }
 template <int bits>
 Lanes ShiftLeft(Lanes a) noexcept {
@@ -78,9 +54,8 @@ Lanes ShiftRight(Lanes a) noexcept {
 void Store(CellRow cells, Lanes a) noexcept {
     _mm256_storeu_si256(reinterpret_cast<__m256i*>(cells), a.v);
 }
-void StorePixels(Bgra* pixels, Lanes a) noexcept {
-    const __m128i packed = _mm_packus_epi16(_mm256_castsi256_si128(a.v), _mm256_extracti128_si256(a.v, 1));
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(pixels), packed);
+Lanes Approached(Lanes near, Lanes far, Lanes share) noexcept {
+    return near + MulHighSigned(far - near, share);
 }
 
 // In all four lanes of each cell.
@@ -92,14 +67,51 @@ Lanes Luma(Lanes a) noexcept {
     return {_mm256_or_si256(luma, _mm256_slli_epi32(luma, 16))};
 }
 
-// In the lanes of blue, green and red.
-Lanes BrightestChannel(Lanes a) noexcept {
-    const __m256i next =
-        _mm256_broadcastsi128_si256(_mm_setr_epi8(2, 3, 4, 5, 0, 1, 6, 7, 10, 11, 12, 13, 8, 9, 14, 15));
-    const __m256i other =
-        _mm256_broadcastsi128_si256(_mm_setr_epi8(4, 5, 0, 1, 2, 3, 6, 7, 12, 13, 8, 9, 10, 11, 14, 15));
-    return {_mm256_max_epi16(
-        a.v, _mm256_max_epi16(_mm256_shuffle_epi8(a.v, next), _mm256_shuffle_epi8(a.v, other)))};
+// The veil over eight pixels: over 0, 1, 4 and 5 and over 2, 3, 6 and 7, as bytes unpack in both halves.
+constexpr std::int32_t kScreenPixels = 8;
+struct Veil {
+    Lanes low, high;
+};
+
+Veil LoadVeil(ConstCellRow cells) noexcept {
+    const __m256i first = Lanes::Load(cells).v, second = Lanes::Load(cells + Lanes::kSize).v;
+    return {{_mm256_permute2x128_si256(first, second, 0x20)},
+            {_mm256_permute2x128_si256(first, second, 0x31)}};
+}
+
+// Over four pixels under one cell: 3/8 and 1/8 of the way to the cell before, as far to the one behind. Then
+// over the next four.
+Veil SpreadVeil(ConstCellRow cell) noexcept {
+    constexpr long long kFar = 0x6000600060006000, kNear = 0x2000200020002000;
+    const Lanes lowShares = {_mm256_setr_epi64x(kFar, kNear, kFar, kNear)};
+    const Lanes highShares = {_mm256_setr_epi64x(kNear, kFar, kNear, kFar)};
+    const __m256i cells = Lanes::Load(cell - kCellLanes).v;
+    const Lanes near = {_mm256_permute4x64_epi64(cells, _MM_SHUFFLE(2, 2, 1, 1))};
+    return {Approached(near, {_mm256_permute4x64_epi64(cells, _MM_SHUFFLE(1, 1, 0, 0))}, lowShares),
+            Approached(near, {_mm256_permute4x64_epi64(cells, _MM_SHUFFLE(3, 3, 2, 2))}, highShares)};
+}
+
+// The veil's fourth number is 0, so alpha stays as it is.
+void ScreenPixels(const Bgra* in, Bgra* out, const Veil& veil) noexcept {
+    const __m256i pixels = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in));
+    const __m256i brighter = _mm256_max_epu8(pixels, _mm256_srli_epi32(pixels, 8));
+    const __m256i brightest = _mm256_max_epu8(brighter, _mm256_srli_epi32(pixels, 16));
+    const __m256i level = _mm256_min_epu8(brightest, _mm256_set1_epi8(kBlackRamp));
+    // The first byte of each pixel, four times as a word; -1 gives 0.
+    const __m256i lowLevels =
+        _mm256_broadcastsi128_si256(_mm_setr_epi8(0, -1, 0, -1, 0, -1, 0, -1, 4, -1, 4, -1, 4, -1, 4, -1));
+    const __m256i highLevels = _mm256_add_epi8(lowLevels, _mm256_set1_epi16(8));
+    const __m256i step = _mm256_set1_epi16(static_cast<short>(kBlackRampStep));
+    const __m256i lowShare = _mm256_mullo_epi16(_mm256_shuffle_epi8(level, lowLevels), step);
+    const __m256i highShare = _mm256_mullo_epi16(_mm256_shuffle_epi8(level, highLevels), step);
+    const __m256i rest = _mm256_xor_si256(pixels, _mm256_set1_epi8(-1));
+    const __m256i zero = _mm256_setzero_si256();
+    const __m256i low =
+        _mm256_mulhrs_epi16(_mm256_unpacklo_epi8(rest, zero), _mm256_mulhi_epu16(veil.low.v, lowShare));
+    const __m256i high =
+        _mm256_mulhrs_epi16(_mm256_unpackhi_epi8(rest, zero), _mm256_mulhi_epu16(veil.high.v, highShare));
+    const __m256i screened = _mm256_add_epi8(pixels, _mm256_packus_epi16(low, high));
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(out), screened);
 }
 
 void AverageBlocks(const Bgra* const rows[4], CellRow cells, std::int32_t count) noexcept {

@@ -16,24 +16,11 @@ struct Lanes {
     static Lanes Load(ConstCellRow cells) noexcept {
         return {_mm_loadu_si128(reinterpret_cast<const __m128i*>(cells))};
     }
-    static Lanes LoadPixels(const Bgra* pixels) noexcept {
-        const __m128i bytes = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(pixels));
-        return {_mm_unpacklo_epi8(bytes, _mm_setzero_si128())};
-    }
     static Lanes Pair(ConstCellRow first, ConstCellRow second) noexcept {
         return {_mm_unpacklo_epi64(_mm_loadl_epi64(reinterpret_cast<const __m128i*>(first)),
                                    _mm_loadl_epi64(reinterpret_cast<const __m128i*>(second)))};
     }
-    // For four pixels under one cell: the cell, the cells on either side of it, and the way towards those.
     static Lanes Repeat(ConstCellRow cell) noexcept { return Pair(cell, cell); }
-    static Lanes Neighbours(ConstCellRow cell, int half) noexcept {
-        return Repeat(half == 0 ? cell - kCellLanes : cell + kCellLanes);
-    }
-    static Lanes NeighbourShares(int half) noexcept {
-        constexpr short kFar = 24576, kNear = 8192;
-        return {half == 0 ? _mm_setr_epi16(kFar, kFar, kFar, kFar, kNear, kNear, kNear, kNear)
-                          : _mm_setr_epi16(kNear, kNear, kNear, kNear, kFar, kFar, kFar, kFar)};
-    }
 };
 
 Lanes operator+(Lanes a, Lanes b) noexcept {
@@ -54,14 +41,8 @@ Lanes MulHigh(Lanes a, Lanes b) noexcept {
 Lanes MulHighSigned(Lanes a, Lanes b) noexcept {
     return {_mm_mulhi_epi16(a.v, b.v)};
 }
-Lanes MulLow(Lanes a, Lanes b) noexcept {
-    return {_mm_mullo_epi16(a.v, b.v)};
-}
 Lanes Mean(Lanes a, Lanes b) noexcept {
     return {_mm_avg_epu16(a.v, b.v)};
-}
-Lanes Min(Lanes a, Lanes b) noexcept {
-    return {_mm_min_epi16(a.v, b.v)};
 }
 template <int bits>
 Lanes ShiftLeft(Lanes a) noexcept {
@@ -75,8 +56,8 @@ Lanes ShiftRight(Lanes a) noexcept {
 void Store(CellRow cells, Lanes a) noexcept {
     _mm_storeu_si128(reinterpret_cast<__m128i*>(cells), a.v);
 }
-void StorePixels(Bgra* pixels, Lanes a) noexcept {
-    _mm_storel_epi64(reinterpret_cast<__m128i*>(pixels), _mm_packus_epi16(a.v, a.v));
+Lanes Approached(Lanes near, Lanes far, Lanes share) noexcept {
+    return near + MulHighSigned(far - near, share);
 }
 
 // In all four lanes of each cell.
@@ -89,12 +70,47 @@ Lanes Luma(Lanes a) noexcept {
     return {_mm_or_si128(luma, _mm_slli_epi32(luma, 16))};
 }
 
-// In the lanes of blue, green and red.
-Lanes BrightestChannel(Lanes a) noexcept {
-    constexpr int kNext = _MM_SHUFFLE(3, 0, 2, 1), kOther = _MM_SHUFFLE(3, 1, 0, 2);
-    const __m128i next = _mm_shufflehi_epi16(_mm_shufflelo_epi16(a.v, kNext), kNext);
-    const __m128i other = _mm_shufflehi_epi16(_mm_shufflelo_epi16(a.v, kOther), kOther);
-    return {_mm_max_epi16(a.v, _mm_max_epi16(next, other))};
+// The veil over the first and the last two of four pixels.
+constexpr std::int32_t kScreenPixels = 4;
+struct Veil {
+    Lanes low, high;
+};
+
+Veil LoadVeil(ConstCellRow cells) noexcept {
+    return {Lanes::Load(cells), Lanes::Load(cells + Lanes::kSize)};
+}
+
+// Over four pixels under one cell: 3/8 and 1/8 of the way to the cell before, as far to the one behind.
+Veil SpreadVeil(ConstCellRow cell) noexcept {
+    constexpr short kFar = 24576, kNear = 8192;
+    const Lanes lowShares = {_mm_setr_epi16(kFar, kFar, kFar, kFar, kNear, kNear, kNear, kNear)};
+    const Lanes highShares = {_mm_setr_epi16(kNear, kNear, kNear, kNear, kFar, kFar, kFar, kFar)};
+    const Lanes near = Lanes::Repeat(cell);
+    return {Approached(near, Lanes::Repeat(cell - kCellLanes), lowShares),
+            Approached(near, Lanes::Repeat(cell + kCellLanes), highShares)};
+}
+
+// (rest × veil + 0x4000) >> 15, of a rest below 256: rounding down on the way does not change the result.
+__m128i MulRound(__m128i rest, __m128i veil) noexcept {
+    const __m128i product = _mm_mulhi_epu16(_mm_slli_epi16(rest, 8), veil);
+    return _mm_srli_epi16(_mm_add_epi16(product, _mm_set1_epi16(64)), 7);
+}
+
+// The veil's fourth number is 0, so alpha stays as it is.
+void ScreenPixels(const Bgra* in, Bgra* out, const Veil& veil) noexcept {
+    const __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in));
+    const __m128i brighter = _mm_max_epu8(pixels, _mm_srli_epi32(pixels, 8));
+    const __m128i brightest = _mm_max_epu8(brighter, _mm_srli_epi32(pixels, 16));
+    const __m128i level =
+        _mm_and_si128(_mm_min_epu8(brightest, _mm_set1_epi8(kBlackRamp)), _mm_set1_epi32(0xFF));
+    const __m128i share = _mm_mullo_epi16(level, _mm_set1_epi16(static_cast<short>(kBlackRampStep)));
+    const __m128i shares = _mm_or_si128(share, _mm_slli_epi32(share, 16));
+    const __m128i lowVeil = _mm_mulhi_epu16(veil.low.v, _mm_unpacklo_epi32(shares, shares));
+    const __m128i highVeil = _mm_mulhi_epu16(veil.high.v, _mm_unpackhi_epi32(shares, shares));
+    const __m128i rest = _mm_xor_si128(pixels, _mm_set1_epi8(-1));
+    const __m128i low = MulRound(_mm_unpacklo_epi8(rest, _mm_setzero_si128()), lowVeil);
+    const __m128i high = MulRound(_mm_unpackhi_epi8(rest, _mm_setzero_si128()), highVeil);
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(out), _mm_add_epi8(pixels, _mm_packus_epi16(low, high)));
 }
 
 void AverageBlocks(const Bgra* const rows[4], CellRow cells, std::int32_t count) noexcept {

@@ -61,10 +61,6 @@ void Lift(CellRow cells, std::int32_t count, std::uint16_t strength) noexcept {
     }
 }
 
-Lanes Approached(Lanes near, Lanes far, Lanes share) noexcept {
-    return near + MulHighSigned(far - near, share);
-}
-
 void Approach(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t count,
               std::int16_t share) noexcept {
     const Lanes shares = Lanes::All(share);
@@ -73,34 +69,18 @@ void Approach(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t cou
     }
 }
 
-// The veil's fourth number is 0, so alpha stays as it is.
-Lanes Screened(Lanes pixels, Lanes veil) noexcept {
-    const Lanes level = Min(BrightestChannel(pixels), Lanes::All(kBlackRamp));
-    const Lanes share =
-        MulLow(MulLow(level, Lanes::All(2 * kBlackRamp) - level), Lanes::All(kBlackRampScale));
-    const Lanes veiled = MulHigh(veil + veil, share);
-    const Lanes change = MulHigh(ShiftLeft<8>(Lanes::All(255) - pixels), veiled);
-    return pixels + ShiftRight<7>(change + Lanes::All(64));
-}
-
 void Screen(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
     std::int32_t x = 0;
-    for (; x <= width - Lanes::kCells; x += Lanes::kCells, veil += Lanes::kSize) {
-        StorePixels(out + x, Screened(Lanes::LoadPixels(in + x), Lanes::Load(veil)));
+    for (; x <= width - kScreenPixels; x += kScreenPixels, veil += kScreenPixels * kCellLanes) {
+        ScreenPixels(in + x, out + x, LoadVeil(veil));
     }
     kPlainGlowKernels.screen(in + x, out + x, veil, width - x);
 }
 
 void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
-    constexpr int kVectors = 4 / Lanes::kCells;
     std::int32_t x = 0;
-    for (; x <= width - 4; x += 4, veil += kCellLanes) {
-        for (int i = 0; i < kVectors; ++i) {
-            const std::int32_t at = x + i * Lanes::kCells;
-            const Lanes between =
-                Approached(Lanes::Repeat(veil), Lanes::Neighbours(veil, i), Lanes::NeighbourShares(i));
-            StorePixels(out + at, Screened(Lanes::LoadPixels(in + at), between));
-        }
+    for (; x <= width - kScreenPixels; x += kScreenPixels, veil += kScreenPixels / 4 * kCellLanes) {
+        ScreenPixels(in + x, out + x, SpreadVeil(veil));
     }
     kPlainGlowKernels.screenFourfold(in + x, out + x, veil, width - x);
 }

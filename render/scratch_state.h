@@ -103,10 +103,10 @@ class ScratchReplays {
     std::uint32_t m_uses = 0;
 };
 
-// The frame whose scratches `frameNumber` shows: 0 before the clip starts; after 2^24 frames (155 hours) they
+// The frame whose scratches `frameNumber` shows: 0 before the clip starts; after 2^22 frames (38 hours) they
 // come again from the start, so that no frame number asks for an endless replay.
 [[nodiscard]] constexpr std::int32_t ScratchFrame(std::int32_t frameNumber) noexcept {
-    return frameNumber < 0 ? 0 : frameNumber & 0xFFFFFF;
+    return frameNumber < 0 ? 0 : frameNumber & 0x3FFFFF;
 }
 
 // The state of a life in `frame`, one of the life's own frames, in a picture `width` pixels wide.

@@ -68,7 +68,7 @@ void LayStrength(const ScratchState& scratch, std::int32_t age, std::int32_t dep
     for (std::int32_t k = 0; k <= ScratchLine::kSegments; ++k) {
         const std::int32_t along = k + age * ScratchLine::kSegments;
         const std::int32_t breath =
-            26000 + NoiseAt(scratch.look, kBreath, along, 2) / 2 + HashAt(scratch.look, kGrain, along) / 10;
+            24000 + NoiseAt(scratch.look, kBreath, along, 2) / 2 + HashAt(scratch.look, kGrain, along) / 7;
         const std::int32_t above = NoiseAt(scratch.look, kBreak, along, 3) - worn;
         const std::int32_t present = worn == 0 ? 65536 : std::clamp(above * 5, 0, 65536);
         const std::int64_t strength = ((full * breath >> 16) * present) >> 16;
@@ -87,32 +87,58 @@ void DrawPixel(Bgra& pixel, std::uint32_t weight, std::uint32_t strength, bool i
     }
 }
 
-void DrawSpanPlain(Bgra* span, const std::uint16_t* weights, std::int32_t pixels, std::uint32_t strength,
-                   bool isWhite) noexcept {
-    for (std::int32_t i = 0; i < pixels; ++i) DrawPixel(span[i], weights[i], strength, isWhite);
-}
+// The pixels of a scratch that lie whole in the picture.
+struct PlainSpan {
+    static void Draw(Bgra* span, const std::uint16_t* weights, std::int32_t pixels, std::uint32_t strength,
+                     bool isWhite) noexcept {
+        for (std::int32_t i = 0; i < pixels; ++i) DrawPixel(span[i], weights[i], strength, isWhite);
+    }
+};
 
 // Four pixels a step. The saturating differences keep the direction and, by their limits' alpha, the alpha.
-void DrawSpanSse2(Bgra* span, const std::uint16_t* weights, std::int32_t pixels, std::uint32_t strength,
-                  bool isWhite) noexcept {
-    const __m128i zero = _mm_setzero_si128();
-    const __m128i darkest = _mm_set1_epi32(static_cast<std::int32_t>(0xFF000000u | kDarkest * 0x010101u));
-    const __m128i brightest = _mm_set1_epi32(kBrightest * 0x010101);
-    const __m128i strengths = _mm_set1_epi16(static_cast<short>(strength));
-    for (std::int32_t i = 0; i < pixels; i += 4) {
-        const __m128i pixel = _mm_loadu_si128(reinterpret_cast<const __m128i*>(span + i));
-        const __m128i weight = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(weights + i));
-        const __m128i share = _mm_mulhi_epu16(weight, strengths);
-        const __m128i pairs = _mm_unpacklo_epi16(share, share);
-        const __m128i towards = isWhite ? _mm_subs_epu8(brightest, pixel) : _mm_subs_epu8(pixel, darkest);
-        // The difference in the upper byte: the product's upper half is then 256 times the change.
-        const __m128i low =
-            _mm_mulhi_epu16(_mm_unpacklo_epi8(zero, towards), _mm_unpacklo_epi32(pairs, pairs));
-        const __m128i high =
-            _mm_mulhi_epu16(_mm_unpackhi_epi8(zero, towards), _mm_unpackhi_epi32(pairs, pairs));
-        const __m128i change = _mm_packus_epi16(_mm_srli_epi16(low, 8), _mm_srli_epi16(high, 8));
-        const __m128i drawn = isWhite ? _mm_add_epi8(pixel, change) : _mm_sub_epi8(pixel, change);
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(span + i), drawn);
+struct Sse2Span {
+    static void Draw(Bgra* span, const std::uint16_t* weights, std::int32_t pixels, std::uint32_t strength,
+                     bool isWhite) noexcept {
+        const __m128i zero = _mm_setzero_si128();
+        const __m128i darkest = _mm_set1_epi32(static_cast<std::int32_t>(0xFF000000u | kDarkest * 0x010101u));
+        const __m128i brightest = _mm_set1_epi32(kBrightest * 0x010101);
+        const __m128i strengths = _mm_set1_epi16(static_cast<short>(strength));
+        for (std::int32_t i = 0; i < pixels; i += 4) {
+            const __m128i pixel = _mm_loadu_si128(reinterpret_cast<const __m128i*>(span + i));
+            const __m128i weight = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(weights + i));
+            const __m128i share = _mm_mulhi_epu16(weight, strengths);
+            const __m128i pairs = _mm_unpacklo_epi16(share, share);
+            const __m128i towards = isWhite ? _mm_subs_epu8(brightest, pixel) : _mm_subs_epu8(pixel, darkest);
+            // The difference in the upper byte: the product's upper half is then 256 times the change.
+            const __m128i low =
+                _mm_mulhi_epu16(_mm_unpacklo_epi8(zero, towards), _mm_unpacklo_epi32(pairs, pairs));
+            const __m128i high =
+                _mm_mulhi_epu16(_mm_unpackhi_epi8(zero, towards), _mm_unpackhi_epi32(pairs, pairs));
+            const __m128i change = _mm_packus_epi16(_mm_srli_epi16(low, 8), _mm_srli_epi16(high, 8));
+            const __m128i drawn = isWhite ? _mm_add_epi8(pixel, change) : _mm_sub_epi8(pixel, change);
+            _mm_storeu_si128(reinterpret_cast<__m128i*>(span + i), drawn);
+        }
+    }
+};
+
+// `along` tells the row: knots from the top, 1/65536.
+template <typename Span>
+void DrawLine(const ScratchLine& line, Bgra* row, std::int32_t width, std::uint64_t along) noexcept {
+    const std::size_t knot = static_cast<std::size_t>(along >> 16);
+    const std::int32_t part = static_cast<std::int32_t>(along & 0xFFFF) >> 4;
+    const ScratchLine::Knot &from = line.knots[knot], &to = line.knots[knot + 1];
+    const std::uint32_t strength =
+        static_cast<std::uint32_t>(from.strength + ((to.strength - from.strength) * part >> 12));
+    if (strength == 0) return;
+    const std::int32_t edge = from.offset + ((to.offset - from.offset) * part >> 12);
+    const std::int32_t first = line.pixel + (edge >> 8);
+    const ScratchShape& shape = *line.shape;
+    const std::uint16_t* weights = shape.weights[static_cast<std::size_t>((edge & 255) >> 3)].data();
+    if (first >= 0 && first <= width - shape.pixels) {
+        return Span::Draw(row + first, weights, shape.pixels, strength, line.isWhite);
+    }
+    for (std::int32_t x = std::max(first, 0); x < std::min(first + shape.pixels, width); ++x) {
+        DrawPixel(row[x], weights[x - first], strength, line.isWhite);
     }
 }
 
@@ -123,31 +149,13 @@ ScratchStage::ScratchStage(const ScratchLine* lines, std::uint32_t count, std::i
     : m_lines(lines),
       m_count(count),
       m_knotStep((std::uint64_t{ScratchLine::kSegments} << 16) / static_cast<std::uint64_t>(height)),
-      m_drawSpan(form == Form::kPlain ? DrawSpanPlain : DrawSpanSse2) {}
+      m_form(form) {}
 
 void ScratchStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     if (in != out) std::memcpy(out, in, static_cast<std::size_t>(width) * sizeof(Bgra));
     const std::uint64_t along = m_knotStep * static_cast<std::uint64_t>(y);
-    const std::size_t knot = static_cast<std::size_t>(along >> 16);
-    const std::int32_t part = static_cast<std::int32_t>(along & 0xFFFF) >> 4;
-    for (const ScratchLine *line = m_lines, *end = m_lines + m_count; line != end; ++line) {
-        const ScratchLine::Knot& from = line->knots[knot];
-        const ScratchLine::Knot& to = line->knots[knot + 1];
-        const std::int32_t strength = from.strength + ((to.strength - from.strength) * part >> 12);
-        if (strength == 0) continue;
-        const std::int32_t edge = from.offset + ((to.offset - from.offset) * part >> 12);
-        const std::int32_t first = line->pixel + (edge >> 8);
-        const ScratchShape& shape = *line->shape;
-        const std::uint16_t* weights = shape.weights[static_cast<std::size_t>((edge & 255) >> 3)].data();
-        if (first >= 0 && first <= width - shape.pixels) {
-            m_drawSpan(out + first, weights, shape.pixels, static_cast<std::uint32_t>(strength),
-                       line->isWhite);
-            continue;
-        }
-        for (std::int32_t x = std::max(first, 0); x < std::min(first + shape.pixels, width); ++x) {
-            DrawPixel(out[x], weights[x - first], static_cast<std::uint32_t>(strength), line->isWhite);
-        }
-    }
+    const auto draw = m_form == Form::kPlain ? DrawLine<PlainSpan> : DrawLine<Sse2Span>;
+    for (std::uint32_t i = 0; i < m_count; ++i) draw(m_lines[i], out, width, along);
 }
 
 ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffset,

@@ -49,13 +49,10 @@ class ScratchStage {
     void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
   private:
-    using DrawSpan = void (*)(Bgra* span, const std::uint16_t* weights, std::int32_t pixels,
-                              std::uint32_t strength, bool isWhite) noexcept;
-
     const ScratchLine* m_lines = nullptr;
     std::uint32_t m_count = 0;
     std::uint64_t m_knotStep = 0;  // knots per row, 1/65536
-    DrawSpan m_drawSpan = nullptr;
+    Form m_form = Form::kPlain;
 };
 
 // The scratches of a frame whose picture was moved sideways by `xOffset`. The stage points into `memory` and

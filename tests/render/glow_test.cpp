@@ -1,0 +1,160 @@
+// Diffusion: what a mist filter does and does not do to a picture.
+
+#include <gtest/gtest.h>
+
+#include <cmath>
+#include <limits>
+
+#include "render/glow.h"
+#include "tests/render/plain_picture.h"
+
+namespace velmora::render {
+namespace {
+
+using testing::PlainPicture;
+using testing::SamePixels;
+
+PlainPicture Glowing(const PlainPicture& in, float amount, Form form = BestForm()) {
+    GlowMemory memory;
+    PlainPicture out = in;
+    const GlowStage stage = PrepareGlow(amount, in, in.Width(), in.Height(), memory, form);
+    EXPECT_TRUE(stage.IsActive());
+    for (std::int32_t y = 0; y < in.Height(); ++y) stage.Row(in.Row(y), out.Row(y), in.Width(), y);
+    return out;
+}
+
+void Paint(PlainPicture& picture, const Rectangle& rectangle, std::uint8_t level) {
+    for (std::int32_t y = rectangle.top; y < rectangle.bottom; ++y) {
+        std::fill(picture.Row(y) + rectangle.left, picture.Row(y) + rectangle.right,
+                  Bgra{level, level, level, 255});
+    }
+}
+
+// Small ones, odd ones, and heights on both sides of every step of the reduction up to eightfold.
+constexpr struct {
+    std::int32_t width, height;
+} kSizes[] = {{1, 1},    {2, 1},    {1, 5},    {3, 2},    {7, 7},    {64, 48},   {31, 299}, {1023, 3},
+              {33, 300}, {34, 301}, {45, 599}, {61, 602}, {5, 1201}, {71, 1210}, {2, 2403}};
+
+TEST(Glow, DoesNothingWithoutAnAmount) {
+    const PlainPicture picture(8, 8, {200, 200, 200, 255});
+    GlowMemory memory;
+    for (const float amount : {0.0f, -1.0f, std::numeric_limits<float>::quiet_NaN()}) {
+        EXPECT_FALSE(PrepareGlow(amount, picture, 8, 8, memory, BestForm()).IsActive());
+    }
+}
+
+TEST(Glow, NeverDarkensKeepsBlackAndAlphaAndHasOneResultInAllForms) {
+    for (const auto& size : kSizes) {
+        SCOPED_TRACE(::testing::Message() << size.width << "x" << size.height);
+        PlainPicture in = PlainPicture::Random(size.width, size.height, 5);
+        for (std::size_t i = 0; i < in.Pixels().size(); i += 3) in.Pixels()[i] = {0, 0, 0, 77};
+        for (const float amount : {0.1f, 1.0f}) {
+            const PlainPicture out = Glowing(in, amount, Form::kPlain);
+            for (std::size_t i = 0; i < in.Pixels().size(); ++i) {
+                const Bgra before = in.Pixels()[i], after = out.Pixels()[i];
+                ASSERT_GE(after.blue, before.blue);
+                ASSERT_GE(after.green, before.green);
+                ASSERT_GE(after.red, before.red);
+                ASSERT_EQ(after.alpha, before.alpha);
+                ASSERT_TRUE(i % 3 != 0 || after.blue + after.green + after.red == 0);
+            }
+            for (const Form form : {Form::kSse2, Form::kAvx2, Form::kAvx512}) {
+                ASSERT_TRUE(form > BestForm() || SamePixels(out, Glowing(in, amount, form)));
+            }
+        }
+    }
+}
+
+TEST(Glow, LeavesAnEvenPictureEvenUpToItsBorder) {
+    for (const auto& size : kSizes) {
+        for (const std::uint8_t level : std::initializer_list<std::uint8_t>{1, 20, 90, 140, 201, 255}) {
+            SCOPED_TRACE(::testing::Message() << size.width << "x" << size.height << " of " << int{level});
+            const std::uint8_t half = static_cast<std::uint8_t>(level / 2);
+            const PlainPicture out =
+                Glowing(PlainPicture(size.width, size.height, {half, level, level, 9}), 0.7f);
+            const Bgra first = out.Pixels().front();
+            EXPECT_GE(first.green, level);
+            ASSERT_TRUE(SamePixels(out, PlainPicture(size.width, size.height, first)));
+        }
+    }
+}
+
+TEST(Glow, SpreadsALightEvenlyToAllSides) {
+    PlainPicture in(256, 256, {25, 25, 25, 255});
+    Paint(in, {118, 138, 118, 138}, 255);
+    const PlainPicture out = Glowing(in, 1.0f);
+    const auto at = [&out](std::int32_t x, std::int32_t y) -> int { return out.Row(y)[x].green; };
+    for (std::int32_t y = 0; y < 256; ++y) {
+        for (std::int32_t x = 0; x < 256; ++x) {
+            ASSERT_NEAR(at(x, y), at(255 - x, y), 1);
+            ASSERT_NEAR(at(x, y), at(x, 255 - y), 1);
+            ASSERT_NEAR(at(x, y), at(y, x), 1);
+        }
+    }
+    EXPECT_GT(at(112, 128), 60);  // a halo
+    EXPECT_EQ(at(2, 128), 25);    // not a wash
+}
+
+// A light of a tenth of the height, seen at shares of the height from its edge.
+TEST(Glow, ReachesAsFarAsThePictureIsHigh) {
+    const auto halo = [](std::int32_t height, double distance) -> int {
+        PlainPicture in(height, height, {40, 40, 40, 255});
+        Paint(in, {height * 45 / 100, height * 55 / 100, height * 45 / 100, height * 55 / 100}, 255);
+        const std::int32_t x = height * 55 / 100 + static_cast<std::int32_t>(std::lround(height * distance));
+        return Glowing(in, 1.0f).Row(height / 2)[x].green - 40;
+    };
+    for (const double distance : {0.01, 0.02, 0.04, 0.08}) {
+        const int expected = halo(1200, distance);
+        for (const std::int32_t height : {200, 280, 320, 580, 720, 1080}) {
+            EXPECT_NEAR(halo(height, distance), expected, 3 + expected / 10)
+                << height << " rows, " << distance;
+        }
+    }
+}
+
+// Beside a light the veil falls without a step that the eye could take for an edge. The bound is the steepest
+// fall of blurs as wide as these, in levels a pixel.
+TEST(Glow, FallsOffWithoutBands) {
+    for (const std::int32_t height : {288, 576, 1080, 1440}) {
+        PlainPicture in(height, height, {60, 60, 60, 255});
+        Paint(in, {height / 4, height * 3 / 4, 0, height / 4}, 250);
+        const PlainPicture out = Glowing(in, 1.0f);
+        for (const std::int32_t y : {height / 2, height / 2 + 1, height / 2 + 3}) {
+            for (std::int32_t x = height / 4 + height / 100; x + 1 < height; ++x) {
+                const int fall = out.Row(y)[x].green - out.Row(y)[x + 1].green;
+                ASSERT_GE(fall, 0) << height << " rows, column " << x;
+                ASSERT_LE(fall, 8 * 288 / height + 1) << height << " rows, column " << x;
+            }
+        }
+    }
+}
+
+TEST(Glow, GrowsWithTheAmountAndKeepsTheLightsColour) {
+    PlainPicture in(300, 200, {50, 50, 50, 255});
+    for (std::int32_t y = 80; y < 120; ++y)
+        std::fill(in.Row(y) + 100, in.Row(y) + 200, Bgra{60, 200, 255, 255});
+    int last = 50;
+    for (const float amount : {0.1f, 0.25f, 0.5f, 0.75f, 1.0f}) {
+        const Bgra beside = Glowing(in, amount).Row(100)[205];
+        EXPECT_GT(beside.red, last);
+        EXPECT_GE(beside.red, beside.green);
+        EXPECT_GT(beside.green, beside.blue);
+        last = beside.red;
+    }
+}
+
+// A frame after another of any size is what it is alone.
+TEST(Glow, RemembersNothingOfTheFrameBefore) {
+    GlowMemory memory;
+    for (const auto& size : kSizes) {
+        const PlainPicture in = PlainPicture::Random(size.width, size.height, 8);
+        PlainPicture out = in;
+        const GlowStage stage = PrepareGlow(0.5f, in, size.width, size.height, memory, BestForm());
+        for (std::int32_t y = 0; y < size.height; ++y) stage.Row(out.Row(y), out.Row(y), size.width, y);
+        ASSERT_TRUE(SamePixels(out, Glowing(in, 0.5f)));
+    }
+}
+
+}  // namespace
+}  // namespace velmora::render
