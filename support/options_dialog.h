@@ -1,0 +1,59 @@
+// The options dialog: the library's name and version, its one preference, a logo that opens the maker's web page,
+// and help. Windows only; the user-interface thread.
+#pragma once
+
+#include <windows.h>
+
+#include "support/help_launcher.h"
+#include "support/mnemonics.h"
+#include "support/translation.h"
+
+namespace velmora::support {
+
+// What the dialog is made of. Everything outlives it.
+struct OptionsDialogParts {
+    HMODULE templates = nullptr;     // holds the dialog's template and manifest
+    HMODULE buttonModule = nullptr;  // for which the button class is registered; null: no logo
+    HBITMAP logo = nullptr;          // may be null, see BitButtonDescription
+    TranslationHelper* texts = nullptr;
+    const HelpLauncher* help = nullptr;
+};
+
+class OptionsDialog {
+  public:
+    explicit OptionsDialog(const OptionsDialogParts& parts, bool knobsDragVertical) noexcept
+        : m_parts(parts), m_knobsDragVertical(knobsDragVertical) {}
+    OptionsDialog(const OptionsDialog&) = delete;
+    OptionsDialog& operator=(const OptionsDialog&) = delete;
+
+    // Shows the dialog until the user closes it. True: with OK. False: cancelled, or it could not be shown.
+    [[nodiscard]] bool Show(HWND owner) noexcept;
+
+    // Brings a dialog that is shown already to the user's eyes.
+    void ToFront() const noexcept;
+    // Closes a dialog that is shown, as Cancel does, and destroys its logo at once.
+    void Abandon() noexcept;
+
+    // The preference, as the user left it with OK.
+    [[nodiscard]] bool KnobsDragVertical() const noexcept { return m_knobsDragVertical; }
+
+  private:
+    static INT_PTR CALLBACK Procedure(HWND window, UINT message, WPARAM wParam, LPARAM lParam) noexcept;
+
+    INT_PTR OnMessage(UINT message, WPARAM wParam) noexcept;
+    void OnOpen() noexcept;
+    void OnCommand(int control) noexcept;
+    void OnOk() noexcept;
+    void OpenHelp() const noexcept;
+    void SetTexts() noexcept;
+    void SetMarkedText(int control, const char16_t* text, char16_t substitute) noexcept;
+    void CreateLogo() noexcept;
+
+    OptionsDialogParts m_parts;
+    bool m_knobsDragVertical;
+    HWND m_window = nullptr;
+    HWND m_logo = nullptr;
+    MnemonicChooser m_mnemonics;
+};
+
+}  // namespace velmora::support
