@@ -36,7 +36,8 @@ std::FILE* CreateBeside(const NativePath& path, NativePath* beside) {
     struct stat status {};
     const bool exists = stat(path.c_str(), &status) == 0;
     // Renaming needs no right to the file itself: a write-protected preset must stay.
-    if (exists && (!S_ISREG(status.st_mode) || access(path.c_str(), W_OK) != 0)) return nullptr;
+    if (exists && (!S_ISREG(status.st_mode) || faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) != 0))
+        return nullptr;
     *beside = path.substr(0, path.rfind('/') + 1) + ".preset-XXXXXX";
     const int descriptor = mkstemp(beside->data());
     if (descriptor < 0) return nullptr;

@@ -58,17 +58,7 @@ TEST(ReplaceTextFile, FailsWhereNothingCanBeWritten) {
     EXPECT_EQ(folder.Count(), 1u);
 }
 
-#ifdef _WIN32
-TEST(ReplaceTextFile, KeepsAWriteProtectedFile) {
-    const TemporaryFolder folder;
-    const std::string name = folder.Write("a", "old");
-    fs::permissions(name, fs::perms::owner_write, fs::perm_options::remove);
-    EXPECT_FALSE(ReplaceTextFile(name.c_str(), WriteHello));
-    EXPECT_EQ(folder.Read("a"), "old");
-    EXPECT_EQ(folder.Count(), 1u);
-    fs::permissions(name, fs::perms::owner_write, fs::perm_options::add);
-}
-#else
+#ifndef _WIN32
 TEST(ReplaceTextFile, ReportsAFullDisk) {
     EXPECT_FALSE(ReplaceTextFile("/dev/full", WriteHello));
 }
@@ -95,25 +85,49 @@ TEST(ReplaceTextFile, WritesInPlaceWhereTheFileCannotBeRenamedOver) {
     EXPECT_EQ(folder.Count(), 1u);
 }
 #else
+// The administrator may write everywhere: for its life, the process is somebody else, who owns these.
+class PlainUser {
+  public:
+    explicit PlainUser(std::initializer_list<std::string> owned) {
+        if (::getuid() != 0) return;
+        for (const std::string& name : owned) EXPECT_EQ(::chown(name.c_str(), kNobody, kNobody), 0);
+        EXPECT_EQ(::seteuid(kNobody), 0);
+    }
+    ~PlainUser() {
+        if (::getuid() == 0) {
+            EXPECT_EQ(::seteuid(0), 0);
+        }
+    }
+    PlainUser(const PlainUser&) = delete;
+    PlainUser& operator=(const PlainUser&) = delete;
+
+  private:
+    static constexpr uid_t kNobody = 65534;
+};
+
 TEST(ReplaceTextFile, WritesInPlaceWhereTheFolderTakesNoNewFiles) {
     const TemporaryFolder folder;
     const std::string name = folder.Write("a", "old");
-    const bool isAdministrator = ::getuid() == 0;  // who may write everywhere
-    constexpr uid_t kNobody = 65534;
-    if (isAdministrator) {
-        ASSERT_EQ(::chown(name.c_str(), kNobody, kNobody), 0);
-        ASSERT_EQ(::chmod(folder.Path().c_str(), 0555), 0);
-        ASSERT_EQ(::seteuid(kNobody), 0);
-    } else {
-        ASSERT_EQ(::chmod(folder.Path().c_str(), 0555), 0);
-    }
-    EXPECT_TRUE(ReplaceTextFile(name.c_str(), WriteHello));
-    EXPECT_FALSE(ReplaceTextFile(folder.File("b").c_str(), WriteHello));
-    if (isAdministrator) {
-        ASSERT_EQ(::seteuid(0), 0);
+    ASSERT_EQ(::chmod(folder.Path().c_str(), 0555), 0);
+    {
+        const PlainUser user({name});
+        EXPECT_TRUE(ReplaceTextFile(name.c_str(), WriteHello));
+        EXPECT_FALSE(ReplaceTextFile(folder.File("b").c_str(), WriteHello));
     }
     ::chmod(folder.Path().c_str(), 0755);
     EXPECT_EQ(folder.Read("a"), kHello);
+    EXPECT_EQ(folder.Count(), 1u);
+}
+
+TEST(ReplaceTextFile, KeepsAWriteProtectedFile) {
+    const TemporaryFolder folder;
+    const std::string name = folder.Write("a", "old");
+    ::chmod(name.c_str(), 0444);
+    {
+        const PlainUser user({folder.Path().string(), name});
+        EXPECT_FALSE(ReplaceTextFile(name.c_str(), WriteHello));
+    }
+    EXPECT_EQ(folder.Read("a"), "old");
     EXPECT_EQ(folder.Count(), 1u);
 }
 #endif

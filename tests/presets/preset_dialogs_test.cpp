@@ -1,0 +1,277 @@
+// The saver with the system's real dialogs, which a second thread reads and answers as a user would.
+#include <gtest/gtest.h>
+
+#include <windows.h>
+#include <commdlg.h>
+#include <dlgs.h>
+
+#include <functional>
+#include <string>
+#include <thread>
+
+#include "presets/dialogs.h"
+#include "presets/preset_file.h"
+#include "presets/preset_saver.h"
+#include "tests/presets/fake_library.h"
+#include "tests/presets/temporary_folder.h"
+
+namespace velmora {
+namespace {
+
+using tests::FakeLibrary;
+using tests::FakeTexts;
+using tests::kIndexOfLook;
+using tests::TemporaryFolder;
+
+std::wstring TextOf(HWND window) {
+    wchar_t text[2048] = L"";
+    SendMessageW(window, WM_GETTEXT, std::size(text), reinterpret_cast<LPARAM>(text));
+    return text;
+}
+
+// A visible dialog of this process, other than `other`; null when none comes within some seconds.
+HWND WaitForDialog(HWND other = nullptr) {
+    for (int tries = 0; tries < 400; ++tries) {
+        HWND window = nullptr;
+        while ((window = FindWindowExW(nullptr, window, L"#32770", nullptr)) != nullptr) {
+            DWORD process = 0;
+            GetWindowThreadProcessId(window, &process);
+            const bool isOwn = process == GetCurrentProcessId();
+            if (isOwn && IsWindowVisible(window) && IsWindowEnabled(window) && window != other) return window;
+        }
+        Sleep(25);
+    }
+    return nullptr;
+}
+
+void Press(HWND dialog, int button) {
+    PostMessageW(dialog, WM_COMMAND, MAKEWPARAM(button, BN_CLICKED), 0);
+}
+
+bool WaitForEnd(HWND window) {
+    for (int tries = 0; tries < 400 && IsWindow(window); ++tries) Sleep(25);
+    return !IsWindow(window);
+}
+
+// What a file dialog shows. The file-type list holds the label; its pattern decides which files are listed.
+struct SeenFileDialog {
+    std::wstring title, label, name;
+    int labels = 0;
+};
+
+HWND FileTypes(HWND dialog) {
+    return GetDlgItem(dialog, cmb1);
+}
+
+// The name field is an edit, alone or inside a combination.
+HWND NameField(HWND dialog) {
+    HWND field = GetDlgItem(dialog, edt1);
+    if (field == nullptr) field = GetDlgItem(dialog, cmb13);
+    return field;
+}
+
+SeenFileDialog See(HWND dialog) {
+    SeenFileDialog seen = {TextOf(dialog), TextOf(FileTypes(dialog)), TextOf(NameField(dialog)), 0};
+    seen.labels = static_cast<int>(SendMessageW(FileTypes(dialog), CB_GETCOUNT, 0, 0));
+    return seen;
+}
+
+void Type(HWND dialog, const std::string& fileName) {
+    const std::wstring wide(fileName.begin(), fileName.end());
+    SendMessageW(NameField(dialog), WM_SETTEXT, 0, reinterpret_cast<LPARAM>(wide.c_str()));
+}
+
+struct SeenMessage {
+    std::wstring caption, text;
+    int buttons = 0;
+    bool hasOk = false;
+    bool hasExclamation = false;
+    bool isOwned = false;
+};
+
+SeenMessage SeeMessage(HWND box) {
+    SeenMessage seen;
+    seen.caption = TextOf(box);
+    seen.isOwned = GetWindow(box, GW_OWNER) != nullptr;
+    HWND child = nullptr;
+    while ((child = FindWindowExW(box, child, nullptr, nullptr)) != nullptr) {
+        wchar_t name[64] = L"";
+        GetClassNameW(child, name, std::size(name));
+        const auto icon = reinterpret_cast<HICON>(SendMessageW(child, STM_GETICON, 0, 0));
+        if (std::wstring(name) == L"Button" && IsWindowVisible(child)) {
+            ++seen.buttons;
+            const int id = GetDlgCtrlID(child);
+            seen.hasOk = seen.hasOk || id == IDOK || (id == IDCANCEL && TextOf(child) == L"OK");
+        } else if (icon != nullptr) {
+            seen.hasExclamation = icon == LoadIconW(nullptr, IDI_EXCLAMATION);
+        } else if (std::wstring(name) == L"Static" && !TextOf(child).empty()) {
+            seen.text = TextOf(child);
+        }
+    }
+    return seen;
+}
+
+void ExpectMessage(const SeenMessage& seen, const wchar_t* caption, const wchar_t* text) {
+    EXPECT_EQ(seen.caption, caption);
+    EXPECT_EQ(seen.text, text);
+    EXPECT_EQ(seen.buttons, 1);
+    EXPECT_TRUE(seen.hasOk);
+    EXPECT_TRUE(seen.hasExclamation);
+}
+
+class PresetDialogsTest : public testing::Test {
+  protected:
+    ~PresetDialogsTest() override { m_saver->Release(); }
+
+    // Runs an operation while `user` acts in another thread.
+    template <typename Operation>
+    std::int32_t Run(const Operation& operation, const std::function<void()>& user) {
+        std::thread thread(user);
+        const std::int32_t result = operation();
+        thread.join();
+        return result;
+    }
+    std::int32_t Save(const std::function<void()>& user, const char* language = nullptr) {
+        return Run(
+            [&] { return m_saver->SavePreset(nullptr, &m_library, kIndexOfLook, &m_record, language); },
+            user);
+    }
+    std::int32_t Load(const std::function<void()>& user, const char* language = nullptr) {
+        return Run(
+            [&] { return m_saver->LoadPreset(nullptr, &m_library, kIndexOfLook, &m_record, language); },
+            user);
+    }
+    // Waits for the file dialog, looks at it, and answers it with a name, or cancels it when there is none.
+    HWND AnswerFileDialog(const std::string& fileName) {
+        HWND dialog = WaitForDialog();
+        if (dialog == nullptr) {
+            ADD_FAILURE() << "no file dialog";
+            return nullptr;
+        }
+        Sleep(300);  // until it has filled its controls
+        m_seen = See(dialog);
+        if (!fileName.empty()) Type(dialog, fileName);
+        Press(dialog, fileName.empty() ? IDCANCEL : IDOK);
+        return dialog;
+    }
+    void AnswerMessage(HWND before, SeenMessage* seen) {
+        HWND box = WaitForDialog(before);
+        if (box == nullptr) {
+            ADD_FAILURE() << "no message";
+            return;
+        }
+        Sleep(100);
+        *seen = SeeMessage(box);
+        Press(box, IDOK);
+    }
+
+    IPresetSaver* m_saver = CreatePresetSaver();
+    FakeLibrary m_library;
+    TemporaryFolder m_folder;
+    PresetRecord m_record = tests::MakeRecord(kIndexOfLook, 0);
+    SeenFileDialog m_seen;
+};
+
+TEST_F(PresetDialogsTest, SavesUnderTheDefaultExtension) {
+    EXPECT_EQ(Save([&] { AnswerFileDialog(m_folder.File("mine")); }), 0);
+    EXPECT_EQ(m_seen.title, L"Save Preset");
+    EXPECT_EQ(m_seen.label, L"Preset Files (*.fxprelb)");
+    EXPECT_EQ(m_seen.labels, 1);
+    ASSERT_EQ(m_folder.Count(), 1u);
+    PresetRecord loaded = {};
+    EXPECT_TRUE(ReadPreset(m_folder.File("mine.fxprelb").c_str(), &loaded));
+    EXPECT_STREQ(loaded.effectName, "Film Look");
+
+    EXPECT_EQ(Load([&] { AnswerFileDialog(m_folder.File("mine.fxprelb")); }), 0);
+    EXPECT_EQ(m_seen.title, L"Load Preset");
+    EXPECT_EQ(m_seen.label, L"Preset Files (*.fxprelb)");
+    EXPECT_EQ(m_record.count, loaded.count);
+}
+
+TEST_F(PresetDialogsTest, CancelIsSilent) {
+    wchar_t before[MAX_PATH] = L"", after[MAX_PATH] = L"";
+    GetCurrentDirectoryW(MAX_PATH, before);
+    EXPECT_EQ(Save([&] { AnswerFileDialog(""); }), 0);
+    EXPECT_EQ(Load([&] { AnswerFileDialog(""); }), 0);
+    GetCurrentDirectoryW(MAX_PATH, after);
+    EXPECT_STREQ(before, after) << "the host's current folder";
+}
+
+TEST_F(PresetDialogsTest, AsksBeforeAnExistingPresetIsReplaced) {
+    m_folder.Write("mine.fxprelb", "old");
+    const std::string name = m_folder.File("mine.fxprelb");
+    EXPECT_EQ(Save([&] {
+                  HWND dialog = AnswerFileDialog(name);
+                  HWND question = WaitForDialog(dialog);
+                  ASSERT_NE(question, nullptr);
+                  EXPECT_EQ(m_folder.Read("mine.fxprelb"), "old");
+                  Press(question, IDNO);
+                  ASSERT_TRUE(WaitForEnd(question));
+                  Press(dialog, IDCANCEL);
+              }),
+              0);
+    EXPECT_EQ(m_folder.Read("mine.fxprelb"), "old");
+    EXPECT_EQ(Save([&] {
+                  HWND dialog = AnswerFileDialog(name);
+                  HWND question = WaitForDialog(dialog);
+                  ASSERT_NE(question, nullptr);
+                  Press(question, IDYES);
+              }),
+              0);
+    EXPECT_NE(m_folder.Read("mine.fxprelb"), "old");
+}
+
+TEST_F(PresetDialogsTest, SpeaksTheUsersLanguage) {
+    FakeTexts texts;
+    texts.texts = {{{4, "Save Preset As"}, u"Vorgabe speichern unter"},
+                   {{4, "Open Preset"}, u"\u30D7\u30EA\u30BB\u30C3\u30C8\u3092\u958B\u304F"},
+                   {{4, "Preset Files"}, u"Vorgabedateien"}};
+    m_library.texts = &texts;
+    EXPECT_EQ(Save([&] { AnswerFileDialog(""); }, "de"), 0);
+    EXPECT_EQ(m_seen.title, L"Vorgabe speichern unter");
+    EXPECT_EQ(m_seen.label, L"Vorgabedateien (*.fxprelb)");
+    EXPECT_EQ(Load([&] { AnswerFileDialog(""); }, "de"), 0);
+    EXPECT_EQ(m_seen.title, L"\u30D7\u30EA\u30BB\u30C3\u30C8\u3092\u958B\u304F");
+}
+
+TEST_F(PresetDialogsTest, TellsOfFailuresInMessages) {
+    SeenMessage seen;
+    EXPECT_EQ(Run([&] { return m_saver->SavePreset(nullptr, nullptr, 0, nullptr, nullptr); },
+                  [&] { AnswerMessage(nullptr, &seen); }),
+              1);
+    ExpectMessage(seen, L"Preset save error",
+                  L"Sorry, can't save preset.\nPossible reason: access denied or disk is full.");
+    const std::string broken = m_folder.Write("broken.fxprelb", "<Preset");
+    EXPECT_EQ(Load([&] { AnswerMessage(AnswerFileDialog(broken), &seen); }), 1);
+    ExpectMessage(
+        seen, L"Preset load error",
+        L"Sorry, can't open the preset specified.\nPossible reason: access denied or file is corrupted.");
+    const std::string other =
+        m_folder.Write("other.fxprelb", "<Preset EffectName='Film Damage'><parameter/></Preset>");
+    EXPECT_EQ(Load([&] { AnswerMessage(AnswerFileDialog(other), &seen); }), 2);
+    ExpectMessage(
+        seen, L"Preset open warning",
+        L"Error trying to open a Film Damage preset. This can only open Film Look presets. Please try "
+        L"again.");
+}
+
+// The message belongs to the window that the user works in, not to the file dialog's owner.
+TEST_F(PresetDialogsTest, MessagesAreOwnedByTheForegroundWindow) {
+    HWND window = CreateWindowW(L"Static", L"host", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 0, 0, 300, 200, nullptr,
+                                nullptr, nullptr, nullptr);
+    SetForegroundWindow(window);
+    if (GetForegroundWindow() != window) GTEST_SKIP() << "the screen keeps its foreground window";
+    HWND owner = nullptr;
+    EXPECT_EQ(Run([&] { return m_saver->LoadPreset(nullptr, nullptr, 0, nullptr, nullptr); },
+                  [&] {
+                      HWND box = WaitForDialog();
+                      owner = GetWindow(box, GW_OWNER);
+                      Press(box, IDOK);
+                  }),
+              1);
+    EXPECT_EQ(owner, window);
+    DestroyWindow(window);
+}
+
+}  // namespace
+}  // namespace velmora
