@@ -11,6 +11,7 @@
 namespace velmora::effects {
 
 // The renderer's settings in the order in which it asks for them.
+// clang-format off
 enum class Master : std::uint32_t {
     kYJitter, kXJitter, kBorder,
     kFlicker, kFlickerSpeed, kBrightness, kContrast,
@@ -19,6 +20,7 @@ enum class Master : std::uint32_t {
     kWear, kPattern, kBlueChannelOnly,
     kSpots, kScratches, kDepth, kBlack, kWhite, kThick,
 };
+// clang-format on
 inline constexpr std::uint32_t kMasterCount = 21;
 
 struct Layout {
@@ -29,7 +31,7 @@ struct Layout {
 struct ParamRow {
     const char* name;
     ParamKind kind;
-    float minimum;           // shown range of a slider
+    float minimum;  // shown range of a slider
     float maximum;
     ValueWord defaultValue;  // stored form: normalised number, colour word, item index, flag
     Layout layout;
@@ -55,8 +57,8 @@ struct MasterAnswer {
 struct EffectTable {
     const char* name;
     std::span<const ParamRow> params;
-    std::span<const char* const> presetNames;      // alphabetical
-    std::span<const PresetCell> presetCells;       // preset major: [preset * params.size() + parameter]
+    std::span<const char* const> presetNames;  // alphabetical
+    std::span<const PresetCell> presetCells;   // preset major: [preset * params.size() + parameter]
     std::array<MasterAnswer, kMasterCount> answers;
     bool marksSliders;  // writes 1 behind a slider's maximum
 };

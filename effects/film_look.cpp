@@ -59,7 +59,7 @@ constexpr PresetRow<7> kPresets[] = {
 constexpr AnswerRow kSettings[] = {
     Fixed(       Master::kYJitter,         0.0),
     Fixed(       Master::kXJitter,         0.0),
-    FixedColour( Master::kBorder,          0x00000000),  // no top byte, unlike the others; without jitter none shows
+    FixedColour( Master::kBorder,          0x00000000),  // no top byte, unlike the others; no border shows
     Fixed(       Master::kFlicker,         0.0),
     Fixed(       Master::kFlickerSpeed,    0.0),
     Own(         Master::kBrightness,      "Brightness"),

@@ -8,7 +8,8 @@
 
 namespace velmora::tests {
 
-// Its destructor lies behind the interface's operations. Counts references, and answers the identifier kIidPresetSaver as if it were its own.
+// Counts references, and answers the identifier kIidPresetSaver as if it were its own. Its destructor lies
+// behind the interface's operations in the table.
 class TestHost : public IVideoHost {
   public:
     virtual ~TestHost() = default;
