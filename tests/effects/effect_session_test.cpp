@@ -125,6 +125,7 @@ TEST(EffectSession, PinnedFramesDoNotDependOnTheirOrder) {
             auto forward = SessionWith(*effect, preset);
             auto backward = SessionWith(*effect, preset);
             std::vector<Picture> frames;
+            frames.reserve(4);
             for (int frame = 0; frame < 4; ++frame) frames.push_back(FrameOf(*forward, SecondsOf(frame)));
             for (int frame = 3; frame >= 0; --frame) {
                 EXPECT_EQ(FrameOf(*backward, SecondsOf(frame)), frames[static_cast<std::size_t>(frame)]);

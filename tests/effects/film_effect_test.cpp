@@ -32,7 +32,7 @@ class Effect {
     Effect& operator=(const Effect&) = delete;
 
     IVideoEffect* operator->() const { return m_effect; }
-    IVideoHost& Face() const { return *m_face; }
+    IVideoHost* Face() const { return m_face; }
     // Without frames there is nothing to render, but the host is attached.
     void Attach(IVideoHost* host) {
         EXPECT_FALSE(m_effect->Process(host, nullptr, nullptr, nullptr, nullptr));
@@ -51,7 +51,7 @@ constexpr std::uint32_t kMasterKinds[21] = {2, 2, 3, 2, 2, 2, 2, 2, 3, 2, 2, 2, 
 TEST(FilmEffect, AnswersToItsThreeIdentifiersFromBothFaces) {
     for (std::uint32_t i = 0; i < 5; ++i) {
         Effect effect(i);
-        IUnknown* const faces[] = {static_cast<IUnknown*>(effect.operator->()), &effect.Face()};
+        IUnknown* const faces[] = {static_cast<IUnknown*>(effect.operator->()), effect.Face()};
         for (IUnknown* face : faces) {
             struct {
                 const Guid* iid;
@@ -60,7 +60,7 @@ TEST(FilmEffect, AnswersToItsThreeIdentifiersFromBothFaces) {
             } const rows[] = {
                 {&kIidUnknown, kStatusOk, effect.operator->()},
                 {&kIidVideoEffect, kStatusOk, effect.operator->()},
-                {&kIidVideoHost, kStatusOk, &effect.Face()},
+                {&kIidVideoHost, kStatusOk, effect.Face()},
                 {&kIidEffectLibrary, kStatusNoInterface, nullptr},
                 {&kIidPresetSaver, kStatusNoInterface, nullptr},
             };
@@ -86,11 +86,11 @@ TEST(FilmEffect, PassesUnknownIdentifiersToTheAttachedHost) {
     EXPECT_EQ(out, &host);
     EXPECT_EQ(host.references, 2u);
     out = &host;
-    EXPECT_EQ(effect.Face().QueryInterface(&kIidEffectLibrary, &out), kStatusNoInterface);
+    EXPECT_EQ(effect.Face()->QueryInterface(&kIidEffectLibrary, &out), kStatusNoInterface);
     EXPECT_EQ(out, nullptr);
     // Its own come first and the host is not counted.
     EXPECT_EQ(effect->QueryInterface(&kIidVideoHost, &out), kStatusOk);
-    EXPECT_EQ(out, &effect.Face());
+    EXPECT_EQ(out, effect.Face());
     effect->Release();
     EXPECT_EQ(host.references, 2u);
 }
@@ -140,12 +140,12 @@ TEST(FilmEffect, AnswersNothingWithoutAHost) {
         for (int round = 0; round < 2; ++round) {
             for (std::uint32_t index = 0; index <= 21; ++index) {
                 ValueCell cell = kUntouchedCell;
-                EXPECT_FALSE(effect.Face().GetParamValue(index, &cell, 2));
+                EXPECT_FALSE(effect.Face()->GetParamValue(index, &cell, 2));
                 EXPECT_EQ(cell.value.bits, kUntouchedCell.value.bits);
                 EXPECT_EQ(cell.kind, kUntouchedCell.kind);
             }
-            EXPECT_FALSE(effect.Face().HostOperation4(1, 2, 3));
-            EXPECT_EQ(effect.Face().HostOperation5(1, 2), 0u);
+            EXPECT_FALSE(effect.Face()->HostOperation4(1, 2, 3));
+            EXPECT_EQ(effect.Face()->HostOperation5(1, 2), 0u);
             effect.Attach(nullptr);
         }
     }
@@ -155,12 +155,12 @@ TEST(FilmEffect, ForwardsTwoOperationsToTheHost) {
     Effect effect(1);
     TestHost host;
     effect.Attach(&host);
-    EXPECT_TRUE(effect.Face().HostOperation4(11, 12, 13));
+    EXPECT_TRUE(effect.Face()->HostOperation4(11, 12, 13));
     EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{11, 12, 13}));
-    EXPECT_EQ(effect.Face().HostOperation5(21, 22), 0x12345678u);
+    EXPECT_EQ(effect.Face()->HostOperation5(21, 22), 0x12345678u);
     EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{21, 22}));
-    EXPECT_FALSE(effect.Face().HostOperation6(31, 32));
-    effect.Face().HostOperation7(41, 42);
+    EXPECT_FALSE(effect.Face()->HostOperation6(31, 32));
+    effect.Face()->HostOperation7(41, 42);
     EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{21, 22}));
 }
 
@@ -204,7 +204,7 @@ TEST(FilmEffect, AnswersEachOfTheRenderersSettings) {
             RecordingHost host;
             effect.Attach(&host);
             ValueCell cell = kUntouchedCell;
-            EXPECT_TRUE(effect.Face().GetParamValue(index, &cell, kMasterKinds[index]));
+            EXPECT_TRUE(effect.Face()->GetParamValue(index, &cell, kMasterKinds[index]));
             EXPECT_EQ(cell.kind, kMasterKinds[index]);
             EXPECT_EQ(cell.second, kUntouchedCell.second);
             ExpectAnswer(expected.answers[index], host, cell, kMasterKinds[index]);
@@ -218,15 +218,15 @@ TEST(FilmEffect, FailsPastTheLastSettingAndWithoutACell) {
     effect.Attach(&host);
     for (const std::uint32_t index : {21u, 0xFFFFFFFFu}) {
         ValueCell cell = kUntouchedCell;
-        EXPECT_FALSE(effect.Face().GetParamValue(index, &cell, 2));
+        EXPECT_FALSE(effect.Face()->GetParamValue(index, &cell, 2));
         EXPECT_EQ(cell.value.bits, kUntouchedCell.value.bits);
         EXPECT_EQ(cell.kind, 2u);
     }
-    EXPECT_FALSE(effect.Face().GetParamValue(0, nullptr, 2));
+    EXPECT_FALSE(effect.Face()->GetParamValue(0, nullptr, 2));
     EXPECT_TRUE(host.calls.empty());
     host.answers = false;
     ValueCell cell = kUntouchedCell;
-    EXPECT_FALSE(effect.Face().GetParamValue(0, &cell, 2));
+    EXPECT_FALSE(effect.Face()->GetParamValue(0, &cell, 2));
 }
 
 // "Film Express" has one slider for the amount of scratches and derives their depth: 1 - (1 - s)^2.
@@ -252,19 +252,19 @@ TEST(FilmEffect, DerivesTheDepthOfScratches) {
     for (const auto& row : rows) {
         host.amount = row.amount;
         ValueCell cell = {};
-        EXPECT_TRUE(effect.Face().GetParamValue(17, &cell, 2));
+        EXPECT_TRUE(effect.Face()->GetParamValue(17, &cell, 2));
         EXPECT_EQ(cell.value.number, row.depth) << "amount " << row.amount;
     }
     // 0.2 is no exact number: 1 - s is narrowed before it is squared.
     host.amount = 0.2f;
     ValueCell cell = {};
-    EXPECT_TRUE(effect.Face().GetParamValue(17, &cell, 2));
+    EXPECT_TRUE(effect.Face()->GetParamValue(17, &cell, 2));
     EXPECT_EQ(cell.value.number,
               static_cast<float>(1.0L - 0.800000011920928955078125L * 0.800000011920928955078125L));
 
     host.answers = false;
     cell.value.number = 0.5f;
-    EXPECT_TRUE(effect.Face().GetParamValue(17, &cell, 2));
+    EXPECT_TRUE(effect.Face()->GetParamValue(17, &cell, 2));
     EXPECT_EQ(cell.value.number, 0.75f);
 }
 
