@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "render/shade.h"
+#include "render/wear.h"
 
 namespace velmora::render {
 namespace {
@@ -19,8 +20,8 @@ void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) 
 }
 
 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-             const float* fractions) noexcept {
-    for (std::int32_t x = 0; x < width; ++x) out[x] = ShadePixel(in[x], fractions[bytes[x]]);
+             float amount) noexcept {
+    for (std::int32_t x = 0; x < width; ++x) out[x] = ShadePixel(in[x], WearFraction(bytes[x], amount));
 }
 
 void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {

@@ -33,9 +33,9 @@ struct RowKernels {
     void (*tables)(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept;
     // The saturation mix with weight w in -127..127 (render/colour.h), without a table.
     void (*mix)(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) noexcept;
-    // Lightens all three channels of each pixel by the fraction of its wear byte.
+    // Lightens all three channels of each pixel by the fraction of its wear byte, (byte / 255) * amount.
     void (*wear)(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-                 const float* fractions) noexcept;
+                 float amount) noexcept;
     // Copies a row; `out` is not read again soon.
     void (*copy)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
 };

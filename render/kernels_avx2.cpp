@@ -38,43 +38,40 @@ VM_AVX2 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
     kSse2Kernels.mix(in + x, out + x, width - x, weight);
 }
 
-// Two pixels, as in the 16-byte form.
-VM_AVX2 inline __m256i Lighten(__m128i pixels, __m256 fraction) noexcept {
-    const __m256i channels = _mm256_cvtepu8_epi32(pixels);
-    const __m256 product =
-        _mm256_mul_ps(fraction, _mm256_cvtepi32_ps(_mm256_sub_epi32(_mm256_set1_epi32(255), channels)));
+// One channel of eight pixels, at `shift` of their words: R(a (255 - c)), as in the 16-byte form.
+template <int kShift>
+VM_AVX2 inline __m256i Lightened(__m256i pixels, __m256 fraction) noexcept {
+    const __m256i byte = _mm256_set1_epi32(255);
+    const __m256i channel = _mm256_and_si256(_mm256_srli_epi32(pixels, kShift), byte);
+    const __m256 product = _mm256_mul_ps(fraction, _mm256_cvtepi32_ps(_mm256_sub_epi32(byte, channel)));
     const __m256i whole = _mm256_cvttps_epi32(product);
     const __m256 rest = _mm256_sub_ps(product, _mm256_cvtepi32_ps(whole));
     const __m256i up = _mm256_castps_si256(_mm256_cmp_ps(rest, _mm256_set1_ps(0.5f), _CMP_GE_OQ));
-    return _mm256_add_epi32(channels, _mm256_sub_epi32(whole, up));
+    return _mm256_slli_epi32(_mm256_sub_epi32(whole, up), kShift);
 }
 
+// The channels' sums stay below 256, so they can be added in place without a carry into the next channel.
 VM_AVX2 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-                     const float* fractions) noexcept {
-    const __m256 colour = _mm256_castsi256_ps(_mm256_setr_epi32(-1, -1, -1, 0, -1, -1, -1, 0));
-    const __m256i firstTwo = _mm256_setr_epi32(0, 0, 0, 0, 1, 1, 1, 1);
-    const __m256i lastTwo = _mm256_setr_epi32(2, 2, 2, 2, 3, 3, 3, 3);
+                     float amount) noexcept {
     std::int32_t x = 0;
-    for (; x + 4 <= width; x += 4) {
-        std::uint32_t worn;
+    for (; x + 8 <= width; x += 8) {
+        std::int64_t worn;
         std::memcpy(&worn, bytes + x, sizeof worn);
-        __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + x));
+        if (worn == 0 && in == out) continue;
+        const __m256i pixels = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x));
+        __m256i result = pixels;
         if (worn != 0) {
-            const __m256 four =
-                _mm256_castps128_ps256(_mm_setr_ps(fractions[bytes[x]], fractions[bytes[x + 1]],
-                                                   fractions[bytes[x + 2]], fractions[bytes[x + 3]]));
-            const __m256i low =
-                Lighten(pixels, _mm256_and_ps(colour, _mm256_permutevar8x32_ps(four, firstTwo)));
-            const __m256i high = Lighten(_mm_srli_si128(pixels, 8),
-                                         _mm256_and_ps(colour, _mm256_permutevar8x32_ps(four, lastTwo)));
-            // Packing works in halves: pixel 0 and 2 come first, 1 and 3 behind.
-            const __m256i words = _mm256_packs_epi32(low, high);
-            const __m256i packed = _mm256_packus_epi16(words, words);
-            pixels = _mm_unpacklo_epi32(_mm256_castsi256_si128(packed), _mm256_extracti128_si256(packed, 1));
+            const __m128i eight = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(bytes + x));
+            const __m256 levels = _mm256_cvtepi32_ps(_mm256_cvtepu8_epi32(eight));
+            const __m256 fraction =
+                _mm256_mul_ps(_mm256_div_ps(levels, _mm256_set1_ps(255.0f)), _mm256_set1_ps(amount));
+            result = _mm256_add_epi32(result, Lightened<0>(pixels, fraction));
+            result = _mm256_add_epi32(result, Lightened<8>(pixels, fraction));
+            result = _mm256_add_epi32(result, Lightened<16>(pixels, fraction));
         }
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), pixels);
+        _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), result);
     }
-    kPlainKernels.wear(in + x, out + x, width - x, bytes + x, fractions);
+    kSse2Kernels.wear(in + x, out + x, width - x, bytes + x, amount);
 }
 
 VM_AVX2 void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {

@@ -80,7 +80,7 @@ VM_AVX512 inline __m512i Lightened(__m512i pixels, __m512 fraction) noexcept {
 }
 
 VM_AVX512 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-                       const float* fractions) noexcept {
+                       float amount) noexcept {
     for (std::int32_t x = 0; x < width; x += kPixels) {
         const __mmask16 tail = Tail(width - x);
         const __m128i worn = _mm_maskz_loadu_epi8(tail, bytes + x);
@@ -89,8 +89,9 @@ VM_AVX512 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std:
         const __m512i pixels = _mm512_maskz_loadu_epi32(tail, in + x);
         __m512i result = pixels;
         if (touched != 0) {
-            const __m512 fraction = _mm512_mask_i32gather_ps(_mm512_setzero_ps(), touched,
-                                                             _mm512_cvtepu8_epi32(worn), fractions, 4);
+            const __m512 levels = _mm512_cvtepi32_ps(_mm512_cvtepu8_epi32(worn));
+            const __m512 fraction =
+                _mm512_mul_ps(_mm512_div_ps(levels, _mm512_set1_ps(255.0f)), _mm512_set1_ps(amount));
             result = _mm512_add_epi32(result, Lightened<0>(pixels, fraction));
             result = _mm512_add_epi32(result, Lightened<8>(pixels, fraction));
             result = _mm512_add_epi32(result, Lightened<16>(pixels, fraction));

@@ -71,33 +71,36 @@ __m128i Lighten(__m128i channels, __m128 fraction) noexcept {
     return _mm_add_epi32(channels, _mm_sub_epi32(whole, up));
 }
 
-// Alpha's fraction is 0.
-__m128 PixelFraction(float fraction) noexcept {
-    return _mm_setr_ps(fraction, fraction, fraction, 0.0f);
+// A lane's fraction for the channels of its pixel; alpha's is 0.
+template <int kLane>
+__m128 PixelFraction(__m128 fractions) noexcept {
+    const __m128 colour = _mm_castsi128_ps(_mm_setr_epi32(-1, -1, -1, 0));
+    return _mm_and_ps(colour, _mm_shuffle_ps(fractions, fractions, kLane * 0x55));
 }
 
 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-             const float* fractions) noexcept {
+             float amount) noexcept {
     const __m128i zero = _mm_setzero_si128();
     std::int32_t x = 0;
     for (; x + 4 <= width; x += 4) {
-        std::uint32_t worn;
+        std::int32_t worn;
         std::memcpy(&worn, bytes + x, sizeof worn);
+        if (worn == 0 && in == out) continue;
         __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + x));
         if (worn != 0) {
+            const __m128i wide = _mm_unpacklo_epi16(_mm_unpacklo_epi8(_mm_cvtsi32_si128(worn), zero), zero);
+            const __m128 fractions =
+                _mm_mul_ps(_mm_div_ps(_mm_cvtepi32_ps(wide), _mm_set1_ps(255.0f)), _mm_set1_ps(amount));
             const __m128i low = _mm_unpacklo_epi8(pixels, zero), high = _mm_unpackhi_epi8(pixels, zero);
-            const __m128i first = Lighten(_mm_unpacklo_epi16(low, zero), PixelFraction(fractions[bytes[x]]));
-            const __m128i second =
-                Lighten(_mm_unpackhi_epi16(low, zero), PixelFraction(fractions[bytes[x + 1]]));
-            const __m128i third =
-                Lighten(_mm_unpacklo_epi16(high, zero), PixelFraction(fractions[bytes[x + 2]]));
-            const __m128i fourth =
-                Lighten(_mm_unpackhi_epi16(high, zero), PixelFraction(fractions[bytes[x + 3]]));
+            const __m128i first = Lighten(_mm_unpacklo_epi16(low, zero), PixelFraction<0>(fractions));
+            const __m128i second = Lighten(_mm_unpackhi_epi16(low, zero), PixelFraction<1>(fractions));
+            const __m128i third = Lighten(_mm_unpacklo_epi16(high, zero), PixelFraction<2>(fractions));
+            const __m128i fourth = Lighten(_mm_unpackhi_epi16(high, zero), PixelFraction<3>(fractions));
             pixels = _mm_packus_epi16(_mm_packs_epi32(first, second), _mm_packs_epi32(third, fourth));
         }
         _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), pixels);
     }
-    kPlainKernels.wear(in + x, out + x, width - x, bytes + x, fractions);
+    kPlainKernels.wear(in + x, out + x, width - x, bytes + x, amount);
 }
 
 }  // namespace

@@ -16,6 +16,9 @@ struct GreyPicture {
     const std::uint8_t* pixels;
 };
 
+// No wear picture is wider.
+inline constexpr std::int32_t kWidestWear = 64;
+
 // The wear picture of an item value of the "Pattern" menu, 2000..2006; any other value gives 2000's.
 // 0 is intact film, 255 film worn down to the base. The last row continues in the first.
 const GreyPicture& WearPicture(std::int32_t menuValue) noexcept;

@@ -1,6 +1,8 @@
 #include "render/row_program.h"
 
 #include <algorithm>
+#include <array>
+#include <cstring>
 
 namespace velmora::render {
 namespace {
@@ -107,9 +109,21 @@ void RowProgram::Mix(const Bgra* in, Bgra* out, std::int32_t width) const noexce
 
 void RowProgram::Wear(Bgra* row, std::int32_t width, std::int32_t y) const noexcept {
     if (m_plan.wear.BlueOnly()) return m_plan.wear.Row(row, row, width, y);
-    m_plan.wear.ForEachStrip(width, y, [&](std::int32_t x, std::int32_t count, const std::uint8_t* bytes) {
-        m_kernels.wear(row + x, row + x, count, bytes, m_plan.wear.Fractions());
+    // The strips are narrow, so their bytes are lined up first and the kernel runs over all of them.
+    constexpr std::int32_t kBatch = 4096;
+    std::array<std::uint8_t, kBatch + kWidestWear> bytes;
+    std::int32_t start = 0, filled = 0;
+    const auto flush = [&] {
+        m_kernels.wear(row + start, row + start, filled, bytes.data(), m_plan.wear.Amount());
+        start += filled;
+        filled = 0;
+    };
+    m_plan.wear.ForEachStrip(width, y, [&](std::int32_t, std::int32_t count, const std::uint8_t* strip) {
+        std::memcpy(bytes.data() + filled, strip, static_cast<std::size_t>(count));
+        filled += count;
+        if (filled >= kBatch) flush();
     });
+    flush();
 }
 
 }  // namespace velmora::render

@@ -1,6 +1,5 @@
 #include "render/wear.h"
 
-#include "render/rounding.h"
 #include "render/shade.h"
 
 namespace velmora::render {
@@ -20,9 +19,7 @@ WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random&
     stage.m_channels = settings.wearChannels;
     stage.m_starts = random;
     random.Skip(WearStripCount(settings, width));
-    for (std::size_t byte = 0; byte < stage.m_fractions.size(); ++byte) {
-        stage.m_fractions[byte] = Narrow(double{Narrow(static_cast<double>(byte) / 255.0)} * settings.wear);
-    }
+    stage.m_amount = settings.wear;
     return stage;
 }
 
@@ -30,7 +27,7 @@ void WearStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
     ForEachStrip(width, y, [&](std::int32_t start, std::int32_t count, const std::uint8_t* bytes) {
         for (std::int32_t i = 0; i < count; ++i) {
             const Bgra pixel = in[start + i];
-            const float fraction = m_fractions[bytes[i]];
+            const float fraction = WearFraction(bytes[i], m_amount);
             Bgra& result = out[start + i];
             if (m_channels == kWearAllChannels) {
                 result = ShadePixel(pixel, fraction);

@@ -4,15 +4,19 @@
 // Fraction of a pixel under wear byte b: (b / 255) * wear, in single precision.
 #pragma once
 
-#include <array>
 #include <cstdint>
 
 #include "render/image.h"
 #include "render/pictures.h"
 #include "render/random.h"
+#include "render/rounding.h"
 #include "render/stage_settings.h"
 
 namespace velmora::render {
+
+[[nodiscard]] inline float WearFraction(std::uint8_t byte, float amount) noexcept {
+    return Narrow(double{Narrow(byte / 255.0)} * amount);
+}
 
 class WearStage {
   public:
@@ -33,8 +37,7 @@ class WearStage {
             visit(x, count, m_picture->pixels + row * m_picture->rowStep);
         }
     }
-    [[nodiscard]] float Fraction(std::uint8_t byte) const noexcept { return m_fractions[byte]; }
-    [[nodiscard]] const float* Fractions() const noexcept { return m_fractions.data(); }
+    [[nodiscard]] float Amount() const noexcept { return m_amount; }
     [[nodiscard]] bool BlueOnly() const noexcept { return m_channels == kWearBlueOnly; }
 
   private:
@@ -46,7 +49,7 @@ class WearStage {
     // The strips' start rows are drawn anew for each row from where the frame's draws began: a strip count
     // that grows with the width needs no room, and a draw costs next to nothing beside a strip's pixels.
     Random m_starts;
-    std::array<float, 256> m_fractions{};
+    float m_amount = 0.0f;
 };
 
 // The strips of a frame of this width, each of which takes one draw.

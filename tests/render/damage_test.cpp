@@ -69,6 +69,10 @@ TEST(Wear, TilesInStripsWithARandomStartEach) {
     }
 }
 
+TEST(Wear, PicturesAreNoWiderThanRowsMakeRoomFor) {
+    for (std::int32_t value = 2000; value <= 2006; ++value) EXPECT_LE(WearPicture(value).width, kWidestWear);
+}
+
 TEST(Wear, ZeroDrawsOnceAndDoesNothing) {
     Random random(5);
     EXPECT_FALSE(PrepareWear({}, 500, random).IsActive());
