@@ -6,6 +6,7 @@
 #include <algorithm>
 #include <cstdio>
 
+#include "help/topics.h"
 #include "support/bit_button.h"
 #include "support/product.h"
 #include "support/resource_ids.h"
@@ -15,7 +16,6 @@
 namespace velmora::support {
 namespace {
 
-constexpr std::int32_t kOptionsTopic = 300;
 constexpr RECT kLogoPlace = {10, 8, 230, 40};  // in dialog units
 
 // Over the middle of its owner, inside the screen's free area. Without an owner the system has centred it.
@@ -174,7 +174,7 @@ void OptionsDialog::OnOk() noexcept {
 }
 
 void OptionsDialog::OpenHelp() const noexcept try {
-    static_cast<void>(m_parts.help->Show(m_window, kOptionsTopic, false));
+    static_cast<void>(m_parts.help->Show(m_window, help::kOptions, false));
 } catch (...) {
     // As with every help that cannot be opened, nothing is said.
 }
