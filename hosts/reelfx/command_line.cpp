@@ -5,6 +5,7 @@
 #include "hosts/common/number_text.h"
 #include "hosts/common/usage_error.h"
 #include "hosts/reelfx/list_command.h"
+#include "hosts/reelfx/picture_commands.h"
 #include "hosts/reelfx/render_command.h"
 
 namespace velmora::hosts {
@@ -28,12 +29,13 @@ struct Typed {
     InputOptions input;
     EffectOptions effect;
     OutputOptions output;
-    std::string outPath, size, rate, seed = "0", randomState, preset, frames, start, duration, frame = "0";
+    std::string outPath, size, rate, seed = "0", randomState, preset, frames, start, duration;
     std::string format, codec, crf, pixelFormat;
     int threads = 0;
     bool overwrite = false, noSound = false, digests = false, quiet = false;
     ListOptions list;
     std::string listEffect;
+    PictureOptions picture;
 };
 
 std::optional<std::string> Given(const std::string& text) {
@@ -88,6 +90,21 @@ void AddRender(CLI::App& app, Typed& typed) {
     render.add_flag("--no-sound", typed.noSound, "Leave sound and subtitles out");
     render.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
     render.add_flag("--quiet,-q", typed.quiet, "No progress line");
+}
+
+CLI::App& AddPicture(CLI::App& app, Typed& typed, const char* name, const char* what) {
+    CLI::App& command = *app.add_subcommand(name, what);
+    AddInput(command, typed);
+    command.add_option("OUT", typed.picture.out, "PNG or JPEG")->required();
+    AddEffect(command, typed);
+    command.add_option("--frame,-n", typed.picture.frame, "Frame of the clip, counted from 0")
+        ->type_name("N")
+        ->check(CLI::NonNegativeNumber);
+    command.add_option("--width", typed.picture.width, "Width of each picture in pixels")
+        ->type_name("W")
+        ->check(CLI::Range(16, 8192));
+    command.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
+    return command;
 }
 
 void AddList(CLI::App& app, Typed& typed) {
@@ -170,6 +187,14 @@ RenderOptions ReadRender(const Typed& typed) {
     return options;
 }
 
+PictureOptions ReadPicture(const Typed& typed) {
+    PictureOptions options = typed.picture;
+    options.input = ReadInput(typed);
+    options.effect = ReadEffect(typed);
+    options.mayOverwrite = typed.overwrite;
+    return options;
+}
+
 }  // namespace
 
 ExitCode RunCommandLine(int count, char** arguments) {
@@ -180,6 +205,10 @@ ExitCode RunCommandLine(int count, char** arguments) {
     app.require_subcommand(1);
     AddList(app, typed);
     AddRender(app, typed);
+    AddPicture(app, typed, "frame", "Write one frame before and after, side by side");
+    AddPicture(app, typed, "sheet", "Write one frame through all presets of an effect")
+        .add_option("--columns", typed.picture.columns, "Pictures in a row")
+        ->check(CLI::Range(1, 32));
     try {
         app.parse(count, arguments);
     } catch (const CLI::Success& wish) {
@@ -192,6 +221,8 @@ ExitCode RunCommandLine(int count, char** arguments) {
         typed.list.effect = Given(typed.listEffect);
         return RunList(typed.list);
     }
+    if (app.got_subcommand("frame")) return RunFrame(ReadPicture(typed));
+    if (app.got_subcommand("sheet")) return RunSheet(ReadPicture(typed));
     return RunRender(ReadRender(typed));
 }
 
