@@ -6,6 +6,7 @@
 #include "hosts/common/usage_error.h"
 #include "hosts/reelfx/list_command.h"
 #include "hosts/reelfx/picture_commands.h"
+#include "hosts/reelfx/preset_command.h"
 #include "hosts/reelfx/render_command.h"
 
 namespace velmora::hosts {
@@ -29,13 +30,15 @@ struct Typed {
     InputOptions input;
     EffectOptions effect;
     OutputOptions output;
-    std::string outPath, size, rate, seed = "0", randomState, preset, frames, start, duration;
+    std::string outPath, size, rate, seed = "0", randomState, preset, presetFile, frames, start, duration;
     std::string format, codec, crf, pixelFormat;
     int threads = 0;
     bool overwrite = false, noSound = false, digests = false, quiet = false;
     ListOptions list;
     std::string listEffect;
     PictureOptions picture;
+    PresetShowOptions presetShow;
+    PresetSaveOptions presetSave;
 };
 
 std::optional<std::string> Given(const std::string& text) {
@@ -52,13 +55,17 @@ void AddInput(CLI::App& command, Typed& typed) {
 
 void AddEffect(CLI::App& command, Typed& typed) {
     command.add_option("--effect,-e", typed.effect.effect, "Effect, see reelfx list")
-        ->required()
         ->type_name("NAME")
         ->envname("REELFX_EFFECT");
     command.add_option("--preset,-p", typed.preset, "Preset of the effect")->type_name("NAME");
+    command.add_option("--preset-file", typed.presetFile, "Preset file, as editors save it")
+        ->type_name("FILE");
     command.add_option("--set,-s", typed.effect.settings, "One parameter, after the preset; repeatable")
         ->type_name("NAME=VALUE")
         ->allow_extra_args(false);
+}
+
+void AddRandom(CLI::App& command, Typed& typed) {
     command.add_option("--seed", typed.seed, "Another seed gives other damage")
         ->type_name("N")
         ->capture_default_str()
@@ -74,6 +81,7 @@ void AddRender(CLI::App& app, Typed& typed) {
     AddInput(render, typed);
     render.add_option("OUT", typed.outPath, "File, image pattern, or - (YUV4MPEG2)");
     AddEffect(render, typed);
+    AddRandom(render, typed);
     render.add_option("--frames", typed.frames, "Frames A up to but not including B; either may be left out")
         ->type_name("A:B");
     render.add_option("--start", typed.start, "Begin at this time of the clip")->type_name("TIME");
@@ -97,6 +105,7 @@ CLI::App& AddPicture(CLI::App& app, Typed& typed, const char* name, const char* 
     AddInput(command, typed);
     command.add_option("OUT", typed.picture.out, "PNG or JPEG")->required();
     AddEffect(command, typed);
+    AddRandom(command, typed);
     command.add_option("--frame,-n", typed.picture.frame, "Frame of the clip, counted from 0")
         ->type_name("N")
         ->check(CLI::NonNegativeNumber);
@@ -105,6 +114,19 @@ CLI::App& AddPicture(CLI::App& app, Typed& typed, const char* name, const char* 
         ->check(CLI::Range(16, 8192));
     command.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
     return command;
+}
+
+void AddPreset(CLI::App& app, Typed& typed) {
+    CLI::App& preset = *app.add_subcommand("preset", "Show and save preset files");
+    preset.require_subcommand(1);
+    CLI::App& show = *preset.add_subcommand("show", "Print what a preset file holds");
+    show.add_option("FILE", typed.presetShow.file)->required();
+    show.add_flag("--json", typed.presetShow.asJson, "As JSON");
+    CLI::App& save = *preset.add_subcommand("save", "Write settings as a preset file");
+    save.add_option("FILE", typed.presetSave.file)->required();
+    AddEffect(save, typed);
+    save.add_option("--name", typed.presetSave.name, "The preset's name; default: the file's");
+    save.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing FILE");
 }
 
 void AddList(CLI::App& app, Typed& typed) {
@@ -152,6 +174,7 @@ InputOptions ReadInput(const Typed& typed) {
 EffectOptions ReadEffect(const Typed& typed) {
     EffectOptions effect = typed.effect;
     effect.preset = Given(typed.preset);
+    effect.presetFile = Given(typed.presetFile);
     const auto seed = Parsed("--seed", typed.seed, ParseInteger, "a whole number");
     if (seed < 0 || seed > 0xFFFFFFFFll) throw UsageError("--seed takes a number from 0 to 4294967295");
     effect.seed = static_cast<std::uint32_t>(seed);
@@ -195,6 +218,13 @@ PictureOptions ReadPicture(const Typed& typed) {
     return options;
 }
 
+PresetSaveOptions ReadPresetSave(const Typed& typed) {
+    PresetSaveOptions options = typed.presetSave;
+    options.effect = ReadEffect(typed);
+    options.mayOverwrite = typed.overwrite;
+    return options;
+}
+
 }  // namespace
 
 ExitCode RunCommandLine(int count, char** arguments) {
@@ -209,6 +239,7 @@ ExitCode RunCommandLine(int count, char** arguments) {
     AddPicture(app, typed, "sheet", "Write one frame through all presets of an effect")
         .add_option("--columns", typed.picture.columns, "Pictures in a row")
         ->check(CLI::Range(1, 32));
+    AddPreset(app, typed);
     try {
         app.parse(count, arguments);
     } catch (const CLI::Success& wish) {
@@ -223,6 +254,10 @@ ExitCode RunCommandLine(int count, char** arguments) {
     }
     if (app.got_subcommand("frame")) return RunFrame(ReadPicture(typed));
     if (app.got_subcommand("sheet")) return RunSheet(ReadPicture(typed));
+    if (const CLI::App* preset = app.get_subcommand("preset"); preset->parsed()) {
+        return preset->got_subcommand("show") ? RunPresetShow(typed.presetShow)
+                                              : RunPresetSave(ReadPresetSave(typed));
+    }
     return RunRender(ReadRender(typed));
 }
 

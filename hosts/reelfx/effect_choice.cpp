@@ -4,6 +4,8 @@
 
 #include "effects/effect_queries.h"
 #include "effects/effect_table.h"
+#include "hosts/common/usage_error.h"
+#include "hosts/reelfx/preset_io.h"
 
 namespace velmora::hosts {
 namespace {
@@ -33,11 +35,16 @@ const std::vector<EffectInfo>& CoreEffects() {
     return all;
 }
 
-EffectChoice::EffectChoice(const EffectOptions& options)
-    : m_options(options),
-      m_index(FindEffect(CoreEffects(), options.effect)),
-      m_info(&CoreEffects()[m_index]) {
+EffectChoice::EffectChoice(const EffectOptions& options) : m_options(options) {
+    std::optional<PresetRecord> record;
+    if (options.presetFile) record = LoadPresetFile(*options.presetFile);
+    std::string effect = options.effect;
+    if (effect.empty() && record) effect = PresetEffect(*record);
+    if (effect.empty()) throw UsageError("--effect is missing; reelfx list shows which there are");
+    m_index = FindEffect(CoreEffects(), effect);
+    m_info = &CoreEffects()[m_index];
     if (options.preset) m_preset = FindPreset(*m_info, *options.preset);
+    if (record) m_settings = PresetSettings(*record, *m_info, *options.presetFile);
     for (const std::string& text : options.settings) m_settings.push_back(ParseSetting(*m_info, text));
 }
 

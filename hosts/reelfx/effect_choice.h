@@ -15,13 +15,14 @@
 namespace velmora::hosts {
 
 struct EffectOptions {
-    std::string effect;
-    std::optional<std::string> preset;
-    std::vector<std::string> settings;  // "NAME=VALUE", applied after the preset
+    std::string effect = {};  // may be empty where a preset file tells it
+    std::optional<std::string> preset = {};
+    std::optional<std::string> presetFile = {};  // applied after the preset
+    std::vector<std::string> settings = {};      // "NAME=VALUE", applied last
     std::uint32_t seed = 0;
     // A running sequence of random numbers from this state, as a host that plays a clip through the library
     // gets it, instead of numbers that follow from seed and frame.
-    std::optional<std::uint32_t> randomState;
+    std::optional<std::uint32_t> randomState = {};
 };
 
 // The five effects as the core describes them, in the library's order.
@@ -29,7 +30,8 @@ const std::vector<EffectInfo>& CoreEffects();
 
 class EffectChoice {
   public:
-    // Throws UsageError when the effect, the preset or a setting does not exist or does not fit.
+    // Throws UsageError when the effect, the preset or a setting does not exist or does not fit, Failure when
+    // the preset file cannot be read or belongs to another effect.
     explicit EffectChoice(const EffectOptions& options);
 
     [[nodiscard]] const EffectInfo& Info() const { return *m_info; }
@@ -44,7 +46,7 @@ class EffectChoice {
     std::size_t m_index;
     const EffectInfo* m_info;
     std::optional<std::uint32_t> m_preset;
-    std::vector<Setting> m_settings;
+    std::vector<Setting> m_settings;  // of the preset file, then those given one by one
 };
 
 }  // namespace velmora::hosts

@@ -98,6 +98,10 @@ void MediaWriter::SetUpEncoder(const OutputOptions& options, const AVCodec& code
     encoder.sample_aspect_ratio =
         av_guess_sample_aspect_ratio(&m_source.Container(), &m_source.Picture(), nullptr);
     encoder.framerate = m_source.FrameRateGuess();
+    if (codec.supported_framerates) {
+        encoder.framerate =
+            codec.supported_framerates[av_find_nearest_q_idx(encoder.framerate, codec.supported_framerates)];
+    }
     const bool isTimeless = (m_container->oformat->flags & AVFMT_NOTIMESTAMPS) != 0;
     encoder.time_base =
         isTimeless || NeedsConstantRate(codec) ? av_inv_q(encoder.framerate) : m_source.Picture().time_base;
