@@ -82,14 +82,18 @@ void ContinueEnds(CellRow row, std::int32_t width) noexcept {
 
 class VeilMaker {
   public:
-    VeilMaker(const RowReader& input, std::int32_t width, std::int32_t height,
+    VeilMaker(double amount, const RowReader& input, std::int32_t width, std::int32_t height,
               const GlowKernels& kernels) noexcept
-        : m_input(input), m_width(width), m_height(height), m_kernels(kernels) {
+        : m_input(input),
+          m_width(width),
+          m_height(height),
+          m_kernels(kernels),
+          m_strength(static_cast<std::uint16_t>(RoundHalfAway(kStrongest * amount * 65535.0))) {
         while (Reduced(height, m_reduction) > kMostVeilRows) ++m_reduction;
     }
 
     [[nodiscard]] bool Allocate(GlowMemory& memory) noexcept;
-    [[nodiscard]] GlowStage Make(double amount) noexcept;
+    [[nodiscard]] GlowStage Make() noexcept;
 
   private:
     static constexpr int kLevels = 5;
@@ -108,6 +112,7 @@ class VeilMaker {
     std::int32_t m_width;
     std::int32_t m_height;
     const GlowKernels& m_kernels;
+    std::uint16_t m_strength;
     int m_reduction = 0;
 
     CellPlane m_levels[kLevels];
@@ -251,7 +256,7 @@ void VeilMaker::Halve(int level) noexcept {
     }
 }
 
-// Adds the next level to this one.
+// Adds the next level to this one. The last sum becomes the veil.
 void VeilMaker::AddDoubled(int level, double ownShare, double otherShare) noexcept {
     const CellPlane &fine = m_levels[level], &coarse = m_levels[level + 1];
     const auto share = [](double x) { return static_cast<std::uint16_t>(RoundHalfAway(x * 65535.0)); };
@@ -261,10 +266,11 @@ void VeilMaker::AddDoubled(int level, double ownShare, double otherShare) noexce
         ContinueEnds(m_rows.Row(0), coarse.width);
         m_kernels.doubleAlong(m_rows.Row(0), m_rows.Row(1), coarse.width);
         m_kernels.mix(fine.Row(y), m_rows.Row(1), fine.width, share(ownShare), share(otherShare));
+        if (level == 0) m_kernels.lift(fine.Row(y), fine.width, m_strength);
     }
 }
 
-GlowStage VeilMaker::Make(double amount) noexcept {
+GlowStage VeilMaker::Make() noexcept {
     const VeilTaps taps = MakeVeilTaps(m_height, 1 << m_reduction);
     const CellPlane& veil = m_levels[0];
     for (std::int32_t y = 0; y < veil.height; ++y) {
@@ -283,8 +289,6 @@ GlowStage VeilMaker::Make(double amount) noexcept {
     AddDoubled(2, kMiddleShare, kWideShare);
     AddDoubled(1, 0.0, 1.0);
     AddDoubled(0, kNarrowShare, 1.0);
-    const std::uint16_t strength = static_cast<std::uint16_t>(RoundHalfAway(kStrongest * amount * 65535.0));
-    for (std::int32_t y = 0; y < veil.height; ++y) m_kernels.lift(veil.Row(y), veil.width, strength);
     return {veil, m_reduction, m_rows, m_kernels};
 }
 
@@ -325,9 +329,9 @@ void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
 GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width, std::int32_t height,
                       GlowMemory& memory, Form form) noexcept {
     if (!(amount > 0.0f) || width < 1 || height < 1) return {};
-    VeilMaker maker(input, width, height, GlowKernelsOf(form));
+    VeilMaker maker(std::min<double>(amount, 1.0), input, width, height, GlowKernelsOf(form));
     if (!maker.Allocate(memory)) return {};
-    return maker.Make(std::min<double>(amount, 1.0));
+    return maker.Make();
 }
 
 }  // namespace velmora::render

@@ -23,7 +23,7 @@ inline constexpr std::int32_t kCellWhite = 255 * 128;  // 15 bits: sums of two s
 // A symmetric filter: the middle weight and those of the pairs around it, together 65536 at most.
 struct GlowTaps {
     static constexpr int kMostPairs = 4;
-    int pairs = 0;
+    int pairs = 0;  // 2 or 4
     std::uint16_t middle = 0;
     std::array<std::uint16_t, kMostPairs> pair{};
 };

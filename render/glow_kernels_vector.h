@@ -16,16 +16,31 @@ void KeepHighlights(CellRow cells, std::int32_t count) noexcept {
     }
 }
 
-void Filter(ConstCellRow middle, const ConstCellRow* before, const ConstCellRow* after, CellRow out,
-            std::int32_t count, const GlowTaps& taps) noexcept {
+// With the number of pairs known, weights and pointers stay where the processor reaches them at once.
+template <int kPairs>
+void FilterPairs(ConstCellRow middle, const ConstCellRow* before, const ConstCellRow* after, CellRow out,
+                 std::int32_t count, const GlowTaps& taps) noexcept {
+    const Lanes middleWeight = Lanes::All(taps.middle);
+    Lanes weights[kPairs];
+    ConstCellRow befores[kPairs], afters[kPairs];
+    for (std::size_t p = 0; p < kPairs; ++p) {
+        weights[p] = Lanes::All(taps.pair[p]);
+        befores[p] = before[p];
+        afters[p] = after[p];
+    }
     for (std::int32_t i = 0; i < count * kCellLanes; i += Lanes::kSize) {
-        Lanes sum = MulHigh(Lanes::Load(middle + i), Lanes::All(taps.middle));
-        for (int p = 0; p < taps.pairs; ++p) {
-            const Lanes pair = Lanes::Load(before[p] + i) + Lanes::Load(after[p] + i);
-            sum = sum + MulHigh(pair, Lanes::All(taps.pair[static_cast<std::size_t>(p)]));
+        Lanes sum = MulHigh(Lanes::Load(middle + i), middleWeight);
+        for (int p = 0; p < kPairs; ++p) {
+            sum = sum + MulHigh(Lanes::Load(befores[p] + i) + Lanes::Load(afters[p] + i), weights[p]);
         }
         Store(out + i, sum);
     }
+}
+
+void Filter(ConstCellRow middle, const ConstCellRow* before, const ConstCellRow* after, CellRow out,
+            std::int32_t count, const GlowTaps& taps) noexcept {
+    const auto filter = taps.pairs == 2 ? FilterPairs<2> : FilterPairs<GlowTaps::kMostPairs>;
+    filter(middle, before, after, out, count, taps);
 }
 
 Lanes ThreeToOne(Lanes near, Lanes far) noexcept {
