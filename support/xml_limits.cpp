@@ -75,7 +75,10 @@ class Scanner {
             const bool isHexadecimal = *m_at == 'x';
             if (isHexadecimal) ++m_at;
             m_at += std::strspn(m_at, isHexadecimal ? "0123456789abcdefABCDEF" : "0123456789");
-            if (*m_at != ';') return false;
+            if (*m_at != ';') {
+                m_swallows = true;
+                return false;
+            }
         }
     }
 
@@ -111,7 +114,7 @@ class Scanner {
             if (StartsWithLetters("version") || StartsWithLetters("encoding") ||
                 StartsWithLetters("standalone")) {
                 if (Attribute()) continue;
-                m_isOver = m_depth == 0;
+                m_isOver = m_depth == 0 && !m_swallows;
                 return m_isOver;
             }
             while (*m_at != '\0' && *m_at != '>' && !IsBlank(*m_at)) ++m_at;
@@ -162,7 +165,8 @@ class Scanner {
     const char* m_at;
     int m_depth = 0;
     int m_nodes = 0;
-    bool m_isOver = false;  // the parser stops here without complaint
+    bool m_isOver = false;    // the parser stops here without complaint
+    bool m_swallows = false;  // a malformed reference was met
 };
 
 }  // namespace

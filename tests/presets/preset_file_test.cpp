@@ -302,6 +302,8 @@ TEST(ReadPreset, ReadsOddFiles) {
         {"reference without an end", Document("<parameter type='&#49'/>" + one), -1},
         {"reference that swallows markup", Document("<parameter a='&#x'/>" + Repeat("<a>", 99) + "x;'/>"),
          -1},
+        {"such a reference in a declaration",
+         "<?xml version='&#x' x;'?>" + Repeat("<a>", 99) + Repeat("</a>", 99) + full, -1},
         {"document type", "<!DOCTYPE a>" + full, 1},
         {"definitions of entities are not understood", "<!DOCTYPE a [<!ENTITY b 'c'>]>" + full, -1},
         {"own entities stay unknown", "<!DOCTYPE a><Preset Name='&b;'>" + one + "</Preset>", 1},
