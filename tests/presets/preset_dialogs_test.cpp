@@ -1,10 +1,6 @@
 // The saver with the system's real dialogs, which a second thread reads and answers as a user would.
 #include <gtest/gtest.h>
 
-#include <windows.h>
-#include <commdlg.h>
-#include <dlgs.h>
-
 #include <functional>
 #include <string>
 #include <thread>
@@ -12,6 +8,7 @@
 #include "presets/dialogs.h"
 #include "presets/preset_file.h"
 #include "presets/preset_saver.h"
+#include "tests/presets/dialog_driver.h"
 #include "tests/presets/fake_library.h"
 #include "tests/presets/temporary_folder.h"
 
@@ -21,95 +18,13 @@ namespace {
 using tests::FakeLibrary;
 using tests::FakeTexts;
 using tests::kIndexOfLook;
+using tests::Press;
+using tests::SeeMessage;
+using tests::SeenFileDialog;
+using tests::SeenMessage;
 using tests::TemporaryFolder;
-
-std::wstring TextOf(HWND window) {
-    wchar_t text[2048] = L"";
-    SendMessageW(window, WM_GETTEXT, std::size(text), reinterpret_cast<LPARAM>(text));
-    return text;
-}
-
-// A visible dialog of this process, other than `other`; null when none comes within some seconds.
-HWND WaitForDialog(HWND other = nullptr) {
-    for (int tries = 0; tries < 400; ++tries) {
-        HWND window = nullptr;
-        while ((window = FindWindowExW(nullptr, window, L"#32770", nullptr)) != nullptr) {
-            DWORD process = 0;
-            GetWindowThreadProcessId(window, &process);
-            const bool isOwn = process == GetCurrentProcessId();
-            if (isOwn && IsWindowVisible(window) && IsWindowEnabled(window) && window != other) return window;
-        }
-        Sleep(25);
-    }
-    return nullptr;
-}
-
-void Press(HWND dialog, int button) {
-    PostMessageW(dialog, WM_COMMAND, MAKEWPARAM(button, BN_CLICKED), 0);
-}
-
-bool WaitForEnd(HWND window) {
-    for (int tries = 0; tries < 400 && IsWindow(window); ++tries) Sleep(25);
-    return !IsWindow(window);
-}
-
-// What a file dialog shows. The file-type list holds the label; its pattern decides which files are listed.
-struct SeenFileDialog {
-    std::wstring title, label, name;
-    int labels = 0;
-};
-
-HWND FileTypes(HWND dialog) {
-    return GetDlgItem(dialog, cmb1);
-}
-
-// The name field is an edit, alone or inside a combination.
-HWND NameField(HWND dialog) {
-    HWND field = GetDlgItem(dialog, edt1);
-    if (field == nullptr) field = GetDlgItem(dialog, cmb13);
-    return field;
-}
-
-SeenFileDialog See(HWND dialog) {
-    SeenFileDialog seen = {TextOf(dialog), TextOf(FileTypes(dialog)), TextOf(NameField(dialog)), 0};
-    seen.labels = static_cast<int>(SendMessageW(FileTypes(dialog), CB_GETCOUNT, 0, 0));
-    return seen;
-}
-
-void Type(HWND dialog, const std::string& fileName) {
-    const std::wstring wide(fileName.begin(), fileName.end());
-    SendMessageW(NameField(dialog), WM_SETTEXT, 0, reinterpret_cast<LPARAM>(wide.c_str()));
-}
-
-struct SeenMessage {
-    std::wstring caption, text;
-    int buttons = 0;
-    bool hasOk = false;
-    bool hasExclamation = false;
-    bool isOwned = false;
-};
-
-SeenMessage SeeMessage(HWND box) {
-    SeenMessage seen;
-    seen.caption = TextOf(box);
-    seen.isOwned = GetWindow(box, GW_OWNER) != nullptr;
-    HWND child = nullptr;
-    while ((child = FindWindowExW(box, child, nullptr, nullptr)) != nullptr) {
-        wchar_t name[64] = L"";
-        GetClassNameW(child, name, std::size(name));
-        const auto icon = reinterpret_cast<HICON>(SendMessageW(child, STM_GETICON, 0, 0));
-        if (std::wstring(name) == L"Button" && IsWindowVisible(child)) {
-            ++seen.buttons;
-            const int id = GetDlgCtrlID(child);
-            seen.hasOk = seen.hasOk || id == IDOK || (id == IDCANCEL && TextOf(child) == L"OK");
-        } else if (icon != nullptr) {
-            seen.hasExclamation = icon == LoadIconW(nullptr, IDI_EXCLAMATION);
-        } else if (std::wstring(name) == L"Static" && !TextOf(child).empty()) {
-            seen.text = TextOf(child);
-        }
-    }
-    return seen;
-}
+using tests::WaitForDialog;
+using tests::WaitForEnd;
 
 void ExpectMessage(const SeenMessage& seen, const wchar_t* caption, const wchar_t* text) {
     EXPECT_EQ(seen.caption, caption);
@@ -141,19 +56,7 @@ class PresetDialogsTest : public testing::Test {
             [&] { return m_saver->LoadPreset(nullptr, &m_library, kIndexOfLook, &m_record, language); },
             user);
     }
-    // Waits for the file dialog, looks at it, and answers it with a name, or cancels it when there is none.
-    HWND AnswerFileDialog(const std::string& fileName) {
-        HWND dialog = WaitForDialog();
-        if (dialog == nullptr) {
-            ADD_FAILURE() << "no file dialog";
-            return nullptr;
-        }
-        Sleep(300);  // until it has filled its controls
-        m_seen = See(dialog);
-        if (!fileName.empty()) Type(dialog, fileName);
-        Press(dialog, fileName.empty() ? IDCANCEL : IDOK);
-        return dialog;
-    }
+    HWND AnswerFileDialog(const std::string& fileName) { return tests::AnswerFileDialog(fileName, &m_seen); }
     void AnswerMessage(HWND before, SeenMessage* seen) {
         HWND box = WaitForDialog(before);
         if (box == nullptr) {

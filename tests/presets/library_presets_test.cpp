@@ -1,0 +1,101 @@
+// Presets through the product itself: saved and loaded back by the DLL's own saver and dialogs.
+//
+// VELMORA_KEEP_PRESETS names a folder: then every preset of every effect is saved there and stays, for other
+// hosts to read; otherwise the first of each effect is.
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <cstring>
+#include <functional>
+#include <thread>
+
+#include "tests/common/library_under_test.h"
+#include "tests/presets/dialog_driver.h"
+#include "tests/presets/temporary_folder.h"
+
+namespace velmora {
+namespace {
+
+using tests::SeenFileDialog;
+
+PresetRecord MakeRecord(IVideoEffect& effect, std::uint32_t preset) {
+    PresetRecord record = {};
+    std::strncpy(record.name, effect.GetPresetName(preset), sizeof record.name - 1);
+    for (std::uint32_t index = 0;; ++index) {
+        ParamDescriptor descriptor = {};
+        if (!effect.GetParamInfo(index, &descriptor)) return record;
+        PresetCell cell = {};
+        effect.GetPresetValue(preset, index, &cell);
+        record.values[record.count++] = {cell.value, 0, descriptor.kind};
+    }
+}
+
+void ExpectSameValues(const PresetRecord& expected, const PresetRecord& actual) {
+    EXPECT_STREQ(actual.name, expected.name);
+    EXPECT_STREQ(actual.effectName, expected.effectName);
+    ASSERT_EQ(actual.count, expected.count);
+    for (std::int32_t i = 0; i < expected.count; ++i) {
+        const ValueCell& cell = expected.values[i];
+        EXPECT_EQ(actual.values[i].kind, cell.kind);
+        const std::uint32_t mask = cell.kind == kKindGroup      ? 0
+                                   : cell.kind == kKindCheckBox ? 0xFF
+                                                                : 0xFFFFFFFF;
+        EXPECT_EQ(actual.values[i].value.bits & mask, cell.value.bits & mask) << expected.name << ", " << i;
+    }
+}
+
+class LibraryPresetsTest : public ::testing::Test {
+  protected:
+    ~LibraryPresetsTest() override {
+        m_saver->Release();
+        m_library->Release();
+    }
+
+    using Operation = std::int32_t (VM_CALL IPresetSaver::*)(void*, IEffectLibrary*, std::uint32_t,
+                                                             PresetRecord*, const char*);
+    std::int32_t Run(Operation operation, std::uint32_t effect, PresetRecord& record,
+                     const std::string& fileName) {
+        std::thread user([&] { tests::AnswerFileDialog(fileName, &m_seen); });
+        const std::int32_t result = (m_saver->*operation)(nullptr, m_library, effect, &record, nullptr);
+        user.join();
+        return result;
+    }
+    void SaveAndLoad(std::uint32_t index, std::uint32_t preset, const std::string& fileName) {
+        IVideoEffect* effect = m_library->CreateEffect(index);
+        PresetRecord saved = MakeRecord(*effect, preset);
+        effect->Release();
+        ASSERT_EQ(Run(&IPresetSaver::SavePreset, index, saved, fileName), 0);
+        EXPECT_EQ(m_seen.label,
+                  std::wstring(L"Preset Files (*.fxprel") + static_cast<wchar_t>(L'a' + index) + L")");
+        PresetRecord loaded = {};
+        ASSERT_EQ(Run(&IPresetSaver::LoadPreset, index, loaded, fileName), 0);
+        ExpectSameValues(saved, loaded);
+    }
+    bool HasPreset(std::uint32_t index, std::uint32_t preset) {
+        IVideoEffect* effect = m_library->CreateEffect(index);
+        const bool has = effect->GetPresetName(preset) != nullptr;
+        effect->Release();
+        return has;
+    }
+
+    velmora::testing::LoadedLibrary m_module;
+    IEffectLibrary* m_library = m_module.getEffectsLibrary();
+    IPresetSaver* m_saver = m_library->CreatePresetSaver();
+    SeenFileDialog m_seen;
+};
+
+TEST_F(LibraryPresetsTest, ComeBackBitForBit) {
+    const tests::TemporaryFolder folder;
+    const char* keep = std::getenv("VELMORA_KEEP_PRESETS");
+    for (std::uint32_t index = 0; index < 5; ++index) {
+        for (std::uint32_t preset = 0; HasPreset(index, preset) && (keep != nullptr || preset == 0);
+             ++preset) {
+            const std::string name = std::to_string(index) + "-" + std::to_string(preset) + ".fxprel" +
+                                     static_cast<char>('a' + index);
+            SaveAndLoad(index, preset, keep != nullptr ? std::string(keep) + "\\" + name : folder.File(name));
+        }
+    }
+}
+
+}  // namespace
+}  // namespace velmora
