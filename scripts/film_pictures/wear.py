@@ -28,15 +28,16 @@ def wavy(width, height):
 
 
 def blotchy(width, height):
-    """Soft stains of a dozen pixels, some hardly begun."""
-    large, small, mottle = (clouds(21 + i, width, height, size) for i, size in enumerate((12, 5, 1.5)))
-    strength = clouds(24, width, height, 10)
+    """Soft stains of a dozen pixels, many of them hardly begun, none with an edge.
+
+    Evened, so that no large stain tells that the strips repeat.
+    """
+    large, small, mottle = (clouds(21 + i, width, height, size) for i, size in enumerate((13, 6, 2)))
     ends = strip_ends(25, width, height, 4)
-    stains = highlights(field(width, height, lambda x, y:
-                              large[y][x] + 0.4 * small[y][x] + 0.1 * mottle[y][x] - 1.2 * ends[y][x]),
-                        0.70, 0.96)
-    shown = field(width, height, lambda x, y: smoothstep(-2.6, 0.6, strength[y][x]) * (1 - ends[y][x]))
-    return multiplied(stains, shown)
+    ground = evened(field(width, height, lambda x, y:
+                          large[y][x] + 0.6 * small[y][x] + 0.25 * mottle[y][x]), 11)
+    stains = highlights(field(width, height, lambda x, y: ground[y][x] - 0.8 * ends[y][x]), 0.52, 1.0)
+    return blurred(multiplied(stains, field(width, height, lambda x, y: 1 - 0.8 * ends[y][x])))
 
 
 def grainy(width, height):
