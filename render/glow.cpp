@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <new>
 
+#include "render/glow_taps.h"
 #include "render/rounding.h"
 
 namespace velmora::render {
@@ -10,18 +11,11 @@ namespace {
 
 constexpr std::int32_t kMostVeilRows = 300;
 
-// The veil is the sum of three blurs: the first softens outlines, the second makes halos, the third is the
-// mist. Standard deviations are shares of the picture's height.
-constexpr double kNarrowSigma = 0.004;
-constexpr double kMiddleSigma = 0.020;
-constexpr double kWideSigma = 0.075;
+// Of the three blurs in the veil.
 constexpr double kNarrowShare = 0.30;
 constexpr double kMiddleShare = 0.32;
 constexpr double kWideShare = 0.38;
 constexpr double kStrongest = 0.75;  // of the veil at amount 1
-
-// What two halvings, and two doublings as well, add to a blur's variance, in squares of the coarser cells.
-constexpr double kResamplingVariance = 0.1875 + 0.1875 / 4;
 
 // Half the size, the last cell of an odd one counted whole.
 constexpr std::int32_t Halved(std::int32_t size) noexcept {
@@ -30,45 +24,6 @@ constexpr std::int32_t Halved(std::int32_t size) noexcept {
 constexpr std::int32_t Reduced(std::int32_t size, int reduction) noexcept {
     for (; reduction > 0; --reduction) size = Halved(size);
     return size;
-}
-
-// A filter of about this variance: passes of (t, 1 − 2t, t) run into one.
-GlowTaps MakeTaps(double variance, int passes) noexcept {
-    const double t = std::max(variance, 0.0) / (2.0 * passes);
-    double weights[GlowTaps::kMostPairs + 2] = {1.0};  // from the middle outward
-    for (int pass = 0; pass < passes; ++pass) {
-        double inner = weights[1];
-        for (int i = 0; i <= passes; ++i) {
-            const double own = weights[i];
-            weights[i] = own * (1.0 - 2.0 * t) + (inner + weights[i + 1]) * t;
-            inner = own;
-        }
-    }
-    GlowTaps taps;
-    taps.pairs = passes;
-    taps.middle = static_cast<std::uint16_t>(std::min(Truncate(weights[0] * 65536.0), 65535));
-    for (int i = 0; i < passes; ++i) {
-        taps.pair[static_cast<std::size_t>(i)] =
-            static_cast<std::uint16_t>(Truncate(weights[i + 1] * 65536.0));
-    }
-    return taps;
-}
-
-struct VeilTaps {
-    GlowTaps narrow, middle, wide;
-};
-
-// The filters for a veil whose cells are `cell` pixels wide, in the pyramid's levels 0, 2 and 4. What reducing,
-// halving and doubling blur by themselves is left out of them.
-VeilTaps MakeVeilTaps(double height, double cell) noexcept {
-    const auto square = [](double x) { return x * x; };
-    const double onScreen = 0.25 * (1.0 - 1.0 / square(cell));  // by averaging blocks and by interpolation
-    const double narrow = std::max(square(kNarrowSigma * height / cell) - onScreen, 0.0);
-    const double beforeMiddle = (onScreen + narrow) / 16 + 2 * kResamplingVariance;
-    const double middle = std::max(square(kMiddleSigma * height / cell) / 16 - beforeMiddle, 0.0);
-    const double beforeWide = (beforeMiddle + middle) / 16 + 2 * kResamplingVariance;
-    const double wide = std::max(square(kWideSigma * height / cell) / 256 - beforeWide, 0.0);
-    return {MakeTaps(narrow, 2), MakeTaps(middle, 4), MakeTaps(wide, 4)};
 }
 
 // Continues a row by copies of its end cells.
@@ -194,22 +149,19 @@ void VeilMaker::ReadBlocks(std::int32_t y, CellRow out) noexcept {
 
 // One pixel for a cell, or 2 × 2: in small pictures only.
 void VeilMaker::ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept {
-    const int scale = 128 / (side * side);
     const Bgra* rows[2];
-    for (std::int32_t i = 0; i < side; ++i) {
-        rows[i] = m_input.Read(std::min(y * side + i, m_height - 1), m_pixels + std::ptrdiff_t{m_width} * i);
+    for (std::int32_t i = 0; i < 2; ++i) {
+        const std::int32_t row = std::min(y * side + i * (side - 1), m_height - 1);
+        rows[i] = m_input.Read(row, m_pixels + std::ptrdiff_t{m_width} * i);
     }
+    // A single pixel counts four times.
+    constexpr int kScale = 128 / 4;
     for (std::int32_t x = 0; x < m_width; x += side, out += kCellLanes) {
-        int blue = 0, green = 0, red = 0;
-        for (int i = 0; i < side * side; ++i) {
-            const Bgra& pixel = rows[i / side][std::min(x + i % side, m_width - 1)];
-            blue += pixel.blue;
-            green += pixel.green;
-            red += pixel.red;
-        }
-        out[0] = static_cast<std::uint16_t>(blue * scale);
-        out[1] = static_cast<std::uint16_t>(green * scale);
-        out[2] = static_cast<std::uint16_t>(red * scale);
+        const std::int32_t next = std::min(x + side - 1, m_width - 1);
+        const Bgra &a = rows[0][x], &b = rows[0][next], &c = rows[1][x], &d = rows[1][next];
+        out[0] = static_cast<std::uint16_t>((a.blue + b.blue + c.blue + d.blue) * kScale);
+        out[1] = static_cast<std::uint16_t>((a.green + b.green + c.green + d.green) * kScale);
+        out[2] = static_cast<std::uint16_t>((a.red + b.red + c.red + d.red) * kScale);
         out[3] = 0;
     }
 }

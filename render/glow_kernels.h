@@ -29,8 +29,8 @@ struct GlowTaps {
 };
 
 // Highlights come in smoothly where luma is above the floor and count in full from three quarters of white on:
-// by 3t² − 2t³ (a hair less, to stay below 1), t rising from 0 to 1 between. The excess is doubled and lengthened by a share of 65536, so that
-// it fills 16 bits there.
+// by 3t² − 2t³ (a hair less, to stay below 1), t rising from 0 to 1 between. The excess is doubled and
+// lengthened by a share of 65536, so that it fills 16 bits there.
 inline constexpr std::int32_t kHighlightFloor = 3300;
 inline constexpr std::int32_t kHighlightStretch = 35850;
 inline constexpr std::int32_t kLumaBlue = 29, kLumaGreen = 150, kLumaRed = 77;  // of 256
@@ -50,7 +50,7 @@ struct GlowKernels {
                    std::int32_t count, const GlowTaps& taps) noexcept;
     // The mean of four rows, 1 3 3 1.
     void (*halveRows)(const ConstCellRow rows[4], CellRow out, std::int32_t count) noexcept;
-    // The same along a row: `count` cells of `out` from twice as many, whose ends are continued by a cell.
+    // The same along a row: `count` cells of `out` from twice as many, whose ends are continued by two.
     void (*halveAlong)(ConstCellRow row, CellRow out, std::int32_t count) noexcept;
     // Three parts of one row and one of another, as lies between cells when a row becomes two.
     void (*between)(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t count) noexcept;

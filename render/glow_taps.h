@@ -1,0 +1,17 @@
+// The widths of the glow's blurs.
+#pragma once
+
+#include "render/glow_kernels.h"
+
+namespace velmora::render {
+
+// The filters of the veil's pyramid, in its levels 0, 2 and 4.
+struct VeilTaps {
+    GlowTaps narrow, middle, wide;
+};
+
+// For a veil whose cells are `cell` pixels wide. What reducing, halving and doubling blur by themselves is left
+// out of the filters.
+[[nodiscard]] VeilTaps MakeVeilTaps(double height, double cell) noexcept;
+
+}  // namespace velmora::render
