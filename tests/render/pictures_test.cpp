@@ -32,7 +32,7 @@ struct WearCase {
 
 constexpr WearCase kWearCases[] = {
     {2000, 50, 300, .06, .12, .06, .12},    // Wavy
-    {2001, 50, 300, .07, .13, .07, .13},    // Blotchy
+    {2001, 50, 300, .07, .13, .02, .08},    // Blotchy: soft, so that little of it reaches half
     {2002, 50, 300, .03, .07, .03, .07},    // Grainy
     {2003, 50, 300, .02, .05, .02, .06},    // Fine
     {2004, 25, 150, .05, .11, .06, .12},    // Splotchy
