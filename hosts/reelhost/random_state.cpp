@@ -60,6 +60,7 @@ std::uint32_t RandomStateFinder::Find() {
         for (const Shift& shift : seen) {
             if (random.Draw(-kLargestShift, kLargestShift) != shift.down) return std::nullopt;
             if (random.Draw(-kLargestShift, kLargestShift) != shift.right) return std::nullopt;
+            random.Next();  // every frame draws once for the wear, also without any
         }
         return random.State();
     };
