@@ -121,16 +121,19 @@ struct Sse2Span {
     }
 };
 
-// `along` tells the row: knots from the top, 1/65536.
+// A row between two knots: `part` of 4096 of the way from one to the next.
+struct RowPlace {
+    std::size_t knot;
+    std::int32_t part;
+};
+
 template <typename Span>
-void DrawLine(const ScratchLine& line, Bgra* row, std::int32_t width, std::uint64_t along) noexcept {
-    const std::size_t knot = static_cast<std::size_t>(along >> 16);
-    const std::int32_t part = static_cast<std::int32_t>(along & 0xFFFF) >> 4;
-    const ScratchLine::Knot &from = line.knots[knot], &to = line.knots[knot + 1];
+void DrawLine(const ScratchLine& line, Bgra* row, std::int32_t width, const RowPlace& place) noexcept {
+    const ScratchLine::Knot &from = line.knots[place.knot], &to = line.knots[place.knot + 1];
     const std::uint32_t strength =
-        static_cast<std::uint32_t>(from.strength + ((to.strength - from.strength) * part >> 12));
+        static_cast<std::uint32_t>(from.strength + ((to.strength - from.strength) * place.part >> 12));
     if (strength == 0) return;
-    const std::int32_t edge = from.offset + ((to.offset - from.offset) * part >> 12);
+    const std::int32_t edge = from.offset + ((to.offset - from.offset) * place.part >> 12);
     const std::int32_t first = line.pixel + (edge >> 8);
     const ScratchShape& shape = *line.shape;
     const std::uint16_t* weights = shape.weights[static_cast<std::size_t>((edge & 255) >> 3)].data();
@@ -140,6 +143,13 @@ void DrawLine(const ScratchLine& line, Bgra* row, std::int32_t width, std::uint6
     for (std::int32_t x = std::max(first, 0); x < std::min(first + shape.pixels, width); ++x) {
         DrawPixel(row[x], weights[x - first], strength, line.isWhite);
     }
+}
+
+template <typename Span>
+void DrawLines(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
+               const RowPlace& place) noexcept {
+    for (const ScratchLine* line = lines; line != lines + count; ++line)
+        DrawLine<Span>(*line, row, width, place);
 }
 
 }  // namespace
@@ -154,8 +164,10 @@ ScratchStage::ScratchStage(const ScratchLine* lines, std::uint32_t count, std::i
 void ScratchStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     if (in != out) std::memcpy(out, in, static_cast<std::size_t>(width) * sizeof(Bgra));
     const std::uint64_t along = m_knotStep * static_cast<std::uint64_t>(y);
-    const auto draw = m_form == Form::kPlain ? DrawLine<PlainSpan> : DrawLine<Sse2Span>;
-    for (std::uint32_t i = 0; i < m_count; ++i) draw(m_lines[i], out, width, along);
+    const RowPlace place = {static_cast<std::size_t>(along >> 16),
+                            static_cast<std::int32_t>(along & 0xFFFF) >> 4};
+    const auto draw = m_form == Form::kPlain ? DrawLines<PlainSpan> : DrawLines<Sse2Span>;
+    draw(m_lines, m_count, out, width, place);
 }
 
 ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffset,
