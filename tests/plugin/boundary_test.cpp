@@ -35,7 +35,9 @@ class Boundary : public ::testing::Test {
     LoadedLibrary m_dll;
     Owned<IEffectLibrary> m_library{m_dll.getEffectsLibrary()};
 
-    Owned<IVideoEffect> Effect(std::uint32_t index) { return Owned<IVideoEffect>(m_library->CreateEffect(index)); }
+    Owned<IVideoEffect> Effect(std::uint32_t index) {
+        return Owned<IVideoEffect>(m_library->CreateEffect(index));
+    }
 };
 
 // "Film Camera" with full jitter, which any frame shows.
@@ -190,8 +192,9 @@ TEST_F(Boundary, WritesNothingButTheProcessedRectangle) {
             if (descriptor.kind == kKindMenu) host.SetBits(i, i % 7);
             if (descriptor.kind == kKindColour) host.SetBits(i, 0x00336699);
         }
-        for (const Geometry& shape : {Geometry{1, 1}, Geometry{2, 3, 1, 1, 0, true}, Geometry{33, 17, 3, 2, 5},
-                                      Geometry{64, 48, 0, 0, 1, true}, Geometry{131, 5}}) {
+        for (const Geometry& shape :
+             {Geometry{1, 1}, Geometry{2, 3, 1, 1, 0, true}, Geometry{33, 17, 3, 2, 5},
+              Geometry{64, 48, 0, 0, 1, true}, Geometry{131, 5}}) {
             GuardedFrame source(shape), destination(Geometry{shape.width + 3, shape.height + 2, 2, 1, 7});
             source.FillRandom(1), destination.FillRandom(2);
             const GuardedFrame before = destination, untouched = source;
@@ -310,7 +313,9 @@ std::uint32_t CallOffBy(std::uint32_t shift, void* function, const std::vector<s
     return result;
 }
 
-std::uint32_t Word(const void* pointer) { return reinterpret_cast<std::uint32_t>(pointer); }
+std::uint32_t Word(const void* pointer) {
+    return reinterpret_cast<std::uint32_t>(pointer);
+}
 
 TEST_F(Boundary, TakesAStackAlignedToFourBytes) {
     for (const std::uint32_t shift : {0u, 4u, 8u, 12u}) {

@@ -4,8 +4,12 @@
 
 namespace velmora {
 
-bool ShowOpenDialog(const FileDialog&, DialogFileName&) noexcept { return false; }
-bool ShowSaveDialog(const FileDialog&, DialogFileName&) noexcept { return false; }
+bool ShowOpenDialog(const FileDialog&, DialogFileName&) noexcept {
+    return false;
+}
+bool ShowSaveDialog(const FileDialog&, DialogFileName&) noexcept {
+    return false;
+}
 void ShowWarning(const char16_t*, const char16_t*) noexcept {}
 
 }  // namespace velmora
