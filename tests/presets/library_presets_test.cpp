@@ -97,5 +97,18 @@ TEST_F(LibraryPresetsTest, ComeBackBitForBit) {
     }
 }
 
+// Shows the save dialog in the language VELMORA_LANGUAGE for some seconds, for the pictures in docs/pictures.
+TEST_F(LibraryPresetsTest, DISABLED_ShowsItsSaveDialog) {
+    const char* language = std::getenv("VELMORA_LANGUAGE");
+    PresetRecord record = {};
+    std::thread user([] {
+        HWND dialog = tests::WaitForDialog();
+        Sleep(8000);
+        tests::Press(dialog, IDCANCEL);
+    });
+    EXPECT_EQ(m_saver->SavePreset(nullptr, m_library, 1, &record, language), 0);
+    user.join();
+}
+
 }  // namespace
 }  // namespace velmora
