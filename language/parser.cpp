@@ -1,0 +1,111 @@
+#include "language/parser.h"
+
+#include <atomic>
+#include <cstring>
+#include <filesystem>
+#include <fstream>
+#include <ios>
+#include <new>
+#include <optional>
+#include <string>
+#include <utility>
+
+#include "language/copy_text.h"
+#include "language/language_table.h"
+
+namespace velmora::language {
+namespace {
+
+// Parsers alive in this module: a host must not free the module while it is above 0.
+std::atomic<std::int32_t> liveParsers{0};
+
+// The file's bytes; nothing when it cannot be read. Stops one byte past the largest size allowed, so that a
+// file that never ends is refused like one that is too large.
+std::optional<std::string> ReadBytes(const std::filesystem::path& path) {
+    std::ifstream stream(path, std::ios::binary);
+    if (!stream) return std::nullopt;
+    std::string bytes;
+    constexpr std::size_t kStep = 64 * 1024;
+    while (stream && bytes.size() <= kLargestFile) {
+        const std::size_t before = bytes.size();
+        bytes.resize(before + kStep);
+        stream.read(bytes.data() + before, kStep);
+        bytes.resize(before + static_cast<std::size_t>(stream.gcount()));
+    }
+    if (stream.bad()) return std::nullopt;
+    return bytes;
+}
+
+class Parser final : public LangXMLParser {
+  public:
+    Parser() { ++liveParsers; }
+    Parser(const Parser&) = delete;
+    Parser& operator=(const Parser&) = delete;
+
+    Status VM_CALL QueryInterface(const Guid* iid, void** out) override {
+        if (!out) return kStatusFailure;
+        *out = nullptr;
+        if (!iid || std::memcmp(iid, &kIidUnknown, sizeof(Guid)) != 0) return kStatusNoInterface;
+        *out = static_cast<IUnknown*>(this);
+        AddRef();
+        return kStatusOk;
+    }
+
+    std::uint32_t VM_CALL AddRef() override { return ++m_references; }
+
+    std::uint32_t VM_CALL Release() override {
+        const std::uint32_t left = --m_references;
+        if (left == 0) delete this;
+        return left;
+    }
+
+    std::int32_t VM_CALL Reserved3() override { return 0; }
+
+    bool VM_CALL Load(const char16_t* path) override {
+        if (!path) return false;
+        try {
+            const std::optional<std::string> bytes = ReadBytes(path);
+            if (!bytes) return false;
+            std::optional<LanguageTable> table = LanguageTable::Read(*bytes);
+            if (!table) return false;
+            m_table = std::move(*table);
+            return true;
+        } catch (...) {
+            return false;  // memory, or a path that is not well-formed 16-bit text
+        }
+    }
+
+    std::int32_t VM_CALL LookUpText(std::intptr_t languageCode, std::intptr_t category, std::intptr_t key,
+                                    std::intptr_t fallback, std::intptr_t buffer, std::intptr_t capacity,
+                                    std::intptr_t found) override {
+        const char16_t* const text =
+            m_table.Find(reinterpret_cast<const char*>(languageCode), static_cast<std::int32_t>(category),
+                         reinterpret_cast<const char*>(key));
+        if (found != 0) *reinterpret_cast<std::int32_t*>(found) = text ? 1 : 0;
+        return CopyText(text ? text : reinterpret_cast<const char16_t*>(fallback),
+                        reinterpret_cast<char16_t*>(buffer), static_cast<std::int32_t>(capacity));
+    }
+
+    std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
+                                 char16_t* buffer, std::int32_t capacity) override {
+        return CopyText(m_table.Find(languageCode, category, key), buffer, capacity);
+    }
+
+  private:
+    ~Parser() { --liveParsers; }
+
+    std::atomic<std::uint32_t> m_references{1};
+    LanguageTable m_table;
+};
+
+}  // namespace
+
+LangXMLParser* CreateParser() noexcept {
+    return new (std::nothrow) Parser;
+}
+
+bool NoParserIsAlive() noexcept {
+    return liveParsers == 0;
+}
+
+}  // namespace velmora::language
