@@ -17,19 +17,31 @@ inline std::wstring TextOf(HWND window) {
     return text;
 }
 
-// A visible dialog of this process, other than `other`; null when none comes within some seconds.
-inline HWND WaitForDialog(HWND other = nullptr) {
+inline HWND FileTypes(HWND dialog) {
+    return GetDlgItem(dialog, cmb1);
+}
+
+// A file dialog or a message of this process; null when none comes within some seconds. Told apart by what is
+// in them: a new window may get the handle of one that has just closed.
+inline HWND WaitForWindow(bool isFileDialog) {
     for (int tries = 0; tries < 400; ++tries) {
         HWND window = nullptr;
         while ((window = FindWindowExW(nullptr, window, L"#32770", nullptr)) != nullptr) {
             DWORD process = 0;
             GetWindowThreadProcessId(window, &process);
-            const bool isOwn = process == GetCurrentProcessId();
-            if (isOwn && IsWindowVisible(window) && IsWindowEnabled(window) && window != other) return window;
+            const bool isReady = IsWindowVisible(window) && IsWindowEnabled(window);
+            const bool isFitting = (FileTypes(window) != nullptr) == isFileDialog;
+            if (process == GetCurrentProcessId() && isReady && isFitting) return window;
         }
         Sleep(25);
     }
     return nullptr;
+}
+inline HWND WaitForFileDialog() {
+    return WaitForWindow(true);
+}
+inline HWND WaitForMessage() {
+    return WaitForWindow(false);
 }
 
 inline void Press(HWND dialog, int button) {
@@ -46,10 +58,6 @@ struct SeenFileDialog {
     std::wstring title, label, name;
     int labels = 0;
 };
-
-inline HWND FileTypes(HWND dialog) {
-    return GetDlgItem(dialog, cmb1);
-}
 
 // The name field is an edit, alone or inside a combination.
 inline HWND NameField(HWND dialog) {
@@ -71,7 +79,7 @@ inline void Type(HWND dialog, const std::string& fileName) {
 
 // Waits for a file dialog, looks at it, and answers it with a name, or cancels it when there is none.
 inline HWND AnswerFileDialog(const std::string& fileName, SeenFileDialog* seen) {
-    HWND dialog = WaitForDialog();
+    HWND dialog = WaitForFileDialog();
     if (dialog == nullptr) {
         ADD_FAILURE() << "no file dialog";
         return nullptr;

@@ -1,7 +1,8 @@
 // Presets through the product itself: saved and loaded back by the DLL's own saver and dialogs.
 //
 // VELMORA_KEEP_PRESETS names a folder: then every preset of every effect is saved there and stays, for other
-// hosts to read; otherwise the first of each effect is.
+// hosts to read; otherwise the first of each effect is. VELMORA_READ_PRESETS names a folder of such files, as
+// another host may have written them: they are loaded only, and must hold the same.
 #include <gtest/gtest.h>
 
 #include <cstdlib>
@@ -60,16 +61,23 @@ class LibraryPresetsTest : public ::testing::Test {
         user.join();
         return result;
     }
-    void SaveAndLoad(std::uint32_t index, std::uint32_t preset, const std::string& fileName) {
+    PresetRecord BuiltIn(std::uint32_t index, std::uint32_t preset) {
         IVideoEffect* effect = m_library->CreateEffect(index);
-        PresetRecord saved = MakeRecord(*effect, preset);
+        PresetRecord record = MakeRecord(*effect, preset);
+        std::strcpy(record.effectName, effect->GetName());
         effect->Release();
-        ASSERT_EQ(Run(&IPresetSaver::SavePreset, index, saved, fileName), 0);
+        return record;
+    }
+    void Save(std::uint32_t index, std::uint32_t preset, const std::string& fileName) {
+        PresetRecord record = BuiltIn(index, preset);
+        ASSERT_EQ(Run(&IPresetSaver::SavePreset, index, record, fileName), 0);
         EXPECT_EQ(m_seen.label,
                   std::wstring(L"Preset Files (*.fxprel") + static_cast<wchar_t>(L'a' + index) + L")");
+    }
+    void Load(std::uint32_t index, std::uint32_t preset, const std::string& fileName) {
         PresetRecord loaded = {};
         ASSERT_EQ(Run(&IPresetSaver::LoadPreset, index, loaded, fileName), 0);
-        ExpectSameValues(saved, loaded);
+        ExpectSameValues(BuiltIn(index, preset), loaded);
     }
     bool HasPreset(std::uint32_t index, std::uint32_t preset) {
         IVideoEffect* effect = m_library->CreateEffect(index);
@@ -85,14 +93,17 @@ class LibraryPresetsTest : public ::testing::Test {
 };
 
 TEST_F(LibraryPresetsTest, ComeBackBitForBit) {
-    const tests::TemporaryFolder folder;
+    const tests::TemporaryFolder temporary;
     const char* keep = std::getenv("VELMORA_KEEP_PRESETS");
+    const char* read = std::getenv("VELMORA_READ_PRESETS");
+    const bool isAll = keep != nullptr || read != nullptr;
+    const std::string folder = read != nullptr ? read : keep != nullptr ? keep : temporary.Path().string();
     for (std::uint32_t index = 0; index < 5; ++index) {
-        for (std::uint32_t preset = 0; HasPreset(index, preset) && (keep != nullptr || preset == 0);
-             ++preset) {
-            const std::string name = std::to_string(index) + "-" + std::to_string(preset) + ".fxprel" +
-                                     static_cast<char>('a' + index);
-            SaveAndLoad(index, preset, keep != nullptr ? std::string(keep) + "\\" + name : folder.File(name));
+        for (std::uint32_t preset = 0; HasPreset(index, preset) && (isAll || preset == 0); ++preset) {
+            const std::string name = folder + "\\" + std::to_string(index) + "-" + std::to_string(preset) +
+                                     ".fxprel" + static_cast<char>('a' + index);
+            if (read == nullptr) Save(index, preset, name);
+            Load(index, preset, name);
         }
     }
 }
@@ -102,7 +113,7 @@ TEST_F(LibraryPresetsTest, DISABLED_ShowsItsSaveDialog) {
     const char* language = std::getenv("VELMORA_LANGUAGE");
     PresetRecord record = {};
     std::thread user([] {
-        HWND dialog = tests::WaitForDialog();
+        HWND dialog = tests::WaitForFileDialog();
         Sleep(8000);
         tests::Press(dialog, IDCANCEL);
     });

@@ -23,8 +23,8 @@ using tests::SeeMessage;
 using tests::SeenFileDialog;
 using tests::SeenMessage;
 using tests::TemporaryFolder;
-using tests::WaitForDialog;
 using tests::WaitForEnd;
+using tests::WaitForMessage;
 
 void ExpectMessage(const SeenMessage& seen, const wchar_t* caption, const wchar_t* text) {
     EXPECT_EQ(seen.caption, caption);
@@ -36,7 +36,13 @@ void ExpectMessage(const SeenMessage& seen, const wchar_t* caption, const wchar_
 
 class PresetDialogsTest : public testing::Test {
   protected:
-    ~PresetDialogsTest() override { m_saver->Release(); }
+    // The host's window has the foreground: messages must not belong to a window of another program, which may
+    // close it and take them along.
+    PresetDialogsTest() { SetForegroundWindow(m_host); }
+    ~PresetDialogsTest() override {
+        m_saver->Release();
+        DestroyWindow(m_host);
+    }
 
     // Runs an operation while `user` acts in another thread.
     template <typename Operation>
@@ -47,18 +53,16 @@ class PresetDialogsTest : public testing::Test {
         return result;
     }
     std::int32_t Save(const std::function<void()>& user, const char* language = nullptr) {
-        return Run(
-            [&] { return m_saver->SavePreset(nullptr, &m_library, kIndexOfLook, &m_record, language); },
-            user);
+        return Run([&] { return m_saver->SavePreset(m_host, &m_library, kIndexOfLook, &m_record, language); },
+                   user);
     }
     std::int32_t Load(const std::function<void()>& user, const char* language = nullptr) {
-        return Run(
-            [&] { return m_saver->LoadPreset(nullptr, &m_library, kIndexOfLook, &m_record, language); },
-            user);
+        return Run([&] { return m_saver->LoadPreset(m_host, &m_library, kIndexOfLook, &m_record, language); },
+                   user);
     }
     HWND AnswerFileDialog(const std::string& fileName) { return tests::AnswerFileDialog(fileName, &m_seen); }
-    void AnswerMessage(HWND before, SeenMessage* seen) {
-        HWND box = WaitForDialog(before);
+    void AnswerMessage(SeenMessage* seen) {
+        HWND box = WaitForMessage();
         if (box == nullptr) {
             ADD_FAILURE() << "no message";
             return;
@@ -68,6 +72,8 @@ class PresetDialogsTest : public testing::Test {
         Press(box, IDOK);
     }
 
+    HWND m_host = CreateWindowW(L"Static", L"host", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 0, 0, 300, 200, nullptr,
+                                nullptr, nullptr, nullptr);
     IPresetSaver* m_saver = CreatePresetSaver();
     FakeLibrary m_library;
     TemporaryFolder m_folder;
@@ -105,7 +111,7 @@ TEST_F(PresetDialogsTest, AsksBeforeAnExistingPresetIsReplaced) {
     const std::string name = m_folder.File("mine.fxprelb");
     EXPECT_EQ(Save([&] {
                   HWND dialog = AnswerFileDialog(name);
-                  HWND question = WaitForDialog(dialog);
+                  HWND question = WaitForMessage();
                   ASSERT_NE(question, nullptr);
                   EXPECT_EQ(m_folder.Read("mine.fxprelb"), "old");
                   Press(question, IDNO);
@@ -115,8 +121,8 @@ TEST_F(PresetDialogsTest, AsksBeforeAnExistingPresetIsReplaced) {
               0);
     EXPECT_EQ(m_folder.Read("mine.fxprelb"), "old");
     EXPECT_EQ(Save([&] {
-                  HWND dialog = AnswerFileDialog(name);
-                  HWND question = WaitForDialog(dialog);
+                  AnswerFileDialog(name);
+                  HWND question = WaitForMessage();
                   ASSERT_NE(question, nullptr);
                   Press(question, IDYES);
               }),
@@ -140,18 +146,26 @@ TEST_F(PresetDialogsTest, SpeaksTheUsersLanguage) {
 TEST_F(PresetDialogsTest, TellsOfFailuresInMessages) {
     SeenMessage seen;
     EXPECT_EQ(Run([&] { return m_saver->SavePreset(nullptr, nullptr, 0, nullptr, nullptr); },
-                  [&] { AnswerMessage(nullptr, &seen); }),
+                  [&] { AnswerMessage(&seen); }),
               1);
     ExpectMessage(seen, L"Preset save error",
                   L"Sorry, can't save preset.\nPossible reason: access denied or disk is full.");
     const std::string broken = m_folder.Write("broken.fxprelb", "<Preset");
-    EXPECT_EQ(Load([&] { AnswerMessage(AnswerFileDialog(broken), &seen); }), 1);
+    EXPECT_EQ(Load([&] {
+                  AnswerFileDialog(broken);
+                  AnswerMessage(&seen);
+              }),
+              1);
     ExpectMessage(
         seen, L"Preset load error",
         L"Sorry, can't open the preset specified.\nPossible reason: access denied or file is corrupted.");
     const std::string other =
         m_folder.Write("other.fxprelb", "<Preset EffectName='Film Damage'><parameter/></Preset>");
-    EXPECT_EQ(Load([&] { AnswerMessage(AnswerFileDialog(other), &seen); }), 2);
+    EXPECT_EQ(Load([&] {
+                  AnswerFileDialog(other);
+                  AnswerMessage(&seen);
+              }),
+              2);
     ExpectMessage(
         seen, L"Preset open warning",
         L"Error trying to open a Film Damage preset. This can only open Film Look presets. Please try "
@@ -160,20 +174,16 @@ TEST_F(PresetDialogsTest, TellsOfFailuresInMessages) {
 
 // The message belongs to the window that the user works in, not to the file dialog's owner.
 TEST_F(PresetDialogsTest, MessagesAreOwnedByTheForegroundWindow) {
-    HWND window = CreateWindowW(L"Static", L"host", WS_OVERLAPPEDWINDOW | WS_VISIBLE, 0, 0, 300, 200, nullptr,
-                                nullptr, nullptr, nullptr);
-    SetForegroundWindow(window);
-    if (GetForegroundWindow() != window) GTEST_SKIP() << "the screen keeps its foreground window";
+    if (GetForegroundWindow() != m_host) GTEST_SKIP() << "the screen keeps its foreground window";
     HWND owner = nullptr;
     EXPECT_EQ(Run([&] { return m_saver->LoadPreset(nullptr, nullptr, 0, nullptr, nullptr); },
                   [&] {
-                      HWND box = WaitForDialog();
+                      HWND box = WaitForMessage();
                       owner = GetWindow(box, GW_OWNER);
                       Press(box, IDOK);
                   }),
               1);
-    EXPECT_EQ(owner, window);
-    DestroyWindow(window);
+    EXPECT_EQ(owner, m_host);
 }
 
 }  // namespace
