@@ -1,8 +1,10 @@
 #include <windows.h>
 
 #include "plugin/module.h"
+#include "support/module_detach.h"
 
-extern "C" BOOL WINAPI DllMain(HINSTANCE module, DWORD reason, LPVOID) {
+extern "C" BOOL WINAPI DllMain(HINSTANCE module, DWORD reason, LPVOID reserved) {
     if (reason == DLL_PROCESS_ATTACH) velmora::SetModuleHandle(module);
+    if (reason == DLL_PROCESS_DETACH) velmora::support::ReleaseRuntimeOfThread(module, reserved);
     return TRUE;
 }

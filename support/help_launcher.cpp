@@ -39,9 +39,9 @@ class HelpControl {
     void Load() noexcept {
         wchar_t path[kLongestControlPath + 1] = {};
         DWORD size = kLongestControlPath * sizeof(wchar_t);
-        // Expands a path with environment variables, as some installations store it.
-        if (RegGetValueW(HKEY_CLASSES_ROOT, kControlKey, nullptr, RRF_RT_REG_SZ | RRF_RT_REG_EXPAND_SZ,
-                         nullptr, path, &size) == ERROR_SUCCESS) {
+        // Also reads, and expands, a path that is stored with environment variables.
+        if (RegGetValueW(HKEY_CLASSES_ROOT, kControlKey, nullptr, RRF_RT_REG_SZ, nullptr, path, &size) ==
+            ERROR_SUCCESS) {
             m_module = LoadLibraryW(path);
         }
         if (m_module == nullptr) m_module = LoadLibraryW(kControlName);

@@ -7,6 +7,7 @@
 #include <cstdio>
 
 #include "help/topics.h"
+#include "help/topics.h"
 #include "support/bit_button.h"
 #include "support/product.h"
 #include "support/resource_ids.h"
