@@ -104,7 +104,8 @@ class TableReader {
         if (keyLength == 0 || keyLength > kLongestKey || !Utf16FromUtf8(key)) return false;
         std::optional<std::u16string> wide = Utf16FromUtf8(text);
         if (!wide || wide->empty()) return false;
-        return m_table.m_texts.try_emplace({code, category, key}, std::move(*wide)).second;
+        return m_table.m_texts.try_emplace(LanguageTable::Place{code, category, key}, std::move(*wide))
+            .second;
     }
 
     LanguageTable& m_table;
@@ -135,7 +136,7 @@ const char16_t* LanguageTable::Find(const char* languageCode, std::int32_t categ
     const std::string_view smallCode(code, sizeof(code));
     if (smallCode.back() != 0) return nullptr;
     const std::string_view wanted(smallCode.substr(0, kCodeLength));
-    const auto found = m_texts.find(std::make_tuple(wanted, category, std::string_view(key)));
+    const auto found = m_texts.find(PlaceView{wanted, category, key});
     return found != m_texts.end() ? found->second.c_str() : nullptr;
 }
 

@@ -3,7 +3,6 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <functional>
 #include <map>
 #include <optional>
 #include <string>
@@ -30,9 +29,26 @@ class LanguageTable {
   private:
     friend class TableReader;
 
-    // Language code in small letters, category, key.
-    using Place = std::tuple<std::string, std::int32_t, std::string>;
-    std::map<Place, std::u16string, std::less<>> m_texts;
+    // What names a text, so that one can be looked for without allocating.
+    struct PlaceView {
+        std::string_view code;  // in small letters
+        std::int32_t category;
+        std::string_view key;
+    };
+    struct Place {
+        std::string code;
+        std::int32_t category;
+        std::string key;
+
+        operator PlaceView() const noexcept { return {code, category, key}; }
+    };
+    struct Order {
+        using is_transparent = void;
+        bool operator()(const PlaceView& a, const PlaceView& b) const noexcept {
+            return std::tie(a.code, a.category, a.key) < std::tie(b.code, b.category, b.key);
+        }
+    };
+    std::map<Place, std::u16string, Order> m_texts;
 };
 
 }  // namespace velmora::language

@@ -7,6 +7,8 @@
 #include <cstdint>
 #include <system_error>
 
+#include "language/utf.h"
+
 namespace velmora::language {
 namespace {
 
@@ -120,7 +122,7 @@ bool HasOnlyTextBytes(std::string_view file) {
 }  // namespace
 
 bool IsPlainMarkup(std::string_view file) noexcept {
-    return HasOnlyTextBytes(file) && Scanner(file).Scan();
+    return HasOnlyTextBytes(file) && IsUtf8(file) && Scanner(file).Scan();
 }
 
 }  // namespace velmora::language

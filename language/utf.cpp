@@ -36,23 +36,37 @@ void Append(std::u16string& text, std::uint32_t value) {
     text.push_back(static_cast<char16_t>(0xDC00 + (offset & 0x3FF)));
 }
 
+// Takes one character off the front of a text that is not empty; nothing when it is not well-formed.
+std::optional<std::uint32_t> TakeCharacter(std::string_view& text) {
+    const Sequence sequence = SequenceOf(ByteAt(text, 0));
+    if (sequence.length == 0 || sequence.length > text.size()) return std::nullopt;
+    std::uint32_t value = sequence.firstBits;
+    for (std::size_t i = 1; i < sequence.length; ++i) {
+        const std::uint32_t next = ByteAt(text, i);
+        if ((next & 0xC0) != 0x80) return std::nullopt;
+        value = value << 6 | (next & 0x3F);
+    }
+    const bool isSurrogate = value >= 0xD800 && value <= 0xDFFF;
+    if (value < sequence.lowestValue || value > 0x10FFFF || isSurrogate) return std::nullopt;
+    text.remove_prefix(sequence.length);
+    return value;
+}
+
 }  // namespace
+
+bool IsUtf8(std::string_view text) noexcept {
+    while (!text.empty()) {
+        if (!TakeCharacter(text)) return false;
+    }
+    return true;
+}
 
 std::optional<std::u16string> Utf16FromUtf8(std::string_view text) {
     std::u16string result;
-    for (std::size_t at = 0; at < text.size();) {
-        const Sequence sequence = SequenceOf(ByteAt(text, at));
-        if (sequence.length == 0 || sequence.length > text.size() - at) return std::nullopt;
-        std::uint32_t value = sequence.firstBits;
-        for (std::size_t i = 1; i < sequence.length; ++i) {
-            const std::uint32_t next = ByteAt(text, at + i);
-            if ((next & 0xC0) != 0x80) return std::nullopt;
-            value = value << 6 | (next & 0x3F);
-        }
-        const bool isSurrogate = value >= 0xD800 && value <= 0xDFFF;
-        if (value < sequence.lowestValue || value > 0x10FFFF || isSurrogate) return std::nullopt;
-        Append(result, value);
-        at += sequence.length;
+    while (!text.empty()) {
+        const std::optional<std::uint32_t> value = TakeCharacter(text);
+        if (!value) return std::nullopt;
+        Append(result, *value);
     }
     return result;
 }

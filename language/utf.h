@@ -1,4 +1,5 @@
-// Strict conversion of the language file's text.
+// The language file's text. Well-formed UTF-8 has no overlong forms, no surrogates, no values past U+10FFFF and
+// no sequences cut short.
 #pragma once
 
 #include <optional>
@@ -7,8 +8,9 @@
 
 namespace velmora::language {
 
-// Nothing when `text` is not well-formed UTF-8 (overlong forms, surrogates, values past U+10FFFF, a sequence
-// cut short). Throws std::bad_alloc.
+bool IsUtf8(std::string_view text) noexcept;
+
+// Nothing when `text` is not well-formed. Throws std::bad_alloc.
 std::optional<std::u16string> Utf16FromUtf8(std::string_view text);
 
 }  // namespace velmora::language
