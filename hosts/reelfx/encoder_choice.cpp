@@ -26,7 +26,7 @@ constexpr QualityRow kQualities[] = {
 // For codecs with a quantiser instead: 1 is best, 31 worst.
 constexpr int kQuantiser = 2;
 
-// A constant number, so that the bytes of a file do not depend on the machine that wrote it.
+// A constant number: some codecs cut a picture by it, and a file should not depend on the machine's processors.
 constexpr int kEncoderThreads = 4;
 
 // These refuse sizes that their chroma does not divide.

@@ -51,6 +51,7 @@ MediaWriter::MediaWriter(const OutputOptions& options, const std::string& addres
     }
     m_container.reset(container);
     m_container->opaque = &m_closeError;
+    m_container->flags |= AVFMT_FLAG_BITEXACT;  // no random identifiers: the same frames give the same file
     m_container->io_close2 = CloseAndRemember;
     av_dict_copy(&m_container->metadata, source.Container().metadata, 0);
     AddPicture(options);
@@ -101,6 +102,11 @@ void MediaWriter::SetUpEncoder(const OutputOptions& options, const AVCodec& code
     if (codec.supported_framerates) {
         encoder.framerate =
             codec.supported_framerates[av_find_nearest_q_idx(encoder.framerate, codec.supported_framerates)];
+    }
+    if (codec.id == AV_CODEC_ID_MPEG4) {
+        // The codec counts in at most 65535 parts of a second.
+        av_reduce(&encoder.framerate.num, &encoder.framerate.den, encoder.framerate.num,
+                  encoder.framerate.den, 65535);
     }
     const bool isTimeless = (m_container->oformat->flags & AVFMT_NOTIMESTAMPS) != 0;
     encoder.time_base =

@@ -50,15 +50,10 @@ SoundTranscoder::SoundTranscoder(const AVStream& source, AVCodecID target, bool 
     m_encoder->time_base = {1, m_encoder->sample_rate};
     m_encoder->thread_count = 1;
     if (globalHeader) m_encoder->flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
-    SwrContext* resampler = nullptr;
-    const bool isReady = avcodec_open2(m_encoder.get(), codec, nullptr) >= 0 &&
-                         swr_alloc_set_opts2(&resampler, &m_encoder->ch_layout, m_encoder->sample_fmt,
-                                             m_encoder->sample_rate, &m_decoder->ch_layout,
-                                             m_decoder->sample_fmt, m_decoder->sample_rate, 0, nullptr) >= 0;
-    m_resampler.reset(resampler);
-    if (!isReady || swr_init(resampler) < 0) {
+    if (avcodec_open2(m_encoder.get(), codec, nullptr) < 0) {
         throw Failure(kExitOutput, "the sound cannot be encoded; --no-sound leaves it out");
     }
+    m_resampler = Allocated<ResamplerPtr>(swr_alloc());
     m_fifo = av_audio_fifo_alloc(m_encoder->sample_fmt, channels, 4096);
     if (!m_fifo) throw std::bad_alloc();
 }
@@ -90,12 +85,21 @@ void SoundTranscoder::TakeDecoded(const Sink& sink) {
     }
 }
 
-void SoundTranscoder::Resample(const AVFrame& frame) {
+void SoundTranscoder::Resample(AVFrame& frame) {
+    if (frame.ch_layout.order == AV_CHANNEL_ORDER_UNSPEC) {
+        av_channel_layout_default(&frame.ch_layout, frame.ch_layout.nb_channels);
+    }
     const FramePtr converted = NewFrame();
     converted->format = m_encoder->sample_fmt;
     converted->sample_rate = m_encoder->sample_rate;
     av_channel_layout_copy(&converted->ch_layout, &m_encoder->ch_layout);
-    if (swr_convert_frame(m_resampler.get(), converted.get(), &frame) < 0) return;
+    // The first frame, and any that differs from the one before, tells what there is to convert.
+    int error = swr_convert_frame(m_resampler.get(), converted.get(), &frame);
+    if (error == AVERROR_INPUT_CHANGED) {
+        swr_close(m_resampler.get());
+        error = swr_convert_frame(m_resampler.get(), converted.get(), &frame);
+    }
+    if (error < 0) throw Failure(kExitInput, "the sound cannot be converted; --no-sound leaves it out");
     void** const samples = reinterpret_cast<void**>(converted->extended_data);
     if (av_audio_fifo_write(m_fifo, samples, converted->nb_samples) < 0) throw std::bad_alloc();
 }

@@ -27,7 +27,7 @@ class SoundTranscoder {
 
   private:
     void TakeDecoded(const Sink& sink);
-    void Resample(const AVFrame& frame);
+    void Resample(AVFrame& frame);
     void Encode(int samples, const Sink& sink);
     void TakeEncoded(const Sink& sink);
 
