@@ -4,7 +4,6 @@
 #include <cstring>
 
 #include "render/shade.h"
-#include "render/wear.h"
 
 namespace velmora::render {
 namespace {
@@ -19,23 +18,30 @@ void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) 
     for (std::int32_t x = 0; x < width; ++x) out[x] = MixWithGrey(in[x], weight);
 }
 
-void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-             float amount) noexcept {
-    for (std::int32_t x = 0; x < width; ++x) out[x] = ShadePixel(in[x], WearFraction(bytes[x], amount));
+void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
+             std::uint32_t channels) noexcept {
+    const bool onlyBlue = channels == kBlueChannel;
+    for (std::int32_t x = 0; x < width; ++x) {
+        const Bgra pixel = in[x], shaded = ShadePixel(pixel, fractions[x]);
+        out[x] = onlyBlue ? Bgra{shaded.blue, pixel.green, pixel.red, pixel.alpha} : shaded;
+    }
 }
 
 void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
     std::memmove(out, in, static_cast<std::size_t>(width) * sizeof(Bgra));
 }
 
+void NothingToEnd() noexcept {}
+
 }  // namespace
 
-const RowKernels kPlainKernels = {TablesRow, MixRow, WearRow, CopyRow};
+const RowKernels kPlainKernels = {TablesRow, MixRow, WearRow, CopyRow, CopyRow, NothingToEnd};
 
 void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept {
     blue = b;
     green = g;
     red = r;
+    areEqual = b == g && g == r;
     for (std::size_t i = 0; i < 256; ++i) {
         blueWord[i] = b[i];
         greenWord[i] = std::uint32_t{g[i]} << 8;

@@ -7,6 +7,7 @@
 
 #include <array>
 #include <cstdint>
+#include <limits>
 
 #include "render/colour.h"
 #include "render/cpu.h"
@@ -16,6 +17,7 @@ namespace velmora::render {
 
 // One table a channel, prepared for the kernels.
 struct ChannelTables {
+    bool areEqual;
     alignas(64) ByteTable blue;
     alignas(64) ByteTable green;
     alignas(64) ByteTable red;
@@ -28,16 +30,25 @@ struct ChannelTables {
     void Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept;
 };
 
+// What wear may change of a pixel word.
+inline constexpr std::uint32_t kBlueChannel = 0x000000FFu;
+inline constexpr std::uint32_t kColourChannels = 0x00FFFFFFu;
+
 struct RowKernels {
     // Each channel through its table.
     void (*tables)(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept;
     // The saturation mix with weight w in -127..127 (render/colour.h), without a table.
     void (*mix)(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) noexcept;
-    // Lightens all three channels of each pixel by the fraction of its wear byte, (byte / 255) * amount.
-    void (*wear)(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-                 float amount) noexcept;
-    // Copies a row; `out` is not read again soon.
+    // Lightens the channels of each pixel by its fraction (0..1): render/shade.h. `channels` is a pixel word
+    // with 0xFF at each channel that is to change, 0 at alpha.
+    void (*wear)(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
+                 std::uint32_t channels) noexcept;
+    // Copies a row.
     void (*copy)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
+    // Copies a row to where it is not read again soon: past the caches, in a form that can. `in` must not be
+    // `out`. After the last row of a frame `endStream` makes the rows seen by other threads.
+    void (*stream)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
+    void (*endStream)() noexcept;
 };
 
 // `form` must be one that the processor can run.
@@ -46,6 +57,16 @@ struct RowKernels {
 // The forms, each in its own file.
 // What the forms without byte permutations look tables up with.
 void TablesRowByWords(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept;
+
+// How many pixels before the first one at a multiple of `bytes`; as good as never when none lies at one.
+[[nodiscard]] inline std::int32_t PixelsToBoundary(const Bgra* pixels, std::uintptr_t bytes) noexcept {
+    const std::uintptr_t away = (bytes - reinterpret_cast<std::uintptr_t>(pixels) % bytes) % bytes;
+    constexpr std::int32_t kNever = std::numeric_limits<std::int32_t>::max();
+    return away % sizeof(Bgra) == 0 ? static_cast<std::int32_t>(away / sizeof(Bgra)) : kNever;
+}
+
+// The largest float below a half.
+inline constexpr float kBelowHalf = 0x1.fffffep-2f;
 
 extern const RowKernels kPlainKernels;
 extern const RowKernels kSse2Kernels;

@@ -3,7 +3,7 @@
 
 #include <immintrin.h>
 
-#include <cstring>
+#include <algorithm>
 
 #include "render/kernels.h"
 
@@ -38,40 +38,32 @@ VM_AVX2 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
     kSse2Kernels.mix(in + x, out + x, width - x, weight);
 }
 
-// One channel of eight pixels, at `shift` of their words: R(a (255 - c)), as in the 16-byte form.
+// As in the 16-byte form, a channel of eight pixels.
 template <int kShift>
-VM_AVX2 inline __m256i Lightened(__m256i pixels, __m256 fraction) noexcept {
-    const __m256i byte = _mm256_set1_epi32(255);
-    const __m256i channel = _mm256_and_si256(_mm256_srli_epi32(pixels, kShift), byte);
-    const __m256 product = _mm256_mul_ps(fraction, _mm256_cvtepi32_ps(_mm256_sub_epi32(byte, channel)));
-    const __m256i whole = _mm256_cvttps_epi32(product);
-    const __m256 rest = _mm256_sub_ps(product, _mm256_cvtepi32_ps(whole));
-    const __m256i up = _mm256_castps_si256(_mm256_cmp_ps(rest, _mm256_set1_ps(0.5f), _CMP_GE_OQ));
-    return _mm256_slli_epi32(_mm256_sub_epi32(whole, up), kShift);
+VM_AVX2 inline __m256i Lightened(__m256i room, __m256 fraction) noexcept {
+    const __m256i channel = _mm256_and_si256(_mm256_srli_epi32(room, kShift), _mm256_set1_epi32(255));
+    const __m256 product = _mm256_mul_ps(fraction, _mm256_cvtepi32_ps(channel));
+    const __m256 lifted = _mm256_add_ps(product, _mm256_set1_ps(kBelowHalf));
+    return _mm256_slli_epi32(_mm256_cvttps_epi32(lifted), kShift);
 }
 
-// The channels' sums stay below 256, so they can be added in place without a carry into the next channel.
-VM_AVX2 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-                     float amount) noexcept {
+VM_AVX2 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
+                     std::uint32_t channels) noexcept {
+    const __m256i changing = _mm256_set1_epi32(static_cast<int>(channels));
     std::int32_t x = 0;
     for (; x + 8 <= width; x += 8) {
-        std::int64_t worn;
-        std::memcpy(&worn, bytes + x, sizeof worn);
-        if (worn == 0 && in == out) continue;
         const __m256i pixels = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x));
+        const __m256 fraction = _mm256_loadu_ps(fractions + x);
         __m256i result = pixels;
-        if (worn != 0) {
-            const __m128i eight = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(bytes + x));
-            const __m256 levels = _mm256_cvtepi32_ps(_mm256_cvtepu8_epi32(eight));
-            const __m256 fraction =
-                _mm256_mul_ps(_mm256_div_ps(levels, _mm256_set1_ps(255.0f)), _mm256_set1_ps(amount));
-            result = _mm256_add_epi32(result, Lightened<0>(pixels, fraction));
-            result = _mm256_add_epi32(result, Lightened<8>(pixels, fraction));
-            result = _mm256_add_epi32(result, Lightened<16>(pixels, fraction));
+        if (_mm256_testz_si256(_mm256_castps_si256(fraction), _mm256_castps_si256(fraction)) == 0) {
+            const __m256i room = _mm256_andnot_si256(pixels, changing);
+            result = _mm256_add_epi32(result, Lightened<0>(room, fraction));
+            result = _mm256_add_epi32(result, Lightened<8>(room, fraction));
+            result = _mm256_add_epi32(result, Lightened<16>(room, fraction));
         }
         _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), result);
     }
-    kSse2Kernels.wear(in + x, out + x, width - x, bytes + x, amount);
+    kSse2Kernels.wear(in + x, out + x, width - x, fractions + x, channels);
 }
 
 VM_AVX2 void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
@@ -85,8 +77,22 @@ VM_AVX2 void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
     kPlainKernels.copy(in + x, out + x, width - x);
 }
 
+VM_AVX2 void StreamRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
+    std::int32_t x = std::min(PixelsToBoundary(out, 32), width);
+    kPlainKernels.copy(in, out, x);
+    for (; x + 8 <= width; x += 8) {
+        _mm256_stream_si256(reinterpret_cast<__m256i*>(out + x),
+                            _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x)));
+    }
+    kPlainKernels.copy(in + x, out + x, width - x);
+}
+
+void EndStream() noexcept {
+    _mm_sfence();
+}
+
 }  // namespace
 
-const RowKernels kAvx2Kernels = {TablesRowByWords, MixRow, WearRow, CopyRow};
+const RowKernels kAvx2Kernels = {TablesRowByWords, MixRow, WearRow, CopyRow, StreamRow, EndStream};
 
 }  // namespace velmora::render

@@ -2,6 +2,8 @@
 
 #include <immintrin.h>
 
+#include <algorithm>
+
 #include "render/kernels.h"
 
 #define VM_AVX512 __attribute__((target("avx512f,avx512bw,avx512vl,avx512vbmi")))
@@ -10,35 +12,50 @@ namespace velmora::render {
 namespace {
 
 constexpr std::int32_t kPixels = 16;  // in a register
+constexpr __mmask64 kBlue = 0x1111111111111111u, kGreen = kBlue << 1, kRed = kBlue << 2, kAlpha = kBlue << 3;
 
-// The mask of a row's last `left` pixels.
-VM_AVX512 inline __mmask16 Tail(std::int32_t left) noexcept {
-    return left >= kPixels ? static_cast<__mmask16>(0xFFFF) : static_cast<__mmask16>((1u << left) - 1u);
+// Calls step(pixels, x, mask) for each 16 pixels of a row from column x on, the mask telling which of them there
+// are, and stores what it returns.
+template <typename Step>
+VM_AVX512 inline void ForEachSixteen(const Bgra* in, Bgra* out, std::int32_t width,
+                                     const Step& step) noexcept {
+    std::int32_t x = 0;
+    for (; x + kPixels <= width; x += kPixels) {
+        const __m512i pixels = _mm512_loadu_si512(in + x);
+        _mm512_storeu_si512(out + x, step(pixels, x, static_cast<__mmask16>(0xFFFF)));
+    }
+    if (x == width) return;
+    const __mmask16 tail = static_cast<__mmask16>((1u << (width - x)) - 1u);
+    const __m512i pixels = _mm512_maskz_loadu_epi32(tail, in + x);
+    _mm512_mask_storeu_epi32(out + x, tail, step(pixels, x, tail));
 }
 
-// `result` with the bytes of `mask` replaced by the table's entries for `bytes`.
-VM_AVX512 inline __m512i LookUp(__m512i result, __mmask64 mask, __m512i bytes,
+// The bytes of `mask` replaced by the table's entries for them; `isHigh` tells the bytes above 127. A byte that
+// was replaced must not be in the mask of a later call.
+VM_AVX512 inline __m512i LookUp(__m512i bytes, __mmask64 mask, __mmask64 isHigh,
                                 const ByteTable& table) noexcept {
     const std::uint8_t* entries = table.data();
-    const __m512i low =
-        _mm512_permutex2var_epi8(_mm512_load_si512(entries), bytes, _mm512_load_si512(entries + 64));
-    const __m512i high =
-        _mm512_permutex2var_epi8(_mm512_load_si512(entries + 128), bytes, _mm512_load_si512(entries + 192));
-    const __mmask64 isHigh = _mm512_movepi8_mask(bytes);
-    return _mm512_mask_mov_epi8(result, mask, _mm512_mask_blend_epi8(isHigh, low, high));
+    const __mmask64 low = _kandn_mask64(isHigh, mask), high = _kand_mask64(isHigh, mask);
+    bytes = _mm512_mask2_permutex2var_epi8(_mm512_load_si512(entries), bytes, low,
+                                           _mm512_load_si512(entries + 64));
+    return _mm512_mask2_permutex2var_epi8(_mm512_load_si512(entries + 128), bytes, high,
+                                          _mm512_load_si512(entries + 192));
 }
+
+struct TablesStep {
+    const ChannelTables& tables;
+    VM_AVX512 __m512i operator()(__m512i pixels, std::int32_t, __mmask16) const noexcept {
+        const __mmask64 isHigh = _mm512_movepi8_mask(pixels);
+        if (tables.areEqual) return LookUp(pixels, ~kAlpha, isHigh, tables.blue);
+        __m512i result = LookUp(pixels, kBlue, isHigh, tables.blue);
+        result = LookUp(result, kGreen, isHigh, tables.green);
+        return LookUp(result, kRed, isHigh, tables.red);
+    }
+};
 
 VM_AVX512 void TablesRow(const Bgra* in, Bgra* out, std::int32_t width,
                          const ChannelTables& tables) noexcept {
-    constexpr __mmask64 kBlue = 0x1111111111111111u, kGreen = kBlue << 1, kRed = kBlue << 2;
-    for (std::int32_t x = 0; x < width; x += kPixels) {
-        const __mmask16 tail = Tail(width - x);
-        const __m512i bytes = _mm512_maskz_loadu_epi32(tail, in + x);
-        __m512i result = LookUp(bytes, kBlue, bytes, tables.blue);
-        result = LookUp(result, kGreen, bytes, tables.green);
-        result = LookUp(result, kRed, bytes, tables.red);
-        _mm512_mask_storeu_epi32(out + x, tail, result);
-    }
+    ForEachSixteen(in, out, width, TablesStep{tables});
 }
 
 // As in the 16-byte form, eight pixels at a time.
@@ -52,63 +69,83 @@ VM_AVX512 inline __m512i MixEight(__m512i channels, __m512i luma, __m512i u) noe
     return _mm512_srai_epi16(_mm512_adds_epi16(scaled, away), 7);
 }
 
-VM_AVX512 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) noexcept {
-    constexpr __mmask64 kAlpha = 0x8888888888888888u;
-    const __m512i zero = _mm512_setzero_si512();
-    const __m512i luma = _mm512_set1_epi64(0x0000004C0095001E);  // 30, 149, 76, 0
-    const __m512i u = _mm512_set1_epi16(static_cast<short>(-weight));
-    for (std::int32_t x = 0; x < width; x += kPixels) {
-        const __mmask16 tail = Tail(width - x);
-        const __m512i pixels = _mm512_maskz_loadu_epi32(tail, in + x);
+struct MixStep {
+    std::int32_t weight;
+    VM_AVX512 __m512i operator()(__m512i pixels, std::int32_t, __mmask16) const noexcept {
+        const __m512i zero = _mm512_setzero_si512();
+        const __m512i luma = _mm512_set1_epi64(0x0000004C0095001E);  // 30, 149, 76, 0
+        const __m512i u = _mm512_set1_epi16(static_cast<short>(-weight));
         const __m512i mixed = _mm512_packus_epi16(MixEight(_mm512_unpacklo_epi8(pixels, zero), luma, u),
                                                   MixEight(_mm512_unpackhi_epi8(pixels, zero), luma, u));
-        _mm512_mask_storeu_epi32(out + x, tail, _mm512_mask_blend_epi8(kAlpha, mixed, pixels));
+        return _mm512_mask_blend_epi8(kAlpha, mixed, pixels);
     }
+};
+
+VM_AVX512 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) noexcept {
+    ForEachSixteen(in, out, width, MixStep{weight});
 }
 
-// One channel of sixteen pixels, at `shift` of their words. Adding a half rounded down never lifts a number to
-// the next whole one.
-template <int kShift>
-VM_AVX512 inline __m512i Lightened(__m512i pixels, __m512 fraction) noexcept {
-    const __m512i byte = _mm512_set1_epi32(255);
-    const __m512i channel = _mm512_and_si512(_mm512_srli_epi32(pixels, kShift), byte);
-    const __m512 product = _mm512_mul_ps(fraction, _mm512_cvtepi32_ps(_mm512_sub_epi32(byte, channel)));
-    const __m512 lifted =
-        _mm512_add_round_ps(product, _mm512_set1_ps(0.5f), _MM_FROUND_TO_NEG_INF | _MM_FROUND_NO_EXC);
-    // The sum stays below 256, so it can be added in place without a carry into the next channel.
-    return _mm512_slli_epi32(_mm512_cvttps_epi32(lifted), kShift);
+// R(a room) of one channel, as a byte at the channel's place of each pixel of `result`.
+//
+// 2^23 and the room make a float whose last byte is the room: fused, the product with a less a 2^23 is rounded
+// once, as the product with the room would be. Then a half is added. In 2^22 and such a sum, rounded down, the
+// last bit stands for a half, so that the byte above it is the number wanted.
+template <int kChannel>
+VM_AVX512 inline __m512i Lightened(__m512i result, __m512i room, __m512 fraction, __m512 lifted) noexcept {
+    constexpr __mmask64 kFirst = kBlue, kThis = kBlue << kChannel;
+    const __m512i first = _mm512_set_epi32(12, 8, 4, 0, 12, 8, 4, 0, 12, 8, 4, 0, 12, 8, 4, 0);
+    const __m512i from = _mm512_add_epi8(first, _mm512_set1_epi8(kChannel));
+    const __m512i number = _mm512_mask_shuffle_epi8(_mm512_set1_epi32(0x4B000000), kFirst, room, from);
+    const __m512 product = _mm512_fmsub_ps(fraction, _mm512_castsi512_ps(number), lifted);
+    const __m512 sum =
+        _mm512_add_round_ps(product, _mm512_set1_ps(4194304.5f), _MM_FROUND_TO_NEG_INF | _MM_FROUND_NO_EXC);
+    // Bits 1 to 8 of either half of 64 bits, at the channel's byte.
+    const __m512i bits = _mm512_set1_epi64(0x2121212101010101);
+    return _mm512_mask_multishift_epi64_epi8(result, kThis, bits, _mm512_castps_si512(sum));
 }
 
-VM_AVX512 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-                       float amount) noexcept {
-    for (std::int32_t x = 0; x < width; x += kPixels) {
-        const __mmask16 tail = Tail(width - x);
-        const __m128i worn = _mm_maskz_loadu_epi8(tail, bytes + x);
-        const __mmask16 touched = _mm_test_epi8_mask(worn, worn);
-        if (touched == 0 && in == out) continue;
-        const __m512i pixels = _mm512_maskz_loadu_epi32(tail, in + x);
-        __m512i result = pixels;
-        if (touched != 0) {
-            const __m512 levels = _mm512_cvtepi32_ps(_mm512_cvtepu8_epi32(worn));
-            const __m512 fraction =
-                _mm512_mul_ps(_mm512_div_ps(levels, _mm512_set1_ps(255.0f)), _mm512_set1_ps(amount));
-            result = _mm512_add_epi32(result, Lightened<0>(pixels, fraction));
-            result = _mm512_add_epi32(result, Lightened<8>(pixels, fraction));
-            result = _mm512_add_epi32(result, Lightened<16>(pixels, fraction));
-        }
-        _mm512_mask_storeu_epi32(out + x, tail, result);
+struct WearStep {
+    const float* fractions;
+    __m512i channels;
+    VM_AVX512 __m512i operator()(__m512i pixels, std::int32_t x, __mmask16 mask) const noexcept {
+        const __m512 fraction = _mm512_maskz_loadu_ps(mask, fractions + x);
+        const __m512 lifted = _mm512_mul_ps(fraction, _mm512_set1_ps(8388608.0f));
+        const __m512i room = _mm512_andnot_si512(pixels, channels);
+        __m512i result = Lightened<0>(_mm512_setzero_si512(), room, fraction, lifted);
+        result = Lightened<1>(result, room, fraction, lifted);
+        result = Lightened<2>(result, room, fraction, lifted);
+        return _mm512_add_epi8(pixels, result);
     }
+};
+
+VM_AVX512 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
+                       std::uint32_t channels) noexcept {
+    ForEachSixteen(in, out, width, WearStep{fractions, _mm512_set1_epi32(static_cast<int>(channels))});
 }
+
+struct CopyStep {
+    VM_AVX512 __m512i operator()(__m512i pixels, std::int32_t, __mmask16) const noexcept { return pixels; }
+};
 
 VM_AVX512 void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
-    for (std::int32_t x = 0; x < width; x += kPixels) {
-        const __mmask16 tail = Tail(width - x);
-        _mm512_mask_storeu_epi32(out + x, tail, _mm512_maskz_loadu_epi32(tail, in + x));
+    ForEachSixteen(in, out, width, CopyStep{});
+}
+
+VM_AVX512 void StreamRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
+    std::int32_t x = std::min(PixelsToBoundary(out, 64), width);
+    CopyRow(in, out, x);
+    for (; x + kPixels <= width; x += kPixels) {
+        _mm512_stream_si512(reinterpret_cast<__m512i*>(out + x), _mm512_loadu_si512(in + x));
     }
+    CopyRow(in + x, out + x, width - x);
+}
+
+void EndStream() noexcept {
+    _mm_sfence();
 }
 
 }  // namespace
 
-const RowKernels kAvx512Kernels = {TablesRow, MixRow, WearRow, CopyRow};
+const RowKernels kAvx512Kernels = {TablesRow, MixRow, WearRow, CopyRow, StreamRow, EndStream};
 
 }  // namespace velmora::render

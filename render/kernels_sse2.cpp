@@ -3,6 +3,7 @@
 
 #include <emmintrin.h>
 
+#include <algorithm>
 #include <cstring>
 
 #include "render/kernels.h"
@@ -60,51 +61,56 @@ void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) 
     kPlainKernels.mix(in + x, out + x, width - x, weight);
 }
 
-// One pixel, its channels as 32-bit numbers: c + R(a (255 - c)). The product's part behind the point is
-// exact, so comparing it with a half rounds halves up as the plain form does.
-__m128i Lighten(__m128i channels, __m128 fraction) noexcept {
-    const __m128 product =
-        _mm_mul_ps(fraction, _mm_cvtepi32_ps(_mm_sub_epi32(_mm_set1_epi32(255), channels)));
-    const __m128i whole = _mm_cvttps_epi32(product);
-    const __m128 rest = _mm_sub_ps(product, _mm_cvtepi32_ps(whole));
-    const __m128i up = _mm_castps_si128(_mm_cmpge_ps(rest, _mm_set1_ps(0.5f)));  // -1 where rounded up
-    return _mm_add_epi32(channels, _mm_sub_epi32(whole, up));
+// One channel of four pixels, at `shift` of the words in `room`, of what is missing to white: R(a room). The
+// largest number below a half rounds halves up in every product that has a float's 24 bits.
+template <int kShift>
+__m128i Lightened(__m128i room, __m128 fraction) noexcept {
+    const __m128i channel = _mm_and_si128(_mm_srli_epi32(room, kShift), _mm_set1_epi32(255));
+    const __m128 product = _mm_mul_ps(fraction, _mm_cvtepi32_ps(channel));
+    return _mm_slli_epi32(_mm_cvttps_epi32(_mm_add_ps(product, _mm_set1_ps(kBelowHalf))), kShift);
 }
 
-// A lane's fraction for the channels of its pixel; alpha's is 0.
-template <int kLane>
-__m128 PixelFraction(__m128 fractions) noexcept {
-    const __m128 colour = _mm_castsi128_ps(_mm_setr_epi32(-1, -1, -1, 0));
-    return _mm_and_ps(colour, _mm_shuffle_ps(fractions, fractions, kLane * 0x55));
-}
-
-void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const std::uint8_t* bytes,
-             float amount) noexcept {
-    const __m128i zero = _mm_setzero_si128();
+// The channels' sums stay below 256, so they can be added in place without a carry into the next channel.
+void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
+             std::uint32_t channels) noexcept {
+    const __m128i changing = _mm_set1_epi32(static_cast<int>(channels));
     std::int32_t x = 0;
     for (; x + 4 <= width; x += 4) {
-        std::int32_t worn;
-        std::memcpy(&worn, bytes + x, sizeof worn);
-        if (worn == 0 && in == out) continue;
-        __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + x));
-        if (worn != 0) {
-            const __m128i wide = _mm_unpacklo_epi16(_mm_unpacklo_epi8(_mm_cvtsi32_si128(worn), zero), zero);
-            const __m128 fractions =
-                _mm_mul_ps(_mm_div_ps(_mm_cvtepi32_ps(wide), _mm_set1_ps(255.0f)), _mm_set1_ps(amount));
-            const __m128i low = _mm_unpacklo_epi8(pixels, zero), high = _mm_unpackhi_epi8(pixels, zero);
-            const __m128i first = Lighten(_mm_unpacklo_epi16(low, zero), PixelFraction<0>(fractions));
-            const __m128i second = Lighten(_mm_unpackhi_epi16(low, zero), PixelFraction<1>(fractions));
-            const __m128i third = Lighten(_mm_unpacklo_epi16(high, zero), PixelFraction<2>(fractions));
-            const __m128i fourth = Lighten(_mm_unpackhi_epi16(high, zero), PixelFraction<3>(fractions));
-            pixels = _mm_packus_epi16(_mm_packs_epi32(first, second), _mm_packs_epi32(third, fourth));
+        const __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + x));
+        const __m128 fraction = _mm_loadu_ps(fractions + x);
+        __m128i result = pixels;
+        if (_mm_movemask_ps(_mm_cmpneq_ps(fraction, _mm_setzero_ps())) != 0) {
+            const __m128i room = _mm_andnot_si128(pixels, changing);
+            result = _mm_add_epi32(result, Lightened<0>(room, fraction));
+            result = _mm_add_epi32(result, Lightened<8>(room, fraction));
+            result = _mm_add_epi32(result, Lightened<16>(room, fraction));
         }
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), pixels);
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), result);
     }
-    kPlainKernels.wear(in + x, out + x, width - x, bytes + x, amount);
+    kPlainKernels.wear(in + x, out + x, width - x, fractions + x, channels);
+}
+
+void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
+    kPlainKernels.copy(in, out, width);
+}
+
+void StreamRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
+    constexpr std::int32_t kPixels = 4;
+    std::int32_t x = std::min(PixelsToBoundary(out, 16), width);
+    kPlainKernels.copy(in, out, x);
+    for (; x + kPixels <= width; x += kPixels) {
+        _mm_stream_si128(reinterpret_cast<__m128i*>(out + x),
+                         _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + x)));
+    }
+    kPlainKernels.copy(in + x, out + x, width - x);
+}
+
+void EndStream() noexcept {
+    _mm_sfence();
 }
 
 }  // namespace
 
-const RowKernels kSse2Kernels = {TablesRowByWords, MixRow, WearRow, kPlainKernels.copy};
+const RowKernels kSse2Kernels = {TablesRowByWords, MixRow, WearRow, CopyRow, StreamRow, EndStream};
 
 }  // namespace velmora::render

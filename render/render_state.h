@@ -8,7 +8,9 @@
 
 #include "render/glow.h"
 #include "render/random.h"
+#include "render/row_memory.h"
 #include "render/scratches.h"
+#include "render/wear_fractions.h"
 
 namespace velmora::render {
 
@@ -43,6 +45,8 @@ struct RenderState {
     ContrastCache contrast;
     ScratchMemory scratches;
     GlowMemory glow;
+    WearFractions wear;
+    RowMemory row;
 };
 
 }  // namespace velmora::render

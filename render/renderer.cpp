@@ -32,14 +32,29 @@ void RenderByStages(FrameContext& context, const FramePlan& plan) noexcept {
     ForEachActiveStage(plan, [&context](const auto& stage) { ApplyStage(stage, context); });
 }
 
-void RenderByRows(FrameContext& context, const FramePlan& plan, Form form) noexcept {
-    const RowProgram program(plan, form);
-    if (!plan.jitter.IsActive() && program.IsEmpty()) return;
+// In place, what was read is still in the caches when it is written.
+bool IsStreamed(const FrameContext& context, const RenderOptions& options) noexcept {
+    const std::int64_t bytes =
+        std::int64_t{context.Width()} * context.Height() * static_cast<std::int64_t>(sizeof(Bgra));
+    return bytes >= options.streamedBytes && !context.FramesOverlap();
+}
+
+void RenderByRows(FrameContext& context, const FramePlan& plan, const RenderOptions& options,
+                  RowMemory& memory) noexcept {
+    const RowProgram program(plan, options.form);
+    Bgra* const room = IsStreamed(context, options) ? memory.Reserve(context.Width()) : nullptr;
+    if (room == nullptr && !plan.jitter.IsActive() && program.IsEmpty()) return;
     const ImageView& source = context.Source();
     const ImageView& destination = context.ClaimDestination();
     for (std::int32_t y = 0; y < context.Height(); ++y) {
-        program.Run(plan.jitter.Shifted(source, y), destination.Row(y), context.Width(), y);
+        const ShiftedRow row = plan.jitter.Shifted(source, y);
+        if (room == nullptr) {
+            program.Run(row, destination.Row(y), context.Width(), y);
+        } else {
+            program.Stream(row, room, destination.Row(y), context.Width(), y);
+        }
     }
+    if (room != nullptr) program.EndStream();
 }
 
 // In place the rows can be worked on where they lie, unless the picture moves over itself.
@@ -61,6 +76,8 @@ FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings, 
     plan.colour = PrepareColour(settings, context.Time(), state.contrast);
     plan.tint = PrepareTint(settings);
     plan.wear = PrepareWear(settings, context.Width(), random);
+    if (plan.wear.IsActive()) state.wear.Set(plan.wear.Picture(), plan.wear.Amount());
+    plan.wearFractions = &state.wear;
     plan.scratches = PrepareScratches(settings, plan.jitter.Dx(), context, state.scratches, form);
     plan.spots = PrepareSpots(settings, context.Destination().Region(), random);
     return plan;
@@ -77,7 +94,7 @@ void RenderStages(FrameContext& context, const StageSettings& settings, RenderSt
     if (options.road == Road::kByStages) {
         RenderByStages(context, plan);
     } else {
-        RenderByRows(context, plan, form);
+        RenderByRows(context, plan, options, state.row);
     }
 }
 

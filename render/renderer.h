@@ -27,6 +27,8 @@ enum class Road { kByRows, kByStages };
 struct RenderOptions {
     Road road = Road::kByRows;
     Form form = BestForm();  // of the pixel kernels, by rows
+    // From this size on a result, which nobody can find in a cache again, is written past the caches.
+    std::int64_t streamedBytes = std::int64_t{6} << 20;
 };
 
 // What the stages do to one frame.
@@ -36,6 +38,7 @@ struct FramePlan {
     ColourStage colour;
     TintStage tint;
     WearStage wear;
+    const WearFractions* wearFractions = nullptr;
     ScratchStage scratches;
     SpotStage spots;
 };

@@ -25,6 +25,14 @@ bool FitsKernel(std::int32_t weight) noexcept {
     return weight >= -127 && weight <= 127;
 }
 
+// For rows that are the source's but for a border, which is filled in where it goes to.
+struct StreamOrCopy {
+    const RowKernels& kernels;
+    void operator()(const Bgra* in, Bgra* out, std::int32_t count) const noexcept {
+        if (in != out) kernels.stream(in, out, count);
+    }
+};
+
 }  // namespace
 
 RowProgram::RowProgram(const FramePlan& plan, Form form) noexcept : m_plan(plan), m_kernels(KernelsOf(form)) {
@@ -50,6 +58,13 @@ void RowProgram::PlanTables() noexcept {
 bool RowProgram::IsEmpty() const noexcept {
     return !m_plan.glow.IsActive() && !m_mixes && !m_hasAfter && !m_plan.wear.IsActive() &&
            !m_plan.scratches.IsActive() && !m_plan.spots.IsActive();
+}
+
+void RowProgram::Stream(const ShiftedRow& in, Bgra* room, Bgra* out, std::int32_t width,
+                        std::int32_t y) const noexcept {
+    if (IsEmpty()) return FetchThrough(in, out, width, StreamOrCopy{m_kernels});
+    Run(in, room, width, y);
+    m_kernels.stream(room, out, width);
 }
 
 // Glow needs the pixel at its place; the first step behind the source otherwise takes the row from there.
@@ -108,18 +123,20 @@ void RowProgram::Mix(const Bgra* in, Bgra* out, std::int32_t width) const noexce
 }
 
 void RowProgram::Wear(Bgra* row, std::int32_t width, std::int32_t y) const noexcept {
-    if (m_plan.wear.BlueOnly()) return m_plan.wear.Row(row, row, width, y);
-    // The strips are narrow, so their bytes are lined up first and the kernel runs over all of them.
-    constexpr std::int32_t kBatch = 4096;
-    std::array<std::uint8_t, kBatch + kWidestWear> bytes;
+    // The strips are narrow, so their fractions are lined up first and the kernel runs over all of them.
+    constexpr std::int32_t kBatch = 2048;
+    std::array<float, kBatch + 2 * kWidestWear> fractions;
     std::int32_t start = 0, filled = 0;
+    const std::uint32_t channels = m_plan.wear.BlueOnly() ? kBlueChannel : kColourChannels;
     const auto flush = [&] {
-        m_kernels.wear(row + start, row + start, filled, bytes.data(), m_plan.wear.Amount());
+        m_kernels.wear(row + start, row + start, filled, fractions.data(), channels);
         start += filled;
         filled = 0;
     };
-    m_plan.wear.ForEachStrip(width, y, [&](std::int32_t, std::int32_t count, const std::uint8_t* strip) {
-        std::memcpy(bytes.data() + filled, strip, static_cast<std::size_t>(count));
+    m_plan.wear.ForEachStrip(width, y, [&](std::int32_t, std::int32_t count, std::int32_t wearRow) {
+        // A fixed size is copied at once; the next strip covers what is too much.
+        std::memcpy(fractions.data() + filled, m_plan.wearFractions->From(wearRow),
+                    sizeof(float) * kWidestWear);
         filled += count;
         if (filled >= kBatch) flush();
     });

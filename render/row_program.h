@@ -18,6 +18,11 @@ class RowProgram {
     [[nodiscard]] bool IsEmpty() const noexcept;
     // Row `y`. The source pixels of the row may lie where they go to, but not overlap it otherwise.
     void Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
+    // The same into a row that is not read again soon, by way of `room` for a row where there is work to do.
+    void Stream(const ShiftedRow& in, Bgra* room, Bgra* out, std::int32_t width,
+                std::int32_t y) const noexcept;
+    // After the last row that was streamed.
+    void EndStream() const noexcept { m_kernels.endStream(); }
 
   private:
     void PlanTables() noexcept;

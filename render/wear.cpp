@@ -24,7 +24,8 @@ WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random&
 }
 
 void WearStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
-    ForEachStrip(width, y, [&](std::int32_t start, std::int32_t count, const std::uint8_t* bytes) {
+    ForEachStrip(width, y, [&](std::int32_t start, std::int32_t count, std::int32_t row) {
+        const std::uint8_t* bytes = m_picture->pixels + row * m_picture->rowStep;
         for (std::int32_t i = 0; i < count; ++i) {
             const Bgra pixel = in[start + i];
             const float fraction = WearFraction(bytes[i], m_amount);

@@ -25,18 +25,20 @@ class WearStage {
     // The plain form, row `y` of the processed rectangle. `in` may be `out`.
     void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
-    // Calls visit(x, count, bytes) for each strip of row `y`, from the left: the strip's first column, its
-    // width and the wear bytes over it.
+    // Calls visit(x, count, row) for each strip of row `y`, from the left: the strip's first column, its width
+    // and the row of the wear picture over it.
     template <typename Visit>
     void ForEachStrip(std::int32_t width, std::int32_t y, Visit&& visit) const noexcept {
         Random starts = m_starts;
+        const std::int32_t height = m_picture->height;
+        const std::int32_t down = y % height;
         for (std::int32_t x = 0; x < width; x += m_picture->width) {
-            const std::int32_t start = starts.Draw(0, m_picture->height - 3);
-            const std::int32_t row = (start + y) % m_picture->height;
+            const std::int32_t row = starts.Draw(0, height - 3) + down;
             const std::int32_t count = width - x < m_picture->width ? width - x : m_picture->width;
-            visit(x, count, m_picture->pixels + row * m_picture->rowStep);
+            visit(x, count, row < height ? row : row - height);
         }
     }
+    [[nodiscard]] const GreyPicture& Picture() const noexcept { return *m_picture; }
     [[nodiscard]] float Amount() const noexcept { return m_amount; }
     [[nodiscard]] bool BlueOnly() const noexcept { return m_channels == kWearBlueOnly; }
 

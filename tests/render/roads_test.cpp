@@ -70,6 +70,7 @@ void Render(GuardedFrame& source, GuardedFrame& destination, const StageSettings
 }
 
 constexpr RenderOptions kReference = {Road::kByStages, Form::kPlain};
+const RenderOptions kStreamed = {Road::kByRows, BestForm(), 0};
 
 TEST(Roads, GiveTheSameBytes) {
     for (std::uint32_t seed = 0; seed < 400; ++seed) {
@@ -86,9 +87,11 @@ TEST(Roads, GiveTheSameBytes) {
         ASSERT_TRUE(expected.OnlyRegionDiffers(before, width, height));
         for (const Form form : {Form::kPlain, Form::kSse2, Form::kAvx2, Form::kAvx512}) {
             if (form > BestForm()) continue;
-            GuardedFrame destination = before;
-            Render(source, destination, settings, {Road::kByRows, form}, seconds);
-            ASSERT_EQ(destination.Bytes(), expected.Bytes()) << static_cast<int>(form);
+            for (const std::int64_t streamedBytes : {std::int64_t{0}, RenderOptions{}.streamedBytes}) {
+                GuardedFrame destination = before;
+                Render(source, destination, settings, {Road::kByRows, form, streamedBytes}, seconds);
+                ASSERT_EQ(destination.Bytes(), expected.Bytes()) << static_cast<int>(form);
+            }
         }
         ASSERT_EQ(source.Bytes(), untouched.Bytes());
     }
@@ -104,7 +107,7 @@ TEST(Roads, InPlaceIsAsIfTheSourceHadBeenCopiedFirst) {
         source.FillRandom(seed);
         expected = source;
         Render(source, expected, settings, kReference, 1.0);
-        for (const RenderOptions& options : {kReference, RenderOptions{}}) {
+        for (const RenderOptions& options : {kReference, RenderOptions{}, kStreamed}) {
             GuardedFrame both = source;
             Render(both, both, settings, options, 1.0);
             ASSERT_EQ(both.Bytes(), expected.Bytes());
@@ -141,7 +144,7 @@ TEST(Roads, OverlappingFramesAreAsIfTheSourceHadBeenCopiedFirst) {
 }
 
 TEST(Roads, NeutralSettingsCopyTheSource) {
-    for (const RenderOptions& options : {kReference, RenderOptions{}}) {
+    for (const RenderOptions& options : {kReference, RenderOptions{}, kStreamed}) {
         GuardedFrame source{Geometry{13, 9, 1, 2, 3, true}}, destination{Geometry{11, 12}};
         source.FillRandom(1), destination.FillRandom(2);
         Render(source, destination, {}, options, 2.0);
