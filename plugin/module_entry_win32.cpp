@@ -5,6 +5,6 @@
 
 extern "C" BOOL WINAPI DllMain(HINSTANCE module, DWORD reason, LPVOID reserved) {
     if (reason == DLL_PROCESS_ATTACH) velmora::SetModuleHandle(module);
-    if (reason == DLL_PROCESS_DETACH) velmora::support::ReleaseRuntimeOfThread(module, reserved);
+    if (reason == DLL_PROCESS_DETACH) velmora::support::runtimeRelease.Arm(module, reserved);
     return TRUE;
 }

@@ -1,4 +1,5 @@
-// For the entry of a module that may be unloaded while the process goes on. Windows only.
+// For the entry of a module that may be unloaded while the process goes on. Windows only; include it in one file
+// of a module.
 #pragma once
 
 #include <windows.h>
@@ -7,17 +8,29 @@ extern "C" const IMAGE_TLS_DIRECTORY _tls_used;  // the module's own, made by th
 
 namespace velmora::support {
 
-// Call at DLL_PROCESS_DETACH. The C++ runtime that is linked into the module keeps two handles for the thread that
-// first used it and gives them back when that thread ends, but not when the module goes before: a host that
-// loads and unloads the library again and again would lose two handles each time. So the runtime is told that the
-// unloading thread ends, which for the module is true. `reserved` is the entry's last argument: not null when the
-// whole process ends, and then nothing has to be done.
-inline void ReleaseRuntimeOfThread(HINSTANCE module, void* reserved) noexcept {
-    if (reserved != nullptr) return;
-    const auto* callback = reinterpret_cast<const PIMAGE_TLS_CALLBACK*>(_tls_used.AddressOfCallBacks);
-    for (; callback != nullptr && *callback != nullptr; ++callback) {
-        (*callback)(module, DLL_THREAD_DETACH, nullptr);
+// The C++ runtime that is linked into a module keeps handles for a thread that uses it and gives them back when that
+// thread ends, but not when the module goes before: a host that loads and unloads the library again and again would
+// lose some each time. So the runtime is told that the unloading thread ends, which for the module is true.
+class RuntimeRelease {
+  public:
+    // Call at DLL_PROCESS_DETACH; `reserved` is the entry's last argument, not null when the whole process ends:
+    // then nothing has to be done.
+    void Arm(HINSTANCE module, const void* reserved) noexcept {
+        m_module = reserved == nullptr ? module : nullptr;
     }
-}
+    ~RuntimeRelease() {
+        if (m_module == nullptr) return;
+        const auto* callback = reinterpret_cast<const PIMAGE_TLS_CALLBACK*>(_tls_used.AddressOfCallBacks);
+        for (; callback != nullptr && *callback != nullptr; ++callback) {
+            (*callback)(m_module, DLL_THREAD_DETACH, nullptr);
+        }
+    }
+
+  private:
+    HINSTANCE m_module = nullptr;
+};
+
+// Made before and so destroyed after everything else in the module, which may still use the runtime.
+__attribute__((init_priority(101))) inline RuntimeRelease runtimeRelease;
 
 }  // namespace velmora::support

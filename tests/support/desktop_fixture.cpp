@@ -194,9 +194,13 @@ void DesktopTest::ForgetSettings() {
 }
 
 std::wstring DesktopTest::RecordedCommandLine() const {
-    if (!WaitFor([this] { return std::filesystem::exists(m_recordPath); })) return {};
-    std::ifstream file(std::filesystem::path(m_recordPath), std::ios::binary);
-    EXPECT_TRUE(file.is_open());
+    std::ifstream file;
+    // The recorder may still hold the file when it has its name already.
+    const bool isOpen = WaitFor([&] {
+        file.open(std::filesystem::path(m_recordPath), std::ios::binary);
+        return file.is_open();
+    });
+    if (!isOpen) return {};
     const std::string bytes((std::istreambuf_iterator<char>(file)), std::istreambuf_iterator<char>());
     return std::wstring(reinterpret_cast<const wchar_t*>(bytes.data()), bytes.size() / sizeof(wchar_t));
 }

@@ -13,7 +13,7 @@ extern "C" {
 
 BOOL WINAPI DllMain(HINSTANCE module, DWORD reason, LPVOID reserved) {
     if (reason == DLL_PROCESS_ATTACH) ownModule = module;
-    if (reason == DLL_PROCESS_DETACH) velmora::support::ReleaseRuntimeOfThread(module, reserved);
+    if (reason == DLL_PROCESS_DETACH) velmora::support::runtimeRelease.Arm(module, reserved);
     return TRUE;
 }
 

@@ -1,0 +1,8 @@
+#include <windows.h>
+
+#include "support/module_detach.h"
+
+extern "C" BOOL WINAPI DllMain(HINSTANCE module, DWORD reason, LPVOID reserved) {
+    if (reason == DLL_PROCESS_DETACH) velmora::support::runtimeRelease.Arm(module, reserved);
+    return TRUE;
+}
