@@ -33,9 +33,13 @@ void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
 
 void NothingToEnd() noexcept {}
 
+void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
+    ToneInPasses(kPlainKernels, in, out, width, tone);
+}
+
 }  // namespace
 
-const RowKernels kPlainKernels = {TablesRow, MixRow, WearRow, CopyRow, CopyRow, NothingToEnd};
+const RowKernels kPlainKernels = {TablesRow, MixRow, ToneRow, WearRow, CopyRow, CopyRow, NothingToEnd};
 
 void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept {
     blue = b;

@@ -34,11 +34,23 @@ struct ChannelTables {
 inline constexpr std::uint32_t kBlueChannel = 0x000000FFu;
 inline constexpr std::uint32_t kColourChannels = 0x00FFFFFFu;
 
+// Tables, saturation mix and tables again, of which at least one is there.
+struct Tone {
+    const ChannelTables* before = nullptr;
+    bool mixes = false;
+    std::int32_t weight = 0;  // of the mix, -127..127
+    const ChannelTables* after = nullptr;
+
+    [[nodiscard]] bool IsActive() const noexcept { return before != nullptr || mixes || after != nullptr; }
+};
+
 struct RowKernels {
     // Each channel through its table.
     void (*tables)(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept;
     // The saturation mix with weight w in -127..127 (render/colour.h), without a table.
     void (*mix)(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) noexcept;
+    // All steps of a tone in one pass.
+    void (*tone)(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
     // Lightens the channels of each pixel by its fraction (0..1): render/shade.h. `channels` is a pixel word
     // with 0xFF at each channel that is to change, 0 at alpha.
     void (*wear)(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
@@ -53,6 +65,20 @@ struct RowKernels {
 
 // `form` must be one that the processor can run.
 [[nodiscard]] const RowKernels& KernelsOf(Form form) noexcept;
+
+// A tone's steps one after the other over a row, which the nearest cache holds.
+inline void ToneInPasses(const RowKernels& kernels, const Bgra* in, Bgra* out, std::int32_t width,
+                         const Tone& tone) noexcept {
+    if (tone.before != nullptr) {
+        kernels.tables(in, out, width, *tone.before);
+        in = out;
+    }
+    if (tone.mixes) {
+        kernels.mix(in, out, width, tone.weight);
+        in = out;
+    }
+    if (tone.after != nullptr) kernels.tables(in, out, width, *tone.after);
+}
 
 // The forms, each in its own file.
 // What the forms without byte permutations look tables up with.

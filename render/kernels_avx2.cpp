@@ -91,8 +91,12 @@ void EndStream() noexcept {
     _mm_sfence();
 }
 
+void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
+    ToneInPasses(kAvx2Kernels, in, out, width, tone);
+}
+
 }  // namespace
 
-const RowKernels kAvx2Kernels = {TablesRowByWords, MixRow, WearRow, CopyRow, StreamRow, EndStream};
+const RowKernels kAvx2Kernels = {TablesRowByWords, MixRow, ToneRow, WearRow, CopyRow, StreamRow, EndStream};
 
 }  // namespace velmora::render

@@ -85,6 +85,27 @@ VM_AVX512 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_
     ForEachSixteen(in, out, width, MixStep{weight});
 }
 
+template <bool kBefore, bool kAfter>
+struct MixedToneStep {
+    const Tone& tone;
+    VM_AVX512 __m512i operator()(__m512i pixels, std::int32_t x, __mmask16 mask) const noexcept {
+        if constexpr (kBefore) pixels = TablesStep{*tone.before}(pixels, x, mask);
+        pixels = MixStep{tone.weight}(pixels, x, mask);
+        if constexpr (kAfter) pixels = TablesStep{*tone.after}(pixels, x, mask);
+        return pixels;
+    }
+};
+
+VM_AVX512 void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
+    if (!tone.mixes) return ToneInPasses(kAvx512Kernels, in, out, width, tone);
+    if (tone.before == nullptr) {
+        if (tone.after == nullptr) return MixRow(in, out, width, tone.weight);
+        return ForEachSixteen(in, out, width, MixedToneStep<false, true>{tone});
+    }
+    if (tone.after == nullptr) return ForEachSixteen(in, out, width, MixedToneStep<true, false>{tone});
+    ForEachSixteen(in, out, width, MixedToneStep<true, true>{tone});
+}
+
 // R(a room) of one channel, as a byte at the channel's place of each pixel of `result`.
 //
 // 2^23 and the room make a float whose last byte is the room: fused, the product with a less a 2^23 is rounded
@@ -146,6 +167,6 @@ void EndStream() noexcept {
 
 }  // namespace
 
-const RowKernels kAvx512Kernels = {TablesRow, MixRow, WearRow, CopyRow, StreamRow, EndStream};
+const RowKernels kAvx512Kernels = {TablesRow, MixRow, ToneRow, WearRow, CopyRow, StreamRow, EndStream};
 
 }  // namespace velmora::render

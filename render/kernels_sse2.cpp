@@ -109,8 +109,12 @@ void EndStream() noexcept {
     _mm_sfence();
 }
 
+void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
+    ToneInPasses(kSse2Kernels, in, out, width, tone);
+}
+
 }  // namespace
 
-const RowKernels kSse2Kernels = {TablesRowByWords, MixRow, WearRow, CopyRow, StreamRow, EndStream};
+const RowKernels kSse2Kernels = {TablesRowByWords, MixRow, ToneRow, WearRow, CopyRow, StreamRow, EndStream};
 
 }  // namespace velmora::render

@@ -42,21 +42,26 @@ RowProgram::RowProgram(const FramePlan& plan, Form form) noexcept : m_plan(plan)
 void RowProgram::PlanTables() noexcept {
     const ByteTable identity = Identity();
     const ByteTable& tone = m_plan.colour.IsActive() ? m_plan.colour.Tone() : identity;
-    m_mixes = m_plan.colour.IsActive() && m_plan.colour.Mixes();
-    m_hasBefore = m_mixes && tone != identity;
-    if (m_hasBefore) m_before.Set(tone, tone, tone);
+    m_tone.mixes = m_plan.colour.IsActive() && m_plan.colour.Mixes();
+    m_tone.weight = m_tone.mixes ? m_plan.colour.Weight() : 0;
+    if (m_tone.mixes && tone != identity) {
+        m_before.Set(tone, tone, tone);
+        m_tone.before = &m_before;
+    }
 
-    const ByteTable& first = m_mixes ? identity : tone;
+    const ByteTable& first = m_tone.mixes ? identity : tone;
     const bool tints = m_plan.tint.IsActive();
     const ByteTable blue = tints ? Joined(first, m_plan.tint.Blue()) : first;
     const ByteTable green = tints ? Joined(first, m_plan.tint.Green()) : first;
     const ByteTable red = tints ? Joined(first, m_plan.tint.Red()) : first;
-    m_hasAfter = blue != identity || green != identity || red != identity;
-    if (m_hasAfter) m_after.Set(blue, green, red);
+    if (blue != identity || green != identity || red != identity) {
+        m_after.Set(blue, green, red);
+        m_tone.after = &m_after;
+    }
 }
 
 bool RowProgram::IsEmpty() const noexcept {
-    return !m_plan.glow.IsActive() && !m_mixes && !m_hasAfter && !m_plan.wear.IsActive() &&
+    return !m_plan.glow.IsActive() && !m_tone.IsActive() && !m_plan.wear.IsActive() &&
            !m_plan.scratches.IsActive() && !m_plan.spots.IsActive();
 }
 
@@ -67,41 +72,29 @@ void RowProgram::Stream(const ShiftedRow& in, Bgra* room, Bgra* out, std::int32_
     m_kernels.stream(room, out, width);
 }
 
-// Glow needs the pixel at its place; the first step behind the source otherwise takes the row from there.
+// Glow needs the pixel at its place, and so does wear; the first step behind the source otherwise takes the row
+// from there.
 void RowProgram::Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
-    if (m_plan.glow.IsActive()) {
-        const bool isWhole = in.count == width;
-        if (!isWhole) FetchThrough(in, out, width, m_kernels.copy);
-        m_plan.glow.Row(isWhole ? in.pixels : out, out, width, y);
-        if (m_hasBefore) m_kernels.tables(out, out, width, m_before);
-        if (m_mixes) Mix(out, out, width);
-        if (m_hasAfter) m_kernels.tables(out, out, width, m_after);
-    } else {
-        FetchThroughTables(in, out, width);
+    const auto toneRow = [this](const Bgra* from, Bgra* to, std::int32_t count) { RunTone(from, to, count); };
+    const bool isWhole = in.count == width;
+    const Bgra* row = isWhole ? in.pixels : out;
+    const bool takesTone = m_tone.IsActive() && !m_plan.glow.IsActive();
+    const bool takesRow = m_plan.glow.IsActive() || m_plan.wear.IsActive();
+    if (takesTone) {
+        FetchThrough(in, out, width, toneRow);
+        row = out;
+    } else if (!isWhole || (!takesRow && row != out)) {
+        FetchThrough(in, out, width, m_kernels.copy);
+        row = out;
     }
-    if (m_plan.wear.IsActive()) Wear(out, width, y);
+    if (m_plan.glow.IsActive()) {
+        m_plan.glow.Row(row, out, width, y);
+        row = out;
+        if (m_tone.IsActive()) toneRow(out, out, width);
+    }
+    if (m_plan.wear.IsActive()) Wear(row, out, width, y);
     if (m_plan.scratches.IsActive()) m_plan.scratches.Row(out, out, width, y);
     if (m_plan.spots.IsActive()) m_plan.spots.Row(out, out, width, y);
-}
-
-void RowProgram::FetchThroughTables(const ShiftedRow& in, Bgra* out, std::int32_t width) const noexcept {
-    const auto tables = [this](const ChannelTables& t) {
-        return [this, &t](const Bgra* from, Bgra* to, std::int32_t count) {
-            m_kernels.tables(from, to, count, t);
-        };
-    };
-    const auto mix = [this](const Bgra* from, Bgra* to, std::int32_t count) { Mix(from, to, count); };
-    if (m_hasBefore) {
-        FetchThrough(in, out, width, tables(m_before));
-        Mix(out, out, width);
-    } else if (m_mixes) {
-        FetchThrough(in, out, width, mix);
-    } else if (m_hasAfter) {
-        return FetchThrough(in, out, width, tables(m_after));
-    } else if (in.pixels != out || in.count != width) {
-        FetchThrough(in, out, width, m_kernels.copy);
-    }
-    if (m_hasAfter) m_kernels.tables(out, out, width, m_after);
 }
 
 template <typename Step>
@@ -117,19 +110,18 @@ void RowProgram::FetchThrough(const ShiftedRow& in, Bgra* out, std::int32_t widt
     border(in.start + in.count, width - in.start - in.count);
 }
 
-void RowProgram::Mix(const Bgra* in, Bgra* out, std::int32_t width) const noexcept {
-    const std::int32_t weight = m_plan.colour.Weight();
-    (FitsKernel(weight) ? m_kernels : kPlainKernels).mix(in, out, width, weight);
+void RowProgram::RunTone(const Bgra* in, Bgra* out, std::int32_t width) const noexcept {
+    (FitsKernel(m_tone.weight) ? m_kernels : kPlainKernels).tone(in, out, width, m_tone);
 }
 
-void RowProgram::Wear(Bgra* row, std::int32_t width, std::int32_t y) const noexcept {
+void RowProgram::Wear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     // The strips are narrow, so their fractions are lined up first and the kernel runs over all of them.
     constexpr std::int32_t kBatch = 2048;
     std::array<float, kBatch + 2 * kWidestWear> fractions;
     std::int32_t start = 0, filled = 0;
     const std::uint32_t channels = m_plan.wear.BlueOnly() ? kBlueChannel : kColourChannels;
     const auto flush = [&] {
-        m_kernels.wear(row + start, row + start, filled, fractions.data(), channels);
+        m_kernels.wear(in + start, out + start, filled, fractions.data(), channels);
         start += filled;
         filled = 0;
     };

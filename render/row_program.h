@@ -13,6 +13,8 @@ class RowProgram {
   public:
     // Keeps references into `plan`.
     RowProgram(const FramePlan& plan, Form form) noexcept;
+    RowProgram(const RowProgram&) = delete;
+    RowProgram& operator=(const RowProgram&) = delete;
 
     // True when a row leaves as it came in.
     [[nodiscard]] bool IsEmpty() const noexcept;
@@ -26,20 +28,16 @@ class RowProgram {
 
   private:
     void PlanTables() noexcept;
-    // Tables and mix, the first of them straight from the source: the pixels cross the memory once.
-    void FetchThroughTables(const ShiftedRow& in, Bgra* out, std::int32_t width) const noexcept;
     template <typename Step>
     void FetchThrough(const ShiftedRow& in, Bgra* out, std::int32_t width, Step&& step) const noexcept;
-    void Mix(const Bgra* in, Bgra* out, std::int32_t width) const noexcept;
-    void Wear(Bgra* row, std::int32_t width, std::int32_t y) const noexcept;
+    void RunTone(const Bgra* in, Bgra* out, std::int32_t width) const noexcept;
+    void Wear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
     const FramePlan& m_plan;
     const RowKernels& m_kernels;
-    bool m_mixes = false;
-    bool m_hasBefore = false;  // tables before the mix
-    bool m_hasAfter = false;   // tables behind it, or in its place
-    ChannelTables m_before;
-    ChannelTables m_after;
+    Tone m_tone;
+    ChannelTables m_before;  // the mix
+    ChannelTables m_after;   // the mix, or in its place
 };
 
 }  // namespace velmora::render

@@ -82,6 +82,18 @@ TEST(RowKernels, MixesAreEqualInAllForms) {
     }
 }
 
+TEST(RowKernels, TonesAreEqualInAllForms) {
+    std::mt19937 numbers(4);
+    const ChannelTables before = AnyTables(numbers, true), after = AnyTables(numbers, false);
+    for (const Tone& tone : {Tone{&before, true, 40, &after}, Tone{nullptr, true, -127, &after},
+                             Tone{&before, true, 127, nullptr}, Tone{&before, false, 0, nullptr},
+                             Tone{nullptr, false, 0, &after}, Tone{nullptr, true, 5, nullptr}}) {
+        ExpectEqualForms([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
+                             std::int32_t width) { kernels.tone(in, out, width, tone); },
+                         true);
+    }
+}
+
 TEST(RowKernels, WearIsEqualInAllForms) {
     std::mt19937 numbers(3);
     std::vector<float> fractions(kWidest);
