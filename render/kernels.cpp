@@ -34,18 +34,23 @@ void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
 void NothingToEnd() noexcept {}
 
 void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
-    ToneInPasses(kPlainKernels, in, out, width, tone);
+    ToneInPasses(TablesRow, MixRow, in, out, width, tone);
+}
+
+void LineUp(const float* const* strips, std::int32_t count, std::int32_t width, float* out) noexcept {
+    for (std::int32_t i = 0; i < count; ++i, out += width) {
+        std::memcpy(out, strips[i], sizeof(float) * kWidestWear);
+    }
 }
 
 }  // namespace
 
-const RowKernels kPlainKernels = {TablesRow, MixRow, ToneRow, WearRow, CopyRow, CopyRow, NothingToEnd};
+const RowKernels kPlainKernels = {ToneRow, WearRow, CopyRow, CopyRow, NothingToEnd, LineUp};
 
 void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept {
     blue = b;
     green = g;
     red = r;
-    areEqual = b == g && g == r;
     for (std::size_t i = 0; i < 256; ++i) {
         blueWord[i] = b[i];
         greenWord[i] = std::uint32_t{g[i]} << 8;

@@ -12,12 +12,12 @@
 #include "render/colour.h"
 #include "render/cpu.h"
 #include "render/image.h"
+#include "render/pictures.h"
 
 namespace velmora::render {
 
 // One table a channel, prepared for the kernels.
 struct ChannelTables {
-    bool areEqual;
     alignas(64) ByteTable blue;
     alignas(64) ByteTable green;
     alignas(64) ByteTable red;
@@ -34,7 +34,7 @@ struct ChannelTables {
 inline constexpr std::uint32_t kBlueChannel = 0x000000FFu;
 inline constexpr std::uint32_t kColourChannels = 0x00FFFFFFu;
 
-// Tables, saturation mix and tables again, of which at least one is there.
+// Tables, the saturation mix (render/colour.h, without its table) and tables again, of which at least one is there.
 struct Tone {
     const ChannelTables* before = nullptr;
     bool mixes = false;
@@ -45,11 +45,7 @@ struct Tone {
 };
 
 struct RowKernels {
-    // Each channel through its table.
-    void (*tables)(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept;
-    // The saturation mix with weight w in -127..127 (render/colour.h), without a table.
-    void (*mix)(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) noexcept;
-    // All steps of a tone in one pass.
+    // All steps of a tone.
     void (*tone)(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
     // Lightens the channels of each pixel by its fraction (0..1): render/shade.h. `channels` is a pixel word
     // with 0xFF at each channel that is to change, 0 at alpha.
@@ -61,23 +57,27 @@ struct RowKernels {
     // `out`. After the last row of a frame `endStream` makes the rows seen by other threads.
     void (*stream)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
     void (*endStream)() noexcept;
+    // Lays strips of fractions, `width` each, one behind the other. From each strip kWidestWear numbers are read, and
+    // `out` has room for as many from the last strip's start on.
+    void (*lineUp)(const float* const* strips, std::int32_t count, std::int32_t width, float* out) noexcept;
 };
 
 // `form` must be one that the processor can run.
 [[nodiscard]] const RowKernels& KernelsOf(Form form) noexcept;
 
 // A tone's steps one after the other over a row, which the nearest cache holds.
-inline void ToneInPasses(const RowKernels& kernels, const Bgra* in, Bgra* out, std::int32_t width,
-                         const Tone& tone) noexcept {
+template <typename Tables, typename Mix>
+void ToneInPasses(Tables&& tables, Mix&& mix, const Bgra* in, Bgra* out, std::int32_t width,
+                  const Tone& tone) noexcept {
     if (tone.before != nullptr) {
-        kernels.tables(in, out, width, *tone.before);
+        tables(in, out, width, *tone.before);
         in = out;
     }
     if (tone.mixes) {
-        kernels.mix(in, out, width, tone.weight);
+        mix(in, out, width, tone.weight);
         in = out;
     }
-    if (tone.after != nullptr) kernels.tables(in, out, width, *tone.after);
+    if (tone.after != nullptr) tables(in, out, width, *tone.after);
 }
 
 // The forms, each in its own file.
@@ -98,5 +98,7 @@ extern const RowKernels kPlainKernels;
 extern const RowKernels kSse2Kernels;
 extern const RowKernels kAvx2Kernels;
 extern const RowKernels kAvx512Kernels;
+// The tone of kAvx512Kernels, in a file of its own.
+void ToneRowAvx512(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
 
 }  // namespace velmora::render

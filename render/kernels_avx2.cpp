@@ -4,6 +4,7 @@
 #include <immintrin.h>
 
 #include <algorithm>
+#include <cstring>
 
 #include "render/kernels.h"
 
@@ -35,7 +36,7 @@ VM_AVX2 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
                                                   MixFour(_mm256_unpackhi_epi8(pixels, zero), luma, u));
         _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), _mm256_blendv_epi8(mixed, pixels, alpha));
     }
-    kSse2Kernels.mix(in + x, out + x, width - x, weight);
+    kSse2Kernels.tone(in + x, out + x, width - x, Tone{nullptr, true, weight, nullptr});
 }
 
 // As in the 16-byte form, a channel of eight pixels.
@@ -92,11 +93,17 @@ void EndStream() noexcept {
 }
 
 void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
-    ToneInPasses(kAvx2Kernels, in, out, width, tone);
+    ToneInPasses(TablesRowByWords, MixRow, in, out, width, tone);
+}
+
+VM_AVX2 void LineUp(const float* const* strips, std::int32_t count, std::int32_t width, float* out) noexcept {
+    for (std::int32_t i = 0; i < count; ++i, out += width) {
+        std::memcpy(out, strips[i], sizeof(float) * kWidestWear);
+    }
 }
 
 }  // namespace
 
-const RowKernels kAvx2Kernels = {TablesRowByWords, MixRow, ToneRow, WearRow, CopyRow, StreamRow, EndStream};
+const RowKernels kAvx2Kernels = {ToneRow, WearRow, CopyRow, StreamRow, EndStream, LineUp};
 
 }  // namespace velmora::render

@@ -29,7 +29,7 @@ void TablesRowByWords(const Bgra* in, Bgra* out, std::int32_t width, const Chann
         }
         std::memcpy(out + x, pair, sizeof pair);
     }
-    kPlainKernels.tables(in + x, out + x, width - x, tables);
+    kPlainKernels.tone(in + x, out + x, width - x, Tone{&tables, false, 0, nullptr});
 }
 
 namespace {
@@ -58,7 +58,7 @@ void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) 
         const __m128i kept = _mm_or_si128(_mm_and_si128(colour, mixed), _mm_andnot_si128(colour, pixels));
         _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), kept);
     }
-    kPlainKernels.mix(in + x, out + x, width - x, weight);
+    kPlainKernels.tone(in + x, out + x, width - x, Tone{nullptr, true, weight, nullptr});
 }
 
 // One channel of four pixels, at `shift` of the words in `room`, of what is missing to white: R(a room). The
@@ -110,11 +110,17 @@ void EndStream() noexcept {
 }
 
 void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
-    ToneInPasses(kSse2Kernels, in, out, width, tone);
+    ToneInPasses(TablesRowByWords, MixRow, in, out, width, tone);
+}
+
+void LineUp(const float* const* strips, std::int32_t count, std::int32_t width, float* out) noexcept {
+    for (std::int32_t i = 0; i < count; ++i, out += width) {
+        std::memcpy(out, strips[i], sizeof(float) * kWidestWear);
+    }
 }
 
 }  // namespace
 
-const RowKernels kSse2Kernels = {TablesRowByWords, MixRow, ToneRow, WearRow, CopyRow, StreamRow, EndStream};
+const RowKernels kSse2Kernels = {ToneRow, WearRow, CopyRow, StreamRow, EndStream, LineUp};
 
 }  // namespace velmora::render

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <array>
-#include <cstring>
 
 namespace velmora::render {
 namespace {
@@ -116,23 +115,23 @@ void RowProgram::RunTone(const Bgra* in, Bgra* out, std::int32_t width) const no
 
 void RowProgram::Wear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     // The strips are narrow, so their fractions are lined up first and the kernel runs over all of them.
-    constexpr std::int32_t kBatch = 2048;
-    std::array<float, kBatch + 2 * kWidestWear> fractions;
-    std::int32_t start = 0, filled = 0;
+    constexpr std::int32_t kBatch = 40;
+    std::array<const float*, kBatch> strips;
+    std::array<float, kBatch * kWidestWear + kWidestWear> fractions;
     const std::uint32_t channels = m_plan.wear.BlueOnly() ? kBlueChannel : kColourChannels;
-    const auto flush = [&] {
-        m_kernels.wear(in + start, out + start, filled, fractions.data(), channels);
-        start += filled;
+    const std::int32_t stripWidth = m_plan.wear.Picture().width;
+    std::int32_t start = 0, filled = 0;
+    const auto flush = [&](std::int32_t end) {
+        m_kernels.lineUp(strips.data(), filled, stripWidth, fractions.data());
+        m_kernels.wear(in + start, out + start, end - start, fractions.data(), channels);
+        start = end;
         filled = 0;
     };
-    m_plan.wear.ForEachStrip(width, y, [&](std::int32_t, std::int32_t count, std::int32_t wearRow) {
-        // A fixed size is copied at once; the next strip covers what is too much.
-        std::memcpy(fractions.data() + filled, m_plan.wearFractions->From(wearRow),
-                    sizeof(float) * kWidestWear);
-        filled += count;
-        if (filled >= kBatch) flush();
+    m_plan.wear.ForEachStrip(width, y, [&](std::int32_t x, std::int32_t count, std::int32_t wearRow) {
+        strips[static_cast<std::size_t>(filled++)] = m_plan.wearFractions->From(wearRow);
+        if (filled == kBatch) flush(x + count);
     });
-    flush();
+    if (start != width) flush(width);
 }
 
 }  // namespace velmora::render

@@ -90,8 +90,9 @@ void SpotStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
         const std::uint8_t key = spot.picture->pixels[0];
         const std::int32_t end = std::min(spot.left + spot.width, width);
         for (std::int32_t x = std::max(spot.left, 0); x < end; ++x) {
-            const float fraction = SpotFraction(spot.ByteAt(row, x - spot.left), key, spot.strength);
-            out[x] = ShadePixel(out[x], fraction);
+            const std::uint8_t byte = spot.ByteAt(row, x - spot.left);
+            if (byte == key) continue;
+            out[x] = ShadePixel(out[x], SpotFraction(byte, key, spot.strength));
         }
     }
 }
