@@ -132,20 +132,15 @@ void OptionsDialog::SetTexts() noexcept {
     set(VM_TEXT_VERSION, "Version", version);
     set(VM_TEXT_OPTIONS, "Options", "Options");
     SetWindowTextW(m_window, win32::Wide(texts.Translate(kTextsOfOptions, "Title", kProductText)));
-    SetMarkedText(VM_CHECK_KNOBS_VERTICAL,
-                  texts.Translate(kTextsOfOptions, "Up/Down Knobs Control",
-                                  "Up / Down mouse control of circular knobs"),
-                  u'U');
-    // OK and Cancel have their keys: Enter and Escape.
-    SetDlgItemTextW(m_window, VM_BUTTON_OK, win32::Wide(texts.Translate(kTextsOfButtons, "OK")));
-    SetDlgItemTextW(m_window, VM_BUTTON_CANCEL, win32::Wide(texts.Translate(kTextsOfButtons, "Cancel")));
-    SetMarkedText(VM_BUTTON_HELP, texts.Translate(kTextsOfButtons, "Help"), u'H');
-}
-
-void OptionsDialog::SetMarkedText(int control, const char16_t* text, char16_t substitute) noexcept try {
-    SetDlgItemTextW(m_window, control, win32::Wide(m_mnemonics.Mark(text, substitute).c_str()));
-} catch (...) {
-    SetDlgItemTextW(m_window, control, win32::Wide(text));  // short of memory: without its letter
+    // Texts stand as they are: a translation brings its letter for the Alt key with it, and OK and Cancel have
+    // theirs, Enter and Escape.
+    set(VM_CHECK_KNOBS_VERTICAL, "Up/Down Knobs Control", "Up / Down mouse control of circular knobs");
+    const auto setButton = [&](int control, const char* key) {
+        SetDlgItemTextW(m_window, control, win32::Wide(texts.Translate(kTextsOfButtons, key)));
+    };
+    setButton(VM_BUTTON_OK, "OK");
+    setButton(VM_BUTTON_CANCEL, "Cancel");
+    setButton(VM_BUTTON_HELP, "Help");
 }
 
 void OptionsDialog::OnCommand(int control) noexcept {

@@ -5,7 +5,6 @@
 #include <windows.h>
 
 #include "support/help_launcher.h"
-#include "support/mnemonics.h"
 #include "support/translation.h"
 
 namespace velmora::support {
@@ -46,14 +45,12 @@ class OptionsDialog {
     void OnOk() noexcept;
     void OpenHelp() const noexcept;
     void SetTexts() noexcept;
-    void SetMarkedText(int control, const char16_t* text, char16_t substitute) noexcept;
     void CreateLogo() noexcept;
 
     OptionsDialogParts m_parts;
     bool m_knobsDragVertical;
     HWND m_window = nullptr;
     HWND m_logo = nullptr;
-    MnemonicChooser m_mnemonics;
 };
 
 }  // namespace velmora::support

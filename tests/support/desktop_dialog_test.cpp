@@ -35,10 +35,10 @@ TEST_F(DialogTest, SpeaksEnglishWithoutTranslations) {
         {VM_TEXT_PRODUCT, L"Velmora Reel Effects"},
         {VM_TEXT_VERSION, L"Version 1.0"},
         {VM_TEXT_OPTIONS, L"Options"},
-        {VM_CHECK_KNOBS_VERTICAL, L"&Up / Down mouse control of circular knobs"},
+        {VM_CHECK_KNOBS_VERTICAL, L"Up / Down mouse control of circular knobs"},
         {VM_BUTTON_OK, L"OK"},
         {VM_BUTTON_CANCEL, L"Cancel"},
-        {VM_BUTTON_HELP, L"&Help"},
+        {VM_BUTTON_HELP, L"Help"},
     };
     Show([&](HWND dialog) {
         EXPECT_EQ(TextOf(dialog), L"Velmora Reel Effects");
@@ -52,9 +52,9 @@ TEST_F(DialogTest, SpeaksEnglishWithoutTranslations) {
 TEST_F(DialogTest, AsksAnotherLivingLibraryWhenItsOwnIsGone) {
     FakeLibrary other(u"Hjälp");
     m_services->Offer(other);
-    Show([](HWND dialog) { EXPECT_EQ(TextOf(GetDlgItem(dialog, VM_BUTTON_HELP)), L"&Help"); });
+    Show([](HWND dialog) { EXPECT_EQ(TextOf(GetDlgItem(dialog, VM_BUTTON_HELP)), L"Help"); });
     m_services->Withdraw(m_library);
-    Show([](HWND dialog) { EXPECT_EQ(TextOf(GetDlgItem(dialog, VM_BUTTON_HELP)), L"&Hjälp"); });
+    Show([](HWND dialog) { EXPECT_EQ(TextOf(GetDlgItem(dialog, VM_BUTTON_HELP)), L"Hjälp"); });
     EXPECT_EQ(other.references, 1u);
     m_services->Offer(m_library);
     m_services->Withdraw(other);
@@ -63,6 +63,9 @@ TEST_F(DialogTest, AsksAnotherLivingLibraryWhenItsOwnIsGone) {
 TEST_F(DialogTest, IsUsableWithoutAMouse) {
     const int tabOrder[] = {VM_CHECK_KNOBS_VERTICAL, VM_BUTTON_OK, VM_BUTTON_CANCEL, VM_BUTTON_HELP,
                             VM_CHECK_KNOBS_VERTICAL};
+    FakeLibrary marked(u"", u"&Up");
+    m_services->Offer(marked);
+    m_services->Withdraw(m_library);
     const std::int32_t result = Show([&](HWND dialog) {
         for (const int control : tabOrder) {
             EXPECT_EQ(FocusedControl(dialog), control);
@@ -81,6 +84,8 @@ TEST_F(DialogTest, IsUsableWithoutAMouse) {
         Type(dialog, VK_RETURN);
         EXPECT_FALSE(IsWindow(dialog));
     });
+    m_services->Offer(m_library);
+    m_services->Withdraw(marked);
     EXPECT_EQ(result, 1);
     EXPECT_TRUE((**m_services).KnobsDragVertical());
 }

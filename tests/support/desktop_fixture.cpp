@@ -99,8 +99,10 @@ Status VM_CALL FakeLibrary::QueryInterface(const Guid* iid, void** out) {
 std::int32_t VM_CALL FakeLibrary::GetText(const char* languageCode, std::int32_t, const char* key,
                                           char16_t* buffer, std::int32_t capacity) {
     language = languageCode;
-    if (std::string(key) != "Help") return 0;
-    lstrcpynW(reinterpret_cast<wchar_t*>(buffer), reinterpret_cast<const wchar_t*>(m_help), capacity);
+    const bool isKnobs = std::string(key) == "Up/Down Knobs Control";
+    if (!isKnobs && std::string(key) != "Help") return 0;
+    lstrcpynW(reinterpret_cast<wchar_t*>(buffer), reinterpret_cast<const wchar_t*>(isKnobs ? m_knobs : m_help),
+              capacity);
     return lstrlenW(reinterpret_cast<wchar_t*>(buffer));
 }
 

@@ -41,7 +41,8 @@ class RegisteredText {
 // A library object as far as the services see it. Translates "Help" to its own name when it has texts.
 class FakeLibrary final : public IMultiLingual {
   public:
-    explicit FakeLibrary(const char16_t* help) noexcept : m_help(help) {}
+    explicit FakeLibrary(const char16_t* help, const char16_t* knobs = u"") noexcept
+        : m_help(help), m_knobs(knobs) {}
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
     std::uint32_t VM_CALL AddRef() override { return ++references; }
     std::uint32_t VM_CALL Release() override { return --references; }
@@ -57,6 +58,7 @@ class FakeLibrary final : public IMultiLingual {
 
   private:
     const char16_t* m_help;
+    const char16_t* m_knobs;
 };
 
 // The services' module, loaded. Freed at the end.

@@ -4,7 +4,6 @@
 #include <functional>
 
 #include "support/bit_button_state.h"
-#include "support/mnemonics.h"
 #include "support/text_sources.h"
 
 namespace velmora::support {
@@ -117,27 +116,6 @@ TEST(BitButtonState, ClicksOnlyWhenReleasedInside) {
     BitButtonState silent(false);
     Press(silent);
     EXPECT_FALSE(silent.OnButtonUp().click);
-}
-
-TEST(Mnemonics, MarksTheFirstLetterThatIsFree) {
-    const struct {
-        const char16_t* text;
-        char16_t substitute;
-        const char16_t* marked;
-    } rows[] = {
-        {u"Up / Down", u'U', u"&Up / Down"},
-        {u"up there", u'U', u"u&p there"},  // U is taken
-        {u"Öffnen", u'O', u"Ö&ffnen"},      // a letter that one key types
-        {u"ヘルプ", u'H', u"ヘルプ(&H)"},
-        {u"Справка", u'H', u"&Справка"},
-        {u"сброс", u'H', u"с&брос"},  // small and capital are one key
-        {u"S&ave", u'S', u"S&ave"},   // marked by the translator
-        {u"axe", u'A', u"a&xe"},      // A is taken by it
-        {u"R&&D", u'R', u"&R&&D"},
-        {u"", u'E', u""},
-    };
-    MnemonicChooser chooser;
-    for (const auto& row : rows) EXPECT_EQ(chooser.Mark(row.text, row.substitute), row.marked);
 }
 
 class Library final : public IUnknown {
