@@ -138,7 +138,13 @@ void MediaReader::SeekBefore(double seconds) {
 
 double MediaReader::SecondsOf(std::int64_t pts) const {
     const AVRational base = m_stream->time_base;
-    return static_cast<double>(pts - m_firstFrame->pts) * base.num / base.den;
+    const double seconds = static_cast<double>(pts - m_firstFrame->pts) * base.num / base.den;
+    // Some containers count whole milliseconds. A time that is a frame's but for that rounding is the frame's:
+    // else neighbouring frames would share a frame number, and with it their damage.
+    const AVRational rate = FrameRateGuess();
+    const double whole = std::round(seconds * rate.num / rate.den) * rate.den / rate.num;
+    const double rounding = 0.51 * base.num / base.den;
+    return std::fabs(seconds - whole) <= rounding ? whole : seconds;
 }
 
 std::optional<double> MediaReader::SecondsOf(const AVPacket& packet) const {

@@ -76,6 +76,14 @@ class SameBytes(ReelfxTest):
         chosen = [d for d, t in zip(whole, times) if 0.9 <= t < 1.2]
         self.assertEqual(self.digests(*TRAIN, "--start", "0.9", "--duration", "0:00.3"), chosen)
 
+    def test_containers_that_count_milliseconds_give_the_same_frames(self):
+        nut, mkv = clips.root / "exact.nut", clips.root / "rounded.mkv"
+        ffmpeg("-f", "lavfi", "-i", "testsrc=size=160x90:rate=30:duration=2", "-c:v", "ffv1", nut)
+        ffmpeg("-i", nut, "-c", "copy", mkv)
+        exact = self.digests(*TRAIN, source=nut)
+        self.assertEqual(len(exact), 60)
+        self.assertEqual(self.digests(*TRAIN, source=mkv), exact)
+
     def test_files_of_any_thread_count_are_equal(self):
         one = self.render(clips.small, "one.mkv", *TRAIN, "--codec", "ffv1", "--threads", 1)
         five = self.render(clips.small, "five.mkv", *TRAIN, "--codec", "ffv1", "--threads", 5)
