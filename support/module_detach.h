@@ -6,6 +6,10 @@
 
 extern "C" const IMAGE_TLS_DIRECTORY _tls_used;  // the module's own, made by the linker
 
+namespace __gnu_cxx {
+void __freeres();  // of the C++ runtime; it has no header
+}
+
 namespace velmora::support {
 
 // The C++ runtime that is linked into a module keeps handles for a thread that uses it and gives them back when that
@@ -24,6 +28,8 @@ class RuntimeRelease {
         for (; callback != nullptr && *callback != nullptr; ++callback) {
             (*callback)(m_module, DLL_THREAD_DETACH, nullptr);
         }
+        // The memory that the runtime sets aside for throwing when there is none.
+        __gnu_cxx::__freeres();
     }
 
   private:
