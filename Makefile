@@ -1,15 +1,18 @@
 # The commands of daily work. Each sets up first what it needs; see CONTRIBUTING.md.
 
-.PHONY: help setup build test demo format tidy clean
+.PHONY: help setup build test demo demo-ffmpeg install-user uninstall-user format tidy clean
 
 help:
-	@echo 'make demo    build everything and see footage through the library and the native core'
-	@echo 'make test    build everything and run all tests'
-	@echo 'make setup   install packages and 32-bit Wine; the other commands do it by themselves'
-	@echo 'make build   build the Windows library and the native programs into build/*/dist'
-	@echo 'make format  bring the sources into their form'
-	@echo 'make tidy    look for doubtful code'
-	@echo 'make clean   delete the builds'
+	@echo 'make demo            build everything and see footage through the library and the native core'
+	@echo 'make demo-ffmpeg     see footage through the frei0r plug-in in FFmpeg'
+	@echo 'make install-user    put the frei0r plug-ins where FFmpeg, Kdenlive and Shotcut look in your home'
+	@echo 'make uninstall-user  take them away again'
+	@echo 'make test            build everything and run all tests'
+	@echo 'make setup           install packages and 32-bit Wine; the other commands do it by themselves'
+	@echo 'make build           build the Windows library and the native programs into build/*/dist'
+	@echo 'make format          bring the sources into their form'
+	@echo 'make tidy            look for doubtful code'
+	@echo 'make clean           delete the builds'
 
 setup:
 	scripts/setup
@@ -22,6 +25,16 @@ test: setup
 
 demo: setup
 	scripts/demo
+
+demo-ffmpeg: setup
+	scripts/demo-ffmpeg
+
+install-user: setup
+	scripts/build native
+	scripts/install-user
+
+uninstall-user:
+	scripts/install-user --remove
 
 format:
 	git ls-files '*.cpp' '*.h' | xargs clang-format -i

@@ -44,8 +44,16 @@ std::string DefaultText(const PluginDescription& plugin, const PluginParam& para
     }
 }
 
+// Editors may write a whole number with decimals.
+std::optional<std::int64_t> WholeNumber(std::string_view text) {
+    if (const auto number = ParseInteger(text)) return number;
+    const auto number = ParseNumber(text);
+    if (!number || std::abs(*number) > 1e15) return std::nullopt;
+    return std::llround(*number);
+}
+
 std::uint32_t SeedOf(std::string_view text) {
-    const auto seed = ParseInteger(text);
+    const auto seed = WholeNumber(text);
     return seed && *seed >= 0 && *seed <= std::numeric_limits<std::uint32_t>::max()
                ? static_cast<std::uint32_t>(*seed)
                : 0;
@@ -99,7 +107,7 @@ void Instance::SetText(std::size_t index, std::string text) {
             m_seed = SeedOf(kept);
             break;
         case ParamRole::kStartFrame:
-            m_clock.SetStartFrame(ParseInteger(kept).value_or(0));
+            m_clock.SetStartFrame(WholeNumber(kept).value_or(0));
             break;
         case ParamRole::kFrameRate:
             m_clock.SetFrameRate(kept);

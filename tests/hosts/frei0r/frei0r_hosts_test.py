@@ -9,7 +9,6 @@ plug-ins with sanitizers need their runtime.
 
 import argparse
 import os
-import subprocess
 import sys
 import tempfile
 import unittest
@@ -140,6 +139,7 @@ class Hosts(unittest.TestCase):
     @classmethod
     def setUpClass(cls):
         cls.work = Work()
+        cls.addClassCleanup(cls.work.folder.cleanup)
 
     def test_show_the_frames_of_reelfx(self):
         rows = ["| host | " + " | ".join(PRESETS) + " |", "|---" * (len(PRESETS) + 1) + "|"]

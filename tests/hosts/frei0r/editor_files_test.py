@@ -1,0 +1,134 @@
+#!/usr/bin/env python3
+"""The editors' files, read as the editors read them, and their way into a user's home and out again.
+
+Environment: REELFX; VELMORA_DIST: what was built; PRELOAD as in frei0r_hosts_test.py.
+"""
+
+import os
+import re
+import shutil
+import subprocess
+import sys
+import tempfile
+import unittest
+import xml.etree.ElementTree as ElementTree
+from pathlib import Path
+
+sys.path.insert(0, str(Path(__file__).parent))
+import frei0r_hosts_test as hosts  # noqa: E402
+
+DIST = Path(os.environ["VELMORA_DIST"])
+EDITORS = DIST / "editors"
+PLUGINS = [hosts.plugin_name(effect) for effect in hosts.PRESETS]
+os.environ.setdefault("FREI0R_PATH", str(DIST / "frei0r-1"))
+
+
+def kdenlive_parameters(plugin):
+    root = ElementTree.parse(EDITORS / "kdenlive/effects" / f"{plugin}.xml").getroot()
+    assert (root.tag, root.get("tag")) == ("effect", f"frei0r.{plugin}")
+    return root.findall("parameter")
+
+
+def melt_metadata(plugin, data=None):
+    environment = dict(os.environ, LD_PRELOAD=os.environ.get("PRELOAD", ""), ASAN_OPTIONS="detect_leaks=0")
+    if data:
+        environment["MLT_DATA"] = str(data)
+    done = subprocess.run(["melt", "-query", f"filter=frei0r.{plugin}"], capture_output=True, env=environment)
+    return done.stdout.decode()
+
+
+def parameters_of_plugin(plugin):
+    """What MLT reads from the plug-in itself, where no description of ours is installed."""
+    return re.findall(r"^  - identifier: (.+)$", melt_metadata(plugin), re.MULTILINE)
+
+
+class EditorFiles(unittest.TestCase):
+    def test_kdenlive_binds_every_parameter_by_its_index(self):
+        for plugin in PLUGINS:
+            names = [p.get("name") for p in kdenlive_parameters(plugin)]
+            self.assertEqual(names, [str(i) for i in range(len(parameters_of_plugin(plugin)))], plugin)
+
+    def test_kdenlive_finds_values_and_defaults_in_range(self):
+        for plugin in PLUGINS:
+            for parameter in kdenlive_parameters(plugin):
+                where = f"{plugin}: {parameter.findtext('name')}"
+                default = parameter.get("default")
+                if parameter.get("type") == "list":
+                    # Kdenlive splits the values at semicolons and what it shows at commas.
+                    values = parameter.get("paramlist").split(";")
+                    self.assertEqual(len(values), len(parameter.findtext("paramlistdisplay").split(",")), where)
+                    self.assertIn(default, values, where)
+                elif parameter.get("type") in ("animated", "constant"):
+                    shown = float(default) * float(parameter.get("factor", 1))
+                    self.assertLessEqual(float(parameter.get("min")), shown, where)
+                    self.assertLessEqual(shown, float(parameter.get("max")), where)
+                elif parameter.get("type") == "color":
+                    self.assertRegex(default, "^#[0-9a-f]{6}$", where)
+                else:
+                    self.assertEqual((parameter.get("type"), default in ("0", "1")), ("bool", True), where)
+
+    def test_a_preset_shows_although_kdenlive_passes_every_value(self):
+        work = hosts.Work()
+        self.addCleanup(work.folder.cleanup)
+        for effect in hosts.PRESETS:
+            values = [f"{p.get('name')}={p.get('default')}" for p in kdenlive_parameters(hosts.plugin_name(effect))[4:]]
+            # An animated value carries the frame that it belongs to.
+            values = [re.sub(r"^(\d+)=([0-9.]+)$", r"\1=0=\2", v) for v in values]
+            self.assertEqual(hosts.in_melt(work, effect, "25", more=values), work.expected(effect, "25"), effect)
+
+    def test_mlt_reads_its_description(self):
+        with tempfile.TemporaryDirectory() as folder:
+            data = Path(folder) / "mlt"
+            system = next(Path("/usr/share").glob("mlt-*"))
+            shutil.copytree(system, data, symlinks=True)
+            for file in (EDITORS / "mlt/frei0r").iterdir():
+                shutil.copy(file, data / "frei0r")
+            for plugin in PLUGINS:
+                text = melt_metadata(plugin, data)
+                names = re.findall(r"^  - identifier: (.+)$", text, re.MULTILINE)
+                self.assertEqual(names, parameters_of_plugin(plugin), plugin)
+                self.assertIn("schema_version: 0.3", text)  # ours: MLT's own has 0.1
+                self.assertIn("      - Reset To None", text)
+
+    def test_shotcut_has_a_control_for_every_parameter(self):
+        for plugin in PLUGINS:
+            folder = EDITORS / "shotcut/filters" / plugin
+            for file in ("meta.qml", "ui.qml"):
+                done = subprocess.run(["qmllint", folder / file], capture_output=True)
+                self.assertEqual(done.returncode, 0, done.stderr.decode())
+            self.assertIn(f'mlt_service: "frei0r.{plugin}"', (folder / "meta.qml").read_text())
+            panel = (folder / "ui.qml").read_text()
+            count = len(parameters_of_plugin(plugin))
+            self.assertEqual(re.findall(r"id: control(\d+)", panel), [str(i) for i in range(count)], plugin)
+            for i in range(count):
+                self.assertEqual(len(re.findall(rf"onClicked: reset\('{i}'", panel)), 1)
+                self.assertRegex(panel, rf"filter.get(Double)?\('{i}'\)")
+
+    def test_a_user_installs_and_removes_them(self):
+        with tempfile.TemporaryDirectory(prefix="home of é ") as home:
+            environment = {k: v for k, v in os.environ.items() if k not in ("FREI0R_PATH", "XDG_DATA_HOME")}
+            environment.update(HOME=home, VELMORA_DIST=str(DIST))
+            own = Path(home) / ".frei0r-1/lib/own.so"
+            own.parent.mkdir(parents=True)
+            own.touch()
+            script = hosts.ROOT / "scripts/install-user"
+            for _ in range(2):  # also over itself
+                said = subprocess.run([script], env=environment, capture_output=True, check=True).stdout.decode()
+            installed = [p for p in Path(home).rglob("*velmora_*") if p.is_file()] + list(Path(home).rglob("*.qml"))
+            self.assertEqual(sorted(str(p) for p in installed), sorted(line.strip() for line in said.splitlines()))
+
+            environment.update(LD_PRELOAD=os.environ.get("PRELOAD", ""), ASAN_OPTIONS="detect_leaks=0")
+            subprocess.run(["ffmpeg", "-nostdin", "-v", "error", "-f", "lavfi", "-i", "testsrc=s=64x48", "-frames:v", "1",
+                            "-vf", "frei0r=velmora_film_pro:oldie", "-f", "null", "-"], env=environment, check=True)
+            done = subprocess.run(["melt", "-query", "filters"], env=environment, capture_output=True)
+            for plugin in PLUGINS:
+                self.assertIn(f"frei0r.{plugin}", done.stdout.decode())
+
+            environment.pop("LD_PRELOAD")
+            subprocess.run([script, "--remove"], env=environment, capture_output=True, check=True)
+            left = [p for p in Path(home).rglob("*") if p.is_file() and ".cache" not in p.parts]
+            self.assertEqual(left, [own])
+
+
+if __name__ == "__main__":
+    unittest.main()
