@@ -16,6 +16,7 @@
 
 #include "bench/bench_cases.h"
 #include "effects/effect_session.h"
+#include "plugin/frame_processor.h"
 
 namespace velmora::bench {
 namespace {
@@ -132,6 +133,26 @@ void RunCase(benchmark::State& state, const BenchCase& test, Size size, double s
     });
 }
 
+// The frame processor's conversion to 32 bits or back; the 4:2:2 frame lies in the first half of its buffer.
+void RunConversion(benchmark::State& state, bool toBgra) {
+    FramePool pool(kFullHd);
+    FrameProcessor processor;
+    RunPaired(state, pool, [&] {
+        FrameRecord source = pool.Record(pool.Source()), destination = pool.Record(pool.Destination());
+        (toBgra ? source : destination).rowStep /= 2;
+        const bool done = toBgra ? processor.ConvertYcbcrToBgra(&source, &destination, 255)
+                                 : processor.ConvertBgraToYcbcr(&source, &destination, 0);
+        if (!done) state.SkipWithError("frame refused");
+    });
+}
+
+void RegisterConversion(const char* name, bool toBgra) {
+    benchmark::RegisterBenchmark(name, [toBgra](benchmark::State& state) { RunConversion(state, toBgra); })
+        ->UseManualTime()
+        ->Unit(benchmark::kMillisecond)
+        ->MinTime(0.4);
+}
+
 // Prints one row of a Markdown table for each case.
 class MarkdownReporter : public benchmark::BenchmarkReporter {
   public:
@@ -166,6 +187,8 @@ int main(int argc, char** argv) {
     const BenchCase& everything = BenchCases()[7];
     Register("Film Pro, everything, played at 10 h", everything, kFullHd, 36000.0);
     Register("Film Pro, everything, 3840x2160", everything, kUltraHd, 1.0);
+    RegisterConversion("frame processor, 4:2:2 to 32 bits (goal 1.5)", true);
+    RegisterConversion("frame processor, 32 bits to 4:2:2 (goal 1.5)", false);
     benchmark::Initialize(&argc, argv);
     if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 2;
     MarkdownReporter reporter;

@@ -83,18 +83,18 @@ void PackRow(const std::uint8_t* bgra, std::uint8_t* rgb, std::int32_t width) no
     }
 }
 
-// Takes all rows to the scratch image before the first one is written when the frames share memory, else
-// row by row, which stays in the cache.
+render::Bgra* PixelsOf(const Region& region, std::int32_t row) noexcept {
+    return reinterpret_cast<render::Bgra*>(region.Row(row));
+}
+
+// Frames that share memory: takes all rows to the scratch image before the first one is written.
 template <typename ToScratch, typename FromScratch>
-bool ConvertThrough(render::PackedImage& scratch, std::int32_t scratchWidth, std::int32_t height,
-                    bool wholeFirst, ToScratch&& toScratch, FromScratch&& fromScratch) noexcept {
+bool ConvertThrough(render::PackedImage& scratch, std::int32_t width, std::int32_t height,
+                    ToScratch&& toScratch, FromScratch&& fromScratch) noexcept {
     constexpr std::int32_t kRgbBytes = 3;
-    const std::int32_t batch = wholeFirst ? height : 1;
-    if (!scratch.Reserve(scratchWidth, batch, kRgbBytes)) return false;
-    for (std::int32_t start = 0; start < height; start += batch) {
-        for (std::int32_t i = 0; i < batch; ++i) toScratch(start + i, scratch.Row(i));
-        for (std::int32_t i = 0; i < batch; ++i) fromScratch(start + i, scratch.Row(i));
-    }
+    if (!scratch.Reserve(width, height, kRgbBytes)) return false;
+    for (std::int32_t y = 0; y < height; ++y) toScratch(y, scratch.Row(y));
+    for (std::int32_t y = 0; y < height; ++y) fromScratch(y, scratch.Row(y));
     return true;
 }
 
@@ -133,9 +133,15 @@ bool VM_CALL FrameProcessor::ConvertYcbcrToBgra(const FrameRecord* source, const
     const Region from = RegionOf(source, kYcbcr), to = RegionOf(destination, kBgra);
     if (from.first == nullptr || to.first == nullptr) return false;
     // The source is decoded by its own width: where that is odd decides about its last pixel.
-    const std::int32_t width = std::min(from.width, to.width);
+    const std::int32_t width = std::min(from.width, to.width), height = std::min(from.height, to.height);
+    if (!Overlap(from, to)) {
+        for (std::int32_t y = 0; y < height; ++y) {
+            render::YcbcrRowToBgra(m_kernels, from.Row(y), from.width, PixelsOf(to, y), width, alpha);
+        }
+        return true;
+    }
     return ConvertThrough(
-        m_scratch, from.width, std::min(from.height, to.height), Overlap(from, to),
+        m_scratch, from.width, height,
         [&](std::int32_t row, std::uint8_t* rgb) { render::YcbcrRowToRgb(from.Row(row), rgb, from.width); },
         [&](std::int32_t row, const std::uint8_t* rgb) { SpreadRow(rgb, to.Row(row), width, alpha); });
 }
@@ -145,9 +151,13 @@ bool VM_CALL FrameProcessor::ConvertBgraToYcbcr(const FrameRecord* source, const
     const FloatGuard guard;
     const Region from = RegionOf(source, kBgra), to = RegionOf(destination, kYcbcr);
     if (from.first == nullptr || to.first == nullptr) return false;
-    const std::int32_t width = std::min(from.width, to.width);
+    const std::int32_t width = std::min(from.width, to.width), height = std::min(from.height, to.height);
+    if (!Overlap(from, to)) {
+        for (std::int32_t y = 0; y < height; ++y) m_kernels.fromBgra(PixelsOf(from, y), to.Row(y), width);
+        return true;
+    }
     return ConvertThrough(
-        m_scratch, width, std::min(from.height, to.height), Overlap(from, to),
+        m_scratch, width, height,
         [&](std::int32_t row, std::uint8_t* rgb) { PackRow(from.Row(row), rgb, width); },
         [&](std::int32_t row, const std::uint8_t* rgb) { render::RgbRowToYcbcr(rgb, to.Row(row), width); });
 }

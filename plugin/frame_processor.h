@@ -24,6 +24,7 @@ class FrameProcessor final : public IFrameProcessor {
                                     std::uint8_t unused) override;
 
   private:
+    const render::YcbcrKernels& m_kernels = render::YcbcrKernelsOf(render::BestForm());
     render::PackedImage m_scratch;  // RGB
     ReferenceCount m_references;
 };

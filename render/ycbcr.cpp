@@ -26,6 +26,32 @@ std::uint8_t Luma(const std::uint8_t* rgb, std::int32_t bias) noexcept {
     return static_cast<std::uint8_t>((16843 * rgb[0] + 33030 * rgb[1] + 6423 * rgb[2] + bias) >> 16);
 }
 
+Bgra DecodedPixel(std::int32_t y, std::int32_t cb, std::int32_t cr, std::uint8_t alpha) noexcept {
+    std::uint8_t rgb[3];
+    WriteRgb(rgb, y, cb, cr);
+    return {rgb[2], rgb[1], rgb[0], alpha};
+}
+
+void ToBgra(const std::uint8_t* source, Bgra* out, std::int32_t width, std::uint8_t alpha) noexcept {
+    for (std::int32_t x = 0; x < width; ++x) {
+        const std::uint8_t* group = source + x / 2 * std::ptrdiff_t{4};
+        out[x] = DecodedPixel(group[x % 2 * 2], group[1], group[3], alpha);
+    }
+}
+
+void FromBgra(const Bgra* in, std::uint8_t* destination, std::int32_t width) noexcept {
+    for (std::int32_t x = 0; x < width; x += 2, in += 2, destination += 4) {
+        const std::int32_t count = std::min(2, width - x);
+        std::uint8_t rgb[6];
+        for (std::int32_t i = 0; i < count; ++i) {
+            rgb[3 * i] = in[i].red;
+            rgb[3 * i + 1] = in[i].green;
+            rgb[3 * i + 2] = in[i].blue;
+        }
+        RgbRowToYcbcr(rgb, destination, count);
+    }
+}
+
 template <typename RowFunction, typename Source, typename Destination>
 ImagingStatus ConvertRows(RowFunction convert, Source* source, std::ptrdiff_t sourceStep,
                           Destination* destination, std::ptrdiff_t destinationStep, std::int32_t width,
@@ -83,6 +109,30 @@ void RgbRowToYcbcr(const std::uint8_t* rgb, std::uint8_t* destination, std::int3
         destination[1] =
             static_cast<std::uint8_t>((-9699 * rgb[0] - 19071 * rgb[1] + 28770 * rgb[2] - 0x7F8000) >> 16);
     }
+}
+
+const YcbcrKernels kPlainYcbcrKernels = {ToBgra, FromBgra};
+
+const YcbcrKernels& YcbcrKernelsOf(Form form) noexcept {
+    switch (form) {
+        case Form::kAvx512:
+            return kAvx512YcbcrKernels;
+        case Form::kAvx2:
+            return kAvx2YcbcrKernels;
+        case Form::kSse2:
+            return kSse2YcbcrKernels;
+        case Form::kPlain:
+            break;
+    }
+    return kPlainYcbcrKernels;
+}
+
+void YcbcrRowToBgra(const YcbcrKernels& kernels, const std::uint8_t* source, std::int32_t sourceWidth,
+                    Bgra* out, std::int32_t width, std::uint8_t alpha) noexcept {
+    kernels.toBgra(source, out, width, alpha);
+    if (width != sourceWidth || width % 2 == 0 || width == 1) return;
+    const std::uint8_t* group = source + (width - 1) * std::ptrdiff_t{2};
+    out[width - 1] = DecodedPixel(group[0], group[1], group[-1], alpha);
 }
 
 ImagingStatus YcbcrToRgb(const std::uint8_t* source, std::ptrdiff_t sourceStep, std::uint8_t* rgb,

@@ -9,6 +9,9 @@
 #include <cstdint>
 #include <memory>
 
+#include "render/cpu.h"
+#include "render/image.h"
+
 namespace velmora::render {
 
 enum class ImagingStatus : std::int32_t { kDone = 0, kBadSize = -6, kNullPointer = -8 };
@@ -40,6 +43,24 @@ class PackedImage {
 // (a width of 1 from its own), writing touches only its Y and Cb.
 void YcbcrRowToRgb(const std::uint8_t* source, std::uint8_t* rgb, std::int32_t width) noexcept;
 void RgbRowToYcbcr(const std::uint8_t* rgb, std::uint8_t* destination, std::int32_t width) noexcept;
+
+// The same without a detour over RGB, for `width` >= 0 pixels that all have their group: the last one of an odd
+// width takes its Cr from its own group's fourth byte, and writing touches only its Y and Cb. Input and output must
+// not overlap.
+struct YcbcrKernels {
+    void (*toBgra)(const std::uint8_t* source, Bgra* out, std::int32_t width, std::uint8_t alpha) noexcept;
+    void (*fromBgra)(const Bgra* in, std::uint8_t* destination, std::int32_t width) noexcept;
+};
+[[nodiscard]] const YcbcrKernels& YcbcrKernelsOf(Form form) noexcept;
+
+extern const YcbcrKernels kPlainYcbcrKernels;
+extern const YcbcrKernels kSse2YcbcrKernels;
+extern const YcbcrKernels kAvx2YcbcrKernels;
+extern const YcbcrKernels kAvx512YcbcrKernels;
+
+// One row from 4:2:2 of `sourceWidth` pixels to its first `width` pixels, with the lone last pixel's rule.
+void YcbcrRowToBgra(const YcbcrKernels& kernels, const std::uint8_t* source, std::int32_t sourceWidth,
+                    Bgra* out, std::int32_t width, std::uint8_t alpha) noexcept;
 
 // Whole pictures; row steps in bytes, may be negative. A null pointer or a size below 1 touches nothing.
 [[nodiscard]] ImagingStatus YcbcrToRgb(const std::uint8_t* source, std::ptrdiff_t sourceStep,

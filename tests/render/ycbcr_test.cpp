@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstring>
 #include <vector>
 
 namespace velmora::render {
@@ -68,6 +69,103 @@ TEST(Ycbcr, EncodesPairsAndALonePixel) {
                             0xEE,
                             0xEE};
     EXPECT_EQ(packed, expected);
+}
+
+// What the kernels must give: the rows by way of RGB.
+std::vector<Bgra> DecodedByRgb(const Bytes& row, std::int32_t sourceWidth, std::int32_t width) {
+    Bytes rgb(static_cast<std::size_t>(sourceWidth) * 3);
+    YcbcrRowToRgb(row.data(), rgb.data(), sourceWidth);
+    std::vector<Bgra> result;
+    for (std::size_t x = 0; x < static_cast<std::size_t>(width); ++x) {
+        result.push_back({rgb[3 * x + 2], rgb[3 * x + 1], rgb[3 * x], 77});
+    }
+    return result;
+}
+
+Bytes EncodedByRgb(const std::vector<Bgra>& row, std::size_t size) {
+    Bytes rgb, result(size, 0xEE);
+    for (const Bgra& p : row) rgb.insert(rgb.end(), {p.red, p.green, p.blue});
+    RgbRowToYcbcr(rgb.data(), result.data(), static_cast<std::int32_t>(row.size()));
+    return result;
+}
+
+bool AreEqual(const Bgra* a, const Bgra* b, std::size_t count) {
+    return std::memcmp(a, b, count * sizeof(Bgra)) == 0;
+}
+
+std::vector<Form> Forms() {
+    std::vector<Form> forms;
+    for (const Form form : {Form::kPlain, Form::kSse2, Form::kAvx2, Form::kAvx512}) {
+        if (form <= BestForm()) forms.push_back(form);
+    }
+    return forms;
+}
+
+TEST(YcbcrKernels, DecodeEveryTripleInEveryForm) {
+    constexpr std::int32_t kWidth = 512;
+    Bytes row(kWidth * 2);
+    std::vector<Bgra> result(kWidth);
+    for (int cb = 0; cb < 256; ++cb) {
+        for (int cr = 0; cr < 256; ++cr) {
+            for (std::size_t i = 0; i < row.size(); i += 4) {
+                row[i] = static_cast<std::uint8_t>(i / 4), row[i + 1] = static_cast<std::uint8_t>(cb);
+                row[i + 2] = static_cast<std::uint8_t>(i / 4 + 128),
+                        row[i + 3] = static_cast<std::uint8_t>(cr);
+            }
+            const std::vector<Bgra> expected = DecodedByRgb(row, kWidth, kWidth);
+            for (const Form form : Forms()) {
+                YcbcrKernelsOf(form).toBgra(row.data(), result.data(), kWidth, 77);
+                ASSERT_TRUE(AreEqual(result.data(), expected.data(), kWidth))
+                    << static_cast<int>(form) << ' ' << cb << ' ' << cr;
+            }
+        }
+    }
+}
+
+TEST(YcbcrKernels, EncodeEveryTripleInEveryForm) {
+    constexpr std::int32_t kWidth = 256;
+    std::vector<Bgra> row(kWidth);
+    Bytes result(kWidth * 2);
+    for (int green = 0; green < 256; ++green) {
+        for (int red = 0; red < 256; ++red) {
+            for (std::size_t x = 0; x < row.size(); ++x) {
+                // Left pixels with any blue in one half of the row, right ones in the other.
+                const auto blue = static_cast<std::uint8_t>(2 * x + x / 128 % 2 + x % 2);
+                row[x] = {blue, static_cast<std::uint8_t>(green), static_cast<std::uint8_t>(red),
+                          static_cast<std::uint8_t>(x)};
+            }
+            const Bytes expected = EncodedByRgb(row, result.size());
+            for (const Form form : Forms()) {
+                YcbcrKernelsOf(form).fromBgra(row.data(), result.data(), kWidth);
+                ASSERT_EQ(result, expected) << static_cast<int>(form) << ' ' << green << ' ' << red;
+            }
+        }
+    }
+}
+
+TEST(YcbcrKernels, AreEqualAtAllWidths) {
+    for (std::int32_t width = 0; width <= 70; ++width) {
+        const auto count = static_cast<std::size_t>(width);
+        Bytes row(144);
+        for (std::size_t i = 0; i < row.size(); ++i) row[i] = static_cast<std::uint8_t>(i * 37 + i * i);
+        std::vector<Bgra> pixels(count);
+        for (std::size_t i = 0; i < count; ++i) std::memcpy(&pixels[i], row.data() + i, sizeof(Bgra));
+        const Bytes encoded = EncodedByRgb(pixels, row.size());
+        for (const Form form : Forms()) {
+            Bytes result(row.size(), 0xEE);
+            YcbcrKernelsOf(form).fromBgra(pixels.data(), result.data(), width);
+            ASSERT_EQ(result, encoded) << static_cast<int>(form) << ' ' << width;
+            for (const std::int32_t sourceWidth : {width, width + 1}) {
+                if (width == 0) continue;
+                std::vector<Bgra> decoded(count + 1, Bgra{1, 2, 3, 4});
+                YcbcrRowToBgra(YcbcrKernelsOf(form), row.data(), sourceWidth, decoded.data(), width, 77);
+                const std::vector<Bgra> expected = DecodedByRgb(row, sourceWidth, width);
+                ASSERT_TRUE(AreEqual(decoded.data(), expected.data(), count))
+                    << static_cast<int>(form) << ' ' << width << ' ' << sourceWidth;
+                ASSERT_EQ(decoded.back().alpha, 4);
+            }
+        }
+    }
 }
 
 TEST(Ycbcr, RefusesNothingAndNoSize) {
