@@ -169,6 +169,7 @@ class MarkdownReporter : public benchmark::BenchmarkReporter {
     }
 };
 
+// The library keeps what is registered until the program ends.
 void Register(const std::string& name, const BenchCase& test, Size size, double startSeconds) {
     benchmark::RegisterBenchmark(name.c_str(), [&test, size, startSeconds](benchmark::State& state) {
         RunCase(state, test, size, startSeconds);

@@ -29,6 +29,7 @@ EffectInfo Describe(const effects::EffectTable& table) {
 const std::vector<EffectInfo>& CoreEffects() {
     static const std::vector<EffectInfo> all = [] {
         std::vector<EffectInfo> list;
+        list.reserve(effects::kAllEffects.size());
         for (const effects::EffectTable* table : effects::kAllEffects) list.push_back(Describe(*table));
         return list;
     }();

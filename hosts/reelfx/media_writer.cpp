@@ -269,7 +269,8 @@ void MediaWriter::Mux(AVPacket& packet, const AVStream& stream, AVRational timeB
 
 void MediaWriter::Finish() {
     Encode(nullptr);
-    for (auto& [index, other] : m_others) {
+    for (auto& entry : m_others) {
+        auto& other = entry.second;
         if (!other.transcoder) continue;
         const AVRational base = other.transcoder->Encoder().time_base;
         other.transcoder->Send(nullptr, [&](AVPacket& encoded) { Mux(encoded, *other.stream, base); });

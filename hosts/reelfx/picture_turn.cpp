@@ -23,7 +23,7 @@ int QuarterTurnsOf(const AVStream& stream) {
 void TurnPicture(const BgraPicture& from, int quarterTurns, BgraPicture& to) {
     const std::int32_t width = from.Width(), height = from.Height();
     if (quarterTurns % 2 != 0) {
-        to.Resize(height, width);
+        to.Resize(height, width);  // NOLINT(readability-suspicious-call-argument): on its side
     } else {
         to.Resize(width, height);
     }
