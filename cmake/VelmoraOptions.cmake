@@ -24,7 +24,9 @@ if(VELMORA_PLAIN_ROAD)
 endif()
 if(VELMORA_SANITIZE)
   target_compile_options(velmora_options INTERFACE
-    -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer)
+    -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer
+    # Beside the checks GCC 12 takes registers of its own vector intrinsics for uninitialised variables.
+    -Wno-uninitialized)
   target_link_options(velmora_options INTERFACE -fsanitize=address,undefined)
 endif()
 if(WIN32)
