@@ -143,7 +143,7 @@ void DoubleAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept {
     kSse2GlowKernels.doubleAlong(row, out, count);
 }
 
-#include "render/glow_kernels_vector.h"
+#include "render/glow_kernels_vector.inc"
 
 }  // namespace
 

@@ -132,7 +132,7 @@ void AverageBlocks(const Bgra* const rows[4], CellRow cells, std::int32_t count)
 void HalveAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept;
 void DoubleAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept;
 
-#include "render/glow_kernels_vector.h"
+#include "render/glow_kernels_vector.inc"
 
 void HalveAlong(ConstCellRow row, CellRow out, std::int32_t count) noexcept {
     for (std::int32_t i = 0; i < count; i += 2, row += 4 * kCellLanes, out += 2 * kCellLanes) {
