@@ -34,4 +34,5 @@ if(WIN32)
     UNICODE _UNICODE NOMINMAX WIN32_LEAN_AND_MEAN STRICT _WIN32_WINNT=0x0601)
   # Runtime libraries are linked in: the product depends on Windows' own modules only.
   target_link_options(velmora_options INTERFACE -static -static-libgcc -static-libstdc++)
+  target_link_options(velmora_options INTERFACE $<$<CONFIG:Release>:-s>)
 endif()

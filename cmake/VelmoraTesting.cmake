@@ -20,6 +20,20 @@ function(velmora_add_test name)
   endif()
 endfunction()
 
+# velmora_test_forms(NAME) runs a test program once more with each form of the pixel kernels, as far as the processor has
+# it, and along the reference road.
+function(velmora_test_forms name)
+  foreach(choice FORM=plain FORM=sse2 FORM=avx2 FORM=avx512 ROAD=stages)
+    string(REPLACE "=" "_" suffix ${choice})
+    string(TOLOWER ${suffix} suffix)
+    add_test(NAME ${name}_${suffix} COMMAND ${name})
+    set_tests_properties(${name}_${suffix} PROPERTIES TIMEOUT 600 ENVIRONMENT VELMORA_${choice})
+    if(WIN32)
+      set_tests_properties(${name}_${suffix} PROPERTIES RESOURCE_LOCK screen)
+    endif()
+  endforeach()
+endfunction()
+
 # velmora_check_module(TARGET EXPORT...) checks that a Windows module exports exactly the given names and needs nothing
 # but Windows' own modules.
 function(velmora_check_module target)

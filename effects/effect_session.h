@@ -9,6 +9,7 @@
 #include "effects/effect_table.h"
 #include "plugin/host_api.h"
 #include "plugin/master_settings.h"
+#include "plugin/render_options.h"
 #include "render/render_state.h"
 
 namespace velmora::effects {
@@ -52,6 +53,7 @@ class EffectSession {
     std::array<ValueWord, kPresetCellCapacity> m_values{};  // by parameter
     MasterSettingsList m_settings;
     render::RenderState m_state;
+    render::RenderOptions m_options = ReadRenderOptions();
     bool m_isPinned = true;
     std::uint32_t m_seed = 0;
 };

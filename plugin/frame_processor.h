@@ -3,6 +3,7 @@
 
 #include "plugin/com_object.h"
 #include "plugin/host_api.h"
+#include "plugin/render_options.h"
 #include "render/ycbcr.h"
 
 namespace velmora {
@@ -24,7 +25,7 @@ class FrameProcessor final : public IFrameProcessor {
                                     std::uint8_t unused) override;
 
   private:
-    const render::YcbcrKernels& m_kernels = render::YcbcrKernelsOf(render::BestForm());
+    const render::YcbcrKernels& m_kernels = render::YcbcrKernelsOf(ReadRenderOptions().form);
     render::PackedImage m_scratch;  // RGB
     ReferenceCount m_references;
 };

@@ -4,6 +4,7 @@
 #include <memory>
 #include <new>
 
+#include "plugin/render_options.h"
 #include "support/platform.h"
 
 namespace velmora {
@@ -22,6 +23,7 @@ KeptList* g_currentList = nullptr;
 struct SeededState : render::RenderState {
     SeededState() noexcept { random.Seed(support::TickCount()); }
 } g_state;
+const render::RenderOptions g_options = ReadRenderOptions();
 
 }  // namespace
 
@@ -55,7 +57,7 @@ MasterSettingsList* CurrentMasterSettings() noexcept {
 }
 
 RenderSession ProcessSession() noexcept {
-    return {CurrentMasterSettings(), &g_state};
+    return {CurrentMasterSettings(), &g_state, g_options};
 }
 
 }  // namespace velmora

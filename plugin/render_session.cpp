@@ -21,7 +21,7 @@ bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameReco
     session.state->random.BeginFrame(context.FrameNumber());
     if (!context.IsValid(render::Slot::kSource) || !context.IsValid(render::Slot::kDestination)) return false;
     session.settings->ReadFromHost(face);
-    render::RenderStages(context, ReadStageSettings(*session.settings), *session.state);
+    render::RenderStages(context, ReadStageSettings(*session.settings), *session.state, session.options);
     context.Finish();
     return true;
 }

@@ -6,12 +6,14 @@
 #include "plugin/host_api.h"
 #include "plugin/master_settings.h"
 #include "render/render_state.h"
+#include "render/renderer.h"
 
 namespace velmora {
 
 struct RenderSession {
     MasterSettingsList* settings = nullptr;  // not owned
     render::RenderState* state = nullptr;    // not owned
+    render::RenderOptions options;
 };
 
 // Renders one frame: builds the views, moves the random state on, reads every exposed setting through

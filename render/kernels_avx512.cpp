@@ -29,23 +29,27 @@ VM_AVX512 inline void ForEachSixteen(const Bgra* in, Bgra* out, std::int32_t wid
     _mm512_mask_storeu_epi32(out + x, tail, step(pixels, x, tail));
 }
 
-// R(a room) of one channel, as a byte at the channel's place of each pixel of `result`.
+// R(a room) of one channel, as a byte at the channel's place of each pixel.
 //
 // 2^23 and the room make a float whose last byte is the room: fused, the product with a less a 2^23 is rounded
 // once, as the product with the room would be. Then a half is added. In 2^22 and such a sum, rounded down, the
 // last bit stands for a half, so that the byte above it is the number wanted.
 template <int kChannel>
-VM_AVX512 inline __m512i Lightened(__m512i result, __m512i room, __m512 fraction, __m512 lifted) noexcept {
-    constexpr __mmask64 kFirst = 0x1111111111111111u, kThis = kFirst << kChannel;
+VM_AVX512 inline __m512i Lightened(__m512i room, __m512 fraction, __m512 lifted) noexcept {
+    constexpr __mmask64 kFirst = 0x1111111111111111u;
     const __m512i first = _mm512_set_epi32(12, 8, 4, 0, 12, 8, 4, 0, 12, 8, 4, 0, 12, 8, 4, 0);
     const __m512i from = _mm512_add_epi8(first, _mm512_set1_epi8(kChannel));
     const __m512i number = _mm512_mask_shuffle_epi8(_mm512_set1_epi32(0x4B000000), kFirst, room, from);
     const __m512 product = _mm512_fmsub_ps(fraction, _mm512_castsi512_ps(number), lifted);
     const __m512 sum =
         _mm512_add_round_ps(product, _mm512_set1_ps(4194304.5f), _MM_FROUND_TO_NEG_INF | _MM_FROUND_NO_EXC);
-    // Bits 1 to 8 of either half of 64 bits, at the channel's byte.
-    const __m512i bits = _mm512_set1_epi64(0x2121212101010101);
-    return _mm512_mask_multishift_epi64_epi8(result, kThis, bits, _mm512_castps_si512(sum));
+    // Of either half of 64 bits: bits 1 to 8 at the channel's byte, at the others some of the bits above, which are 0.
+    constexpr std::uint64_t kZeroBits = 0x2929292909090909u,
+                            kChannelByte = std::uint64_t{0xFF} << 8 * kChannel;
+    constexpr std::uint64_t kPlaces = kChannelByte | kChannelByte << 32;
+    const __m512i bits = _mm512_set1_epi64(
+        static_cast<std::int64_t>((kZeroBits & ~kPlaces) | (0x2121212101010101u & kPlaces)));
+    return _mm512_multishift_epi64_epi8(bits, _mm512_castps_si512(sum));
 }
 
 struct WearStep {
@@ -55,9 +59,10 @@ struct WearStep {
         const __m512 fraction = _mm512_maskz_loadu_ps(mask, fractions + x);
         const __m512 lifted = _mm512_mul_ps(fraction, _mm512_set1_ps(8388608.0f));
         const __m512i room = _mm512_andnot_si512(pixels, channels);
-        __m512i result = Lightened<0>(_mm512_setzero_si512(), room, fraction, lifted);
-        result = Lightened<1>(result, room, fraction, lifted);
-        result = Lightened<2>(result, room, fraction, lifted);
+        const __m512i blue = Lightened<0>(room, fraction, lifted),
+                      green = Lightened<1>(room, fraction, lifted);
+        const __m512i result =
+            _mm512_or_si512(_mm512_or_si512(blue, green), Lightened<2>(room, fraction, lifted));
         return _mm512_add_epi8(pixels, result);
     }
 };

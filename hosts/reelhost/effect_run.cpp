@@ -48,8 +48,12 @@ void EffectRun::Render(FrameSize size, const std::vector<std::uint8_t>& source,
     void* const sourcePixels = const_cast<std::uint8_t*>(source.data());
     const FrameRecord from = {sourcePixels, size.width, size.height, size.width * 4, 0, 0, 0};
     const FrameRecord to = {result.data(), size.width, size.height, size.width * 4, 0, 0, 0};
+    Render(from, to, seconds);
+}
+
+void EffectRun::Render(const FrameRecord& source, const FrameRecord& result, double seconds) {
     const TimingRecord timing = {0.0, 0.0, seconds};
-    if (!m_effect->Process(&m_host, &from, nullptr, &to, &timing)) {
+    if (!m_effect->Process(&m_host, &source, nullptr, &result, &timing)) {
         throw std::runtime_error("the effect does not render this frame");
     }
 }

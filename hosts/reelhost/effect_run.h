@@ -39,10 +39,13 @@ class EffectRun {
 
     void ApplyPreset(std::uint32_t preset);
     void Set(const Setting& setting) { m_host.SetValue(setting.parameter, setting.value); }
+    [[nodiscard]] const EffectInfo& Info() const { return m_info; }
 
     // Both are size.width * size.height * 4 bytes. Throws std::runtime_error when the effect refuses.
     void Render(FrameSize size, const std::vector<std::uint8_t>& source, std::vector<std::uint8_t>& result,
                 double seconds);
+    // The same with frame records of the caller's.
+    void Render(const FrameRecord& source, const FrameRecord& result, double seconds);
 
   private:
     const EffectInfo& m_info;

@@ -13,12 +13,14 @@ const char* const kHostHelp =
     "           [--frames N] [--hash] [--dll PATH]\n"
     "  reelhost --all-presets NAME|all --size WxH [--rate FPS] [--frames N]\n"
     "  reelhost --list\n"
+    "  reelhost --bench [--dll PATH]\n"
     "\n"
     "  --size         frames are raw BGRA of this size; without it they are YUV4MPEG2\n"
     "  --rate         frames per second (default 30, or the YUV4MPEG2 header's)\n"
     "  --frames       read no more than N frames\n"
     "  --hash         print the MD5 of each frame's BGRA instead of writing frames\n"
     "  --all-presets  hash the frames for every preset of an effect, or of all\n"
+    "  --bench        measure the effects on 1920x1080 frames, beside memcpy\n"
     "  --dll          the library (default: beside this program)\n"
     "\n"
     "The state of the library's random sequence at the first frame goes to standard error, with "
@@ -65,6 +67,8 @@ HostOptions ReadHostOptions(int count, char** arguments) {
             options.mode = HostMode::kHelp;
         } else if (name == "--list") {
             options.mode = HostMode::kList;
+        } else if (name == "--bench") {
+            options.mode = HostMode::kBench;
         } else if (name == "--all-presets") {
             options.mode = HostMode::kAllPresets;
             options.effect = reader.Value();

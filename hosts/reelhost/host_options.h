@@ -10,7 +10,7 @@
 
 namespace velmora::hosts {
 
-enum class HostMode { kRender, kList, kAllPresets, kHelp };
+enum class HostMode { kRender, kList, kAllPresets, kBench, kHelp };
 
 struct HostOptions {
     HostMode mode = HostMode::kRender;

@@ -5,6 +5,7 @@
 
 #include "hosts/common/digest.h"
 #include "hosts/common/usage_error.h"
+#include "hosts/reelhost/bench.h"
 #include "hosts/reelhost/effect_library.h"
 #include "hosts/reelhost/effect_run.h"
 #include "hosts/reelhost/frame_stream.h"
@@ -100,6 +101,9 @@ void Run(const HostOptions& options) {
     }
     const EffectLibrary library(options.dll);
     switch (options.mode) {
+        case HostMode::kBench:
+            PrintBench(library);
+            break;
         case HostMode::kList:
             List(library);
             break;
