@@ -37,10 +37,10 @@ bool IsKnownReference(std::string_view name) {
 }
 
 bool HasOnlyKnownReferences(std::string_view text) {
-    for (std::size_t at = text.find('&'); at != text.npos; at = text.find('&', at + 1)) {
+    for (std::size_t at = text.find('&'); at != std::string_view::npos; at = text.find('&', at + 1)) {
         // The longest is "#1114111" with some leading zeros; a bound keeps a file full of '&' quick.
         const std::size_t length = text.substr(at + 1, 16).find(';');
-        if (length == text.npos || !IsKnownReference(text.substr(at + 1, length))) return false;
+        if (length == std::string_view::npos || !IsKnownReference(text.substr(at + 1, length))) return false;
     }
     return true;
 }
@@ -64,13 +64,13 @@ class Scanner {
     bool PassText() {
         const std::string_view text = m_rest.substr(0, m_rest.find('<'));
         m_rest.remove_prefix(text.size());
-        if (m_depth == 0) return text.find_first_not_of(kWhiteSpace) == text.npos;
+        if (m_depth == 0) return text.find_first_not_of(kWhiteSpace) == std::string_view::npos;
         return HasOnlyKnownReferences(text);
     }
 
     bool PassComment() {
         const std::size_t end = m_rest.find(kCommentEnd, kCommentStart.size());
-        if (end == m_rest.npos) return false;
+        if (end == std::string_view::npos) return false;
         m_rest.remove_prefix(end + kCommentEnd.size());
         return true;
     }
@@ -84,17 +84,17 @@ class Scanner {
     // attribute values, no reading of the quotes can disagree about where a tag ends.
     std::string_view TakeTag() {
         const std::size_t end = m_rest.find_first_of("<>", 1);
-        if (end == m_rest.npos || m_rest[end] == '<') return {};
+        if (end == std::string_view::npos || m_rest[end] == '<') return {};
         const std::string_view tag = m_rest.substr(1, end - 1);
         m_rest.remove_prefix(end + 1);
         return HasClosedQuotes(tag) && HasOnlyKnownReferences(tag) ? tag : std::string_view();
     }
 
     static bool HasClosedQuotes(std::string_view tag) {
-        for (std::size_t at = tag.find_first_of("\"'"); at != tag.npos;
+        for (std::size_t at = tag.find_first_of("\"'"); at != std::string_view::npos;
              at = tag.find_first_of("\"'", at + 1)) {
             at = tag.find(tag[at], at + 1);
-            if (at == tag.npos) return false;
+            if (at == std::string_view::npos) return false;
         }
         return true;
     }

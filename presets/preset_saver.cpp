@@ -53,7 +53,7 @@ bool AskForFile(const Flow& flow, void* owner, IEffectLibrary* library, std::uin
 
 void CopyName(char (&field)[kPresetNameWidth], const char* name) {
     const std::size_t length = name != nullptr ? std::min(std::strlen(name), sizeof field - 1) : 0;
-    std::memcpy(field, name, length);
+    if (length != 0) std::memcpy(field, name, length);
     std::memset(field + length, 0, sizeof field - length);
 }
 

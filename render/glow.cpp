@@ -30,7 +30,7 @@ constexpr std::int32_t Reduced(std::int32_t size, int reduction) noexcept {
 void ContinueEnds(CellRow row, std::int32_t width) noexcept {
     for (std::int32_t i = 1; i <= kCellPad; ++i) {
         std::copy_n(row, kCellLanes, row - i * kCellLanes);
-        const CellRow last = row + (width - 1) * std::ptrdiff_t{kCellLanes};
+        CellRow last = row + (width - 1) * std::ptrdiff_t{kCellLanes};
         std::copy_n(last, kCellLanes, last + i * kCellLanes);
     }
 }
@@ -57,8 +57,8 @@ class VeilMaker {
     void ReadRow(int reduction, std::int32_t y, CellRow out) noexcept;
     void ReadBlocks(std::int32_t y, CellRow out) noexcept;
     void ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept;
-    void BlurAlong(CellRow row, CellRow out, std::int32_t width, const GlowTaps& taps) noexcept;
-    void BlurAcross(const CellPlane& from, const CellPlane& to, const GlowTaps& taps) noexcept;
+    void BlurAlong(CellRow row, CellRow out, std::int32_t width, const GlowTaps& taps) const noexcept;
+    void BlurAcross(const CellPlane& from, const CellPlane& to, const GlowTaps& taps) const noexcept;
     void Blur(int level, const GlowTaps& taps) noexcept;
     void Halve(int level) noexcept;
     void AddDoubled(int level, double ownShare, double otherShare) noexcept;
@@ -166,7 +166,7 @@ void VeilMaker::ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept 
     }
 }
 
-void VeilMaker::BlurAlong(CellRow row, CellRow out, std::int32_t width, const GlowTaps& taps) noexcept {
+void VeilMaker::BlurAlong(CellRow row, CellRow out, std::int32_t width, const GlowTaps& taps) const noexcept {
     ContinueEnds(row, width);
     ConstCellRow before[GlowTaps::kMostPairs], after[GlowTaps::kMostPairs];
     for (int i = 0; i < taps.pairs; ++i) {
@@ -176,7 +176,7 @@ void VeilMaker::BlurAlong(CellRow row, CellRow out, std::int32_t width, const Gl
     m_kernels.filter(row, before, after, out, width, taps);
 }
 
-void VeilMaker::BlurAcross(const CellPlane& from, const CellPlane& to, const GlowTaps& taps) noexcept {
+void VeilMaker::BlurAcross(const CellPlane& from, const CellPlane& to, const GlowTaps& taps) const noexcept {
     for (std::int32_t y = 0; y < to.height; ++y) {
         ConstCellRow before[GlowTaps::kMostPairs], after[GlowTaps::kMostPairs];
         for (int i = 0; i < taps.pairs; ++i) {
@@ -198,7 +198,7 @@ void VeilMaker::Blur(int level, const GlowTaps& taps) noexcept {
 // Makes the next level from this one.
 void VeilMaker::Halve(int level) noexcept {
     const CellPlane &from = m_levels[level], &to = m_levels[level + 1];
-    const CellRow narrowed = m_rows.Row(0);
+    CellRow narrowed = m_rows.Row(0);
     for (std::int32_t y = 0; y < to.height; ++y) {
         const ConstCellRow rows[4] = {from.Row(2 * y - 1), from.Row(2 * y), from.Row(2 * y + 1),
                                       from.Row(2 * y + 2)};

@@ -46,6 +46,7 @@ VMUnicodeString::VMUnicodeString(const VMUnicodeString& other) noexcept {
     Assign(other);
 }
 
+// NOLINTNEXTLINE(bugprone-unhandled-self-assignment): the copy is made before the old text goes
 VMUnicodeString& VMUnicodeString::operator=(const VMUnicodeString& other) noexcept {
     Assign(other);
     return *this;
@@ -63,6 +64,7 @@ void VMUnicodeString::Assign(const VMUnicodeString& other) noexcept {
     Assign(other.m_data, other.m_length);
 }
 
+// NOLINTNEXTLINE(performance-unnecessary-value-param): by value, as a string may be appended to itself
 void VMUnicodeString::Append(VMUnicodeString other) noexcept {
     if (!other.IsNotEmpty() || other.m_length >= kMeasureText - m_length) return;
     const std::uint32_t length = m_length + other.m_length;
@@ -91,6 +93,7 @@ VMString::VMString(const VMString& other) noexcept {
     Assign(other.m_data, other.m_length);
 }
 
+// NOLINTNEXTLINE(bugprone-unhandled-self-assignment): the copy is made before the old text goes
 VMString& VMString::operator=(const VMString& other) noexcept {
     Assign(other.m_data, other.m_length);
     return *this;

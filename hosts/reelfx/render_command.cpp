@@ -66,7 +66,7 @@ class RenderRun {
             auto worker = std::make_shared<FrameWorker>(
                 m_choice.NewSession(), m_writer ? &*m_writer : nullptr, FrameSize{first.width, first.height},
                 QuarterTurnsOf(m_reader.Picture()), m_options.withDigests);
-            workers.push_back([worker](PipelineItem& item) { worker->Work(item); });
+            workers.emplace_back([worker](PipelineItem& item) { worker->Work(item); });
         }
         return workers;
     }
