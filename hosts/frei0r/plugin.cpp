@@ -86,12 +86,12 @@ void f0r_destruct(f0r_instance_t instance) {
     delete static_cast<Instance*>(instance);
 }
 
-void f0r_set_param_value(f0r_instance_t instance, f0r_param_t value, int index) {
-    Guarded([&] { static_cast<Instance*>(instance)->Set(index, value); });
+void f0r_set_param_value(f0r_instance_t instance, f0r_param_t param, int index) {
+    Guarded([&] { static_cast<Instance*>(instance)->Set(index, param); });
 }
 
-void f0r_get_param_value(f0r_instance_t instance, f0r_param_t value, int index) {
-    Guarded([&] { static_cast<Instance*>(instance)->Get(index, value); });
+void f0r_get_param_value(f0r_instance_t instance, f0r_param_t param, int index) {
+    Guarded([&] { static_cast<Instance*>(instance)->Get(index, param); });
 }
 
 void f0r_update(f0r_instance_t instance, double time, const uint32_t* in, uint32_t* out) {

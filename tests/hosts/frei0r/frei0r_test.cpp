@@ -211,6 +211,7 @@ TEST(Frei0rInstance, BearsSeveralThreadsAtOnce) {
     const Pixels expected = host.Update(0.5, in);
     std::atomic<int> wrong = 0;
     std::vector<std::thread> threads;
+    threads.reserve(4);
     for (int t = 0; t < 4; ++t) {
         threads.emplace_back([&] {
             for (int n = 0; n < 20; ++n) {
@@ -228,9 +229,9 @@ TEST(Frei0rTimeUnit, FollowsTheCallingModule) {
         TimeUnit unit;
     } rows[] = {
         {"/usr/lib/x86_64-linux-gnu/libavfilter.so.8", TimeUnit::kMilliseconds},
-        {"C:\\Program Files\\Player\\avfilter-9.dll", TimeUnit::kMilliseconds},
+        {R"(C:\Program Files\Player\avfilter-9.dll)", TimeUnit::kMilliseconds},
         {"/opt/static/ffmpeg", TimeUnit::kMilliseconds},
-        {"C:\\Tools\\FFmpeg.exe", TimeUnit::kMilliseconds},
+        {R"(C:\Tools\FFmpeg.exe)", TimeUnit::kMilliseconds},
         {"/usr/lib/x86_64-linux-gnu/mlt-7/libmltfrei0r.so", TimeUnit::kSeconds},
         {"/usr/lib/x86_64-linux-gnu/gstreamer-1.0/libgstfrei0r.so", TimeUnit::kSeconds},
         {"/opt/ffmpeg/bin/editor", TimeUnit::kUnknown},
