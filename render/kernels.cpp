@@ -37,15 +37,14 @@ void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) no
     ToneInPasses(TablesRow, MixRow, in, out, width, tone);
 }
 
-void LineUp(const float* const* strips, std::int32_t count, std::int32_t width, float* out) noexcept {
-    for (std::int32_t i = 0; i < count; ++i, out += width) {
-        std::memcpy(out, strips[i], sizeof(float) * kWidestWear);
-    }
+void WearStrips(const Bgra* in, Bgra* out, std::int32_t width, const float* const* strips,
+                std::int32_t stripWidth, std::uint32_t channels) noexcept {
+    WearLinedUp(WearRow, in, out, width, strips, stripWidth, channels);
 }
 
 }  // namespace
 
-const RowKernels kPlainKernels = {ToneRow, WearRow, CopyRow, CopyRow, NothingToEnd, LineUp};
+const RowKernels kPlainKernels = {ToneRow, WearRow, CopyRow, CopyRow, NothingToEnd, WearStrips};
 
 void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept {
     blue = b;

@@ -7,6 +7,7 @@
 
 #include <array>
 #include <cstdint>
+#include <cstring>
 #include <limits>
 
 #include "render/colour.h"
@@ -44,6 +45,8 @@ struct Tone {
     [[nodiscard]] bool IsActive() const noexcept { return before != nullptr || mixes || after != nullptr; }
 };
 
+inline constexpr std::int32_t kMostStrips = 40;
+
 struct RowKernels {
     // All steps of a tone.
     void (*tone)(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
@@ -57,9 +60,10 @@ struct RowKernels {
     // `out`. After the last row of a frame `endStream` makes the rows seen by other threads.
     void (*stream)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
     void (*endStream)() noexcept;
-    // Lays strips of fractions, `width` each, one behind the other. From each strip kWidestWear numbers are read, and
-    // `out` has room for as many from the last strip's start on.
-    void (*lineUp)(const float* const* strips, std::int32_t count, std::int32_t width, float* out) noexcept;
+    // The same with the fractions in strips of `stripWidth` (16..kWidestWear) numbers, from the left, at most
+    // kMostStrips; from each of them kWidestWear numbers may be read, whatever lies behind its own.
+    void (*wearStrips)(const Bgra* in, Bgra* out, std::int32_t width, const float* const* strips,
+                       std::int32_t stripWidth, std::uint32_t channels) noexcept;
 };
 
 // `form` must be one that the processor can run.
@@ -78,6 +82,18 @@ void ToneInPasses(Tables&& tables, Mix&& mix, const Bgra* in, Bgra* out, std::in
         in = out;
     }
     if (tone.after != nullptr) tables(in, out, width, *tone.after);
+}
+
+// Wear's strips are narrow: their fractions are lined up first, then a kernel runs over all of them.
+template <typename Wear>
+void WearLinedUp(Wear&& wear, const Bgra* in, Bgra* out, std::int32_t width, const float* const* strips,
+                 std::int32_t stripWidth, std::uint32_t channels) noexcept {
+    std::array<float, kMostStrips * kWidestWear + kWidestWear> fractions;
+    for (std::int32_t x = 0; x < width; x += stripWidth) {
+        // A fixed size is copied at once; the next strip covers what is too much.
+        std::memcpy(fractions.data() + x, *strips++, sizeof(float) * kWidestWear);
+    }
+    wear(in, out, width, fractions.data(), channels);
 }
 
 // The forms, each in its own file.

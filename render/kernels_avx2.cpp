@@ -96,14 +96,13 @@ void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) no
     ToneInPasses(TablesRowByWords, MixRow, in, out, width, tone);
 }
 
-VM_AVX2 void LineUp(const float* const* strips, std::int32_t count, std::int32_t width, float* out) noexcept {
-    for (std::int32_t i = 0; i < count; ++i, out += width) {
-        std::memcpy(out, strips[i], sizeof(float) * kWidestWear);
-    }
+void WearStrips(const Bgra* in, Bgra* out, std::int32_t width, const float* const* strips,
+                std::int32_t stripWidth, std::uint32_t channels) noexcept {
+    WearLinedUp(WearRow, in, out, width, strips, stripWidth, channels);
 }
 
 }  // namespace
 
-const RowKernels kAvx2Kernels = {ToneRow, WearRow, CopyRow, StreamRow, EndStream, LineUp};
+const RowKernels kAvx2Kernels = {ToneRow, WearRow, CopyRow, StreamRow, EndStream, WearStrips};
 
 }  // namespace velmora::render

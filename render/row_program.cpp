@@ -114,22 +114,19 @@ void RowProgram::RunTone(const Bgra* in, Bgra* out, std::int32_t width) const no
 }
 
 void RowProgram::Wear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
-    // The strips are narrow, so their fractions are lined up first and the kernel runs over all of them.
-    constexpr std::int32_t kBatch = 40;
-    std::array<const float*, kBatch> strips;
-    std::array<float, kBatch * kWidestWear + kWidestWear> fractions;
+    std::array<const float*, kMostStrips> strips;
     const std::uint32_t channels = m_plan.wear.BlueOnly() ? kBlueChannel : kColourChannels;
     const std::int32_t stripWidth = m_plan.wear.Picture().width;
-    std::int32_t start = 0, filled = 0;
+    std::int32_t start = 0;
+    std::size_t count = 0;
     const auto flush = [&](std::int32_t end) {
-        m_kernels.lineUp(strips.data(), filled, stripWidth, fractions.data());
-        m_kernels.wear(in + start, out + start, end - start, fractions.data(), channels);
+        m_kernels.wearStrips(in + start, out + start, end - start, strips.data(), stripWidth, channels);
         start = end;
-        filled = 0;
+        count = 0;
     };
-    m_plan.wear.ForEachStrip(width, y, [&](std::int32_t x, std::int32_t count, std::int32_t wearRow) {
-        strips[static_cast<std::size_t>(filled++)] = m_plan.wearFractions->From(wearRow);
-        if (filled == kBatch) flush(x + count);
+    m_plan.wear.ForEachStrip(width, y, [&](std::int32_t x, std::int32_t columns, std::int32_t wearRow) {
+        strips[count++] = m_plan.wearFractions->From(wearRow);
+        if (count == strips.size()) flush(x + columns);
     });
     if (start != width) flush(width);
 }

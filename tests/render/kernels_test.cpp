@@ -93,6 +93,22 @@ TEST(RowKernels, WearIsEqualInAllForms) {
     }
 }
 
+TEST(RowKernels, WearInStripsIsEqualInAllForms) {
+    std::mt19937 numbers(5);
+    std::vector<float> fractions(kWidest + 2 * kWidestWear);
+    for (float& f : fractions) f = static_cast<float>(numbers() % 1000) / 999.0f;
+    for (const std::int32_t stripWidth : {16, 25, 50, 64}) {
+        std::vector<const float*> strips;
+        for (std::int32_t x = 0; x < kWidest; x += stripWidth)
+            strips.push_back(fractions.data() + numbers() % kWidest);
+        ExpectEqualForms(
+            [&](const RowKernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
+                kernels.wearStrips(in, out, width, strips.data(), stripWidth, kColourChannels);
+            },
+            true);
+    }
+}
+
 TEST(RowKernels, CopiesAreEqualInAllForms) {
     ExpectEqualForms([](const RowKernels& kernels, const Bgra* in, Bgra* out,
                         std::int32_t width) { kernels.copy(in, out, width); },

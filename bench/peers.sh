@@ -1,0 +1,104 @@
+#!/bin/bash
+# Other programs at the same work on frames of the same size, in one run with ours; prints a Markdown table.
+#
+#   bench/peers.sh [FRAMES]          default 120 frames each
+#   VELMORA_BENCH=path/frames_bench  default: build/native/bench/frames_bench
+#
+# A peer's time is the processor time of a run with its filter less that of the same run without. Its source is one
+# picture that lies in the caches, which no frame of ours does. Installs the peers where they are missing.
+set -euo pipefail
+source "$(dirname "$0")/../scripts/common.sh"
+
+frames=${1:-120}
+bench=${VELMORA_BENCH:-$velmoraRoot/build/native/bench/frames_bench}
+size=1920x1080
+packages=(ffmpeg melt frei0r-plugins gstreamer1.0-tools gstreamer1.0-plugins-base gstreamer1.0-plugins-good)
+
+[ -x "$bench" ] || die "build frames_bench first: cmake --build --preset native --target frames_bench"
+dpkg -s "${packages[@]}" > /dev/null 2>&1 ||
+    as_root apt-get -q install -y --no-install-recommends "${packages[@]}" > /dev/null
+
+work=$(mktemp -d)
+trap 'rm -rf "$work"' EXIT
+
+# Seconds of processor time that a command takes: the least of three runs.
+seconds() {
+    local TIMEFORMAT='%U %S' i
+    for i in 1 2 3; do
+        { time "$@" > "$work/out" 2> "$work/errors"; } 2>> "$work/times" || { cat "$work/errors" >&2; die "failed: $*"; }
+    done
+    awk '{ t = $1 + $2; if (NR == 1 || t < least) least = t } END { print least }' "$work/times"
+    rm "$work/times"
+}
+
+run_ffmpeg() {
+    seconds ffmpeg -v error -nostdin -threads 1 -filter_threads 1 -filter_complex_threads 1 -f lavfi \
+        -i "testsrc2=s=$size:r=30,format=$1,trim=end_frame=1,loop=loop=-1:size=1" -vf "$2" -frames:v "$frames" -f null -
+}
+run_melt() {
+    local filters=() name
+    for name in "$@"; do filters+=(-filter "$name"); done
+    # A consumer that asks for the pictures, which its null one does not.
+    seconds melt -silent -profile atsc_1080p_30 "color:gray" "out=$((frames - 1))" "${filters[@]}" -consumer \
+        avformat:/dev/null f=rawvideo vcodec=rawvideo pix_fmt=yuyv422 an=1 real_time=0 terminate_on_pause=1
+}
+run_gstreamer() {
+    seconds gst-launch-1.0 -q videotestsrc "num-buffers=$frames" pattern=white ! \
+        "video/x-raw,format=BGRx,width=${size%x*},height=${size#*x}" ! "$@" ! fakesink
+}
+
+# "case|peer|milliseconds a frame" for a run and the one without the filter.
+peer() {
+    awk -v with="$3" -v without="$4" -v frames="$frames" -v case="$1" -v name="$2" \
+        'BEGIN { printf "%s|%s|%.3f\n", case, name, 1000 * (with - without) / frames }' < /dev/null >> "$work/peers"
+}
+
+declare -A emptyFfmpeg
+ffmpeg_peer() {  # case, name, filter, pixel format
+    local format=${4:-bgra}
+    [ -n "${emptyFfmpeg[$format]:-}" ] || emptyFfmpeg[$format]=$(run_ffmpeg "$format" null)
+    peer "$1" "$2" "$(run_ffmpeg "$format" "$3")" "${emptyFfmpeg[$format]}"
+}
+melt_peer() {  # case, filters
+    local case=$1
+    shift
+    peer "$case" "MLT $*" "$(run_melt "$@")" "$emptyMelt"
+}
+
+emptyMelt=$(run_melt)
+emptyGstreamer=$(run_gstreamer identity)
+
+ffmpeg_peer "Film Camera, jitter only" "FFmpeg crop, pad" "crop=1910:1070:x='mod(n,10)':y='mod(n,10)',pad=1920:1080"
+tables="Film Look, tables only"
+ffmpeg_peer "$tables" "frei0r brightness" "frei0r=brightness:0.6"
+ffmpeg_peer "$tables" "frei0r gamma" "frei0r=gamma:0.6"
+ffmpeg_peer "$tables" "FFmpeg lutrgb" "lutrgb=r=val*0.9:g=val*0.9:b=val*0.9"
+ffmpeg_peer "$tables" "FFmpeg curves" "curves=vintage"
+mix="Film Look, with saturation"
+ffmpeg_peer "$mix" "frei0r saturat0r" "frei0r=saturat0r:0.3"
+ffmpeg_peer "$mix" "frei0r tint0r" "frei0r=tint0r:0x000000|0xFFC080|0.5"
+ffmpeg_peer "$mix" "FFmpeg colorchannelmixer" "colorchannelmixer=.393:.769:.189:0:.349:.686:.168:0:.272:.534:.131"
+glow="Film Look, with diffusion"
+ffmpeg_peer "$glow" "frei0r glow" "frei0r=glow:0.3"
+ffmpeg_peer "$glow" "frei0r softglow" "frei0r=softglow:0.3|0.5|0.5|0"
+ffmpeg_peer "$glow" "FFmpeg gblur, screen" "split[a][b];[b]gblur=20[c];[a][c]blend=all_mode=screen" gbrp
+damage="Film Damage, wear, 25 spots, 16 scratches"
+melt_peer "$damage" oldfilm dust lines grain
+peer "$damage" "GStreamer agingtv" "$(run_gstreamer agingtv)" "$emptyGstreamer"
+everything="Film Pro, everything but diffusion"
+ffmpeg_peer "$everything" "FFmpeg curves, eq, noise, vignette" "curves=vintage,eq=contrast=1.1,noise=alls=20:allf=t,vignette"
+melt_peer "$everything" oldfilm dust lines grain tcolor vignette
+
+"$bench" 2> /dev/null > "$work/ours"
+awk -F'|' '
+    FILENAME ~ /ours$/ { name = $2; sub(/^ /, "", name); sub(/ \(goal.*$/, "", name); sub(/ $/, "", name); ms[name] = $3; next }
+    { if (!($1 in best) || $3 < best[$1]) { best[$1] = $3; who[$1] = $2 }; rows[NR] = $0; count = NR }
+    END {
+        print "| work | peer | peer, ms | ours, ms | ours ÷ peer |\n|---|---|---|---|---|"
+        for (i = 1; i <= NR; ++i) if (i in rows) {
+            split(rows[i], r, "|")
+            mark = who[r[1]] == r[2] ? "**" : ""
+            printf "| %s | %s | %.2f | %.2f | %s%.2f%s |\n", r[1], r[2], r[3], ms[r[1]], mark, ms[r[1]] / r[3], mark
+        }
+        print "\nBold: the best peer of each work."
+    }' "$work/ours" "$work/peers"
