@@ -5,6 +5,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <type_traits>
 
 #include "render/kernels.h"
 
@@ -21,13 +22,17 @@ std::uint32_t LookUp(std::uint32_t pixel, const ChannelTables& t) noexcept {
 void TablesRowByWords(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept {
     std::int32_t x = 0;
     for (; x + 4 <= width; x += 4) {
-        std::uint64_t pair[2];
-        std::memcpy(pair, in + x, sizeof pair);
-        for (std::uint64_t& two : pair) {
-            const auto low = static_cast<std::uint32_t>(two), high = static_cast<std::uint32_t>(two >> 32);
-            two = LookUp(low, tables) | std::uint64_t{LookUp(high, tables)} << 32;
+        // Two pixels a load where words are that wide.
+        using Word = std::conditional_t<sizeof(void*) == 8, std::uint64_t, std::uint32_t>;
+        Word words[4 * sizeof(Bgra) / sizeof(Word)];
+        std::memcpy(words, in + x, sizeof words);
+        for (Word& word : words) {
+            Word result = LookUp(static_cast<std::uint32_t>(word), tables);
+            if constexpr (sizeof(Word) == 8)
+                result |= Word{LookUp(static_cast<std::uint32_t>(word >> 32), tables)} << 32;
+            word = result;
         }
-        std::memcpy(out + x, pair, sizeof pair);
+        std::memcpy(out + x, words, sizeof words);
     }
     kPlainKernels.tone(in + x, out + x, width - x, Tone{&tables, false, 0, nullptr});
 }
