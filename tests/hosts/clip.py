@@ -15,6 +15,20 @@ def run(*args, **options):
     return subprocess.run([str(a) for a in args], capture_output=True, **options)
 
 
+def run_host(*args, **options):
+    """Runs a program that loads our plug-ins, a second and third time when it hangs.
+
+    The preloaded sanitizer and the start-up of libraries that melt loads (translations, TLS) can wait for each other
+    for ever; our code has no part in that, and no lock to wait for.
+    """
+    for tries in range(3):
+        try:
+            return run(*args, **dict(options, timeout=60))
+        except subprocess.TimeoutExpired:
+            if tries == 2:
+                raise
+
+
 def ffmpeg(*args):
     done = run("ffmpeg", "-nostdin", "-v", "error", "-y", *args)
     assert done.returncode == 0, done.stderr.decode()

@@ -16,6 +16,7 @@ from pathlib import Path
 
 sys.path.insert(0, str(Path(__file__).parent))
 import frei0r_hosts_test as hosts  # noqa: E402
+from clip import run_host  # noqa: E402
 
 DIST = Path(os.environ["VELMORA_DIST"])
 EDITORS = DIST / "editors"
@@ -33,7 +34,7 @@ def melt_metadata(plugin, data=None):
     environment = dict(os.environ, LD_PRELOAD=os.environ.get("PRELOAD", ""), ASAN_OPTIONS="detect_leaks=0")
     if data:
         environment["MLT_DATA"] = str(data)
-    done = subprocess.run(["melt", "-query", f"filter=frei0r.{plugin}"], capture_output=True, env=environment)
+    done = run_host("melt", "-query", f"filter=frei0r.{plugin}", env=environment)
     return done.stdout.decode()
 
 
@@ -118,9 +119,10 @@ class EditorFiles(unittest.TestCase):
             self.assertEqual(sorted(str(p) for p in installed), sorted(line.strip() for line in said.splitlines()))
 
             environment.update(LD_PRELOAD=os.environ.get("PRELOAD", ""), ASAN_OPTIONS="detect_leaks=0")
-            subprocess.run(["ffmpeg", "-nostdin", "-v", "error", "-f", "lavfi", "-i", "testsrc=s=64x48", "-frames:v", "1",
-                            "-vf", "frei0r=velmora_film_pro:oldie", "-f", "null", "-"], env=environment, check=True)
-            done = subprocess.run(["melt", "-query", "filters"], env=environment, capture_output=True)
+            shown = run_host("ffmpeg", "-nostdin", "-v", "error", "-f", "lavfi", "-i", "testsrc=s=64x48", "-frames:v",
+                             "1", "-vf", "frei0r=velmora_film_pro:oldie", "-f", "null", "-", env=environment)
+            self.assertEqual(shown.returncode, 0, shown.stderr.decode())
+            done = run_host("melt", "-query", "filters", env=environment)
             for plugin in PLUGINS:
                 self.assertIn(f"frei0r.{plugin}", done.stdout.decode())
 

@@ -15,7 +15,7 @@ import unittest
 from pathlib import Path
 
 sys.path.insert(0, str(Path(__file__).parent.parent))
-from clip import CLIP, ffmpeg, reelfx, run  # noqa: E402
+from clip import CLIP, ffmpeg, reelfx, run_host  # noqa: E402
 
 ROOT = Path(__file__).parents[3]
 TABLE_FILE = ROOT / "docs" / "hosts.md"
@@ -45,7 +45,7 @@ def host(*args):
     environment = dict(os.environ, ASAN_OPTIONS="detect_leaks=0:verify_asan_link_order=0", GST_REGISTRY=str(Work.gst_registry))
     if os.environ.get("PRELOAD"):
         environment["LD_PRELOAD"] = os.environ["PRELOAD"]
-    done = run(*args, env=environment)
+    done = run_host(*args, env=environment)
     assert done.returncode == 0, f"{args}\n{done.stderr.decode()}"
     return done
 
