@@ -7,7 +7,6 @@
 #include <cstdio>
 
 #include "help/topics.h"
-#include "help/topics.h"
 #include "support/bit_button.h"
 #include "support/product.h"
 #include "support/resource_ids.h"
@@ -105,7 +104,8 @@ INT_PTR OptionsDialog::OnMessage(UINT message, WPARAM wParam) noexcept {
 
 void OptionsDialog::OnOpen() noexcept {
     CreateLogo();
-    CheckDlgButton(m_window, VM_CHECK_KNOBS_VERTICAL, m_knobsDragVertical ? BST_CHECKED : BST_UNCHECKED);
+    CheckDlgButton(m_window, VM_CHECK_KNOBS_VERTICAL,
+                   m_parts.preferences->KnobsDragVertical() ? BST_CHECKED : BST_UNCHECKED);
     SetTexts();
     CentreOverOwner(m_window);
 }
@@ -163,8 +163,10 @@ void OptionsDialog::OnCommand(int control) noexcept {
 }
 
 void OptionsDialog::OnOk() noexcept {
+    // Stored before the dialog goes: a host that sees it go may ask for the preference at once.
     if (GetDlgItem(m_window, VM_CHECK_KNOBS_VERTICAL) != nullptr) {
-        m_knobsDragVertical = IsDlgButtonChecked(m_window, VM_CHECK_KNOBS_VERTICAL) == BST_CHECKED;
+        m_parts.preferences->SetKnobsDragVertical(IsDlgButtonChecked(m_window, VM_CHECK_KNOBS_VERTICAL) ==
+                                                  BST_CHECKED);
     }
     EndDialog(m_window, IDOK);
 }

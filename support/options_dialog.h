@@ -5,6 +5,7 @@
 #include <windows.h>
 
 #include "support/help_launcher.h"
+#include "support/preferences.h"
 #include "support/translation.h"
 
 namespace velmora::support {
@@ -16,12 +17,12 @@ struct OptionsDialogParts {
     HBITMAP logo = nullptr;          // may be null, see BitButtonDescription
     TranslationHelper* texts = nullptr;
     const HelpLauncher* help = nullptr;
+    Preferences* preferences = nullptr;  // shown, and changed by OK
 };
 
 class OptionsDialog {
   public:
-    explicit OptionsDialog(const OptionsDialogParts& parts, bool knobsDragVertical) noexcept
-        : m_parts(parts), m_knobsDragVertical(knobsDragVertical) {}
+    explicit OptionsDialog(const OptionsDialogParts& parts) noexcept : m_parts(parts) {}
     OptionsDialog(const OptionsDialog&) = delete;
     OptionsDialog& operator=(const OptionsDialog&) = delete;
 
@@ -32,9 +33,6 @@ class OptionsDialog {
     void ToFront() const noexcept;
     // Closes a dialog that is shown, as Cancel does, and destroys its logo at once.
     void Abandon() noexcept;
-
-    // The preference, as the user left it with OK.
-    [[nodiscard]] bool KnobsDragVertical() const noexcept { return m_knobsDragVertical; }
 
   private:
     static INT_PTR CALLBACK Procedure(HWND window, UINT message, WPARAM wParam, LPARAM lParam) noexcept;
@@ -48,7 +46,6 @@ class OptionsDialog {
     void CreateLogo() noexcept;
 
     OptionsDialogParts m_parts;
-    bool m_knobsDragVertical;
     HWND m_window = nullptr;
     HWND m_logo = nullptr;
 };

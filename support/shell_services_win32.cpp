@@ -7,7 +7,7 @@
 #include "support/bit_button.h"
 #include "support/help_launcher.h"
 #include "support/options_dialog.h"
-#include "support/registry_settings.h"
+#include "support/preferences.h"
 #include "support/resource_ids.h"
 #include "support/shell_services.h"
 #include "support/text_sources.h"
@@ -17,8 +17,6 @@
 namespace velmora::support {
 namespace {
 
-constexpr char kSection[] = "Common";
-constexpr char kKnobsSetting[] = "Knobs Drag Vertical";
 constexpr char16_t kResourceModule[] = u"resources.dll";
 constexpr std::size_t kLongestHelpFileName = 259;
 
@@ -35,7 +33,7 @@ class WindowsShellServices final : public IShellServices {
   public:
     bool VM_CALL Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
                        std::int32_t dialogs) override;
-    bool VM_CALL KnobsDragVertical() override { return m_knobsDragVertical; }
+    bool VM_CALL KnobsDragVertical() override { return m_preferences.KnobsDragVertical(); }
     std::int32_t VM_CALL ShowOptions(void* owner) override;
     void VM_CALL ShutDown() override;
     std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic, std::int32_t externalViewer) override;
@@ -51,7 +49,7 @@ class WindowsShellServices final : public IShellServices {
     win32::Module m_resources;
     win32::Bitmap m_logo;
     HMODULE m_buttonModule = nullptr;  // for which the button class is registered; null: it is not
-    bool m_knobsDragVertical = false;
+    Preferences m_preferences;
     TranslationHelper m_texts;
     IUnknown* m_textSource = nullptr;  // not owned
     HelpLauncher m_help;
@@ -72,8 +70,7 @@ bool VM_CALL WindowsShellServices::Start(void* moduleHandle, IUnknown* textSourc
     UseTextSource(textSource, nullptr);
     const std::u16string folder = ModuleFolder(moduleHandle);
     if (dialogs != 0) LoadDialogParts(folder);
-    const std::optional<std::string> knobs = ReadSetting(kSection, kKnobsSetting);
-    m_knobsDragVertical = knobs && knobs->starts_with('y');
+    m_preferences.Read();
     const char* const name = helpFileName != nullptr ? helpFileName : "";
     m_help.SetFile(folder, std::string(name, strnlen(name, kLongestHelpFileName)));
     return true;
@@ -106,16 +103,12 @@ std::int32_t VM_CALL WindowsShellServices::ShowOptions(void* owner) try {
                           .buttonModule = m_buttonModule,
                           .logo = m_logo.get(),
                           .texts = &m_texts,
-                          .help = &m_help},
-                         m_knobsDragVertical);
+                          .help = &m_help,
+                          .preferences = &m_preferences});
     m_dialog = &dialog;
     const bool accepted = dialog.Show(static_cast<HWND>(owner));
     m_dialog = nullptr;
-    if (!accepted) return 0;
-    m_knobsDragVertical = dialog.KnobsDragVertical();
-    // A registry that refuses is no reason to bother the user: the choice holds for this session.
-    WriteSetting(kSection, kKnobsSetting, m_knobsDragVertical ? "yes" : "no");
-    return 1;
+    return accepted ? 1 : 0;
 } catch (...) {
     return 0;
 }

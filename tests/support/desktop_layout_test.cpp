@@ -148,6 +148,7 @@ TEST(DialogLayout, ReadsWellInEveryLanguage) {
     ASSERT_TRUE(RegisterBitButtonClass(module));
     const HHOOK hook = SetWindowsHookExW(WH_CALLWNDPROCRET, CheckDialog, nullptr, GetCurrentThreadId());
     const HelpLauncher help;
+    Preferences preferences;
     std::set<std::u16string> helpTexts;
     for (const std::string& language : languages) {
         SCOPED_TRACE(language);
@@ -158,8 +159,8 @@ TEST(DialogLayout, ReadsWellInEveryLanguage) {
                               .buttonModule = module,
                               .logo = static_cast<HBITMAP>(logo),
                               .texts = &texts,
-                              .help = &help},
-                             false);
+                              .help = &help,
+                              .preferences = &preferences});
         EXPECT_FALSE(dialog.Show(nullptr));
     }
     EXPECT_GT(helpTexts.size(), languages.size() / 2) << "the languages differ";

@@ -62,6 +62,32 @@ TEST_F(SettingsTest, OkWritesTheUsersTextAndLeavesTheMachines) {
     services.Withdraw(library);
 }
 
+// The dialog that ends is still a window for a while: who waits for its end may look at what OK has done.
+TEST_F(SettingsTest, OkStoresBeforeTheDialogEnds) {
+    FakeLibrary library(u"");
+    const ServicesModule services(m_modulePath);
+    services.Offer(library);
+    EXPECT_EQ(ShowOptionsTo(*services,
+                            [&](HWND dialog) {
+                                CheckDlgButton(dialog, VM_CHECK_KNOBS_VERTICAL, BST_CHECKED);
+                                EXPECT_FALSE(services->KnobsDragVertical());
+                                SendMessageW(dialog, WM_COMMAND, VM_BUTTON_OK, 0);
+                                EXPECT_TRUE(services->KnobsDragVertical());
+                                EXPECT_EQ(ReadStored(HKEY_CURRENT_USER, kSettingsKey, kKnobs), "yes\0"s);
+                            }),
+              1);
+    ForgetSettings();
+    EXPECT_EQ(ShowOptionsTo(*services,
+                            [](HWND dialog) {
+                                SendMessageW(GetDlgItem(dialog, VM_CHECK_KNOBS_VERTICAL), WM_CLOSE, 0, 0);
+                                SendMessageW(dialog, WM_COMMAND, VM_BUTTON_OK, 0);
+                            }),
+              1);
+    EXPECT_TRUE(services->KnobsDragVertical()) << "without the check box nothing is chosen";
+    EXPECT_EQ(ReadStored(HKEY_CURRENT_USER, kSettingsKey, kKnobs), Stored());
+    services.Withdraw(library);
+}
+
 TEST_F(SettingsTest, CancelChangesNothing) {
     FakeLibrary library(u"");
     const ServicesModule services(m_modulePath);
