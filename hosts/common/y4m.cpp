@@ -12,11 +12,18 @@ namespace {
 // 16-bit fixed point.
 constexpr double kOne = 65536.0;
 constexpr std::int32_t kHalf = 32768;
-constexpr double kRedWeight = 0.299, kBlueWeight = 0.114;
-constexpr double kGreenWeight = 1.0 - kRedWeight - kBlueWeight;
 
 std::int32_t Fixed(double x) {
     return static_cast<std::int32_t>(std::lround(x * kOne));
+}
+
+// What red, green and blue weigh in luma.
+struct Weights {
+    double red, blue;
+    [[nodiscard]] constexpr double Green() const { return 1.0 - red - blue; }
+};
+constexpr Weights WeightsOf(Y4mMatrix matrix) {
+    return matrix == Y4mMatrix::kBt709 ? Weights{0.2126, 0.0722} : Weights{0.299, 0.114};
 }
 
 // Limited range: luma 16..235, chroma 16..240 about 128.
@@ -27,16 +34,20 @@ struct Range {
 constexpr Range kLimited = {16, 219.0 / 255.0, 224.0 / 255.0};
 constexpr Range kFull = {0, 1.0, 1.0};
 
+const Range& RangeOf(const Y4mFormat& format) {
+    return format.isFullRange ? kFull : kLimited;
+}
+
 struct Decoder {
     std::int32_t offset, luma, crToRed, cbToGreen, crToGreen, cbToBlue;
 
-    explicit Decoder(const Range& range)
+    Decoder(const Range& range, const Weights& weights)
         : offset(range.lumaOffset),
           luma(Fixed(1.0 / range.lumaSpan)),
-          crToRed(Fixed(2.0 * (1.0 - kRedWeight) / range.chromaSpan)),
-          cbToGreen(Fixed(-2.0 * (1.0 - kBlueWeight) * kBlueWeight / kGreenWeight / range.chromaSpan)),
-          crToGreen(Fixed(-2.0 * (1.0 - kRedWeight) * kRedWeight / kGreenWeight / range.chromaSpan)),
-          cbToBlue(Fixed(2.0 * (1.0 - kBlueWeight) / range.chromaSpan)) {}
+          crToRed(Fixed(2.0 * (1.0 - weights.red) / range.chromaSpan)),
+          cbToGreen(Fixed(-2.0 * (1.0 - weights.blue) * weights.blue / weights.Green() / range.chromaSpan)),
+          crToGreen(Fixed(-2.0 * (1.0 - weights.red) * weights.red / weights.Green() / range.chromaSpan)),
+          cbToBlue(Fixed(2.0 * (1.0 - weights.blue) / range.chromaSpan)) {}
 
     void Decode(std::int32_t y, std::int32_t cb, std::int32_t cr, std::uint8_t* pixel) const {
         const std::int32_t base = (y - offset) * luma + kHalf;
@@ -55,17 +66,17 @@ struct Decoder {
 struct Encoder {
     std::int32_t offset, red, green, blue;
 
-    static Encoder Luma(const Range& range) {
-        return {range.lumaOffset, Fixed(kRedWeight * range.lumaSpan), Fixed(kGreenWeight * range.lumaSpan),
-                Fixed(kBlueWeight * range.lumaSpan)};
+    static Encoder Luma(const Range& range, const Weights& weights) {
+        return {range.lumaOffset, Fixed(weights.red * range.lumaSpan),
+                Fixed(weights.Green() * range.lumaSpan), Fixed(weights.blue * range.lumaSpan)};
     }
-    static Encoder Cb(const Range& range) {
-        const double k = range.chromaSpan / (2.0 * (1.0 - kBlueWeight));
-        return {128, Fixed(-kRedWeight * k), Fixed(-kGreenWeight * k), Fixed((1.0 - kBlueWeight) * k)};
+    static Encoder Cb(const Range& range, const Weights& weights) {
+        const double k = range.chromaSpan / (2.0 * (1.0 - weights.blue));
+        return {128, Fixed(-weights.red * k), Fixed(-weights.Green() * k), Fixed((1.0 - weights.blue) * k)};
     }
-    static Encoder Cr(const Range& range) {
-        const double k = range.chromaSpan / (2.0 * (1.0 - kRedWeight));
-        return {128, Fixed((1.0 - kRedWeight) * k), Fixed(-kGreenWeight * k), Fixed(-kBlueWeight * k)};
+    static Encoder Cr(const Range& range, const Weights& weights) {
+        const double k = range.chromaSpan / (2.0 * (1.0 - weights.red));
+        return {128, Fixed((1.0 - weights.red) * k), Fixed(-weights.Green() * k), Fixed(-weights.blue * k)};
     }
 
     // Of `count` pixels whose channels are summed up.
@@ -131,6 +142,12 @@ std::size_t Y4mFormat::FrameBytes() const {
     return luma + 2 * static_cast<std::size_t>(ChromaWidth()) * static_cast<std::size_t>(ChromaHeight());
 }
 
+std::optional<Y4mMatrix> ParseY4mMatrix(std::string_view text) {
+    if (text == "bt601") return Y4mMatrix::kBt601;
+    if (text == "bt709") return Y4mMatrix::kBt709;
+    return std::nullopt;
+}
+
 Y4mFormat ParseY4mHeader(std::string_view line) {
     constexpr std::string_view kMagic = "YUV4MPEG2";
     if (!line.starts_with(kMagic)) throw UsageError("the input is not a YUV4MPEG2 stream");
@@ -152,11 +169,13 @@ Y4mFormat ParseY4mHeader(std::string_view line) {
     const auto size = ParseSize(sizeText[0] + "x" + sizeText[1]);
     if (!size) throw UsageError("the YUV4MPEG2 header gives no valid size");
     format.size = *size;
+    const bool isHighDefinition = size->width >= 1280 || size->height > 576;
+    format.matrix = isHighDefinition ? Y4mMatrix::kBt709 : Y4mMatrix::kBt601;
     return format;
 }
 
 void Y4mToBgra(const Y4mFormat& format, const std::uint8_t* planes, std::uint8_t* bgra) {
-    const Decoder decoder(format.isFullRange ? kFull : kLimited);
+    const Decoder decoder(RangeOf(format), WeightsOf(format.matrix));
     const std::ptrdiff_t width = format.size.width, chromaWidth = format.ChromaWidth();
     const std::uint8_t* cb = planes + width * format.size.height;
     const std::uint8_t* cr = cb + chromaWidth * format.ChromaHeight();
@@ -171,13 +190,14 @@ void Y4mToBgra(const Y4mFormat& format, const std::uint8_t* planes, std::uint8_t
 }
 
 void BgraToY4m(const Y4mFormat& format, const std::uint8_t* bgra, std::uint8_t* planes) {
-    const Range& range = format.isFullRange ? kFull : kLimited;
-    EncodePlane(format, Encoder::Luma(range), 0, 0, bgra, planes);
+    const Range& range = RangeOf(format);
+    const Weights weights = WeightsOf(format.matrix);
+    EncodePlane(format, Encoder::Luma(range, weights), 0, 0, bgra, planes);
     if (!format.hasChroma) return;
     std::uint8_t* cb = planes + std::ptrdiff_t{format.size.width} * format.size.height;
     std::uint8_t* cr = cb + std::ptrdiff_t{format.ChromaWidth()} * format.ChromaHeight();
-    EncodePlane(format, Encoder::Cb(range), format.chromaShiftX, format.chromaShiftY, bgra, cb);
-    EncodePlane(format, Encoder::Cr(range), format.chromaShiftX, format.chromaShiftY, bgra, cr);
+    EncodePlane(format, Encoder::Cb(range, weights), format.chromaShiftX, format.chromaShiftY, bgra, cb);
+    EncodePlane(format, Encoder::Cr(range, weights), format.chromaShiftX, format.chromaShiftY, bgra, cr);
 }
 
 }  // namespace velmora::hosts

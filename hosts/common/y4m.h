@@ -1,17 +1,24 @@
 // YUV4MPEG2 streams, 8 bits: the header line, and frames converted from and to BGRA for hosts without a media
-// library. Colours follow BT.601 in limited range, or in full range where the header says so (the format
-// carries no matrix). Chroma is repeated over the pixels it belongs to and averaged over them on the way
-// back, so that an untouched frame returns as it came but for rounding.
+// library. Colours are in limited range, or in full range where the header says so. The format carries no matrix:
+// players assume BT.709 for high definition and BT.601 below, and so does this unless it is told. Chroma is
+// repeated over the pixels it belongs to and averaged over them on the way back, so that an untouched frame
+// returns as it came but for rounding.
 #pragma once
 
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 
 #include "hosts/common/number_text.h"
 
 namespace velmora::hosts {
+
+enum class Y4mMatrix { kBt601, kBt709 };
+
+// "bt601" or "bt709".
+std::optional<Y4mMatrix> ParseY4mMatrix(std::string_view text);
 
 struct Y4mFormat {
     FrameSize size;
@@ -20,6 +27,7 @@ struct Y4mFormat {
     int chromaShiftX = 1;  // 1: one chroma sample for two columns
     int chromaShiftY = 1;
     bool isFullRange = false;
+    Y4mMatrix matrix = Y4mMatrix::kBt601;
 
     [[nodiscard]] std::int32_t ChromaWidth() const;
     [[nodiscard]] std::int32_t ChromaHeight() const;

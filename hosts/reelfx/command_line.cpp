@@ -2,12 +2,11 @@
 
 #include <CLI/CLI.hpp>
 
+#include <cstdio>
+#include <sstream>
+
 #include "hosts/common/number_text.h"
 #include "hosts/common/usage_error.h"
-#include "hosts/reelfx/list_command.h"
-#include "hosts/reelfx/picture_commands.h"
-#include "hosts/reelfx/preset_command.h"
-#include "hosts/reelfx/render_command.h"
 
 namespace velmora::hosts {
 namespace {
@@ -227,7 +226,7 @@ PresetSaveOptions ReadPresetSave(const Typed& typed) {
 
 }  // namespace
 
-ExitCode RunCommandLine(int count, char** arguments) {
+Command ReadCommandLine(int count, const char* const* arguments) {
     Typed typed;
     CLI::App app("The look of old film for any footage.", "reelfx");
     app.footer(kExitCodes);
@@ -243,22 +242,54 @@ ExitCode RunCommandLine(int count, char** arguments) {
     try {
         app.parse(count, arguments);
     } catch (const CLI::Success& wish) {
-        app.exit(wish);  // prints the help or the version
-        return kExitDone;
+        std::ostringstream text;
+        app.exit(wish, text, text);  // writes the help or the version
+        return TextCommand{text.str()};
     } catch (const CLI::ParseError& error) {
         throw UsageError(std::string(error.what()) + "; see reelfx --help");
     }
     if (app.got_subcommand("list")) {
         typed.list.effect = Given(typed.listEffect);
-        return RunList(typed.list);
+        return typed.list;
     }
-    if (app.got_subcommand("frame")) return RunFrame(ReadPicture(typed));
-    if (app.got_subcommand("sheet")) return RunSheet(ReadPicture(typed));
+    if (app.got_subcommand("frame")) return FrameCommand{ReadPicture(typed)};
+    if (app.got_subcommand("sheet")) return SheetCommand{ReadPicture(typed)};
     if (const CLI::App* preset = app.get_subcommand("preset"); preset->parsed()) {
-        return preset->got_subcommand("show") ? RunPresetShow(typed.presetShow)
-                                              : RunPresetSave(ReadPresetSave(typed));
+        if (preset->got_subcommand("show")) return typed.presetShow;
+        return ReadPresetSave(typed);
     }
-    return RunRender(ReadRender(typed));
+    return ReadRender(typed);
+}
+
+namespace {
+
+ExitCode Run(const TextCommand& command) {
+    std::fputs(command.text.c_str(), stdout);
+    return kExitDone;
+}
+ExitCode Run(const ListOptions& options) {
+    return RunList(options);
+}
+ExitCode Run(const RenderOptions& options) {
+    return RunRender(options);
+}
+ExitCode Run(const FrameCommand& command) {
+    return RunFrame(command.options);
+}
+ExitCode Run(const SheetCommand& command) {
+    return RunSheet(command.options);
+}
+ExitCode Run(const PresetShowOptions& options) {
+    return RunPresetShow(options);
+}
+ExitCode Run(const PresetSaveOptions& options) {
+    return RunPresetSave(options);
+}
+
+}  // namespace
+
+ExitCode RunCommand(const Command& command) {
+    return std::visit([](const auto& options) { return Run(options); }, command);
 }
 
 }  // namespace velmora::hosts

@@ -1,11 +1,34 @@
 // The command line of reelfx: its commands and options, and what they mean.
 #pragma once
 
+#include <string>
+#include <variant>
+
 #include "hosts/reelfx/failure.h"
+#include "hosts/reelfx/list_command.h"
+#include "hosts/reelfx/picture_commands.h"
+#include "hosts/reelfx/preset_command.h"
+#include "hosts/reelfx/render_command.h"
 
 namespace velmora::hosts {
 
-// Runs the command that the arguments name. Throws Failure or UsageError; the caller prints their line.
-ExitCode RunCommandLine(int count, char** arguments);
+// A text to print and nothing else: the help, the version.
+struct TextCommand {
+    std::string text;
+};
+struct FrameCommand {
+    PictureOptions options;
+};
+struct SheetCommand {
+    PictureOptions options;
+};
+using Command = std::variant<TextCommand, ListOptions, RenderOptions, FrameCommand, SheetCommand,
+                             PresetShowOptions, PresetSaveOptions>;
+
+// What the arguments ask for; opens and writes nothing. Throws UsageError.
+Command ReadCommandLine(int count, const char* const* arguments);
+
+// Does it. Throws Failure or UsageError; the caller prints their line.
+ExitCode RunCommand(const Command& command);
 
 }  // namespace velmora::hosts

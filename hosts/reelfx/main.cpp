@@ -17,7 +17,7 @@ int main(int count, char** arguments) {
     av_log_set_level(AV_LOG_QUIET);  // one clear line of our own instead
     WatchInterrupts();
     try {
-        return RunCommandLine(count, arguments);
+        return RunCommand(ReadCommandLine(count, arguments));
     } catch (const Failure& failure) {
         std::fprintf(stderr, "reelfx: %s\n", failure.what());
         return failure.Code();

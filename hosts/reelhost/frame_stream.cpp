@@ -1,31 +1,30 @@
 #include "hosts/reelhost/frame_stream.h"
 
-#include <cstdio>
-#include <fcntl.h>
-#include <io.h>
 #include <stdexcept>
 
 #include "hosts/common/usage_error.h"
 
 namespace velmora::hosts {
 
-FrameInput::FrameInput(std::optional<FrameSize> rawSize, std::optional<FrameRate> rate)
-    : m_isRaw(rawSize.has_value()) {
-    _setmode(_fileno(stdin), _O_BINARY);
+FrameInput::FrameInput(std::FILE* file, std::optional<FrameSize> rawSize, std::optional<FrameRate> rate,
+                       std::optional<Y4mMatrix> matrix)
+    : m_file(file), m_isRaw(rawSize.has_value()) {
     if (m_isRaw) {
         m_format.size = *rawSize;
     } else {
-        if (!ReadLine(m_header)) throw UsageError("standard input is empty");
+        if (!ReadLine(m_header)) throw UsageError("the input is empty");
         m_format = ParseY4mHeader(m_header);
         m_planes.resize(m_format.FrameBytes());
     }
     if (rate) m_format.rate = *rate;
+    if (matrix) m_format.matrix = *matrix;
 }
 
 bool FrameInput::ReadLine(std::string& line) {
     constexpr std::size_t kLongest = 1024;
     line.clear();
-    for (int c = std::getchar(); c != '\n'; c = std::getchar()) {
+    for (int c = std::getc(m_file); c != '\n'; c = std::getc(m_file)) {
+        if (c == EOF && !line.empty()) throw UsageError("the input ends inside a line");
         if (c == EOF) return false;
         if (line.size() == kLongest) throw UsageError("the input is not a YUV4MPEG2 stream");
         line += static_cast<char>(c);
@@ -34,7 +33,7 @@ bool FrameInput::ReadLine(std::string& line) {
 }
 
 bool FrameInput::ReadBytes(std::vector<std::uint8_t>& bytes) {
-    const std::size_t count = std::fread(bytes.data(), 1, bytes.size(), stdin);
+    const std::size_t count = std::fread(bytes.data(), 1, bytes.size(), m_file);
     if (count != bytes.size() && (count != 0 || !m_isRaw)) {
         throw UsageError("the input ends inside a frame");
     }
@@ -53,8 +52,8 @@ bool FrameInput::Read(std::vector<std::uint8_t>& bgra) {
     return true;
 }
 
-FrameOutput::FrameOutput(const FrameInput& input) : m_isRaw(input.m_isRaw), m_format(input.m_format) {
-    _setmode(_fileno(stdout), _O_BINARY);
+FrameOutput::FrameOutput(std::FILE* file, const FrameInput& input)
+    : m_file(file), m_isRaw(input.m_isRaw), m_format(input.m_format) {
     if (m_isRaw) return;
     m_planes.resize(m_format.FrameBytes());
     WriteBytes(input.m_header.data(), input.m_header.size());
@@ -62,8 +61,8 @@ FrameOutput::FrameOutput(const FrameInput& input) : m_isRaw(input.m_isRaw), m_fo
 }
 
 void FrameOutput::WriteBytes(const void* bytes, std::size_t count) {
-    if (std::fwrite(bytes, 1, count, stdout) != count) {
-        throw std::runtime_error("standard output does not take the frame");
+    if (std::fwrite(bytes, 1, count, m_file) != count) {
+        throw std::runtime_error("the output does not take the frame");
     }
 }
 
@@ -78,7 +77,7 @@ void FrameOutput::Write(const std::vector<std::uint8_t>& bgra) {
 }
 
 void FrameOutput::Finish() {
-    if (std::fflush(stdout) != 0) throw std::runtime_error("standard output does not take the frame");
+    if (std::fflush(m_file) != 0) throw std::runtime_error("the output does not take the frame");
 }
 
 }  // namespace velmora::hosts

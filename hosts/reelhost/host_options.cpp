@@ -10,13 +10,14 @@ const char* const kHostHelp =
     "reelhost: renders frames through VMReelEffects.dll, standard input to standard output.\n"
     "\n"
     "  reelhost --effect NAME [--preset NAME] [--set NAME=VALUE]... [--size WxH] [--rate FPS]\n"
-    "           [--frames N] [--hash] [--dll PATH]\n"
+    "           [--matrix NAME] [--frames N] [--hash] [--dll PATH]\n"
     "  reelhost --all-presets NAME|all --size WxH [--rate FPS] [--frames N]\n"
     "  reelhost --list\n"
     "  reelhost --bench [--dll PATH]\n"
     "\n"
     "  --size         frames are raw BGRA of this size; without it they are YUV4MPEG2\n"
     "  --rate         frames per second (default 30, or the YUV4MPEG2 header's)\n"
+    "  --matrix       colours of YUV4MPEG2: bt601 or bt709 (default: bt709 from 1280 pixels or 577 rows on)\n"
     "  --frames       read no more than N frames\n"
     "  --hash         print the MD5 of each frame's BGRA instead of writing frames\n"
     "  --all-presets  hash the frames for every preset of an effect, or of all\n"
@@ -56,6 +57,11 @@ class ArgumentReader {
     std::string_view m_name;
 };
 
+std::optional<std::int64_t> ParseFrameCount(std::string_view text) {
+    const auto count = ParseInteger(text);
+    return count && *count >= 0 ? count : std::nullopt;
+}
+
 }  // namespace
 
 HostOptions ReadHostOptions(int count, char** arguments) {
@@ -82,8 +88,10 @@ HostOptions ReadHostOptions(int count, char** arguments) {
             options.size = reader.Value(ParseSize, "a size like 1920x1080");
         } else if (name == "--rate") {
             options.rate = reader.Value(ParseRate, "a rate like 25 or 30000/1001");
+        } else if (name == "--matrix") {
+            options.matrix = reader.Value(ParseY4mMatrix, "bt601 or bt709");
         } else if (name == "--frames") {
-            options.frameLimit = reader.Value(ParseInteger, "a number of frames");
+            options.frameLimit = reader.Value(ParseFrameCount, "a number of frames from 0");
         } else if (name == "--hash") {
             options.withDigests = true;
         } else if (name == "--dll") {

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "hosts/common/number_text.h"
+#include "hosts/common/y4m.h"
 
 namespace velmora::hosts {
 
@@ -20,6 +21,7 @@ struct HostOptions {
     std::vector<std::string> settings;
     std::optional<FrameSize> size;  // raw BGRA
     std::optional<FrameRate> rate;
+    std::optional<Y4mMatrix> matrix;  // of YUV4MPEG2
     std::optional<std::int64_t> frameLimit;
     bool withDigests = false;
 };

@@ -2,6 +2,9 @@
 
 #include <cstdio>
 #include <exception>
+#include <fcntl.h>
+#include <io.h>
+#include <new>
 
 #include "hosts/common/digest.h"
 #include "hosts/common/usage_error.h"
@@ -33,15 +36,23 @@ void List(const EffectLibrary& library) {
     }
 }
 
+FrameInput StandardInput(const HostOptions& options) {
+    _setmode(_fileno(stdin), _O_BINARY);
+    return {stdin, options.size, options.rate, options.matrix};
+}
+
 void Render(const HostOptions& options, const EffectLibrary& library) {
     const auto index = static_cast<std::uint32_t>(FindEffect(library.Effects(), options.effect));
     const EffectInfo& info = library.Effects()[index];
     EffectRun run(library, index);
     if (options.preset) run.ApplyPreset(FindPreset(info, *options.preset));
     for (const std::string& setting : options.settings) run.Set(ParseSetting(info, setting));
-    FrameInput input(options.size, options.rate);
+    FrameInput input = StandardInput(options);
     std::optional<FrameOutput> output;
-    if (!options.withDigests) output.emplace(input);
+    if (!options.withDigests) {
+        _setmode(_fileno(stdout), _O_BINARY);
+        output.emplace(stdout, input);
+    }
     RandomStateFinder finder(library);
     std::fprintf(stderr, "random state %s\n", HexText(finder.Find()).c_str());
     Frame source, result;
@@ -76,7 +87,7 @@ void HashPresets(const EffectLibrary& library, std::uint32_t effect, const Frame
 }
 
 void HashAllPresets(const HostOptions& options, const EffectLibrary& library) {
-    FrameInput input(options.size, options.rate);
+    FrameInput input = StandardInput(options);
     std::vector<Frame> frames;
     Frame frame;
     while ((!options.frameLimit || static_cast<std::int64_t>(frames.size()) < *options.frameLimit) &&
@@ -127,6 +138,9 @@ int main(int count, char** arguments) {
     } catch (const UsageError& error) {
         std::fprintf(stderr, "reelhost: %s\n", error.what());
         return 2;
+    } catch (const std::bad_alloc&) {
+        std::fprintf(stderr, "reelhost: memory is short\n");
+        return 1;
     } catch (const std::exception& error) {
         std::fprintf(stderr, "reelhost: %s\n", error.what());
         return 1;

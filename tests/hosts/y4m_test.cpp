@@ -22,17 +22,23 @@ TEST(Y4m, ReadsHeaders) {
     }
 }
 
-// BT.601: a saturated colour's code values are tabled in every text on video.
+// A saturated colour's code values are tabled in every text on video.
 TEST(Y4m, KnowsTheColourBars) {
+    constexpr Y4mMatrix kBt601 = Y4mMatrix::kBt601, kBt709 = Y4mMatrix::kBt709;
     struct Row {
+        Y4mMatrix matrix;
         std::uint8_t blue, green, red, y, cb, cr;
     };
     const Row rows[] = {
-        {255, 255, 255, 235, 128, 128}, {0, 0, 0, 16, 128, 128},   {0, 0, 255, 81, 90, 240},
-        {0, 255, 0, 145, 54, 34},       {255, 0, 0, 41, 240, 110},
+        {kBt601, 255, 255, 255, 235, 128, 128}, {kBt601, 0, 0, 0, 16, 128, 128},
+        {kBt601, 0, 0, 255, 81, 90, 240},       {kBt601, 0, 255, 0, 145, 54, 34},
+        {kBt601, 255, 0, 0, 41, 240, 110},      {kBt709, 255, 255, 255, 235, 128, 128},
+        {kBt709, 0, 0, 0, 16, 128, 128},        {kBt709, 0, 0, 255, 63, 102, 240},
+        {kBt709, 0, 255, 0, 173, 42, 26},       {kBt709, 255, 0, 0, 32, 240, 118},
     };
-    const Y4mFormat format = ParseY4mHeader("YUV4MPEG2 W1 H1 F25:1 C444");
+    Y4mFormat format = ParseY4mHeader("YUV4MPEG2 W1 H1 F25:1 C444");
     for (const Row& row : rows) {
+        format.matrix = row.matrix;
         const std::uint8_t pixel[4] = {row.blue, row.green, row.red, 7};
         std::uint8_t planes[3] = {};
         BgraToY4m(format, pixel, planes);
@@ -46,6 +52,14 @@ TEST(Y4m, KnowsTheColourBars) {
         EXPECT_NEAR(back[2], row.red, 2);
         EXPECT_EQ(back[3], 255);
     }
+}
+
+TEST(Y4m, GuessesTheMatrixAsPlayersDo) {
+    EXPECT_EQ(ParseY4mHeader("YUV4MPEG2 W720 H576").matrix, Y4mMatrix::kBt601);
+    EXPECT_EQ(ParseY4mHeader("YUV4MPEG2 W720 H577").matrix, Y4mMatrix::kBt709);
+    EXPECT_EQ(ParseY4mHeader("YUV4MPEG2 W1280 H16").matrix, Y4mMatrix::kBt709);
+    EXPECT_EQ(ParseY4mMatrix("bt709"), Y4mMatrix::kBt709);
+    EXPECT_EQ(ParseY4mMatrix("BT2020"), std::nullopt);
 }
 
 TEST(Y4m, UntouchedFramesReturnButForRounding) {
