@@ -8,6 +8,8 @@ set(CMAKE_CXX_VISIBILITY_PRESET hidden)
 set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
 
 option(VELMORA_SANITIZE "Build with address and undefined-behaviour sanitizers" OFF)
+option(VELMORA_SANITIZE_THREADS "Build with the thread sanitizer" OFF)
+option(VELMORA_FUZZ "Build the fuzzing programs (clang only), all code with sanitizers" OFF)
 option(VELMORA_PLAIN_ROAD "Render stage by stage with the plain pixel forms only" OFF)
 set(VELMORA_DIST ${CMAKE_BINARY_DIR}/dist)
 
@@ -16,7 +18,7 @@ target_include_directories(velmora_options INTERFACE ${CMAKE_SOURCE_DIR})
 target_compile_options(velmora_options INTERFACE
   -Wall -Wextra -Wconversion -Wshadow -Wnon-virtual-dtor -Wold-style-cast -Werror
   # GCC 12 sees an overlap in `"text" + string` where there is none.
-  -Wno-restrict
+  $<$<CXX_COMPILER_ID:GNU>:-Wno-restrict>
   # Bytes must not depend on the build: no contraction into fused operations, no relaxed maths.
   -ffp-contract=off -fno-fast-math)
 if(VELMORA_PLAIN_ROAD)
@@ -27,6 +29,15 @@ if(VELMORA_SANITIZE)
     -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer
     # Beside the checks GCC 12 takes registers of its own vector intrinsics for uninitialised variables.
     -Wno-uninitialized)
+  target_link_options(velmora_options INTERFACE -fsanitize=address,undefined)
+endif()
+if(VELMORA_SANITIZE_THREADS)
+  target_compile_options(velmora_options INTERFACE -fsanitize=thread -fno-omit-frame-pointer)
+  target_link_options(velmora_options INTERFACE -fsanitize=thread)
+endif()
+if(VELMORA_FUZZ)
+  target_compile_options(velmora_options INTERFACE
+    -fsanitize=fuzzer-no-link,address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer)
   target_link_options(velmora_options INTERFACE -fsanitize=address,undefined)
 endif()
 if(WIN32)

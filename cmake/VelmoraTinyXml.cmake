@@ -1,8 +1,9 @@
 # velmora_tinyxml: TinyXML 2.6.2 with Debian's patches (std::string in its interface) for both builds. Native code
 # links Debian's library; Debian has none for Windows, so there it is compiled from the sources that
-# scripts/fetch-tinyxml unpacked in the cache folder.
+# scripts/fetch-tinyxml unpacked in the cache folder. The fuzzing programs are compiled from them too: a fuzzer sees only
+# the branches of what it was compiled with.
 
-if(NOT WIN32)
+if(NOT WIN32 AND NOT VELMORA_FUZZ)
   add_library(velmora_tinyxml INTERFACE)
   find_path(VELMORA_TINYXML_INCLUDE tinyxml.h REQUIRED)
   find_library(VELMORA_TINYXML_LIBRARY tinyxml REQUIRED)
@@ -20,5 +21,8 @@ else()
   target_include_directories(velmora_tinyxml SYSTEM PUBLIC ${folder})
   # Its warnings are not ours to mend.
   target_compile_options(velmora_tinyxml PRIVATE -w)
+  if(VELMORA_FUZZ)
+    target_compile_options(velmora_tinyxml PRIVATE -fsanitize=fuzzer-no-link,address,undefined -fno-sanitize-recover=all)
+  endif()
   unset(folder)
 endif()

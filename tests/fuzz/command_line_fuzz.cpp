@@ -1,0 +1,116 @@
+// Lines of text as the arguments of reelfx or reelhost, the first one the program's name: refused with one line that
+// tells the user why, or read into options that keep their ranges. Nothing is opened or run.
+
+#include <algorithm>
+#include <cstdint>
+#include <string>
+#include <string_view>
+#include <variant>
+#include <vector>
+
+#include "hosts/common/usage_error.h"
+#include "hosts/reelfx/command_line.h"
+#include "hosts/reelhost/host_options.h"
+#include "tests/fuzz/fuzz_input.h"
+
+namespace {
+
+using namespace velmora::hosts;
+using velmora::fuzz::Require;
+
+bool IsSize(const FrameSize& size) {
+    return size.width >= 1 && size.width <= 32768 && size.height >= 1 && size.height <= 32768;
+}
+bool IsRate(const FrameRate& rate) {
+    return rate.numerator >= 1 && rate.denominator >= 1;
+}
+
+void CheckInput(const InputOptions& input) {
+    Require(!input.rawSize || IsSize(*input.rawSize));
+    Require(!input.rate || IsRate(*input.rate));
+}
+
+// What is left of an effect's options is read against the effect, preset files apart.
+void CheckEffect(EffectOptions effect) {
+    effect.presetFile.reset();
+    try {
+        const EffectChoice choice(effect);
+        Require(choice.NewSession() != nullptr);
+    } catch (const UsageError& error) {
+        Require(*error.what() != '\0');
+    }
+}
+
+void CheckPicture(const PictureOptions& picture) {
+    CheckInput(picture.input);
+    CheckEffect(picture.effect);
+    Require(picture.frame >= 0 && picture.columns >= 1 && picture.columns <= 32);
+    Require(picture.width == 0 || (picture.width >= 16 && picture.width <= 8192));
+}
+
+void Check(const TextCommand& command) {
+    Require(!command.text.empty());
+}
+void Check(const ListOptions&) {}
+void Check(const PresetShowOptions& options) {
+    Require(!options.file.empty());
+}
+void Check(const PresetSaveOptions& options) {
+    CheckEffect(options.effect);
+}
+void Check(const FrameCommand& command) {
+    CheckPicture(command.options);
+}
+void Check(const SheetCommand& command) {
+    CheckPicture(command.options);
+}
+void Check(const velmora::hosts::RenderOptions& options) {
+    CheckInput(options.input);
+    CheckEffect(options.effect);
+    const SectionOptions& section = options.section;
+    Require(section.firstFrame >= 0 && (!section.endFrame || *section.endFrame > section.firstFrame));
+    Require(!section.start || *section.start >= 0.0);
+    Require(!section.duration || *section.duration > 0.0);
+    Require(options.threads >= 0 && options.threads <= 256);
+    Require(options.output || options.withDigests);
+}
+
+void ReadForReelhost(std::vector<char*>& arguments) {
+    const HostOptions options = ReadHostOptions(static_cast<int>(arguments.size()), arguments.data());
+    Require(!options.size || (IsSize(*options.size) && options.rate));
+    Require(!options.rate || IsRate(*options.rate));
+    Require(!options.frameLimit || *options.frameLimit >= 0);
+    Require(options.mode != HostMode::kRender || !options.effect.empty());
+}
+
+std::vector<std::string> LinesOf(std::string text) {
+    std::replace(text.begin(), text.end(), '\0', ' ');  // ends an argument
+    std::vector<std::string> lines;
+    for (std::size_t at = 0; at <= text.size() && lines.size() < 64;) {
+        const std::size_t end = std::min(text.find('\n', at), text.size());
+        lines.push_back(text.substr(at, end - at));
+        at = end + 1;
+    }
+    return lines;
+}
+
+}  // namespace
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
+    std::vector<std::string> lines = LinesOf(std::string(reinterpret_cast<const char*>(data), size));
+    if (lines.back().empty()) lines.pop_back();  // the line's own end
+    if (lines.empty()) return 0;
+    std::vector<char*> arguments;
+    for (std::string& line : lines) arguments.push_back(line.data());
+    try {
+        if (lines.front() == "reelhost") {
+            ReadForReelhost(arguments);
+        } else {
+            const Command command = ReadCommandLine(static_cast<int>(arguments.size()), arguments.data());
+            std::visit([](const auto& options) { Check(options); }, command);
+        }
+    } catch (const UsageError& error) {
+        Require(*error.what() != '\0');
+    }
+    return 0;
+}
