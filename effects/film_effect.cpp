@@ -3,6 +3,7 @@
 #include <new>
 
 #include "effects/effect_queries.h"
+#include "plugin/float_guard.h"
 
 namespace velmora::effects {
 
@@ -25,8 +26,10 @@ std::uint32_t VM_CALL FilmEffect<kTable>::AddRef() {
 template <const EffectTable& kTable>
 std::uint32_t VM_CALL FilmEffect<kTable>::Release() {
     const std::uint32_t left = m_references.Drop();
-    if (left == 0) delete this;
-    return left;
+    if (left != 0) return left;
+    const FloatGuard guard;
+    delete this;
+    return 0;
 }
 
 template <const EffectTable& kTable>
@@ -41,6 +44,7 @@ std::int32_t VM_CALL FilmEffect<kTable>::GetKind() {
 
 template <const EffectTable& kTable>
 bool VM_CALL FilmEffect<kTable>::GetParamInfo(std::uint32_t index, ParamDescriptor* descriptor) {
+    const FloatGuard guard;
     return DescribeParam(kTable, index, descriptor);
 }
 

@@ -113,8 +113,10 @@ std::uint32_t VM_CALL FrameProcessor::AddRef() {
 
 std::uint32_t VM_CALL FrameProcessor::Release() {
     const std::uint32_t left = m_references.Drop();
-    if (left == 0) delete this;
-    return left;
+    if (left != 0) return left;
+    const FloatGuard guard;
+    delete this;
+    return 0;
 }
 
 bool VM_CALL FrameProcessor::Reserved3(const FrameRecord*, const FrameRecord*, std::uint8_t) {

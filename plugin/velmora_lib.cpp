@@ -98,10 +98,11 @@ std::uint32_t VM_CALL CRsVelmoraLib::AddRef() {
 }
 
 std::uint32_t VM_CALL CRsVelmoraLib::Release() {
-    const FloatGuard guard;
     const std::uint32_t left = m_references.Drop();
-    if (left == 0) delete this;
-    return left;
+    if (left != 0) return left;
+    const FloatGuard guard;
+    delete this;
+    return 0;
 }
 
 const char* VM_CALL CRsVelmoraLib::GetLibraryName() {
@@ -109,6 +110,7 @@ const char* VM_CALL CRsVelmoraLib::GetLibraryName() {
 }
 
 IVideoEffect* VM_CALL CRsVelmoraLib::CreateEffect(std::uint32_t index) {
+    const FloatGuard guard;
     return effects::CreateEffectByIndex(index);
 }
 
@@ -122,10 +124,12 @@ IShellServices* VM_CALL CRsVelmoraLib::GetShellServices() {
 }
 
 IFrameProcessor* VM_CALL CRsVelmoraLib::CreateFrameProcessor() {
+    const FloatGuard guard;
     return new (std::nothrow) FrameProcessor;
 }
 
 IPresetSaver* VM_CALL CRsVelmoraLib::CreatePresetSaver() {
+    const FloatGuard guard;
     return velmora::CreatePresetSaver();
 }
 
@@ -134,12 +138,14 @@ std::int32_t VM_CALL CRsVelmoraLib::LookUpText(std::intptr_t languageCode, std::
                                                std::intptr_t buffer, std::intptr_t capacity,
                                                std::intptr_t found) {
     if (!m_hasLanguage || m_parser == nullptr) return 0;
+    const FloatGuard guard;
     return m_parser->LookUpText(languageCode, category, key, fallback, buffer, capacity, found);
 }
 
 std::int32_t VM_CALL CRsVelmoraLib::GetText(const char* languageCode, std::int32_t category, const char* key,
                                             char16_t* buffer, std::int32_t capacity) {
     if (!m_hasLanguage || m_parser == nullptr) return 0;
+    const FloatGuard guard;
     return m_parser->GetText(languageCode, category, key, buffer, capacity);
 }
 

@@ -117,8 +117,10 @@ std::uint32_t VM_CALL CPresetSaver::AddRef() {
 
 std::uint32_t VM_CALL CPresetSaver::Release() {
     const std::uint32_t left = m_references.Drop();
-    if (left == 0) delete this;
-    return left;
+    if (left != 0) return left;
+    const FloatGuard guard;
+    delete this;
+    return 0;
 }
 
 std::int32_t VM_CALL CPresetSaver::SavePreset(void* owner, IEffectLibrary* library, std::uint32_t effectIndex,
