@@ -1,0 +1,42 @@
+// This program once more, in a process that may crash or hang without taking the first with it.
+#pragma once
+
+#include <memory>
+#include <string>
+#include <vector>
+
+namespace velmora::reelcheck {
+
+class ChildProcess {
+  public:
+    enum class Read { kLine, kEnd, kTimeout };
+
+    // Starts it; its standard output is read here. Throws std::runtime_error when it cannot be started.
+    explicit ChildProcess(const std::vector<std::string>& arguments);
+    ~ChildProcess();
+    ChildProcess(const ChildProcess&) = delete;
+    ChildProcess& operator=(const ChildProcess&) = delete;
+
+    // Waits for the next line of output, its end or the time given.
+    [[nodiscard]] Read ReadLine(std::string& line, double seconds);
+    void Kill();
+    // Waits for its end. Empty when it ended in order, else how it ended.
+    [[nodiscard]] std::string HowItEnded();
+
+  private:
+    struct System;
+    // Appends what there is within a short while; false at the end of the output.
+    bool ReadSome();
+
+    std::unique_ptr<System> m_system;
+    std::string m_read;
+};
+
+// In the child: crashes end the process with a line "crash TEXT" on standard output.
+void ReportCrashes();
+// In the child: writes a line to standard output at once, also from a crash.
+void WriteLine(const char* text) noexcept;
+// In the child: ends the process at once.
+[[noreturn]] void EndNow(int code) noexcept;
+
+}  // namespace velmora::reelcheck

@@ -1,0 +1,22 @@
+// What this process holds of the system: what must not grow.
+#pragma once
+
+#include <cstdint>
+
+namespace velmora::reelcheck {
+
+struct ProcessFigures {
+    std::int64_t handles = 0;      // natively: open files
+    std::int64_t modules = 0;      // natively: mapped files
+    std::int64_t memoryBytes = 0;  // set aside for this process alone
+    std::int64_t threads = 0;
+    std::int64_t windowObjects = 0;   // Windows: windows, menus, hooks
+    std::int64_t drawingObjects = 0;  // Windows: bitmaps, fonts, device contexts
+};
+
+[[nodiscard]] ProcessFigures FiguresNow();
+
+// Fails when `after` holds more of anything than `before`; memory may differ by `memorySlack` bytes.
+void RequireNoGrowth(const ProcessFigures& before, const ProcessFigures& after, std::int64_t memorySlack);
+
+}  // namespace velmora::reelcheck
