@@ -4,6 +4,7 @@
 #include <bit>
 #include <cmath>
 #include <iterator>
+#include <limits>
 
 #include "render/rounding.h"
 
@@ -40,12 +41,11 @@ std::uint8_t Saturate(std::int32_t value) noexcept {
 float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds) noexcept {
     // So much less than a draw that only the error of the product is meant.
     constexpr double kTolerance = 1e-9;
-    constexpr double kMostDraws = 9007199254740992.0;  // 2^53: beyond it doubles skip whole numbers
+    constexpr double kPeriod = 4294967296.0;  // of the generator: only the count modulo that matters
     double draws = std::ceil(seconds * rate - kTolerance);
-    draws = draws >= 1.0 ? std::min(draws, kMostDraws) : 1.0;
+    draws = draws >= 1.0 ? std::min(draws, std::numeric_limits<double>::max()) : 1.0;
     Random random(std::bit_cast<std::uint32_t>(Narrow(double{saturation} + flicker)));
-    // The generator's period is 2^32, so only the count modulo that matters.
-    random.Skip(static_cast<std::uint32_t>(static_cast<std::uint64_t>(draws) - 1));
+    random.Skip(static_cast<std::uint32_t>(std::fmod(draws, kPeriod)) - 1u);
     return Narrow(random.DrawDecimal(0.0f, flicker, 2) - 0.5 * flicker);
 }
 

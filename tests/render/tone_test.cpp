@@ -90,8 +90,18 @@ TEST(FlickerOffset, IsTheLastOfItsDraws) {
         double seconds;
         double draws;
     };
-    const Row rows[] = {{7, 1.0, 7},     {0, 100.0, 1},  {0, 0.0, 1},   {30, 0.0, 1},          {30, 0.1, 3},
-                        {30, 0.1001, 4}, {7, 1.0001, 8}, {29, -5.0, 1}, {30, 36000.0, 1080000}};
+    const Row rows[] = {{7, 1.0, 7},
+                        {0, 100.0, 1},
+                        {0, 0.0, 1},
+                        {30, 0.0, 1},
+                        {30, 0.1, 3},
+                        {30, 0.1001, 4},
+                        {7, 1.0001, 8},
+                        {29, -5.0, 1},
+                        {30, 36000.0, 1080000},
+                        // Whole periods of the generator later.
+                        {1, 0x1p55 + 8, 8},
+                        {2, 0x1p70 + 0x1p20, 2097152}};
     for (const Row& row : rows) {
         for (const float flicker : {0.16f, 0.615f, 1.0f, 0.003f}) {
             EXPECT_EQ(FlickerOffset(0.25f, flicker, row.rate, row.seconds),
