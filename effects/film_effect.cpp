@@ -12,9 +12,12 @@ Status VM_CALL FilmEffect<kTable>::QueryInterface(const Guid* iid, void** out) {
     IVideoEffect* const effect = this;
     IVideoHost* const hostFace = this;
     const Face faces[] = {{&kIidUnknown, effect}, {&kIidVideoEffect, effect}, {&kIidVideoHost, hostFace}};
+    // What lies in `out` is then the host's affair.
+    if (m_host != nullptr && out != nullptr && FaceOf(faces, iid) == nullptr) {
+        return m_host->QueryInterface(iid, out);
+    }
     const Status status = FindFace(faces, iid, out);
     if (status == kStatusOk) AddRef();
-    if (status == kStatusNoInterface && m_host != nullptr) return m_host->QueryInterface(iid, out);
     return status;
 }
 

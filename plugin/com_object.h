@@ -19,19 +19,21 @@ struct Face {
     void* pointer;
 };
 
-// Stores the first face whose identifier matches. Does not count: the caller adds the reference when the
-// result is kStatusOk.
+// The first face whose identifier matches; null when none does.
+template <std::size_t kCount>
+[[nodiscard]] void* FaceOf(const Face (&faces)[kCount], const Guid* iid) noexcept {
+    for (const Face& face : faces) {
+        if (SameId(iid, *face.iid)) return face.pointer;
+    }
+    return nullptr;
+}
+
+// Stores that face, or null. Does not count: the caller adds the reference when the result is kStatusOk.
 template <std::size_t kCount>
 [[nodiscard]] Status FindFace(const Face (&faces)[kCount], const Guid* iid, void** out) noexcept {
     if (out == nullptr) return kStatusFailure;
-    *out = nullptr;
-    for (const Face& face : faces) {
-        if (SameId(iid, *face.iid)) {
-            *out = face.pointer;
-            return kStatusOk;
-        }
-    }
-    return kStatusNoInterface;
+    *out = FaceOf(faces, iid);
+    return *out != nullptr ? kStatusOk : kStatusNoInterface;
 }
 
 // A count that starts with the creator's reference.

@@ -87,7 +87,9 @@ TEST(FilmEffect, PassesUnknownIdentifiersToTheAttachedHost) {
     EXPECT_EQ(host.references, 2u);
     out = &host;
     EXPECT_EQ(effect.Face()->QueryInterface(&kIidEffectLibrary, &out), kStatusNoInterface);
+    EXPECT_EQ(host.outAsPassed, &host);  // the arguments as they are
     EXPECT_EQ(out, nullptr);
+    EXPECT_EQ(effect->QueryInterface(&kIidPresetSaver, nullptr), kStatusFailure);
     // Its own come first and the host is not counted.
     EXPECT_EQ(effect->QueryInterface(&kIidVideoHost, &out), kStatusOk);
     EXPECT_EQ(out, effect.Face());

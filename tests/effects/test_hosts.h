@@ -14,6 +14,7 @@ class TestHost : public IVideoHost {
   public:
     virtual ~TestHost() = default;
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override {
+        outAsPassed = *out;
         const bool known = iid->data1 == kIidPresetSaver.data1;
         *out = known ? this : nullptr;
         if (known) ++references;
@@ -37,6 +38,7 @@ class TestHost : public IVideoHost {
     void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override { arguments = {7}; }
 
     std::uint32_t references = 1;
+    void* outAsPassed = nullptr;           // what lay in it at the last QueryInterface
     std::vector<std::intptr_t> arguments;  // of the last operation
 };
 
