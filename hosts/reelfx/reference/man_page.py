@@ -1,0 +1,123 @@
+"""The man page of reelfx."""
+
+import textwrap
+
+# Of the text's last change, as man pages carry it.
+DATE = "2026-11-21"
+
+DESCRIPTION = """\
+reelfx renders footage through effects that give it the look of old film: shake, dust, scratches, spots, worn edges,
+flicker and faded colours. It reads whatever FFmpeg reads and keeps sound, size, frame rate, times and colours.
+
+The same settings, seed and frames give the same bytes on every machine, with any number of threads, and for a part of a
+clip the same as for the whole. Another seed gives other damage.
+
+Names of effects, presets and parameters are taken in any case of the letters. A slider takes a number of its range, a
+colour #RRGGBB, a menu an item's text or its number from 0, a check box on or off. Settings are applied in this order: the
+built-in preset, the preset file, each --set.
+"""
+
+EXAMPLES = (
+    ("A preset over a whole clip, with its sound:",
+     'reelfx render in.mp4 out.mp4 --effect "Film Pro" --preset "Super 8" --seed 7'),
+    ("Ten seconds with settings of one's own:",
+     'reelfx render in.mp4 out.mp4 -e "Film Camera" -s "X Jitter=4" -s Flicker=20 --start 1:30 --duration 10'),
+    ("All presets of an effect on one frame:", 'reelfx sheet in.mp4 sheet.png -e "Film Damage" -n 20'),
+    ("Between two other programs:",
+     'ffmpeg -i in.mov -f yuv4mpegpipe - | reelfx render - - -e "Film Look" -p Sepia | ffplay -'),
+)
+
+
+def escaped(text):
+    text = text.replace("\\", "\\e").replace("-", "\\-").replace("'", "\\(aq")
+    return "\\&" + text if text.startswith(".") else text
+
+
+def paragraphs(text):
+    return "\n.PP\n".join(escaped(" ".join(part.split())) for part in text.strip().split("\n\n"))
+
+
+def wrapped(line):
+    """Text in short lines; requests stay whole."""
+    return line if line.startswith(".") else textwrap.fill(line, 78, break_long_words=False, break_on_hyphens=False)
+
+
+def synopsis(command):
+    words = [r"[\fIOPTION\fR]..."] if command.options else []
+    for positional in command.positionals:
+        name = rf"\fI{positional.positional}\fR"
+        words.append(name if positional.required else f"[{name}]")
+    return rf"\fBreelfx {' '.join(command.words)}\fR " + " ".join(words)
+
+
+def option_names(option):
+    names = ", ".join(rf"\fB{escaped(name)}\fR" for name in option.names)
+    return names + (rf" \fI{escaped(option.value)}\fR" if option.value else "")
+
+
+def sentence(text):
+    text = text[0].upper() + text[1:]
+    return escaped(text if text.endswith(".") else text + ".")
+
+
+def option_entry(option):
+    more = [f"Default: {escaped(option.default)}."] if option.default else []
+    more += [rf"The environment variable \fB{option.environment}\fR gives the default."] if option.environment else []
+    return "\n".join([".TP", option_names(option), sentence(option.help), *more])
+
+
+def same(one, other):
+    return (one.names, one.help) == (other.names, other.help)
+
+
+def command_section(command, render):
+    """What `render` has told of already is only named."""
+    parts = [f'.SS "{synopsis(command)}"', sentence(command.help)]
+    for positional in command.positionals:
+        parts += [".TP", rf"\fI{positional.positional}\fR", sentence(positional.help)]
+    known = [o for o in command.options if command is not render and any(same(o, r) for r in render.options)]
+    parts += [option_entry(option) for option in command.options if option not in known and option.short != "-h"]
+    names = [rf"\fB{escaped(option.long)}\fR" for option in known if option.short != "-h"]
+    if names:
+        listed = ", ".join(names[:-1]) + " and " + names[-1] if len(names) > 1 else names[0]
+        parts += [".PP", f"And as for \\fBrender\\fR: {listed}."]
+    return parts
+
+
+def effect_entry(effect):
+    names = []
+    for parameter in effect["parameters"]:
+        if parameter["name"] not in names:
+            names.append(parameter["name"])
+    return [".TP", rf"\fB{escaped(effect['name'])}\fR", "Parameters: " + escaped(", ".join(names)) + ".", ".IP",
+            "Presets: " + escaped(", ".join(effect["presets"])) + "."]
+
+
+def text(program):
+    render = next(c for c in program.commands if c.words == ["render"])
+    lines = [r'.\" Written by the build of reelfx.', f'.TH REELFX 1 {DATE} "reelfx {program.version}" "User Commands"']
+    lines += [".SH NAME", "reelfx \\- " + escaped(program.help[0].lower() + program.help[1:].rstrip("."))]
+    lines += [".SH SYNOPSIS", ".nf", *(synopsis(command) for command in program.commands), ".fi"]
+    lines += [".SH DESCRIPTION", paragraphs(DESCRIPTION), ".SH COMMANDS"]
+    for command in sorted(program.commands, key=lambda c: c is not render):
+        lines += command_section(command, render)
+    lines += [".PP", r"Every command takes \fB\-h\fR, \fB\-\-help\fR and prints what it knows."]
+    lines += [".SH EFFECTS", *(line for effect in program.effects for line in effect_entry(effect))]
+    lines.append(".SH ENVIRONMENT")
+    for name, option in program.environment():
+        lines += [".TP", rf"\fB{name}\fR", rf"As \fB{escaped(option.long)}\fR, where that is not given."]
+    lines.append(".SH EXIT STATUS")
+    for code in program.exits:
+        lines += [".TP", rf"\fB{code['code']}\fR", sentence(code["detail"])]
+    lines += [".PP", escaped(program.interrupt), ".SH EXAMPLES"]
+    for what, command in EXAMPLES:
+        lines += [escaped(what), ".PP", ".RS 4", ".nf", escaped(command), ".fi", ".RE", ".PP"]
+    lines.pop()
+    lines += [".SH SEE ALSO", r"\fBffmpeg\fR(1), \fBmelt\fR(1)"]
+    text = "\n".join(lines)
+    kept = text.split(".nf\n")  # lines that are shown as they are end at ".fi"
+    filled = ["\n".join(wrapped(line) for line in part.split("\n")) for part in kept[:1]]
+    for part in kept[1:]:
+        shown, _, rest = part.partition("\n.fi")
+        filled.append(shown + "\n.fi" + "\n".join(wrapped(line) for line in rest.split("\n")))
+    return ".nf\n".join(filled) + "\n"
