@@ -17,7 +17,7 @@ using NativePath = std::string;
 
 // Binary, for reading; null when it cannot be opened or is a folder.
 [[nodiscard]] std::FILE* OpenForReading(const NativePath& path);
-// As text, emptied; null when it cannot be opened.
+// As text, emptied; null when it cannot be opened or is write-protected.
 [[nodiscard]] std::FILE* OpenForWriting(const NativePath& path);
 
 // Creates a new file in the folder of `path`, under a name of its own, opened for writing text. Null when the

@@ -27,6 +27,9 @@ std::FILE* OpenForReading(const NativePath& path) {
 
 // "t", as the host may have made binary files the default.
 std::FILE* OpenForWriting(const NativePath& path) {
+    // Where Windows' files lie on another system's disk, an administrator's rights would pass the protection by.
+    const DWORD attributes = GetFileAttributesW(path.c_str());
+    if (attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_READONLY) != 0) return nullptr;
     return _wfopen(path.c_str(), L"wt");
 }
 

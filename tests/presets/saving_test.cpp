@@ -5,7 +5,9 @@
 
 #include "presets/file_access.h"
 #include "tests/presets/temporary_folder.h"
-#ifndef _WIN32
+#ifdef _WIN32
+#include <windows.h>
+#else
 #include <sys/stat.h>
 #include <unistd.h>
 #endif
@@ -82,6 +84,16 @@ TEST(ReplaceTextFile, WritesInPlaceWhereTheFileCannotBeRenamedOver) {
         folder.Write("a", "old"));  // opened as programs do: shared, but not for deletion
     EXPECT_TRUE(ReplaceTextFile(folder.File("a").c_str(), WriteHello));
     EXPECT_EQ(folder.Read("a"), kHello);
+    EXPECT_EQ(folder.Count(), 1u);
+}
+
+TEST(ReplaceTextFile, KeepsAWriteProtectedFile) {
+    const TemporaryFolder folder;
+    const std::string name = folder.Write("a", "old");
+    ASSERT_NE(SetFileAttributesA(name.c_str(), FILE_ATTRIBUTE_READONLY), 0);
+    EXPECT_FALSE(ReplaceTextFile(name.c_str(), WriteHello));
+    SetFileAttributesA(name.c_str(), FILE_ATTRIBUTE_NORMAL);
+    EXPECT_EQ(folder.Read("a"), "old");
     EXPECT_EQ(folder.Count(), 1u);
 }
 #else
