@@ -14,6 +14,7 @@ const char* const kHostHelp =
     "  reelhost --all-presets NAME|all --size WxH [--rate FPS] [--frames N]\n"
     "  reelhost --list\n"
     "  reelhost --bench [--dll PATH]\n"
+    "  reelhost --soak FRAMES [--dll PATH]\n"
     "\n"
     "  --size         frames are raw BGRA of this size; without it they are YUV4MPEG2\n"
     "  --rate         frames per second (default 30, or the YUV4MPEG2 header's)\n"
@@ -22,12 +23,14 @@ const char* const kHostHelp =
     "  --hash         print the MD5 of each frame's BGRA instead of writing frames\n"
     "  --all-presets  hash the frames for every preset of an effect, or of all\n"
     "  --bench        measure the effects on 1920x1080 frames, beside memcpy\n"
+    "  --soak         render at least FRAMES 1920x1080 frames through all presets: is memory or time lost?\n"
     "  --dll          the library (default: beside this program)\n"
     "\n"
     "The state of the library's random sequence at the first frame goes to standard error, with "
     "--all-presets\n"
     "to standard output before each preset: reelfx --random-state plays the same damage.\n"
-    "Exit codes: 0 done, 1 the library or the output failed, 2 command line or input.\n";
+    "Exit codes: 0 done, 1 the library or the output failed or the soak shows growth, 2 command line or "
+    "input.\n";
 
 namespace {
 
@@ -75,6 +78,9 @@ HostOptions ReadHostOptions(int count, char** arguments) {
             options.mode = HostMode::kList;
         } else if (name == "--bench") {
             options.mode = HostMode::kBench;
+        } else if (name == "--soak") {
+            options.mode = HostMode::kSoak;
+            options.frameLimit = reader.Value(ParseInteger, "a number of frames");
         } else if (name == "--all-presets") {
             options.mode = HostMode::kAllPresets;
             options.effect = reader.Value();

@@ -11,7 +11,7 @@
 
 namespace velmora::hosts {
 
-enum class HostMode { kRender, kList, kAllPresets, kBench, kHelp };
+enum class HostMode { kRender, kList, kAllPresets, kBench, kSoak, kHelp };
 
 struct HostOptions {
     HostMode mode = HostMode::kRender;

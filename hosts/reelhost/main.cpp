@@ -5,6 +5,7 @@
 #include <fcntl.h>
 #include <io.h>
 #include <new>
+#include <stdexcept>
 
 #include "hosts/common/digest.h"
 #include "hosts/common/usage_error.h"
@@ -14,6 +15,7 @@
 #include "hosts/reelhost/frame_stream.h"
 #include "hosts/reelhost/host_options.h"
 #include "hosts/reelhost/random_state.h"
+#include "hosts/reelhost/soak.h"
 
 namespace velmora::hosts {
 namespace {
@@ -114,6 +116,9 @@ void Run(const HostOptions& options) {
     switch (options.mode) {
         case HostMode::kBench:
             PrintBench(library);
+            break;
+        case HostMode::kSoak:
+            if (!RunSoak(library, *options.frameLimit)) throw std::runtime_error("the soak shows growth");
             break;
         case HostMode::kList:
             List(library);
