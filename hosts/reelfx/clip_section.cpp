@@ -95,14 +95,14 @@ void ClipSection::Put(PacketPtr packet) {
     m_ready.push_back(std::move(item));
 }
 
-std::int64_t ClipSection::FrameCountGuess() const {
-    std::int64_t count = m_reader.FrameCountGuess();
-    const double rate = av_q2d(m_reader.FrameRateGuess());
-    if (m_options.endFrame) count = count > 0 ? std::min(count, *m_options.endFrame) : *m_options.endFrame;
-    if (count > 0) count -= m_options.firstFrame;
-    if (count > 0 && m_options.start) count -= std::llround(*m_options.start * rate);
-    if (m_options.duration) {
-        const std::int64_t asked = std::llround(*m_options.duration * rate);
+std::int64_t ClipSection::FrameCountGuess(const MediaReader& reader, const SectionOptions& options) {
+    std::int64_t count = reader.FrameCountGuess();
+    const double rate = av_q2d(reader.FrameRateGuess());
+    if (options.endFrame) count = count > 0 ? std::min(count, *options.endFrame) : *options.endFrame;
+    if (count > 0) count -= options.firstFrame;
+    if (count > 0 && options.start) count -= std::llround(*options.start * rate);
+    if (options.duration) {
+        const std::int64_t asked = std::llround(*options.duration * rate);
         count = count > 0 ? std::min(count, asked) : asked;
     }
     return std::max<std::int64_t>(count, 0);

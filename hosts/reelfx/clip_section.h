@@ -30,7 +30,8 @@ class ClipSection {
     PipelineItemPtr Next();
 
     // Frames that will come, as far as can be told; 0 when it cannot.
-    [[nodiscard]] std::int64_t FrameCountGuess() const;
+    [[nodiscard]] static std::int64_t FrameCountGuess(const MediaReader& reader,
+                                                      const SectionOptions& options);
 
   private:
     void TakeFrame(FramePtr frame);

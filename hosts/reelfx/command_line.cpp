@@ -73,6 +73,14 @@ EffectOptions ReadEffect(const TypedOptions& typed) {
     return effect;
 }
 
+ProgressKind ReadProgress(const TypedOptions& typed) {
+    if (typed.quiet || typed.progress == "none") return ProgressKind::kNone;
+    if (typed.progress == "auto") return ProgressKind::kAuto;
+    if (typed.progress == "text") return ProgressKind::kText;
+    if (typed.progress == "json") return ProgressKind::kJson;
+    throw UsageError("--progress takes auto, none, text or json, not \"" + typed.progress + '"');
+}
+
 RenderOptions ReadRender(const TypedOptions& typed) {
     RenderOptions options;
     options.input = ReadInput(typed);
@@ -95,7 +103,8 @@ RenderOptions ReadRender(const TypedOptions& typed) {
     options.mayOverwrite = typed.overwrite;
     options.withSound = !typed.noSound;
     options.withDigests = typed.digests;
-    options.isQuiet = typed.quiet;
+    options.isDryRun = typed.dryRun;
+    options.progress = ReadProgress(typed);
     return options;
 }
 
@@ -133,6 +142,8 @@ Command ReadCommandLine(int count, const char* const* arguments) {
         typed.list.effect = Given(typed.listEffect);
         return typed.list;
     }
+    if (app.got_subcommand("presets")) return typed.presets;
+    if (app.got_subcommand("info")) return InfoOptions{ReadInput(typed), typed.info.asJson};
     if (app.got_subcommand("frame")) return FrameCommand{ReadPicture(typed)};
     if (app.got_subcommand("sheet")) return SheetCommand{ReadPicture(typed)};
     if (const CLI::App* preset = app.get_subcommand("preset"); preset->parsed()) {
@@ -150,6 +161,12 @@ ExitCode Run(const TextCommand& command) {
 }
 ExitCode Run(const ListOptions& options) {
     return RunList(options);
+}
+ExitCode Run(const PresetsOptions& options) {
+    return RunPresets(options);
+}
+ExitCode Run(const InfoOptions& options) {
+    return RunInfo(options);
 }
 ExitCode Run(const RenderOptions& options) {
     return RunRender(options);

@@ -5,9 +5,11 @@
 #include <variant>
 
 #include "hosts/reelfx/failure.h"
+#include "hosts/reelfx/info_command.h"
 #include "hosts/reelfx/list_command.h"
 #include "hosts/reelfx/picture_commands.h"
 #include "hosts/reelfx/preset_command.h"
+#include "hosts/reelfx/presets_command.h"
 #include "hosts/reelfx/render_command.h"
 
 namespace velmora::hosts {
@@ -23,7 +25,7 @@ struct SheetCommand {
     PictureOptions options;
 };
 using Command = std::variant<TextCommand, ListOptions, RenderOptions, FrameCommand, SheetCommand,
-                             PresetShowOptions, PresetSaveOptions>;
+                             PresetShowOptions, PresetSaveOptions, PresetsOptions, InfoOptions>;
 
 // What the arguments ask for; opens and writes nothing. Throws UsageError.
 Command ReadCommandLine(int count, const char* const* arguments);

@@ -60,12 +60,23 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         ->type_name("N")
         ->envname("REELFX_CRF");
     render.add_option("--pix-fmt", typed.pixelFormat, "Pixel format; default: the source's")
-        ->type_name("NAME");
+        ->type_name("NAME")
+        ->envname("REELFX_PIX_FMT");
     render.add_flag("--raw-bgra", typed.output.isRawBgra, "OUT is raw BGRA frames");
     render.add_flag("--hash", typed.digests, "Print the MD5 of each frame's BGRA; OUT may be left out");
     render.add_flag("--no-sound", typed.noSound, "Leave sound and subtitles out");
     render.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
-    render.add_flag("--quiet,-q", typed.quiet, "No progress line");
+    render
+        .add_option(
+            "--progress", typed.progress,
+            "On standard error: text for people, a line of JSON each time for programs; auto is text at a "
+            "terminal, else none")
+        ->type_name("auto|none|text|json")
+        ->capture_default_str()
+        ->envname("REELFX_PROGRESS");
+    render.add_flag("--quiet,-q", typed.quiet, "As --progress none");
+    render.add_flag("--dry-run", typed.dryRun,
+                    "Check everything and tell what would be done, but write nothing");
 }
 
 CLI::App& AddPicture(CLI::App& app, TypedOptions& typed, const char* name, const char* what) {
@@ -102,6 +113,15 @@ void AddList(CLI::App& app, TypedOptions& typed) {
     CLI::App& list = *app.add_subcommand("list", "List effects, parameters and presets");
     list.add_option("EFFECT", typed.listEffect, "Only this effect")->type_name("EFFECT");
     list.add_flag("--json", typed.list.asJson, "As JSON");
+    CLI::App& presets = *app.add_subcommand("presets", "List an effect's presets with what each one sets");
+    presets.add_option("EFFECT", typed.presets.effect, "The effect")->type_name("EFFECT")->required();
+    presets.add_flag("--json", typed.presets.asJson, "As JSON");
+}
+
+void AddInfo(CLI::App& app, TypedOptions& typed) {
+    CLI::App& info = *app.add_subcommand("info", "Tell what a clip is and what rendering would do with it");
+    AddInput(info, typed);
+    info.add_flag("--json", typed.info.asJson, "As JSON");
 }
 
 std::string ExitCodesText() {
@@ -128,6 +148,7 @@ void AddCommands(CLI::App& app, TypedOptions& typed) {
         ->type_name("N")
         ->check(CLI::Range(1, 32));
     AddPreset(app, typed);
+    AddInfo(app, typed);
 }
 
 }  // namespace velmora::hosts

@@ -6,9 +6,11 @@
 #include <string>
 
 #include "hosts/reelfx/failure.h"
+#include "hosts/reelfx/info_command.h"
 #include "hosts/reelfx/list_command.h"
 #include "hosts/reelfx/picture_commands.h"
 #include "hosts/reelfx/preset_command.h"
+#include "hosts/reelfx/presets_command.h"
 #include "hosts/reelfx/render_command.h"
 
 namespace CLI {
@@ -45,11 +47,13 @@ struct TypedOptions {
     EffectOptions effect;
     OutputOptions output;
     std::string outPath, size, rate, seed = "0", randomState, preset, presetFile, frames, start, duration;
-    std::string format, codec, crf, pixelFormat;
+    std::string format, codec, crf, pixelFormat, progress = "auto";
     int threads = 0;
-    bool overwrite = false, noSound = false, digests = false, quiet = false;
+    bool overwrite = false, noSound = false, digests = false, quiet = false, dryRun = false;
     ListOptions list;
     std::string listEffect;
+    PresetsOptions presets;
+    InfoOptions info;
     PictureOptions picture;
     PresetShowOptions presetShow;
     PresetSaveOptions presetSave;

@@ -180,6 +180,32 @@ void MediaWriter::AddOtherStream(const AVStream& source) {
     m_others.emplace(source.index, std::move(other));
 }
 
+void MediaWriter::Rehearse(std::int64_t frames) {
+    if (m_holdsOnePicture && frames > 1) FailOnePicture();
+    const bool isOneFile = (m_container->oformat->flags & AVFMT_NOFILE) == 0;
+    int error = isOneFile ? avio_open_dyn_buf(&m_container->pb) : 0;
+    if (error >= 0) error = avformat_write_header(m_container.get(), m_options.Entries());
+    if (isOneFile && m_container->pb) {
+        std::uint8_t* header = nullptr;
+        avio_close_dyn_buf(m_container->pb, &header);
+        av_free(header);
+        m_container->pb = nullptr;
+    }
+    if (error < 0) Fail(error);
+}
+
+std::string MediaWriter::Description() const {
+    std::string text = m_name + ": " + m_container->oformat->name + ", " + m_encoder->codec->name + " " +
+                       av_get_pix_fmt_name(m_encoder->pix_fmt);
+    for (const auto& [index, other] : m_others) {
+        const AVCodecParameters& parameters = *other.stream->codecpar;
+        const char* kind = av_get_media_type_string(parameters.codec_type);
+        text += std::string(", ") + (kind ? kind : "stream") + " " + avcodec_get_name(parameters.codec_id) +
+                (other.transcoder ? " encoded anew" : " as it is");
+    }
+    return text;
+}
+
 void MediaWriter::Begin() {
     int error = 0;
     if ((m_container->oformat->flags & AVFMT_NOFILE) == 0) {
@@ -210,11 +236,7 @@ bool MediaWriter::TakesAsItIs(const AVFrame& source) const {
 }
 
 void MediaWriter::WriteFrame(FramePtr frame) {
-    if (m_holdsOnePicture && m_lastPts != AV_NOPTS_VALUE) {
-        throw Failure(kExitUsage, m_name +
-                                      ": holds one picture; give a pattern like frames-%04d.png, or choose "
-                                      "a frame with --frames");
-    }
+    if (m_holdsOnePicture && m_lastPts != AV_NOPTS_VALUE) FailOnePicture();
     const AVRational base = m_source.Picture().time_base;
     frame->pts = av_rescale_q(frame->pts - m_origin, base, m_encoder->time_base);
     // A source of uneven times may put two frames on one tick of a coarser base.
@@ -283,6 +305,12 @@ void MediaWriter::Finish() {
     }
     if (error >= 0) error = m_closeError;
     if (error < 0) Fail(error);
+}
+
+void MediaWriter::FailOnePicture() const {
+    throw Failure(kExitUsage, m_name +
+                                  ": holds one picture; give a pattern like frames-%04d.png, or choose "
+                                  "a frame with --frames");
 }
 
 void MediaWriter::Fail(int error) const {

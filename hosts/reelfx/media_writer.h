@@ -25,6 +25,11 @@ class MediaWriter {
 
     // The number of the first file where the output is a pattern of images; 1 if not called.
     void NumberImagesFrom(std::int64_t number) { m_options.Set("start_number", std::to_string(number)); }
+    // Checks what Begin and the frames would, as far as it shows without writing: that the container takes the
+    // streams, and that there is room for `frames` frames (0: not known). Nothing can be written afterwards.
+    void Rehearse(std::int64_t frames);
+    // "out.mp4: mp4, libx264 yuv420p, audio aac as it is"
+    [[nodiscard]] std::string Description() const;
     // Opens the output and writes what stands before the frames.
     void Begin();
 
@@ -60,6 +65,7 @@ class MediaWriter {
     void Encode(const AVFrame* frame);  // null: no more
     void Mux(AVPacket& packet, const AVStream& stream, AVRational timeBase);
     [[noreturn]] void Fail(int error) const;
+    [[noreturn]] void FailOnePicture() const;
 
     std::string m_name;
     const MediaReader& m_source;

@@ -41,21 +41,28 @@ fs::path MakeHiddenFolder(const fs::path& beside, const std::string& name) {
 
 }  // namespace
 
-OutputPlace::OutputPlace(const std::string& path, bool mayOverwrite)
-    : m_path(path), m_name(path == "-" ? "standard output" : path), m_mayOverwrite(mayOverwrite) {
+void CheckOutputPlace(const std::string& path, bool mayOverwrite) {
     if (path == "-") {
-        if (isatty(STDOUT_FILENO) != 0) {
-            throw Failure(kExitOutput,
-                          "standard output is a terminal; pipe it into a program or name a file");
-        }
-        return;
+        if (isatty(STDOUT_FILENO) == 0) return;
+        throw Failure(kExitOutput, "standard output is a terminal; pipe it into a program or name a file");
     }
     std::error_code ignored;
-    const fs::file_status status = fs::status(m_path, ignored);
+    const fs::file_status status = fs::status(path, ignored);
     if (fs::is_directory(status)) throw Failure(kExitOutput, path + ": is a folder");
     if (fs::exists(status) && !fs::is_regular_file(status)) return;
+    if (!mayOverwrite && SomethingStandsAt(path)) throw Failure(kExitOutput, ExistsText(path));
+    if (access(fs::absolute(path).parent_path().c_str(), W_OK | X_OK) != 0) {
+        throw Failure(kExitOutput, path + ": cannot be written: " + std::strerror(errno));
+    }
+}
+
+OutputPlace::OutputPlace(const std::string& path, bool mayOverwrite)
+    : m_path(path), m_name(path == "-" ? "standard output" : path), m_mayOverwrite(mayOverwrite) {
+    CheckOutputPlace(path, mayOverwrite);
+    std::error_code ignored;
+    const fs::file_status status = fs::status(m_path, ignored);
+    if (path == "-" || (fs::exists(status) && !fs::is_regular_file(status))) return;
     m_replaces = SomethingStandsAt(path);
-    if (m_replaces && !mayOverwrite) throw Failure(kExitOutput, ExistsText(m_name));
     // Absolute: a relative name with a colon would be taken for an address.
     const fs::path beside = fs::absolute(m_path).parent_path();
     m_folder = MakeHiddenFolder(beside, m_name);

@@ -7,6 +7,9 @@
 
 namespace velmora::hosts {
 
+// Throws what the constructor of OutputPlace would, as far as it shows without writing.
+void CheckOutputPlace(const std::string& path, bool mayOverwrite);
+
 class OutputPlace {
   public:
     // `path` is a file's name, a pattern of image files ("frames-%04d.png"), or "-" for standard output.

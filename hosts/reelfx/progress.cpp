@@ -36,24 +36,46 @@ std::string ProgressText(std::int64_t done, std::int64_t total, double seconds) 
     return line;
 }
 
-Progress::Progress(std::int64_t total, bool isQuiet)
-    : m_total(total), m_isShown(!isQuiet && isatty(STDERR_FILENO) != 0) {}
+std::string ProgressJson(std::int64_t done, std::int64_t total, double seconds, bool isEnd) {
+    const std::string frames =
+        total > 0 ? ",\"frames\":" + std::to_string(isEnd ? done : std::max(total, done)) : "";
+    char rest[96];
+    std::snprintf(rest, sizeof rest, ",\"seconds\":%.3f,\"fps\":%.1f,\"progress\":\"%s\"}", seconds,
+                  seconds > 0.0 ? static_cast<double>(done) / seconds : 0.0, isEnd ? "end" : "continue");
+    return "{\"frame\":" + std::to_string(done) + frames + rest;
+}
+
+Progress::Progress(std::int64_t total, ProgressKind kind) : m_total(total), m_kind(kind) {
+    if (kind != ProgressKind::kAuto) return;
+    m_kind = isatty(STDERR_FILENO) != 0 ? ProgressKind::kText : ProgressKind::kNone;
+}
 
 Progress::~Progress() {
-    if (!m_isShown || m_done == 0) return;
-    m_lastLine = {};
-    Update(m_done);
+    if (m_kind != ProgressKind::kText || m_done == 0) return;
+    Write(true);
     std::fputc('\n', stderr);
 }
 
 void Progress::Update(std::int64_t done) {
     m_done = done;
     const Clock::time_point now = Clock::now();
-    if (!m_isShown || now - m_lastLine < kBetweenLines) return;
+    if (now - m_lastLine < kBetweenLines) return;
     m_lastLine = now;
-    const double seconds = std::chrono::duration<double>(now - m_begin).count();
-    // The rest of a longer line before is wiped.
-    std::fprintf(stderr, "\r%s\x1b[K", ProgressText(done, m_total, seconds).c_str());
+    Write(false);
+}
+
+void Progress::End() {
+    if (m_kind == ProgressKind::kJson) Write(true);
+}
+
+void Progress::Write(bool isEnd) const {
+    const double seconds = std::chrono::duration<double>(Clock::now() - m_begin).count();
+    if (m_kind == ProgressKind::kText) {
+        // The rest of a longer line before is wiped.
+        std::fprintf(stderr, "\r%s\x1b[K", ProgressText(m_done, m_total, seconds).c_str());
+    } else if (m_kind == ProgressKind::kJson) {
+        std::fprintf(stderr, "%s\n", ProgressJson(m_done, m_total, seconds, isEnd).c_str());
+    }
     std::fflush(stderr);
 }
 

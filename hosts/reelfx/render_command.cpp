@@ -8,7 +8,7 @@
 #include "hosts/reelfx/interrupt.h"
 #include "hosts/reelfx/output_place.h"
 #include "hosts/reelfx/picture_turn.h"
-#include "hosts/reelfx/progress.h"
+#include "hosts/reelfx/render_plan.h"
 
 namespace velmora::hosts {
 namespace {
@@ -17,16 +17,32 @@ class RenderRun {
   public:
     explicit RenderRun(const RenderOptions& options)
         : m_options(options), m_choice(options.effect), m_reader(options.input) {
-        if (options.output) {
+        if (!options.output) return;
+        if (options.isDryRun) {
+            CheckOutputPlace(options.output->path, options.mayOverwrite);
+        } else {
             m_place.emplace(options.output->path, options.mayOverwrite);
-            m_writer.emplace(*options.output, m_place->Address(), m_reader, options.withSound);
-            if (options.section.firstFrame > 0) m_writer->NumberImagesFrom(options.section.firstFrame + 1);
-            m_writer->Begin();
         }
+        const std::string address = m_place ? m_place->Address() : options.output->path;
+        m_writer.emplace(*options.output, address, m_reader, options.withSound);
+        if (options.section.firstFrame > 0) m_writer->NumberImagesFrom(options.section.firstFrame + 1);
+    }
+
+    // Everything but the frames.
+    ExitCode Rehearse() {
+        const std::int64_t frames = ClipSection::FrameCountGuess(m_reader, m_options.section);
+        if (frames == 0 && m_reader.FrameCountGuess() > 0) FailEmpty();
+        if (m_writer) m_writer->Rehearse(frames);
+        const std::string text =
+            PlanText(m_options, m_choice, m_reader, m_writer ? &*m_writer : nullptr, ThreadCount());
+        std::fputs(text.c_str(), stdout);
+        return kExitDone;
     }
 
     ExitCode Run() {
-        RenderAll();
+        if (m_writer) m_writer->Begin();
+        Progress progress(ClipSection::FrameCountGuess(m_reader, m_options.section), m_options.progress);
+        RenderAll(progress);
         if (m_frames == 0 && Interrupts() == 0) FailEmpty();
         if (m_reader.DamagedPackets() > 0) {
             std::fprintf(stderr, "reelfx: %s: damaged in %lld places; what could be decoded was rendered\n",
@@ -37,6 +53,7 @@ class RenderRun {
                 m_writer->Finish();
                 m_place->Keep();
             }
+            progress.End();
             return kExitDone;
         }
         FinishInterrupted();
@@ -44,9 +61,8 @@ class RenderRun {
     }
 
   private:
-    void RenderAll() {
+    void RenderAll(Progress& progress) {
         ClipSection section(m_reader, m_options.section);
-        Progress progress(section.FrameCountGuess(), m_options.isQuiet);
         FramePipeline pipeline([&] { return section.Next(); }, MakeWorkers());
         while (const PipelineItemPtr item = pipeline.Next()) {
             if (Interrupts() > 1) throw Failure(kExitInterrupted, "interrupted; nothing was kept");
@@ -55,11 +71,15 @@ class RenderRun {
         }
     }
 
-    std::vector<FramePipeline::Worker> MakeWorkers() {
-        unsigned count = m_options.threads > 0 ? static_cast<unsigned>(m_options.threads)
-                                               : std::max(1u, std::thread::hardware_concurrency());
+    [[nodiscard]] unsigned ThreadCount() const {
         // A running sequence of random numbers goes through the frames one after the other.
-        if (m_choice.IsSequence()) count = 1;
+        if (m_choice.IsSequence()) return 1;
+        return m_options.threads > 0 ? static_cast<unsigned>(m_options.threads)
+                                     : std::max(1u, std::thread::hardware_concurrency());
+    }
+
+    std::vector<FramePipeline::Worker> MakeWorkers() {
+        const unsigned count = ThreadCount();
         const AVFrame& first = m_reader.FirstFrame();
         std::vector<FramePipeline::Worker> workers;
         for (unsigned i = 0; i < count; ++i) {
@@ -111,7 +131,8 @@ class RenderRun {
 }  // namespace
 
 ExitCode RunRender(const RenderOptions& options) {
-    return RenderRun(options).Run();
+    RenderRun run(options);
+    return options.isDryRun ? run.Rehearse() : run.Run();
 }
 
 }  // namespace velmora::hosts

@@ -8,6 +8,7 @@
 #include "hosts/reelfx/encoder_choice.h"
 #include "hosts/reelfx/failure.h"
 #include "hosts/reelfx/media_reader.h"
+#include "hosts/reelfx/progress.h"
 
 namespace velmora::hosts {
 
@@ -20,7 +21,8 @@ struct RenderOptions {
     bool mayOverwrite = false;
     bool withSound = true;
     bool withDigests = false;  // a line for each frame on standard output
-    bool isQuiet = false;      // no progress
+    bool isDryRun = false;     // checks and tells, but writes nothing
+    ProgressKind progress = ProgressKind::kAuto;
 };
 
 // Throws Failure or UsageError.

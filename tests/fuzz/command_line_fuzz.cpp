@@ -52,6 +52,12 @@ void Check(const TextCommand& command) {
     Require(!command.text.empty());
 }
 void Check(const ListOptions&) {}
+void Check(const PresetsOptions& options) {
+    Require(!options.effect.empty());
+}
+void Check(const InfoOptions& options) {
+    CheckInput(options.input);
+}
 void Check(const PresetShowOptions& options) {
     Require(!options.file.empty());
 }

@@ -87,5 +87,14 @@ TEST(Progress, TellsShareSpeedAndTimeLeft) {
     EXPECT_EQ(ProgressText(45, 40, 9.0), "frame 45/45  100%  5.0 fps  0:00 left");  // the count was a guess
 }
 
+TEST(Progress, ProgramsGetALineOfJson) {
+    EXPECT_EQ(ProgressJson(10, 40, 2.0, false),
+              R"({"frame":10,"frames":40,"seconds":2.000,"fps":5.0,"progress":"continue"})");
+    EXPECT_EQ(ProgressJson(45, 0, 9.0, true), R"({"frame":45,"seconds":9.000,"fps":5.0,"progress":"end"})");
+    // At the end the count is known.
+    EXPECT_EQ(ProgressJson(38, 40, 0.0, true),
+              R"({"frame":38,"frames":38,"seconds":0.000,"fps":0.0,"progress":"end"})");
+}
+
 }  // namespace
 }  // namespace velmora::hosts

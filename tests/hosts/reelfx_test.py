@@ -60,6 +60,70 @@ class Listing(ReelfxTest):
         self.assertIn('"Sepia"', text)
 
 
+    def test_presets_show_what_they_set(self):
+        presets = json.loads(reelfx("presets", "film look", "--json").stdout)
+        self.assertEqual(len(presets), 30)
+        for preset in presets[::10]:
+            with self.subTest(preset=preset["name"]):
+                told = [word for p in preset["parameters"] for word in ("-s", f"{p['name']}={p['value']}")]
+                self.assertEqual(self.digests("-e", "Film Look", *told, "--frames", ":1"),
+                                 self.digests("-e", "Film Look", "-p", preset["name"], "--frames", ":1"))
+        text = reelfx("presets", "Film Camera").stdout.decode()
+        self.assertIn("Train Ride\n  Y Jitter=", text)
+
+    def test_info_tells_what_probing_tells(self):
+        facts = json.loads(reelfx("info", clips.small, "--json").stdout)
+        self.assertEqual((facts["width"], facts["height"], facts["frames"], facts["codec"], facts["pixelFormat"]),
+                         (320, 180, 41, "h264", "yuv420p"))
+        (seconds,), = probe(clips.small, "-select_streams", "v", "-show_entries", "stream=duration")
+        self.assertAlmostEqual(facts["seconds"], float(seconds), places=3)
+        (matrix, rng), = probe(clips.small, "-select_streams", "v", "-show_entries", "stream=color_space,color_range")[:1]
+        self.assertEqual({facts["colour"]["matrix"], facts["colour"]["range"]}, {matrix, rng})
+        self.assertEqual([s["codec"] for s in facts["otherStreams"]], ["aac"])
+        self.assertIn("320x180", reelfx("info", clips.small).stdout.decode())
+
+    def test_info_notes_what_is_out_of_the_ordinary(self):
+        strange = clips.root / "strange.mkv"
+        ffmpeg("-f", "lavfi", "-i", "testsrc=size=64x48:rate=25:duration=0.2", "-vf",
+               "format=yuv422p10le,setfield=tff,setparams=color_trc=smpte2084", "-flags", "+ildct", "-c:v", "ffv1",
+               strange)
+        notes = " ".join(json.loads(reelfx("info", strange, "--json").stdout)["notes"])
+        for word in ("10 bits", "matrix is not told; smpte170m", "high dynamic range"):
+            self.assertIn(word, notes)
+
+
+class Telling(ReelfxTest):
+    def test_programs_get_progress_as_json(self):
+        done = reelfx("render", clips.small, self.out / "a.mkv", *CAMERA, "--progress", "json", "-j", 1)
+        lines = [json.loads(line) for line in done.stderr.decode().splitlines()]
+        self.assertEqual([line["progress"] for line in lines], ["continue"] * (len(lines) - 1) + ["end"])
+        frames = [line["frame"] for line in lines]
+        self.assertEqual((frames, frames[-1], lines[-1]["frames"]), (sorted(frames), 41, 41))
+        quiet = reelfx("render", clips.small, self.out / "b.mkv", *CAMERA, env=dict(os.environ, REELFX_PROGRESS="none"))
+        self.assertEqual(quiet.stderr, b"")
+
+    def test_a_failure_has_no_end(self):
+        done = reelfx("render", clips.small, "/dev/full", "--format", "matroska", *CAMERA, "--progress", "json")
+        self.assertEqual(done.returncode, 4)
+        self.assertNotIn(b'"end"', done.stderr)
+
+    def test_a_dry_run_tells_and_writes_nothing(self):
+        options = ("-e", "Film Look", "-p", "Sepia", "-s", "Tint=60", "--seed", 5, "--frames", "3:9", "-j", 2)
+        done = reelfx("render", clips.small, self.out / "a.mp4", *options, "--dry-run")
+        self.assertEqual((done.returncode, done.stderr, self.left_over()), (0, b"", []))
+        text = done.stdout.decode()
+        for words in ("320x180", "frame 3 up to but not including 9 (6 frames)", "Film Look, preset Sepia", "Tint=60",
+                      "seed 5", "mp4, libx264 yuv420p, audio aac as it is"):
+            self.assertIn(words, text)
+
+    def test_options_come_from_the_environment_too(self):
+        environment = dict(os.environ, REELFX_EFFECT="Film Camera", REELFX_SEED="7", REELFX_CODEC="ffv1",
+                           REELFX_PIX_FMT="yuv444p", REELFX_THREADS="2")
+        done = reelfx("render", clips.small, self.out / "a.mkv", "--dry-run", env=environment)
+        for words in ("Film Camera", "seed 7", "ffv1 yuv444p", "threads   2"):
+            self.assertIn(words, done.stdout.decode())
+
+
 class SameBytes(ReelfxTest):
     def test_threads_pieces_and_order_do_not_matter(self):
         whole = self.digests(*TRAIN, "--seed", 7, "--threads", 1)
@@ -239,6 +303,9 @@ class Refusing(ReelfxTest):
             (2, ["codec", "h265x"], (*render, *CAMERA, "--codec", "h265x")),
             (2, ["yuv9", "pixel format"], (*render, *CAMERA, "--pix-fmt", "yuv9")),
             (2, ["--format"], ("render", small, self.out / "out.unknown", *CAMERA)),
+            (2, ["--progress", "often"], (*render, *CAMERA, "--progress", "often")),
+            (2, ["Film Foo"], ("presets", "Film Foo")),
+            (3, ["missing.mp4"], ("info", clips.root / "missing.mp4")),
             (2, ["one picture"], ("render", small, self.out / "out.png", *CAMERA)),
             (2, [".png or .jpg"], ("frame", small, self.out / "out.bmp", *CAMERA)),
             (3, ["missing.mp4"], ("render", clips.root / "missing.mp4", out, *CAMERA)),
@@ -256,6 +323,8 @@ class Refusing(ReelfxTest):
         for code, words, args in rows:
             with self.subTest(args=args[1:]):
                 self.check(code, words, *args)
+                if args[0] == "render":
+                    self.check(code, words, *args, "--dry-run")
         self.assertEqual(self.left_over(), ["text.mp4"])
         self.assertEqual(text.read_text(), "no film")
 

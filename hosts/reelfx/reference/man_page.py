@@ -15,6 +15,13 @@ clip the same as for the whole. Another seed gives other damage.
 Names of effects, presets and parameters are taken in any case of the letters. A slider takes a number of its range, a
 colour #RRGGBB, a menu an item's text or its number from 0, a check box on or off. Settings are applied in this order: the
 built-in preset, the preset file, each --set.
+
+With --progress json each line on standard error that begins with a brace is an object with the fields frame (frames done),
+frames (how many there are as far as is known), seconds and fps (since the start), and progress: continue, or end once all is
+done and written. A command that fails writes no end, but one line of text.
+
+With --hash each frame gives a line on standard output: the word frame, its number in the clip from 0, the word md5, and the
+MD5 of its rows of blue, green, red and alpha bytes, as FFmpeg's framemd5 gives it for the pixel format bgra.
 """
 
 EXAMPLES = (

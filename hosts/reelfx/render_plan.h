@@ -1,0 +1,16 @@
+// What `reelfx render --dry-run` tells: everything that a run would do.
+#pragma once
+
+#include <string>
+
+#include "hosts/reelfx/clip_section.h"
+#include "hosts/reelfx/media_writer.h"
+#include "hosts/reelfx/render_command.h"
+
+namespace velmora::hosts {
+
+// Lines of text, each with its end. `writer` null: digests only.
+std::string PlanText(const RenderOptions& options, const EffectChoice& choice, const MediaReader& reader,
+                     const MediaWriter* writer, unsigned threads);
+
+}  // namespace velmora::hosts
