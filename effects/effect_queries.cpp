@@ -1,5 +1,6 @@
 #include "effects/effect_queries.h"
 
+#include "plugin/float_guard.h"
 #include "plugin/params.h"
 #include "render/rounding.h"
 
@@ -23,6 +24,7 @@ void DescribeMenu(const ParamRow& param, ParamDescriptor& descriptor) noexcept {
 // The fewer scratches, the faster the depth rises with them: the little slider of a simple effect goes from
 // a few faint scratches to many deep ones. The range of the amount is the host's promise, not ours.
 float DepthOfAmount(float amount) noexcept {
+    const FloatGuard guard;
     const float rest = render::Narrow(1.0 - SanitizeNormalised(amount));
     return render::Narrow(1.0 - double{rest} * rest);
 }

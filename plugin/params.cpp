@@ -2,12 +2,14 @@
 
 #include <cstring>
 
+#include "plugin/float_guard.h"
 #include "render/rounding.h"
 
 namespace velmora {
 namespace {
 
 ValueCell ReadCell(IVideoHost& host, std::uint32_t index, ParamKind kind) noexcept {
+    const FloatGuard guard;  // whatever the host does to the processor's state while it answers
     ValueCell cell = {};
     host.GetParamValue(index, &cell, kind);
     return cell;

@@ -23,6 +23,8 @@ class FakeHost final : public IVideoHost {
     std::vector<Request> requests;
     std::vector<std::intptr_t> forwarded;  // arguments of operations 4 and 5
     const Guid* lastQueried = nullptr;
+    // Leaves the processor truncating, in 24 bits and without denormals when it answers.
+    bool leavesFloatsStrange = false;
 
     void SetNumber(std::uint32_t index, float number) { values[index].number = number; }
     void SetBits(std::uint32_t index, std::uint32_t bits) { values[index].bits = bits; }
@@ -40,8 +42,17 @@ class FakeHost final : public IVideoHost {
         if (value == values.end()) return false;
         cell->value = value->second;
         cell->kind = kind;
+        if (leavesFloatsStrange) SetStrangeFloats();
         return true;
     }
+    static void SetStrangeFloats() {
+        const std::uint32_t vector = kStrangeVectorControl;
+        const std::uint16_t x87 = kStrangeX87Control;
+        __asm__ __volatile__("ldmxcsr %0\n\tfldcw %1" : : "m"(vector), "m"(x87));
+    }
+    static constexpr std::uint32_t kStrangeVectorControl = 0x9F80 | 0x6000 | 0x0040;
+    static constexpr std::uint16_t kStrangeX87Control = 0x0C7F;
+
     bool VM_CALL HostOperation4(std::intptr_t a, std::intptr_t b, std::intptr_t c) override {
         forwarded = {a, b, c};
         return true;
