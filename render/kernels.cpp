@@ -3,8 +3,6 @@
 #include <algorithm>
 #include <cstring>
 
-#include "render/shade.h"
-
 namespace velmora::render {
 namespace {
 
@@ -18,12 +16,20 @@ void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) 
     for (std::int32_t x = 0; x < width; ++x) out[x] = MixWithGrey(in[x], weight);
 }
 
-void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
+std::uint8_t Lightened(std::uint32_t channel, WearFactor factor) noexcept {
+    return static_cast<std::uint8_t>(channel +
+                                     ((((255 - channel) * 256 * factor.times >> 16) + factor.plus) >> 8));
+}
+
+void WearRow(const Bgra* in, Bgra* out, std::int32_t width, WearStrips strips,
              std::uint32_t channels) noexcept {
-    const bool onlyBlue = channels == kBlueChannel;
-    for (std::int32_t x = 0; x < width; ++x) {
-        const Bgra pixel = in[x], shaded = ShadePixel(pixel, fractions[x]);
-        out[x] = onlyBlue ? Bgra{shaded.blue, pixel.green, pixel.red, pixel.alpha} : shaded;
+    const WearFactor* factors = nullptr;
+    for (std::int32_t x = 0, left = 0; x < width; ++x, --left) {
+        if (left == 0) factors = strips.Next(), left = strips.Width();
+        const Bgra pixel = in[x];
+        const WearFactor factor = *factors++, others = channels == kBlueChannel ? WearFactor{0, 0} : factor;
+        out[x] = {Lightened(pixel.blue, factor), Lightened(pixel.green, others), Lightened(pixel.red, others),
+                  pixel.alpha};
     }
 }
 
@@ -37,14 +43,9 @@ void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) no
     ToneInPasses(TablesRow, MixRow, in, out, width, tone);
 }
 
-void WearStrips(const Bgra* in, Bgra* out, std::int32_t width, const float* const* strips,
-                std::int32_t stripWidth, std::uint32_t channels) noexcept {
-    WearLinedUp(WearRow, in, out, width, strips, stripWidth, channels);
-}
-
 }  // namespace
 
-const RowKernels kPlainKernels = {ToneRow, WearRow, CopyRow, CopyRow, NothingToEnd, WearStrips};
+const RowKernels kPlainKernels = {ToneRow, WearRow, CopyRow, CopyRow, NothingToEnd};
 
 void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept {
     blue = b;

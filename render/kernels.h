@@ -7,13 +7,12 @@
 
 #include <array>
 #include <cstdint>
-#include <cstring>
 #include <limits>
 
 #include "render/colour.h"
 #include "render/cpu.h"
 #include "render/image.h"
-#include "render/pictures.h"
+#include "render/wear_factors.h"
 
 namespace velmora::render {
 
@@ -45,14 +44,12 @@ struct Tone {
     [[nodiscard]] bool IsActive() const noexcept { return before != nullptr || mixes || after != nullptr; }
 };
 
-inline constexpr std::int32_t kMostStrips = 40;
-
 struct RowKernels {
     // All steps of a tone.
     void (*tone)(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
-    // Lightens the channels of each pixel by its fraction (0..1): render/shade.h. `channels` is a pixel word
-    // with 0xFF at each channel that is to change, 0 at alpha.
-    void (*wear)(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
+    // Lightens the channels of each pixel by its factor (render/wear_factors.h). `channels` is a pixel word with
+    // 0xFF at each channel that is to change, 0 at alpha.
+    void (*wear)(const Bgra* in, Bgra* out, std::int32_t width, WearStrips strips,
                  std::uint32_t channels) noexcept;
     // Copies a row.
     void (*copy)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
@@ -60,10 +57,6 @@ struct RowKernels {
     // `out`. After the last row of a frame `endStream` makes the rows seen by other threads.
     void (*stream)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
     void (*endStream)() noexcept;
-    // The same with the fractions in strips of `stripWidth` (16..kWidestWear) numbers, from the left, at most
-    // kMostStrips; from each of them kWidestWear numbers may be read, whatever lies behind its own.
-    void (*wearStrips)(const Bgra* in, Bgra* out, std::int32_t width, const float* const* strips,
-                       std::int32_t stripWidth, std::uint32_t channels) noexcept;
 };
 
 // `form` must be one that the processor can run.
@@ -84,21 +77,19 @@ void ToneInPasses(Tables&& tables, Mix&& mix, const Bgra* in, Bgra* out, std::in
     if (tone.after != nullptr) tables(in, out, width, *tone.after);
 }
 
-// Wear's strips are narrow: their fractions are lined up first, then a kernel runs over all of them.
-template <typename Wear>
-void WearLinedUp(Wear&& wear, const Bgra* in, Bgra* out, std::int32_t width, const float* const* strips,
-                 std::int32_t stripWidth, std::uint32_t channels) noexcept {
-    std::array<float, kMostStrips * kWidestWear + kWidestWear> fractions;
-    for (std::int32_t x = 0; x < width; x += stripWidth) {
-        // A fixed size is copied at once; the next strip covers what is too much.
-        std::memcpy(fractions.data() + x, *strips++, sizeof(float) * kWidestWear);
-    }
-    wear(in, out, width, fractions.data(), channels);
-}
-
 // The forms, each in its own file.
 // What the forms without byte permutations look tables up with.
 void TablesRowByWords(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept;
+
+// Asks for pixels that a row's kernel comes to soon, where they lie in memory. The processor does so by itself as
+// long as a row is all that it reads; wear's factors, read here and there, keep it from that. Past a frame's end
+// nothing happens.
+inline void FetchAhead(const Bgra* pixels) noexcept {
+    constexpr std::uintptr_t kBytes = 5120;
+    constexpr int kToRead = 0, kIntoSecondCache = 2;
+    __builtin_prefetch(reinterpret_cast<const void*>(reinterpret_cast<std::uintptr_t>(pixels) + kBytes),
+                       kToRead, kIntoSecondCache);
+}
 
 // How many pixels before the first one at a multiple of `bytes`; as good as never when none lies at one.
 [[nodiscard]] inline std::int32_t PixelsToBoundary(const Bgra* pixels, std::uintptr_t bytes) noexcept {
@@ -106,9 +97,6 @@ void TablesRowByWords(const Bgra* in, Bgra* out, std::int32_t width, const Chann
     constexpr std::int32_t kNever = std::numeric_limits<std::int32_t>::max();
     return away % sizeof(Bgra) == 0 ? static_cast<std::int32_t>(away / sizeof(Bgra)) : kNever;
 }
-
-// The largest float below a half.
-inline constexpr float kBelowHalf = 0x1.fffffep-2f;
 
 extern const RowKernels kPlainKernels;
 extern const RowKernels kSse2Kernels;

@@ -39,37 +39,65 @@ VM_AVX2 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
     kSse2Kernels.tone(in + x, out + x, width - x, Tone{nullptr, true, weight, nullptr});
 }
 
-// As in the 16-byte form, a channel of eight pixels.
-template <int kShift>
-VM_AVX2 inline __m256i Lightened(__m256i room, __m256 fraction) noexcept {
-    const __m256i channel = _mm256_and_si256(_mm256_srli_epi32(room, kShift), _mm256_set1_epi32(255));
-    const __m256 product = _mm256_mul_ps(fraction, _mm256_cvtepi32_ps(channel));
-    const __m256 lifted = _mm256_add_ps(product, _mm256_set1_ps(kBelowHalf));
-    return _mm256_slli_epi32(_mm256_cvttps_epi32(lifted), kShift);
+// As in the 16-byte form, eight factors.
+class FactorReader {
+  public:
+    static constexpr std::int32_t kFactors = 8;
+
+    explicit FactorReader(const WearStrips& strips) noexcept
+        : m_strips(strips), m_next(m_strips.Next()), m_left(m_strips.Width()) {}
+
+    VM_AVX2 __m256i Read() noexcept {
+        const __m256i factors = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(m_next));
+        m_next += kFactors;
+        m_left -= kFactors;
+        if (m_left >= 0) return factors;
+        const __m256i places = _mm256_setr_epi32(1, 2, 3, 4, 5, 6, 7, 8);
+        const __m256i theirs = _mm256_cmpgt_epi32(places, _mm256_set1_epi32(kFactors + m_left));
+        m_next = m_strips.Next() - m_left;
+        m_left += m_strips.Width();
+        const __m256i others = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(m_next - kFactors));
+        return _mm256_blendv_epi8(factors, others, theirs);
+    }
+
+  private:
+    WearStrips m_strips;
+    const WearFactor* m_next;
+    std::int32_t m_left;  // of the strip
+};
+
+VM_AVX2 inline __m256i Worn(__m256i pixels, __m256i factors, __m256i channels) noexcept {
+    const __m256i times = _mm256_shufflehi_epi16(_mm256_shufflelo_epi16(factors, 0xA0), 0xA0);
+    const __m256i plus = _mm256_shufflehi_epi16(_mm256_shufflelo_epi16(factors, 0xF5), 0xF5);
+    const __m256i upper = _mm256_set1_epi16(static_cast<short>(0xFF00));
+    const __m256i room = _mm256_andnot_si256(pixels, channels);
+    const __m256i blueRed = _mm256_add_epi16(_mm256_mulhi_epu16(_mm256_slli_epi16(room, 8), times), plus);
+    const __m256i green = _mm256_add_epi16(_mm256_mulhi_epu16(_mm256_and_si256(room, upper), times), plus);
+    return _mm256_add_epi8(pixels,
+                           _mm256_or_si256(_mm256_srli_epi16(blueRed, 8), _mm256_and_si256(green, upper)));
 }
 
-VM_AVX2 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
+VM_AVX2 void WearRow(const Bgra* in, Bgra* out, std::int32_t width, WearStrips strips,
                      std::uint32_t channels) noexcept {
     const __m256i changing = _mm256_set1_epi32(static_cast<int>(channels));
+    FactorReader factors(strips);
     std::int32_t x = 0;
     for (; x + 8 <= width; x += 8) {
+        FetchAhead(in + x);
         const __m256i pixels = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x));
-        const __m256 fraction = _mm256_loadu_ps(fractions + x);
-        __m256i result = pixels;
-        if (_mm256_testz_si256(_mm256_castps_si256(fraction), _mm256_castps_si256(fraction)) == 0) {
-            const __m256i room = _mm256_andnot_si256(pixels, changing);
-            result = _mm256_add_epi32(result, Lightened<0>(room, fraction));
-            result = _mm256_add_epi32(result, Lightened<8>(room, fraction));
-            result = _mm256_add_epi32(result, Lightened<16>(room, fraction));
-        }
-        _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), result);
+        _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), Worn(pixels, factors.Read(), changing));
     }
-    kSse2Kernels.wear(in + x, out + x, width - x, fractions + x, channels);
+    if (x == width) return;
+    const __m256i places = _mm256_setr_epi32(0, 1, 2, 3, 4, 5, 6, 7);
+    const __m256i tail = _mm256_cmpgt_epi32(_mm256_set1_epi32(width - x), places);
+    const __m256i pixels = _mm256_maskload_epi32(reinterpret_cast<const int*>(in + x), tail);
+    _mm256_maskstore_epi32(reinterpret_cast<int*>(out + x), tail, Worn(pixels, factors.Read(), changing));
 }
 
 VM_AVX2 void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
     std::int32_t x = 0;
     for (; x + 16 <= width; x += 16) {
+        FetchAhead(in + x);
         const __m256i first = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x));
         const __m256i second = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x + 8));
         _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), first);
@@ -96,13 +124,8 @@ void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) no
     ToneInPasses(TablesRowByWords, MixRow, in, out, width, tone);
 }
 
-void WearStrips(const Bgra* in, Bgra* out, std::int32_t width, const float* const* strips,
-                std::int32_t stripWidth, std::uint32_t channels) noexcept {
-    WearLinedUp(WearRow, in, out, width, strips, stripWidth, channels);
-}
-
 }  // namespace
 
-const RowKernels kAvx2Kernels = {ToneRow, WearRow, CopyRow, StreamRow, EndStream, WearStrips};
+const RowKernels kAvx2Kernels = {ToneRow, WearRow, CopyRow, StreamRow, EndStream};
 
 }  // namespace velmora::render

@@ -25,6 +25,7 @@ void TablesRowByWords(const Bgra* in, Bgra* out, std::int32_t width, const Chann
         // Two pixels a load where words are that wide.
         using Word = std::conditional_t<sizeof(void*) == 8, std::uint64_t, std::uint32_t>;
         Word words[4 * sizeof(Bgra) / sizeof(Word)];
+        FetchAhead(in + x);
         std::memcpy(words, in + x, sizeof words);
         for (Word& word : words) {
             Word result = LookUp(static_cast<std::uint32_t>(word), tables);
@@ -66,33 +67,60 @@ void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) 
     kPlainKernels.tone(in + x, out + x, width - x, Tone{nullptr, true, weight, nullptr});
 }
 
-// One channel of four pixels, at `shift` of the words in `room`, of what is missing to white: R(a room). The
-// largest number below a half rounds halves up in every product that has a float's 24 bits.
-template <int kShift>
-__m128i Lightened(__m128i room, __m128 fraction) noexcept {
-    const __m128i channel = _mm_and_si128(_mm_srli_epi32(room, kShift), _mm_set1_epi32(255));
-    const __m128 product = _mm_mul_ps(fraction, _mm_cvtepi32_ps(channel));
-    return _mm_slli_epi32(_mm_cvttps_epi32(_mm_add_ps(product, _mm_set1_ps(kBelowHalf))), kShift);
+// The next four factors over a row.
+class FactorReader {
+  public:
+    static constexpr std::int32_t kFactors = 4;
+
+    explicit FactorReader(const WearStrips& strips) noexcept
+        : m_strips(strips), m_next(m_strips.Next()), m_left(m_strips.Width()) {}
+
+    __m128i Read() noexcept {
+        const __m128i factors = _mm_loadu_si128(reinterpret_cast<const __m128i*>(m_next));
+        m_next += kFactors;
+        m_left -= kFactors;
+        if (m_left >= 0) return factors;
+        // The strip has ended within them: the others come from the next one.
+        const __m128i theirs = _mm_cmpgt_epi32(_mm_setr_epi32(1, 2, 3, 4), _mm_set1_epi32(kFactors + m_left));
+        m_next = m_strips.Next() - m_left;
+        m_left += m_strips.Width();
+        const __m128i others = _mm_loadu_si128(reinterpret_cast<const __m128i*>(m_next - kFactors));
+        return _mm_or_si128(_mm_andnot_si128(theirs, factors), _mm_and_si128(theirs, others));
+    }
+
+  private:
+    WearStrips m_strips;
+    const WearFactor* m_next;
+    std::int32_t m_left;  // of the strip
+};
+
+// Blue and red, then green, each in the upper byte of its 16 bits.
+__m128i Worn(__m128i pixels, __m128i factors, __m128i channels) noexcept {
+    const __m128i times = _mm_shufflehi_epi16(_mm_shufflelo_epi16(factors, 0xA0), 0xA0);
+    const __m128i plus = _mm_shufflehi_epi16(_mm_shufflelo_epi16(factors, 0xF5), 0xF5);
+    const __m128i upper = _mm_set1_epi16(static_cast<short>(0xFF00));
+    const __m128i room = _mm_andnot_si128(pixels, channels);
+    const __m128i blueRed = _mm_add_epi16(_mm_mulhi_epu16(_mm_slli_epi16(room, 8), times), plus);
+    const __m128i green = _mm_add_epi16(_mm_mulhi_epu16(_mm_and_si128(room, upper), times), plus);
+    return _mm_add_epi8(pixels, _mm_or_si128(_mm_srli_epi16(blueRed, 8), _mm_and_si128(green, upper)));
 }
 
-// The channels' sums stay below 256, so they can be added in place without a carry into the next channel.
-void WearRow(const Bgra* in, Bgra* out, std::int32_t width, const float* fractions,
+void WearRow(const Bgra* in, Bgra* out, std::int32_t width, WearStrips strips,
              std::uint32_t channels) noexcept {
     const __m128i changing = _mm_set1_epi32(static_cast<int>(channels));
+    FactorReader factors(strips);
     std::int32_t x = 0;
     for (; x + 4 <= width; x += 4) {
+        FetchAhead(in + x);
         const __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + x));
-        const __m128 fraction = _mm_loadu_ps(fractions + x);
-        __m128i result = pixels;
-        if (_mm_movemask_ps(_mm_cmpneq_ps(fraction, _mm_setzero_ps())) != 0) {
-            const __m128i room = _mm_andnot_si128(pixels, changing);
-            result = _mm_add_epi32(result, Lightened<0>(room, fraction));
-            result = _mm_add_epi32(result, Lightened<8>(room, fraction));
-            result = _mm_add_epi32(result, Lightened<16>(room, fraction));
-        }
-        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), result);
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), Worn(pixels, factors.Read(), changing));
     }
-    kPlainKernels.wear(in + x, out + x, width - x, fractions + x, channels);
+    if (x == width) return;
+    Bgra rest[4] = {};
+    std::copy(in + x, in + width, rest);
+    const __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(rest));
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(rest), Worn(pixels, factors.Read(), changing));
+    std::copy(rest, rest + (width - x), out + x);
 }
 
 void CopyRow(const Bgra* in, Bgra* out, std::int32_t width) noexcept {
@@ -118,13 +146,8 @@ void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) no
     ToneInPasses(TablesRowByWords, MixRow, in, out, width, tone);
 }
 
-void WearStrips(const Bgra* in, Bgra* out, std::int32_t width, const float* const* strips,
-                std::int32_t stripWidth, std::uint32_t channels) noexcept {
-    WearLinedUp(WearRow, in, out, width, strips, stripWidth, channels);
-}
-
 }  // namespace
 
-const RowKernels kSse2Kernels = {ToneRow, WearRow, CopyRow, StreamRow, EndStream, WearStrips};
+const RowKernels kSse2Kernels = {ToneRow, WearRow, CopyRow, StreamRow, EndStream};
 
 }  // namespace velmora::render

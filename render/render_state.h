@@ -10,7 +10,7 @@
 #include "render/random.h"
 #include "render/row_memory.h"
 #include "render/scratches.h"
-#include "render/wear_fractions.h"
+#include "render/wear_factors.h"
 
 namespace velmora::render {
 
@@ -45,7 +45,7 @@ struct RenderState {
     ContrastCache contrast;
     ScratchMemory scratches;
     GlowMemory glow;
-    WearFractions wear;
+    WearFactors wear;
     RowMemory row;
 };
 

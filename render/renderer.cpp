@@ -77,7 +77,7 @@ FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings, 
     plan.tint = PrepareTint(settings);
     plan.wear = PrepareWear(settings, context.Width(), random);
     if (plan.wear.IsActive()) state.wear.Set(plan.wear.Picture(), plan.wear.Amount());
-    plan.wearFractions = &state.wear;
+    plan.wearFactors = &state.wear;
     plan.scratches = PrepareScratches(settings, plan.jitter.Dx(), context, state.scratches, form);
     plan.spots = PrepareSpots(settings, context.Destination().Region(), random);
     return plan;

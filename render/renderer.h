@@ -38,7 +38,7 @@ struct FramePlan {
     ColourStage colour;
     TintStage tint;
     WearStage wear;
-    const WearFractions* wearFractions = nullptr;
+    const WearFactors* wearFactors = nullptr;
     ScratchStage scratches;
     SpotStage spots;
 };

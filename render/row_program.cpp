@@ -114,21 +114,15 @@ void RowProgram::RunTone(const Bgra* in, Bgra* out, std::int32_t width) const no
 }
 
 void RowProgram::Wear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
-    std::array<const float*, kMostStrips> strips;
-    const std::uint32_t channels = m_plan.wear.BlueOnly() ? kBlueChannel : kColourChannels;
-    const std::int32_t stripWidth = m_plan.wear.Picture().width;
-    std::int32_t start = 0;
-    std::size_t count = 0;
-    const auto flush = [&](std::int32_t end) {
-        m_kernels.wearStrips(in + start, out + start, end - start, strips.data(), stripWidth, channels);
-        start = end;
-        count = 0;
-    };
-    m_plan.wear.ForEachStrip(width, y, [&](std::int32_t x, std::int32_t columns, std::int32_t wearRow) {
-        strips[count++] = m_plan.wearFractions->From(wearRow);
-        if (count == strips.size()) flush(x + columns);
+    const WearStage& wear = m_plan.wear;
+    const WearFactors& factors = *m_plan.wearFactors;
+    m_kernels.wear(in, out, width, factors.Over(wear.RowsOver(y)),
+                   wear.BlueOnly() ? kBlueChannel : kColourChannels);
+    if (!factors.HasOddBytes()) return;
+    // These the kernel has left as they are.
+    wear.ForEachByte(width, y, [&](std::int32_t x, std::uint8_t byte) {
+        if (factors.IsOdd(byte)) wear.ShadeUnder(byte, out[x]);
     });
-    if (start != width) flush(width);
 }
 
 }  // namespace velmora::render

@@ -108,7 +108,10 @@ VM_AVX512 void ToneRowAvx512(const Bgra* in, Bgra* out, std::int32_t width, cons
     std::int32_t x = 0;
     for (; x + kBlock <= width; x += kBlock) {
         Block b;
-        for (int i = 0; i < 4; ++i) b.v[i] = _mm512_loadu_si512(in + x + 16 * i);
+        for (int i = 0; i < 4; ++i) {
+            FetchAhead(in + x + 16 * i);
+            b.v[i] = _mm512_loadu_si512(in + x + 16 * i);
+        }
         b = Toned(b, tone);
         for (int i = 0; i < 4; ++i) _mm512_storeu_si512(out + x + 16 * i, b.v[i]);
     }

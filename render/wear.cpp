@@ -23,20 +23,16 @@ WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random&
     return stage;
 }
 
+void WearStage::ShadeUnder(std::uint8_t byte, Bgra& pixel) const noexcept {
+    const Bgra shaded = ShadePixel(pixel, WearFraction(byte, m_amount));
+    pixel = BlueOnly() ? Bgra{shaded.blue, pixel.green, pixel.red, pixel.alpha} : shaded;
+}
+
 void WearStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
-    ForEachStrip(width, y, [&](std::int32_t start, std::int32_t count, std::int32_t row) {
-        const std::uint8_t* bytes = m_picture->pixels + row * m_picture->rowStep;
-        for (std::int32_t i = 0; i < count; ++i) {
-            const Bgra pixel = in[start + i];
-            const float fraction = WearFraction(bytes[i], m_amount);
-            Bgra& result = out[start + i];
-            if (m_channels == kWearAllChannels) {
-                result = ShadePixel(pixel, fraction);
-            } else {
-                result = pixel;
-                result.blue = ShadeChannel(pixel.blue, fraction);
-            }
-        }
+    ForEachByte(width, y, [&](std::int32_t x, std::uint8_t byte) {
+        Bgra pixel = in[x];
+        ShadeUnder(byte, pixel);
+        out[x] = pixel;
     });
 }
 

@@ -4,6 +4,7 @@
 // Fraction of a pixel under wear byte b: (b / 255) * wear, in single precision.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 
 #include "render/image.h"
@@ -18,6 +19,27 @@ namespace velmora::render {
     return Narrow(double{Narrow(byte / 255.0)} * amount);
 }
 
+// The rows of the wear picture over one row of a frame: one for each strip, from the left.
+//
+// They are drawn anew for each row of the frame, from where the frame's draws began: a strip count that grows with
+// the width needs no room, and a draw costs next to nothing beside a strip's pixels.
+class WearRows {
+  public:
+    // For row `y` of a frame, under a picture of `height` rows.
+    WearRows(Random starts, std::int32_t height, std::int32_t y) noexcept
+        : m_starts(starts), m_height(height), m_down(y % height) {}
+
+    std::int32_t Next() noexcept {
+        const std::int32_t row = m_starts.Draw(0, m_height - 3) + m_down;
+        return row < m_height ? row : row - m_height;
+    }
+
+  private:
+    Random m_starts;
+    std::int32_t m_height;
+    std::int32_t m_down;
+};
+
 class WearStage {
   public:
     [[nodiscard]] bool IsActive() const noexcept { return m_active; }
@@ -25,18 +47,21 @@ class WearStage {
     // The plain form, row `y` of the processed rectangle. `in` may be `out`.
     void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
-    // Calls visit(x, count, row) for each strip of row `y`, from the left: the strip's first column, its width
-    // and the row of the wear picture over it.
+    // One pixel under a byte of the wear picture.
+    void ShadeUnder(std::uint8_t byte, Bgra& pixel) const noexcept;
+
+    // Calls visit(x, byte) for each byte of the wear picture over row `y`, from the left.
     template <typename Visit>
-    void ForEachStrip(std::int32_t width, std::int32_t y, Visit&& visit) const noexcept {
-        Random starts = m_starts;
-        const std::int32_t height = m_picture->height;
-        const std::int32_t down = y % height;
-        for (std::int32_t x = 0; x < width; x += m_picture->width) {
-            const std::int32_t row = starts.Draw(0, height - 3) + down;
-            const std::int32_t count = width - x < m_picture->width ? width - x : m_picture->width;
-            visit(x, count, row < height ? row : row - height);
+    void ForEachByte(std::int32_t width, std::int32_t y, Visit&& visit) const noexcept {
+        WearRows rows = RowsOver(y);
+        for (std::int32_t start = 0; start < width; start += m_picture->width) {
+            const std::uint8_t* bytes = m_picture->pixels + rows.Next() * m_picture->rowStep;
+            const std::int32_t end = std::min(start + m_picture->width, width);
+            for (std::int32_t x = start; x < end; ++x) visit(x, *bytes++);
         }
+    }
+    [[nodiscard]] WearRows RowsOver(std::int32_t y) const noexcept {
+        return {m_starts, m_picture->height, y};
     }
     [[nodiscard]] const GreyPicture& Picture() const noexcept { return *m_picture; }
     [[nodiscard]] float Amount() const noexcept { return m_amount; }
@@ -48,8 +73,6 @@ class WearStage {
     bool m_active = false;
     std::int32_t m_channels = kWearAllChannels;
     const GreyPicture* m_picture = nullptr;
-    // The strips' start rows are drawn anew for each row from where the frame's draws began: a strip count
-    // that grows with the width needs no room, and a draw costs next to nothing beside a strip's pixels.
     Random m_starts;
     float m_amount = 0.0f;
 };

@@ -7,11 +7,12 @@
 #include <algorithm>
 #include <cstring>
 #include <functional>
+#include <limits>
 #include <random>
 #include <vector>
 
 #include "render/shade.h"
-#include "render/wear.h"
+#include "render/wear_factors.h"
 
 namespace velmora::render {
 namespace {
@@ -79,33 +80,20 @@ TEST(RowKernels, TonesAreEqualInAllForms) {
 }
 
 TEST(RowKernels, WearIsEqualInAllForms) {
+    constexpr std::int32_t kHeight = 9;
     std::mt19937 numbers(3);
-    std::vector<float> fractions(kWidest);
-    // Runs without wear, as pictures have them.
-    for (float& f : fractions) f = numbers() % 3 == 0 ? static_cast<float>(numbers() % 1000) / 999.0f : 0.0f;
-    std::fill(fractions.begin() + 20, fractions.begin() + 48, 0.0f);
-    for (const std::uint32_t channels : {kColourChannels, kBlueChannel}) {
-        ExpectEqualForms(
-            [&](const RowKernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
-                kernels.wear(in, out, width, fractions.data(), channels);
-            },
-            true);
+    std::vector<WearFactor> factors(kHeight * kWidestWear + 2 * WearStrips::kRoom);
+    for (WearFactor& f : factors) {
+        f = {static_cast<std::uint16_t>(numbers()), static_cast<std::uint16_t>(numbers() % 256)};
     }
-}
-
-TEST(RowKernels, WearInStripsIsEqualInAllForms) {
-    std::mt19937 numbers(5);
-    std::vector<float> fractions(kWidest + 2 * kWidestWear);
-    for (float& f : fractions) f = static_cast<float>(numbers() % 1000) / 999.0f;
     for (const std::int32_t stripWidth : {16, 25, 50, 64}) {
-        std::vector<const float*> strips;
-        for (std::int32_t x = 0; x < kWidest; x += stripWidth)
-            strips.push_back(fractions.data() + numbers() % kWidest);
-        ExpectEqualForms(
-            [&](const RowKernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
-                kernels.wearStrips(in, out, width, strips.data(), stripWidth, kColourChannels);
-            },
-            true);
+        for (const std::uint32_t channels : {kColourChannels, kBlueChannel}) {
+            const WearStrips strips(WearRows(Random(7), kHeight, 5), factors.data() + WearStrips::kRoom,
+                                    stripWidth);
+            ExpectEqualForms([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
+                                 std::int32_t width) { kernels.wear(in, out, width, strips, channels); },
+                             true);
+        }
     }
 }
 
@@ -121,34 +109,29 @@ TEST(RowKernels, CopiesAreEqualInAllForms) {
         false);
 }
 
-// Each pixel of a row holds one wear byte's fraction and, in its channels, one level in three orders.
-TEST(RowKernels, WearRoundsEveryProductAsShadingDoes) {
-    constexpr std::int32_t kLevels = 256;
+TEST(WearFactor, AddsWhatShadingDoes) {
     constexpr int kAmounts = 499;
-    std::vector<Bgra> row(kLevels), expected(kLevels), result(kLevels);
-    std::vector<float> fractions(kLevels);
+    int bytes = 0, odd = 0;
     for (int step = 0; step <= kAmounts; ++step) {
         const float amount = static_cast<float>(step) / static_cast<float>(kAmounts);
-        for (int byte = 0; byte < kLevels; ++byte) {
+        for (int byte = 0; byte < 256; ++byte, ++bytes) {
             const float fraction = WearFraction(static_cast<std::uint8_t>(byte), amount);
-            std::fill(fractions.begin(), fractions.end(), fraction);
-            for (std::size_t c = 0; c < row.size(); ++c) {
-                const auto level = static_cast<std::uint8_t>(c);
-                row[c] = {level, static_cast<std::uint8_t>(level + 85),
-                          static_cast<std::uint8_t>(level + 170), level};
-            }
-            std::uint8_t shaded[kLevels];
-            for (int c = 0; c < kLevels; ++c)
-                shaded[c] = ShadeChannel(static_cast<std::uint8_t>(c), fraction);
-            for (std::size_t c = 0; c < row.size(); ++c) {
-                expected[c] = {shaded[row[c].blue], shaded[row[c].green], shaded[row[c].red], row[c].alpha};
-            }
-            for (const Form form : FasterForms()) {
-                KernelsOf(form).wear(row.data(), result.data(), kLevels, fractions.data(), kColourChannels);
-                ASSERT_EQ(std::memcmp(result.data(), expected.data(), sizeof(Bgra) * row.size()), 0)
-                    << static_cast<int>(form) << ' ' << byte << ' ' << amount;
+            const auto factor = WearFactorOf(fraction);
+            odd += !factor;
+            for (int channel = 0; factor && channel < 256; ++channel) {
+                const std::uint32_t added =
+                    ((static_cast<std::uint32_t>(255 - channel) * 256 * factor->times >> 16) +
+                     factor->plus) >>
+                    8;
+                ASSERT_EQ(static_cast<std::uint32_t>(channel) + added,
+                          ShadeChannel(static_cast<std::uint8_t>(channel), fraction))
+                    << byte << ' ' << amount;
             }
         }
+    }
+    EXPECT_LT(odd, bytes / 1000);
+    for (const float beyond : {-0.1f, 1.5f, std::numeric_limits<float>::quiet_NaN()}) {
+        EXPECT_FALSE(WearFactorOf(beyond)) << beyond;
     }
 }
 

@@ -97,6 +97,28 @@ TEST(Roads, GiveTheSameBytes) {
     }
 }
 
+// Few amounts give bytes without a factor.
+TEST(Roads, GiveTheSameBytesUnderOddWear) {
+    int found = 0;
+    for (int step = 1; step <= 1000; ++step) {
+        StageSettings settings;
+        settings.wear = static_cast<float>(step) / 1000.0f;
+        WearFactors factors;
+        factors.Set(WearPicture(settings.wearPattern), settings.wear);
+        if (!factors.HasOddBytes()) continue;
+        ++found;
+        for (const std::int32_t channels : {kWearAllChannels, kWearBlueOnly}) {
+            settings.wearChannels = channels;
+            GuardedFrame source{Geometry{130, 40}}, expected{Geometry{130, 40}}, result = expected;
+            source.FillRandom(1);
+            Render(source, expected, settings, kReference, 0.0);
+            Render(source, result, settings, {}, 0.0);
+            ASSERT_EQ(result.Bytes(), expected.Bytes()) << step;
+        }
+    }
+    EXPECT_GT(found, 5);
+}
+
 TEST(Roads, InPlaceIsAsIfTheSourceHadBeenCopiedFirst) {
     for (std::uint32_t seed = 0; seed < 200; ++seed) {
         SCOPED_TRACE(seed);

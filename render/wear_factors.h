@@ -1,0 +1,73 @@
+// The numbers of a wear picture at one amount that the row kernels of wear multiply by.
+//
+// A wear byte's fraction (render/wear.h) has a factor when for every room 0..255 that a channel may have to white
+//   ((room × 256 × times >> 16) + plus) >> 8
+// is what shading by the fraction adds: integers of 16 bits then give the bytes that are defined by products in
+// single precision. `times` lies within a few units of 65536 times the fraction, `plus` near a half of 256. One byte
+// in some thousands has no factor, as has every fraction outside 0..1: the pixels under such bytes are odd, and are
+// shaded one by one.
+#pragma once
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <optional>
+
+#include "render/pictures.h"
+#include "render/wear.h"
+
+namespace velmora::render {
+
+struct WearFactor {
+    std::uint16_t times;
+    std::uint16_t plus;
+};
+
+// The factor of a fraction, if there is one.
+[[nodiscard]] std::optional<WearFactor> WearFactorOf(float fraction) noexcept;
+
+// The factors over one row of a frame, strip by strip from the left.
+class WearStrips {
+  public:
+    // A row kernel may read as many numbers before a strip's first one and behind its last one.
+    static constexpr std::int32_t kRoom = 16;
+
+    // `factors` is a picture of `width` >= kRoom columns, its rows lying one after the other, with room before the
+    // first and behind the last.
+    WearStrips(const WearRows& rows, const WearFactor* factors, std::int32_t width) noexcept
+        : m_rows(rows), m_factors(factors), m_width(width) {}
+
+    [[nodiscard]] std::int32_t Width() const noexcept { return m_width; }
+    const WearFactor* Next() noexcept { return m_factors + m_rows.Next() * m_width; }
+
+  private:
+    WearRows m_rows;
+    const WearFactor* m_factors;
+    std::int32_t m_width;
+};
+
+// Kept from frame to frame, since the amount seldom changes.
+class WearFactors {
+  public:
+    // No wear picture has more pixels.
+    static constexpr std::int32_t kMostPixels = 50 * 300;
+
+    // Serves `picture` at `amount` from now on.
+    void Set(const GreyPicture& picture, float amount) noexcept;
+
+    [[nodiscard]] WearStrips Over(const WearRows& rows) const noexcept {
+        return {rows, m_factors.data() + WearStrips::kRoom, m_picture->width};
+    }
+    // Whether the kernels leave pixels out: those under bytes that are odd.
+    [[nodiscard]] bool HasOddBytes() const noexcept { return m_hasOddBytes; }
+    [[nodiscard]] bool IsOdd(std::uint8_t byte) const noexcept { return m_isOdd[byte]; }
+
+  private:
+    const GreyPicture* m_picture = nullptr;
+    float m_amount = 0.0f;
+    bool m_hasOddBytes = false;
+    std::array<bool, 256> m_isOdd{};
+    std::array<WearFactor, kMostPixels + 2 * WearStrips::kRoom> m_factors{};
+};
+
+}  // namespace velmora::render
