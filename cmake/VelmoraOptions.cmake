@@ -21,6 +21,11 @@ target_compile_options(velmora_options INTERFACE
   $<$<CXX_COMPILER_ID:GNU>:-Wno-restrict>
   # Bytes must not depend on the build: no contraction into fused operations, no relaxed maths.
   -ffp-contract=off -fno-fast-math)
+# Nor must what is shipped depend on the folder or the time of its build.
+if(CMAKE_BUILD_TYPE STREQUAL "Release")
+  target_compile_options(velmora_options INTERFACE
+    -ffile-prefix-map=${CMAKE_SOURCE_DIR}=. -ffile-prefix-map=${CMAKE_BINARY_DIR}=build)
+endif()
 if(VELMORA_PLAIN_ROAD)
   target_compile_definitions(velmora_options INTERFACE VELMORA_PLAIN_ROAD=1)
 endif()
@@ -45,5 +50,7 @@ if(WIN32)
     UNICODE _UNICODE NOMINMAX WIN32_LEAN_AND_MEAN STRICT _WIN32_WINNT=0x0601)
   # Runtime libraries are linked in: the product depends on Windows' own modules only.
   target_link_options(velmora_options INTERFACE -static -static-libgcc -static-libstdc++)
-  target_link_options(velmora_options INTERFACE $<$<CONFIG:Release>:-s>)
+  target_link_options(velmora_options INTERFACE $<$<CONFIG:Release>:-s> -Wl,--no-insert-timestamp)
+else()
+  target_link_options(velmora_options INTERFACE -Wl,-z,relro -Wl,-z,now)
 endif()
