@@ -1,11 +1,12 @@
 # The commands of daily work. Each sets up first what it needs; see CONTRIBUTING.md.
 
-.PHONY: help setup build test demo demo-ffmpeg install-user uninstall-user format tidy clean
+.PHONY: help setup build test package demo demo-ffmpeg install-user uninstall-user format tidy clean
 
 help:
 	@echo 'make demo            build everything and see footage through the library and the native core'
 	@echo 'make demo-ffmpeg     see footage through the frei0r plug-in in FFmpeg'
-	@echo 'make install-user    put the frei0r plug-ins where FFmpeg, Kdenlive and Shotcut look in your home'
+	@echo 'make package         make the installer, the zip, the Debian package and the tarball in build/packages'
+	@echo 'make install-user    put reelfx and the frei0r plug-ins where programs look in your home'
 	@echo 'make uninstall-user  take them away again'
 	@echo 'make test            build everything and run all tests'
 	@echo 'make setup           install packages and 32-bit Wine; the other commands do it by themselves'
@@ -28,6 +29,9 @@ demo: setup
 
 demo-ffmpeg: setup
 	scripts/demo-ffmpeg
+
+package: setup
+	scripts/package
 
 install-user: setup
 	scripts/build native

@@ -1,0 +1,102 @@
+"""The tarball and the Debian package: their bytes, their contents, and what a user does with them on this machine.
+
+Environment: VELMORA_DIST the results of the native build, WORK a folder of this test's own.
+"""
+
+import gzip
+import hashlib
+import os
+import re
+import subprocess
+import tempfile
+from pathlib import Path
+
+from packing import CLIP, DIST, check_digest_list, check_no_build_paths, files_below, pack_twice, run
+
+PRODUCT = "velmora-reel-effects-1.0-linux-x86_64"
+PLUGINS = [f"velmora_film_{name}" for name in ("camera", "damage", "express", "look", "pro")]
+DEB_FILES = ["usr/bin/reelfx", "usr/share/man/man1/reelfx.1.gz", "usr/share/bash-completion/completions/reelfx",
+             "usr/share/zsh/vendor-completions/_reelfx", "usr/share/fish/vendor_completions.d/reelfx.fish",
+             *(f"usr/lib/frei0r-1/{name}.so" for name in PLUGINS),
+             *(f"usr/share/mlt-7/frei0r/filter_frei0r.{name}.yml" for name in PLUGINS),
+             *(f"usr/share/kdenlive/effects/{name}.xml" for name in PLUGINS),
+             *(f"usr/share/doc/velmora-reel-effects/{name}" for name in
+               ("copyright", "changelog.gz", "changelog.Debian.gz", "help/start.html"))]
+
+
+def digests(reelfx, *environment):
+    return run("env", *environment, reelfx, "render", CLIP, "--effect", "Film Pro", "--preset", "Super 8", "--seed", "7",
+               "--duration", "0.3", "--hash")
+
+
+def check_tarball(path, work, expected):
+    folder = work / "a folder with spaces"
+    folder.mkdir()
+    run("tar", "-C", folder, "-xf", path)
+    unpacked = folder / PRODUCT
+    check_digest_list(unpacked)
+    check_no_build_paths(unpacked)
+    assert digests(unpacked / "reelfx") == expected
+
+    home = work / "home"
+    home.mkdir()
+    kept = home / ".local" / "share" / "kdenlive" / "effects" / "mine.xml"
+    kept.parent.mkdir(parents=True)
+    kept.write_text("a user's own")
+    environment = {"HOME": str(home), "PATH": os.environ["PATH"]}
+    said = run(unpacked / "install.sh", env=environment)
+    installed = {str(home / name) for name in files_below(home)} - {str(kept)}
+    listing = str(home / ".local/share/velmora-reel-effects/installed-files")
+    assert set(re.findall(r"^  (.*)$", said, re.M)) == installed - {listing}, said
+    assert digests(home / ".local/bin/reelfx") == expected
+    # FFmpeg finds the plug-in by itself: its frames are those of reelfx.
+    run("ffmpeg", "-nostdin", "-v", "error", "-i", CLIP, "-vf", "frei0r=velmora_film_pro:super8|7", "-frames:v", "2",
+        "-f", "null", "-", env=environment)
+    run(unpacked / "install.sh", "--remove", env=environment)
+    assert list(files_below(home)) == [kept.relative_to(home).as_posix()], files_below(home)
+
+
+def check_deb(path, work, expected):
+    unpacked = work / "deb"
+    run("dpkg-deb", "-R", path, unpacked)
+    files = files_below(unpacked)
+    assert not set(DEB_FILES) - set(files), set(DEB_FILES) - set(files)
+    sums = dict(reversed(line.split("  ", 1)) for line in (unpacked / "DEBIAN/md5sums").read_text().splitlines())
+    assert sums == {name: hashlib.md5((unpacked / name).read_bytes()).hexdigest()
+                    for name in files if not name.startswith("DEBIAN/")}
+    control = (unpacked / "DEBIAN" / "control").read_text()
+    for library in ("libavcodec", "libavformat", "libcairo2", "libtinyxml", "libc6"):
+        assert re.search(rf"^Depends: .*\b{library}", control, re.M), f"{library} is not among the dependencies"
+    owners = {line.split()[1] for line in run("dpkg-deb", "-c", path).splitlines()}
+    assert owners == {"root/root"}, owners
+    for name in files:
+        if name.endswith(".gz"):  # the time in a compressed file's head
+            assert (unpacked / name).read_bytes()[4:8] == bytes(4), name
+            gzip.decompress((unpacked / name).read_bytes())
+    check_no_build_paths(unpacked)
+    assert digests(unpacked / "usr/bin/reelfx") == expected
+
+
+def check_lintian(path):
+    """No errors and no warnings."""
+    words = ["lintian", "--fail-on", "error,warning", "--allow-root", path]
+    done = subprocess.run(words, capture_output=True, text=True)
+    assert done.returncode == 0 and not done.stdout.strip(), done.stdout + done.stderr
+
+
+def main():
+    with tempfile.TemporaryDirectory(prefix="linux-", dir=os.environ["WORK"]) as folder:
+        work = Path(folder)
+        packages = pack_twice(work, "pack-linux", "pack-debian")
+        assert set(packages) == {f"{PRODUCT}.tar.xz", "velmora-reel-effects_1.0-1_amd64.deb"}, packages
+        tarball, deb = packages[f"{PRODUCT}.tar.xz"], packages["velmora-reel-effects_1.0-1_amd64.deb"]
+        expected = digests(DIST / "reelfx")
+        assert len(set(expected.splitlines())) > 3, expected
+        check_tarball(tarball, work, expected)
+        check_deb(deb, work, expected)
+        check_lintian(deb)
+        for name, path in sorted(packages.items()):
+            print(f"{name}: {path.stat().st_size} bytes, sha256 {hashlib.sha256(path.read_bytes()).hexdigest()}")
+
+
+main()

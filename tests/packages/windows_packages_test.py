@@ -1,0 +1,204 @@
+"""The zip and the installer for Windows: their bytes, their contents, and an installation's life in a fresh Wine prefix.
+
+Environment: VELMORA_DIST the results of the Windows build, WORK a folder of this test's own.
+"""
+
+import hashlib
+import os
+import re
+import subprocess
+import sys
+import tempfile
+import time
+import zipfile
+from pathlib import Path
+
+from packing import CLIP, DIST, ROOT, check_digest_list, check_no_build_paths, files_below, pack_twice, run
+
+PRODUCT = "velmora-reel-effects-1.0"
+WINE = ROOT / "scripts" / "wine32"
+MUST_HAVE = """VMReelEffects.dll VMLang.dll VMReelEffectsLang.xml resources.dll VMReelEffects.chm reelhost.exe
+    frei0r/velmora_film_camera.dll frei0r/velmora_film_look.dll frei0r/velmora_film_damage.dll
+    frei0r/velmora_film_express.dll frei0r/velmora_film_pro.dll sdk/host_api.h sdk/example_host.cpp docs/hosts.txt
+    docs/help/start.html README.txt LICENSE.txt third-party.txt SHA256SUMS""".split()
+UNINSTALL = r"Software\Microsoft\Windows\CurrentVersion\Uninstall"
+OWN_KEY = UNINSTALL + r"\VelmoraReelEffects"
+EXIT_IN_USE = 2
+
+
+class Prefix:
+    """A Windows of its own, with a Wine server of its own: neither sees anything of those that other tests use."""
+
+    def __init__(self, folder):
+        self.folder = folder
+        self.drive = folder / "drive_c"
+        self._environment = {**os.environ, "WINEPREFIX": str(folder)}
+        run(WINE, "--prepare", env=self._environment)
+
+    def start(self, program, *arguments, **options):
+        return subprocess.Popen([WINE, program, *arguments], env=self._environment, **options)
+
+    def run(self, program, *arguments):
+        return self.start(program, *arguments).wait(timeout=120)
+
+    def end(self):
+        run(WINE, "--stop", env=self._environment)
+
+    def files(self):
+        """Files and folders, but for what is inside folders for temporary ones: the system empties them when it likes."""
+        names = {path.relative_to(self.drive).as_posix() for path in self.drive.rglob("*")}
+        return {name for name in names if not re.search(r"(^|/)temp/", name, re.I)}
+
+    def registry(self):
+        """{(key, value's line)} of what programs write to; a key without values has the line ""."""
+        lines = set()
+        for number, root in enumerate(("HKCU", r"HKLM\Software")):
+            file = self.drive / f"export{number}.reg"
+            run(WINE, "reg", "export", root, f"C:\\{file.name}", "/y", env=self._environment)
+            text = file.read_text("utf-16").replace("\\\n", "")
+            file.unlink()
+            for block in re.split(r"\n(?=\[)", text)[1:]:
+                key, *values = block.splitlines()
+                lines |= {(key.strip("[]"), value) for value in ["", *values]}
+        # Wine keeps notes of its own there, of colours and sizes.
+        return {line for line in lines if "\\Software\\Wine\\" not in line[0]}
+
+    def write_registry(self, key, name, value):
+        assert self.run("reg", "add", key, "/v", name, "/d", value, "/f") == 0
+
+
+class Installation:
+    """One installation in a prefix: its folder, and the root of the registry that its entry is below."""
+
+    def __init__(self, prefix, setup, folder, root, *switches):
+        self.prefix, self.setup, self.root, self.switches = prefix, setup, root, switches
+        self.folder = prefix.drive.joinpath(*folder.split("\\"))
+        self.name = "C:\\" + folder
+
+    def install(self, *place):
+        return self.prefix.run(self.setup, "/S", *self.switches, *place)
+
+    def uninstall(self):
+        """Ends when all is gone: the uninstaller leaves the work to a copy of itself, and its folder to the last."""
+        assert self.prefix.run(self.folder / "uninstall.exe", "/S") == 0
+        for _ in range(600):
+            if not (self.folder / "uninstall.exe").exists() and not self.entry():
+                return
+            time.sleep(0.1)
+        sys.exit(f"{self.folder} is not uninstalled")
+
+    def entry(self):
+        """The uninstaller's entry {name: value}, or nothing."""
+        query = self.prefix.start("reg", "query", f"{self.root}\\{OWN_KEY}", stdout=subprocess.PIPE, stderr=subprocess.DEVNULL)
+        # As the console writes it: letters that its code page has not are lost.
+        text = query.communicate(timeout=120)[0].decode("cp437", "replace")
+        return dict(re.findall(r"^ +(\S+) +REG_\w+ +(.*?)\r?$", text, re.M))
+
+
+def check_zip(path, work):
+    with zipfile.ZipFile(path) as archive:
+        names = archive.namelist()
+        assert archive.testzip() is None and names == sorted(names), names
+        assert len({entry.date_time for entry in archive.infolist()}) == 1, "files of several times"
+        archive.extractall(work)
+    assert [entry.name for entry in Path(work).iterdir()] == [PRODUCT]
+    unpacked = work / PRODUCT
+    files = files_below(unpacked)
+    missing = set(MUST_HAVE) - set(files)
+    assert not missing, missing
+    assert {name: files.get(name) for name in files_below(DIST)} == files_below(DIST), "not what was built"
+    check_digest_list(unpacked)
+    check_no_build_paths(unpacked)
+    for module in [*unpacked.glob("*.dll"), *unpacked.glob("*.exe"), *unpacked.glob("frei0r/*.dll")]:
+        head = module.read_bytes()[:0x400]
+        stamp = head.index(b"PE\0\0") + 8
+        assert head[stamp:stamp + 4] == bytes(4), f"{module.name} bears the time of its build"
+    return files
+
+
+def digests(start, host):
+    """Frames of the clip through the library beside a host. Film Look draws no random numbers: runs are comparable."""
+    frames = subprocess.run(["ffmpeg", "-nostdin", "-v", "error", "-i", CLIP, "-frames:v", "3", "-fps_mode",
+                             "passthrough", "-pix_fmt", "bgra", "-s", "320x180", "-f", "rawvideo", "-"], capture_output=True, check=True).stdout
+    process = start(host, "--effect", "Film Look", "--preset", "Sepia", "--size", "320x180", "--hash",
+                    stdin=subprocess.PIPE, stdout=subprocess.PIPE, stderr=subprocess.DEVNULL)
+    lines = process.communicate(frames, timeout=120)[0].splitlines()
+    assert process.returncode == 0 and len(lines) == 3, lines
+    return lines
+
+
+def check_in_use(installation):
+    """Neither setup nor uninstaller may change anything while a program has the library loaded."""
+    before = files_below(installation.folder)
+    user = installation.prefix.start(installation.folder / "reelhost.exe", "--effect", "Film Look", "--size", "64x48",
+                                     "--hash", stdin=subprocess.PIPE, stdout=subprocess.PIPE, stderr=subprocess.DEVNULL)
+    user.stdin.write(bytes(64 * 48 * 4))
+    user.stdin.flush()
+    user.stdout.read(1)  # the first digest: the library is at work
+    assert installation.install() == EXIT_IN_USE
+    # "_?=" keeps the uninstaller where it is, so that its exit code can be seen.
+    place = f"_?={installation.name}".split(" ")
+    assert installation.prefix.run(installation.folder / "uninstall.exe", "/S", *place) == EXIT_IN_USE
+    user.communicate(timeout=120)
+    assert files_below(installation.folder) == before and installation.entry()
+
+
+def check_installation(installation, packed, expected, place=()):
+    """Installs, renders, installs once more over it, and finds what the package holds and an entry that fits."""
+    for _ in range(2):
+        assert installation.install(*place) == 0
+        place = ()  # where it lies is known from its entry
+        files = files_below(installation.folder)
+        assert files.pop("uninstall.exe", None)
+        assert files == packed, set(files.items()) ^ set(packed.items())
+    entry = installation.entry()
+    assert entry["DisplayName"] == "Velmora Reel Effects" and entry["DisplayVersion"] == "1.0", entry
+    assert digests(installation.prefix.start, installation.folder / "reelhost.exe") == expected
+
+
+def check_life(prefix, setup, packed, expected):
+    """One installation for the user, in a folder with spaces and letters of two scripts, and one for all, side by side."""
+    user = Installation(prefix, setup, "\u00dcbung mit Film\\\u6620\u753b Effects", "HKCU", "/CurrentUser")
+    everyone = Installation(prefix, setup, "Program Files\\Velmora\\Reel Effects", "HKLM", "/AllUsers")
+    files, registry = prefix.files(), prefix.registry()
+
+    # A word each: the installer takes the rest of its line, which must not be quoted, for the folder.
+    check_installation(user, packed, expected, place=f"/D={user.name}".split(" "))
+    check_in_use(user)
+    check_installation(everyone, packed, expected)
+
+    preset = user.folder / "docs" / "My look.fxprelb"
+    preset.write_text("a user's own")
+    setting = ("HKEY_CURRENT_USER\\Software\\Velmora\\Common", '"Knobs Drag Vertical"="yes"')
+    prefix.write_registry(setting[0], "Knobs Drag Vertical", "yes")
+
+    user.uninstall()
+    assert everyone.entry() and digests(prefix.start, everyone.folder / "reelhost.exe") == expected
+    everyone.uninstall()
+    kept = {preset.relative_to(prefix.drive).as_posix()}
+    kept |= {parent.as_posix() for parent in Path(*kept).parents} - {"."}
+    assert prefix.files() - files == kept, prefix.files() ^ files ^ kept
+    assert files <= prefix.files()
+    # The key below which all programs have their entries is the system's: made when first needed, and never removed.
+    left = {line for line in prefix.registry() - registry if line[1] or not line[0].endswith(UNINSTALL)}
+    assert left == {setting, (setting[0], ""), (setting[0].removesuffix("\\Common"), "")}, left
+    assert registry <= prefix.registry(), registry - prefix.registry()
+
+
+def main():
+    with tempfile.TemporaryDirectory(prefix="windows-", dir=os.environ["WORK"]) as folder:
+        work = Path(folder)
+        packages = pack_twice(work, "pack-windows")
+        assert set(packages) == {f"{PRODUCT}-win32.zip", f"{PRODUCT}-setup.exe"}, packages
+        packed = check_zip(packages[f"{PRODUCT}-win32.zip"], work / "zip")
+        expected = digests(lambda *words, **options: subprocess.Popen([WINE, *words], **options), DIST / "reelhost.exe")
+        prefix = Prefix(work / "prefix")
+        try:
+            check_life(prefix, packages[f"{PRODUCT}-setup.exe"], packed, expected)
+        finally:
+            prefix.end()
+        for name, path in sorted(packages.items()):
+            print(f"{name}: {path.stat().st_size} bytes, sha256 {hashlib.sha256(path.read_bytes()).hexdigest()}")
+
+
+main()
