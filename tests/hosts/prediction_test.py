@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Frames of "Film Pro" without diffusion and scratches, told byte for byte by a second telling of the rules.
+"""Frames of all effects without diffusion and scratches, told byte for byte by a second telling of the rules.
 
 Written apart from the renderer, pixel by pixel and with exact arithmetic: what the two agree on is the rules, not the
 code. Narrowing to single precision is done through packed bytes.
@@ -45,9 +45,13 @@ class Generator:
 
 
 class Settings:
-    """What the renderer reads from sliders that hold `shown` values."""
+    """What the renderer reads from the controls of an effect that hold `shown` values."""
 
-    def __init__(self, shown):
+    def __init__(self, effect, shown):
+        if effect == "Film Express":  # one jitter for both directions, a flicker rate of its own
+            jitter = shown.get("Jitter", 0)
+            shown = {"Y Jitter": jitter, "X Jitter": jitter, "Flicker Rate": 20, **shown}
+
         def percent(name):  # 0..1
             slider = single(100.0 * single(shown.get(name, 0) / 100))
             return single(slider / 100)
@@ -69,7 +73,9 @@ class Settings:
         strength = 4 * centred("Tint") - 3
         colour = shown.get("Colour", (0, 0, 0))
         self.tint = [single(0.5 + 0.5 * (c / 255 - 0.5) * strength) for c in colour]  # red, green, blue
+        self.border = tuple(reversed(shown.get("Border", (0, 0, 0)))) + (255,)
         self.wear = percent("Wear")
+        self.worn_channels = 1 if shown.get("Blue Channel Only") else 3
         self.pattern = 2000 + shown.get("Pattern", 1)
         self.spots = single(100.0 * single(shown.get("Spots", 0) / 100))
 
@@ -144,8 +150,7 @@ def predicted(source, s, seconds, numbers):
     frame = [list(row) for row in source]
     if any(s.jitter):
         dy, dx = (numbers.draw(-j, j) for j in s.jitter)
-        border = (0, 0, 0, 255)
-        frame = [[source[y - dy][x - dx] if 0 <= y - dy < HEIGHT and 0 <= x - dx < WIDTH else border
+        frame = [[source[y - dy][x - dx] if 0 <= y - dy < HEIGHT and 0 <= x - dx < WIDTH else s.border
                   for x in range(WIDTH)] for y in range(HEIGHT)]
     tone = tone_table(s, seconds)
     frame = [[(tone[b], tone[g], tone[r], a) for b, g, r, a in row] for row in frame]
@@ -163,7 +168,8 @@ def predicted(source, s, seconds, numbers):
             for y in range(HEIGHT):
                 for x in range(left, min(left + width, WIDTH)):
                     byte = data[(start + y) % height * width + x - left]
-                    frame[y][x] = shaded(frame[y][x], single(single(byte / 255) * s.wear))
+                    pixel, n = frame[y][x], s.worn_channels
+                    frame[y][x] = shaded(pixel, single(single(byte / 255) * s.wear))[:n] + pixel[n:]
 
     level = math.floor(s.spots + 0.5)
     for _ in range(max(level // 4, 1) if level else 0):
@@ -186,7 +192,7 @@ def predicted(source, s, seconds, numbers):
     return frame
 
 
-CASES = {
+PRO_CASES = {
     "nothing": {},
     "jitter": {"Y Jitter": 3, "X Jitter": 7},
     "vertical jitter only": {"Y Jitter": 2.1},
@@ -209,6 +215,28 @@ CASES = {
                    "Tint": -60, "Saturation": -40, "Brightness": -19, "Contrast": 30, "Film Gamma": 70,
                    "Wear": 56, "Pattern": 6, "Spots": 55},
 }
+CASES = [(name, "Film Pro", shown) for name, shown in PRO_CASES.items()] + [
+    ("camera", "Film Camera", {"Y Jitter": 4.9, "X Jitter": 10, "Border": (0xC0, 0x40, 0x08), "Flicker": 75,
+                               "Flicker Rate": 97}),
+    ("bleached look", "Film Look", {"Tint": 49, "Colour": (255, 255, 255), "Saturation": -57, "Brightness": 11,
+                                    "Contrast": -23, "Film Gamma": 85}),
+    ("posterized look", "Film Look", {"Tint": 100, "Colour": (0x52, 0x88, 0xA3), "Saturation": 100,
+                                      "Contrast": 100, "Film Gamma": 100}),
+    ("water damage", "Film Damage", {"Wear": 89, "Pattern": 0, "Blue Channel Only": True, "Spots": 74.5}),
+    ("express", "Film Express", {"Jitter": 2.85, "Flicker": 29.5, "Colour": (0, 0x89, 0xFF), "Tint": -54,
+                                 "Saturation": -65, "Film Gamma": 86.5, "Wear": 26, "Spots": 35.5}),
+]
+
+
+def control(key, value):
+    """A control's name and value as the command line takes them."""
+    if key in ("Colour", "Border"):
+        value = "#%02X%02X%02X" % value
+    elif key == "Pattern":
+        value = ("Wavy", "Blotchy", "Grainy", "Fine", "Splotchy", "Lite", "Crackly")[value]
+    elif value is True:
+        value = "on"
+    return f"{'Tint' if key == 'Colour' else key}={value}"
 
 
 class Prediction(unittest.TestCase):
@@ -219,20 +247,14 @@ class Prediction(unittest.TestCase):
         with tempfile.TemporaryDirectory(prefix="velmora-prediction-") as folder:
             source, result = Path(folder) / "in.bgra", Path(folder) / "out.bgra"
             source.write_bytes(bytes(c for frame in clip for row in frame for pixel in row for c in pixel))
-            for name, shown in CASES.items():
+            for name, effect, shown in CASES:
                 with self.subTest(name):
-                    values = []
-                    for key, value in shown.items():
-                        if key == "Colour":
-                            value = "#%02X%02X%02X" % value
-                        elif key == "Pattern":
-                            value = ("Wavy", "Blotchy", "Grainy", "Fine", "Splotchy", "Lite", "Crackly")[value]
-                        values += ["--set", f"{'Tint' if key == 'Colour' else key}={value}"]
+                    values = [word for pair in shown.items() for word in ("--set", control(*pair))]
                     done = reelfx("render", source, result, "--size", f"{WIDTH}x{HEIGHT}", "--rate", "24", "-e",
-                                  "Film Pro", "-p", "Reset To None", *values, "--raw-bgra", "--random-state",
+                                  effect, "-p", "Reset To None", *values, "--raw-bgra", "--random-state",
                                   f"{STATE:#x}", "-y")
                     self.assertEqual(done.returncode, 0, done.stderr.decode())
-                    self.check(clip, Settings(shown), result.read_bytes())
+                    self.check(clip, Settings(effect, shown), result.read_bytes())
 
     def check(self, clip, settings, rendered):
         numbers, saved, last = Generator(STATE), STATE, 0
