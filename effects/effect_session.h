@@ -41,6 +41,10 @@ class EffectSession {
     // finds the state that a later frame of a sequence starts from.
     [[nodiscard]] std::uint32_t DrawsPerFrame(std::int32_t width) noexcept;
 
+    // From now on only wear, scratches and spots are drawn, where and as strong as the whole effect draws them:
+    // nothing moves the picture or changes its colours.
+    void KeepDamageOnly() noexcept { m_options.isDamageOnly = true; }
+
     // Renders the frame at a clip time: the frame number is seconds * 30, truncated. False, with nothing
     // written, when a frame record is invalid.
     [[nodiscard]] bool Render(const FrameRecord& source, const FrameRecord& destination,

@@ -87,10 +87,12 @@ void RenderStages(FrameContext& context, const StageSettings& settings, RenderSt
                   const RenderOptions& options) noexcept {
     const Form form = options.road == Road::kByStages ? Form::kPlain : options.form;
     FramePlan plan = PlanFrame(context, settings, state, form);
+    if (options.isDamageOnly) plan.jitter = {}, plan.colour = {}, plan.tint = {};
     // Without memory for the copy the picture stays where it is; the other stages can still work.
     if (NeedsOwnSource(context, plan) && !context.DetachSource()) plan.jitter = {};
     const ShakenRows shaken(context.Source(), plan.jitter);
-    plan.glow = PrepareGlow(settings.glow, shaken, context.Width(), context.Height(), state.glow, form);
+    const float glow = options.isDamageOnly ? 0.0f : settings.glow;
+    plan.glow = PrepareGlow(glow, shaken, context.Width(), context.Height(), state.glow, form);
     if (options.road == Road::kByStages) {
         RenderByStages(context, plan);
     } else {

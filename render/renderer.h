@@ -29,6 +29,8 @@ struct RenderOptions {
     Form form = BestForm();  // of the pixel kernels, by rows
     // From this size on a result, which nobody can find in a cache again, is written past the caches.
     std::int64_t streamedBytes = std::int64_t{6} << 20;
+    // Wear, scratches and spots alone, as they lie on the frame when all stages run.
+    bool isDamageOnly = false;
 };
 
 // What the stages do to one frame.

@@ -93,6 +93,7 @@ RenderOptions ReadRender(const TypedOptions& typed) {
         output.codec = Given(typed.codec);
         output.pixelFormat = Given(typed.pixelFormat);
         if (!typed.crf.empty()) output.crf = Parsed("--crf", typed.crf, ParseNumber, "a number");
+        output.needsAlpha = typed.matte;
         options.output = output;
     } else if (!typed.digests) {
         throw UsageError("render needs OUT, or --hash for digests alone");
@@ -101,7 +102,8 @@ RenderOptions ReadRender(const TypedOptions& typed) {
         throw UsageError("--hash and OUT - both write standard output");
     options.threads = typed.threads;
     options.mayOverwrite = typed.overwrite;
-    options.withSound = !typed.noSound;
+    options.isMatte = typed.matte;
+    options.withSound = !typed.noSound && !typed.matte;
     options.withDigests = typed.digests;
     options.isDryRun = typed.dryRun;
     options.progress = ReadProgress(typed);

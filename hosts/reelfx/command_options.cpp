@@ -62,6 +62,10 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
     render.add_option("--pix-fmt", typed.pixelFormat, "Pixel format; default: the source's")
         ->type_name("NAME")
         ->envname("REELFX_PIX_FMT");
+    render.add_flag(
+        "--matte", typed.matte,
+        "Write the damage alone (wear, spots, scratches) on transparent, with straight alpha and without "
+        "sound, to lay over the picture in other programs");
     render.add_flag("--raw-bgra", typed.output.isRawBgra, "OUT is raw BGRA frames");
     render.add_flag("--hash", typed.digests, "Print the MD5 of each frame's BGRA; OUT may be left out");
     render.add_flag("--no-sound", typed.noSound, "Leave sound and subtitles out");

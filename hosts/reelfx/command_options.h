@@ -49,7 +49,7 @@ struct TypedOptions {
     std::string outPath, size, rate, seed = "0", randomState, preset, presetFile, frames, start, duration;
     std::string format, codec, crf, pixelFormat, progress = "auto";
     int threads = 0;
-    bool overwrite = false, noSound = false, digests = false, quiet = false, dryRun = false;
+    bool overwrite = false, noSound = false, digests = false, quiet = false, dryRun = false, matte = false;
     ListOptions list;
     std::string listEffect;
     PresetsOptions presets;

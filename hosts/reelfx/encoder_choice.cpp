@@ -52,6 +52,45 @@ std::vector<AVPixelFormat> FormatsOf(const AVCodec& codec) {
     return formats;
 }
 
+// What carries transparency in a container whose usual codec does not.
+struct AlphaRow {
+    const char* container;
+    const char* codec;
+};
+constexpr AlphaRow kAlphaCodecs[] = {
+    {"mov", "prores_ks"}, {"webm", "libvpx-vp9"}, {"matroska", "ffv1"}, {"nut", "ffv1"}, {"avi", "ffv1"},
+};
+
+constexpr char kAlphaHint[] =
+    " carries no transparency; ffv1, png, qtrle, prores_ks and, in WebM, libvpx-vp9 do";
+
+bool CarriesAlpha(AVPixelFormat format) {
+    const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
+    constexpr std::uint64_t kWanted = AV_PIX_FMT_FLAG_ALPHA, kUnwanted = AV_PIX_FMT_FLAG_PAL;
+    return descriptor && (descriptor->flags & kWanted) != 0 && (descriptor->flags & kUnwanted) == 0;
+}
+
+// VP8 and VP9 have it in a second stream, which few containers hold.
+void CheckAlphaHolds(const AVCodec& codec, const AVOutputFormat& container) {
+    if (codec.id != AV_CODEC_ID_VP8 && codec.id != AV_CODEC_ID_VP9) return;
+    const std::string name = container.name;
+    if (name == "webm" || name == "matroska") return;
+    throw Failure(kExitUsage, std::string("codec ") + codec.name + " in " + name + kAlphaHint);
+}
+
+AVPixelFormat AlphaPixelFormat(const AVCodec& codec, const AVOutputFormat& container,
+                               const std::vector<AVPixelFormat>& fitting) {
+    std::vector<AVPixelFormat> formats;
+    for (const AVPixelFormat format : fitting) {
+        if (CarriesAlpha(format)) formats.push_back(format);
+    }
+    if (formats.empty()) throw Failure(kExitUsage, std::string("codec ") + codec.name + kAlphaHint);
+    CheckAlphaHolds(codec, container);
+    formats.push_back(AV_PIX_FMT_NONE);
+    int loss = 0;
+    return avcodec_find_best_pix_fmt_of_list(formats.data(), AV_PIX_FMT_BGRA, 1, &loss);
+}
+
 AVPixelFormat AskedPixelFormat(const std::string& name, const AVCodec& codec, const AVFrame& source) {
     const AVPixelFormat asked = av_get_pix_fmt(name.c_str());
     if (asked == AV_PIX_FMT_NONE) throw Failure(kExitUsage, "there is no pixel format \"" + name + '"');
@@ -101,6 +140,10 @@ const AVCodec& ChooseCodec(const OutputOptions& options, const AVOutputFormat& c
         }
         return *codec;
     }
+    for (const AlphaRow& row : kAlphaCodecs) {
+        if (!options.needsAlpha || std::string(container.name) != row.container) continue;
+        if (const AVCodec* codec = avcodec_find_encoder_by_name(row.codec)) return *codec;
+    }
     const AVCodecID id =
         av_guess_codec(&container, nullptr, options.path.c_str(), nullptr, AVMEDIA_TYPE_VIDEO);
     const AVCodec* codec = avcodec_find_encoder(id);
@@ -113,12 +156,20 @@ const AVCodec& ChooseCodec(const OutputOptions& options, const AVOutputFormat& c
 AVPixelFormat ChoosePixelFormat(const OutputOptions& options, const AVCodec& codec,
                                 const AVOutputFormat& container, const AVFrame& source) {
     if (options.isRawBgra) return AV_PIX_FMT_BGRA;
-    if (options.pixelFormat) return AskedPixelFormat(*options.pixelFormat, codec, source);
+    if (options.pixelFormat) {
+        const AVPixelFormat asked = AskedPixelFormat(*options.pixelFormat, codec, source);
+        if (options.needsAlpha && !CarriesAlpha(asked)) {
+            throw Failure(kExitUsage, "pixel format " + *options.pixelFormat + " carries no transparency");
+        }
+        if (options.needsAlpha) CheckAlphaHolds(codec, container);
+        return asked;
+    }
     const auto wanted = static_cast<AVPixelFormat>(source.format);
     std::vector<AVPixelFormat> fitting;
     for (const AVPixelFormat format : FormatsOf(codec)) {
         if (Fits(codec, format, source)) fitting.push_back(format);
     }
+    if (options.needsAlpha) return AlphaPixelFormat(codec, container, fitting);
     if (fitting.empty()) return wanted;
     const auto has = [&](AVPixelFormat format) {
         for (const AVPixelFormat each : fitting) {
@@ -137,6 +188,10 @@ AVPixelFormat ChoosePixelFormat(const OutputOptions& options, const AVCodec& cod
 
 void SetQuality(const OutputOptions& options, const AVCodec& codec, AVCodecContext& encoder) {
     encoder.thread_count = kEncoderThreads;
+    // Pictures that are never shown carry no transparency.
+    if (codec.id == AV_CODEC_ID_VP8 && CarriesAlpha(encoder.pix_fmt)) {
+        av_opt_set(encoder.priv_data, "auto-alt-ref", "0", 0);
+    }
     const bool hasCrf = encoder.priv_data && av_opt_find(encoder.priv_data, "crf", nullptr, 0, 0);
     if (options.crf) {
         if (!hasCrf) throw Failure(kExitUsage, std::string("codec ") + codec.name + " knows no --crf");

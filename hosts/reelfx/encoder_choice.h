@@ -15,7 +15,8 @@ struct OutputOptions {
     std::optional<std::string> codec;   // "libx264", "ffv1", ...
     std::optional<double> crf;          // constant quality, in the codec's own scale
     std::optional<std::string> pixelFormat;
-    bool isRawBgra = false;  // frames of raw BGRA and nothing else
+    bool isRawBgra = false;   // frames of raw BGRA and nothing else
+    bool needsAlpha = false;  // the pixel format must carry transparency
 };
 
 // Each throws Failure (kExitUsage) with one line when there is no such thing.

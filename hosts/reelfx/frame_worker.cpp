@@ -4,6 +4,7 @@
 
 #include "hosts/common/digest.h"
 #include "hosts/reelfx/failure.h"
+#include "hosts/reelfx/matte.h"
 #include "hosts/reelfx/picture_turn.h"
 
 namespace velmora::hosts {
@@ -18,33 +19,43 @@ bool IsSame(const BgraPicture& a, const BgraPicture& b) {
 
 }  // namespace
 
-FrameWorker::FrameWorker(std::unique_ptr<effects::EffectSession> session, const MediaWriter* writer,
-                         FrameSize size, int quarterTurns, bool withDigest)
-    : m_session(std::move(session)),
-      m_writer(writer),
-      m_quarterTurns(quarterTurns),
-      m_withDigest(withDigest),
-      m_source(size.width, size.height) {}
+FrameWorker::FrameWorker(std::unique_ptr<effects::EffectSession> session, const Job& job)
+    : m_session(std::move(session)), m_job(job), m_source(job.size.width, job.size.height) {
+    if (job.isMatte) m_session->KeepDamageOnly();
+}
 
 void FrameWorker::Work(PipelineItem& item) {
-    m_converter.ToBgra(*item.frame, m_source);
-    const BgraPicture& result = Apply(item.seconds);
-    if (m_withDigest) {
+    const BgraPicture& result = Result(item);
+    if (m_job.withDigest) {
         item.digest = FrameDigest(result.Row(0), result.Width(), result.Height(), result.Stride());
     }
-    if (!m_writer) return;
+    if (!m_job.writer) return;
     // An untouched frame keeps its own samples, also those that 8-bit RGB cannot hold: more than 8 bits, and
     // black below black.
-    if (&result != &m_source && m_writer->TakesAsItIs(*item.frame) && IsSame(m_source, result)) return;
-    FramePtr frame = m_writer->NewResult(*item.frame);
+    if (!m_job.isMatte && &result != &m_source && m_job.writer->TakesAsItIs(*item.frame) &&
+        IsSame(m_source, result)) {
+        return;
+    }
+    FramePtr frame = m_job.writer->NewResult(*item.frame);
     m_converter.FromBgra(result, *frame);
     item.frame = std::move(frame);
 }
 
+BgraPicture& FrameWorker::Result(const PipelineItem& item) {
+    if (!m_job.isMatte) {
+        m_converter.ToBgra(*item.frame, m_source);
+        return Apply(item.seconds);
+    }
+    FillMatteGround(m_source);
+    BgraPicture& result = Apply(item.seconds);
+    ReadMatte(result);
+    return result;
+}
+
 BgraPicture& FrameWorker::Apply(double seconds) {
     BgraPicture* input = &m_source;
-    if (m_quarterTurns != 0) {
-        TurnPicture(m_source, m_quarterTurns, m_upright);
+    if (m_job.quarterTurns != 0) {
+        TurnPicture(m_source, m_job.quarterTurns, m_upright);
         input = &m_upright;
     }
     if (m_result.Width() != input->Width() || m_result.Height() != input->Height()) {
@@ -53,8 +64,8 @@ BgraPicture& FrameWorker::Apply(double seconds) {
     if (!m_session->Render(input->Record(), m_result.Record(), seconds)) {
         throw Failure(kExitInternal, "a frame cannot be rendered");
     }
-    if (m_quarterTurns == 0) return m_result;
-    TurnPicture(m_result, 4 - m_quarterTurns, m_source);
+    if (m_job.quarterTurns == 0) return m_result;
+    TurnPicture(m_result, 4 - m_job.quarterTurns, m_source);
     return m_source;
 }
 

@@ -14,20 +14,24 @@ namespace velmora::hosts {
 
 class FrameWorker {
   public:
-    // `writer` null: no frames are wanted, only digests. `quarterTurns`: see QuarterTurnsOf.
-    FrameWorker(std::unique_ptr<effects::EffectSession> session, const MediaWriter* writer, FrameSize size,
-                int quarterTurns, bool withDigest);
+    struct Job {
+        const MediaWriter* writer = nullptr;  // null: no frames are wanted, only digests
+        FrameSize size = {};                  // of the source's frames
+        int quarterTurns = 0;                 // see QuarterTurnsOf
+        bool withDigest = false;
+        bool isMatte = false;  // the result is the damage alone, see matte.h
+    };
+    FrameWorker(std::unique_ptr<effects::EffectSession> session, const Job& job);
 
     // Replaces the frame by its result and fills in the digest.
     void Work(PipelineItem& item);
 
   private:
+    BgraPicture& Result(const PipelineItem& item);
     BgraPicture& Apply(double seconds);  // of m_source; the result, lying as the source does
 
     std::unique_ptr<effects::EffectSession> m_session;
-    const MediaWriter* m_writer;
-    int m_quarterTurns;
-    bool m_withDigest;
+    Job m_job;
     PixelConverter m_converter;
     BgraPicture m_source, m_result, m_upright;
 };

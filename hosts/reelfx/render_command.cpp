@@ -6,6 +6,7 @@
 #include "hosts/common/digest.h"
 #include "hosts/reelfx/frame_worker.h"
 #include "hosts/reelfx/interrupt.h"
+#include "hosts/reelfx/matte.h"
 #include "hosts/reelfx/output_place.h"
 #include "hosts/reelfx/picture_turn.h"
 #include "hosts/reelfx/render_plan.h"
@@ -17,6 +18,7 @@ class RenderRun {
   public:
     explicit RenderRun(const RenderOptions& options)
         : m_options(options), m_choice(options.effect), m_reader(options.input) {
+        if (options.isMatte) CheckMatte(m_choice);
         if (!options.output) return;
         if (options.isDryRun) {
             CheckOutputPlace(options.output->path, options.mayOverwrite);
@@ -81,11 +83,14 @@ class RenderRun {
     std::vector<FramePipeline::Worker> MakeWorkers() {
         const unsigned count = ThreadCount();
         const AVFrame& first = m_reader.FirstFrame();
+        const FrameWorker::Job job = {.writer = m_writer ? &*m_writer : nullptr,
+                                      .size = {first.width, first.height},
+                                      .quarterTurns = QuarterTurnsOf(m_reader.Picture()),
+                                      .withDigest = m_options.withDigests,
+                                      .isMatte = m_options.isMatte};
         std::vector<FramePipeline::Worker> workers;
         for (unsigned i = 0; i < count; ++i) {
-            auto worker = std::make_shared<FrameWorker>(
-                m_choice.NewSession(), m_writer ? &*m_writer : nullptr, FrameSize{first.width, first.height},
-                QuarterTurnsOf(m_reader.Picture()), m_options.withDigests);
+            auto worker = std::make_shared<FrameWorker>(m_choice.NewSession(), job);
             workers.emplace_back([worker](PipelineItem& item) { worker->Work(item); });
         }
         return workers;

@@ -21,6 +21,7 @@ struct RenderOptions {
     bool mayOverwrite = false;
     bool withSound = true;
     bool withDigests = false;  // a line for each frame on standard output
+    bool isMatte = false;      // the damage alone, without the picture
     bool isDryRun = false;     // checks and tells, but writes nothing
     ProgressKind progress = ProgressKind::kAuto;
 };

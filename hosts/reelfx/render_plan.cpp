@@ -52,6 +52,7 @@ std::string PlanText(const RenderOptions& options, const EffectChoice& choice, c
     for (const std::string& note : NotesOn(facts)) text += Line("note", note);
     text += Line("part", SectionText(options.section, ClipSection::FrameCountGuess(reader, options.section)));
     text += Line("effect", effect);
+    if (options.isMatte) text += Line("matte", "the damage alone, with straight alpha");
     text += Line("settings", SettingsText(choice));
     text += Line("random", RandomText(options.effect));
     text += Line("threads", std::to_string(threads));

@@ -2,6 +2,7 @@
 
 import json
 import os
+import re
 import resource
 import signal
 import subprocess
@@ -163,6 +164,64 @@ class SameBytes(ReelfxTest):
         self.assertEqual(self.digests(*neutral, source=raw), expected)
 
 
+class Matte(ReelfxTest):
+    """The damage alone, laid over the picture by a real compositor, is the damaged picture."""
+
+    DAMAGE = ("-e", "Film Damage", "-p", "Aged")
+
+    @classmethod
+    def setUpClass(cls):
+        # RGB on both sides, so that nothing but the matte's own rounding is measured.
+        cls.source = clips.root / "rgb.mkv"
+        ffmpeg("-i", clips.small, "-fps_mode", "passthrough", "-an", "-pix_fmt", "bgr0", "-c:v", "ffv1", cls.source)
+
+    def laid_over(self, under, matte, wanted):
+        """PSNR of the composition against the damaged picture."""
+        graph = ("[0:v]settb=1/25,setpts=N,format=gbrp[u];[1:v]settb=1/25,setpts=N,format=gbrap[m];"
+                 "[u][m]overlay=format=gbrp,format=gbrp[c];[2:v]settb=1/25,setpts=N,format=gbrp[w];[c][w]psnr")
+        done = run("ffmpeg", "-nostdin", "-i", under, "-i", matte, "-i", wanted, "-lavfi", graph, "-f", "null", "-")
+        return float(re.search(r"average:(\S+)", done.stderr.decode()).group(1))
+
+    def test_laid_over_it_is_the_damaged_picture(self):
+        lossless = ("--codec", "ffv1", "--pix-fmt", "bgr0", "--seed", 3)
+        pro = ("-e", "Film Pro", "-p", "Worn Color Print")
+        # Whatever else the effect does lies under the matte.
+        clean = (*pro, "-s", "Wear=0", "-s", "Spots=0", "-s", "Density=0")
+        rows = (("aged", self.DAMAGE, self.source), ("shredded", ("-e", "Film Damage", "-p", "Shredded"), self.source),
+                ("pro", pro, self.render(self.source, "clean.mkv", *clean, *lossless)))
+        for name, options, under in rows:
+            with self.subTest(name=name):
+                wanted = self.render(self.source, name + "-wanted.mkv", *options, *lossless)
+                self.assertLess(self.laid_over(under, under, wanted), 40)
+                matte = self.render(self.source, name + "-matte.mkv", *options, "--seed", 3, "--matte")
+                self.assertGreater(self.laid_over(under, matte, wanted), 55)
+
+    def test_formats_that_carry_it(self):
+        wanted = self.render(self.source, "wanted.mkv", *self.DAMAGE, "--codec", "ffv1", "--pix-fmt", "bgr0")
+        for name, codec, pixels in (("a.mov", (), "yuva444p12le"), ("b.mov", ("--codec", "qtrle"), "argb"),
+                                    ("c-%03d.png", (), "rgba"), ("d.avi", (), "bgra")):
+            with self.subTest(name=name):
+                matte = self.render(self.source, name, *self.DAMAGE, *codec, "--matte")
+                (found,), = probe(matte, "-show_entries", "stream=pix_fmt")
+                self.assertEqual(found, pixels)
+                self.assertGreater(self.laid_over(self.source, matte, wanted), 55)
+        webm = self.render(self.source, "e.webm", *self.DAMAGE, "--matte", "--frames", ":9")
+        done = ffmpeg("-c:v", "libvpx-vp9", "-i", webm, "-vf", "alphaextract", "-f", "rawvideo", "-pix_fmt", "gray", "-")
+        self.assertGreater(sum(value > 100 for value in done), 500)
+
+    def test_a_turned_clip_has_a_turned_matte(self):
+        turned = self.out / "turned.mp4"
+        ffmpeg("-i", clips.small, "-c", "copy", "-metadata:s:v", "rotate=90", turned)
+        lying = self.render(turned, "m.bgra", "-e", "Film Damage", "-s", "Density=100", "-s", "Depth=100", "-s",
+                            "Thick=on", "--matte", "--raw-bgra", "--frames", "4:5").read_bytes()
+        alpha = [lying[y * 1280 + 3:(y + 1) * 1280:4] for y in range(180)]
+        # Scratches run down the upright picture: along the rows of the lying one.
+        rows = max(sum(value > 60 for value in row) for row in alpha)
+        columns = max(sum(row[x] > 60 for row in alpha) for x in range(320))
+        self.assertGreater(rows, 150)
+        self.assertLess(columns, 120)
+
+
 class Keeping(ReelfxTest):
     def test_times_sound_and_colours_stay(self):
         out = self.render(clips.small, "out.mp4", *TRAIN)
@@ -304,6 +363,11 @@ class Refusing(ReelfxTest):
             (2, ["yuv9", "pixel format"], (*render, *CAMERA, "--pix-fmt", "yuv9")),
             (2, ["--format"], ("render", small, self.out / "out.unknown", *CAMERA)),
             (2, ["--progress", "often"], (*render, *CAMERA, "--progress", "often")),
+            (2, ["libx264", "no transparency"], (*render, "-e", "Film Damage", "--matte")),
+            (2, ["yuv420p", "no transparency"], ("render", small, self.out / "out.mkv", "-e", "Film Damage", "--matte",
+                                                 "--pix-fmt", "yuv420p")),
+            (2, ["Blue Channel Only=off"], (*render, "-e", "Film Damage", "-p", "Water Damage", "--matte")),
+            (2, ["damage", "Film Camera"], (*render, *CAMERA, "--matte")),
             (2, ["Film Foo"], ("presets", "Film Foo")),
             (3, ["missing.mp4"], ("info", clips.root / "missing.mp4")),
             (2, ["one picture"], ("render", small, self.out / "out.png", *CAMERA)),
