@@ -47,10 +47,25 @@ void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) no
 
 const RowKernels kPlainKernels = {ToneRow, WearRow, CopyRow, CopyRow, NothingToEnd};
 
+namespace {
+
+ByteTable Differences(const ByteTable& table) noexcept {
+    ByteTable result = table;
+    for (std::size_t i = 0; i < table.size(); ++i) {
+        if (i % 128 >= 16) result[i] = table[i] ^ table[i - 16];
+    }
+    return result;
+}
+
+}  // namespace
+
 void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept {
     blue = b;
     green = g;
     red = r;
+    blueDifferences = Differences(b);
+    greenDifferences = Differences(g);
+    redDifferences = Differences(r);
     for (std::size_t i = 0; i < 256; ++i) {
         blueWord[i] = b[i];
         greenWord[i] = std::uint32_t{g[i]} << 8;

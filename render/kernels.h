@@ -21,8 +21,12 @@ struct ChannelTables {
     alignas(64) ByteTable blue;
     alignas(64) ByteTable green;
     alignas(64) ByteTable red;
-    // The same, each entry at its channel's place in a pixel word: what the forms without byte permutations
-    // look up.
+    // What the 32-byte form looks up: in each half of a table, all but the first 16 entries as their difference (the
+    // bits that are not equal) from the one 16 before.
+    alignas(16) ByteTable blueDifferences;
+    alignas(16) ByteTable greenDifferences;
+    alignas(16) ByteTable redDifferences;
+    // What the 16-byte form looks up: each entry at its channel's place in a pixel word.
     std::array<std::uint32_t, 256> blueWord;
     std::array<std::uint32_t, 256> greenWord;
     std::array<std::uint32_t, 256> redWord;
@@ -78,9 +82,6 @@ void ToneInPasses(Tables&& tables, Mix&& mix, const Bgra* in, Bgra* out, std::in
 }
 
 // The forms, each in its own file.
-// What the forms without byte permutations look tables up with.
-void TablesRowByWords(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept;
-
 // Asks for pixels that a row's kernel comes to soon, where they lie in memory. The processor does so by itself as
 // long as a row is all that it reads; wear's factors, read here and there, keep it from that. Past a frame's end
 // nothing happens.
@@ -102,7 +103,8 @@ extern const RowKernels kPlainKernels;
 extern const RowKernels kSse2Kernels;
 extern const RowKernels kAvx2Kernels;
 extern const RowKernels kAvx512Kernels;
-// The tone of kAvx512Kernels, in a file of its own.
+// The tones of the last two, in files of their own.
+void ToneRowAvx2(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
 void ToneRowAvx512(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
 
 }  // namespace velmora::render

@@ -4,7 +4,6 @@
 #include <immintrin.h>
 
 #include <algorithm>
-#include <cstring>
 
 #include "render/kernels.h"
 
@@ -12,32 +11,6 @@
 
 namespace velmora::render {
 namespace {
-
-// As in the 16-byte form, four pixels at a time.
-VM_AVX2 inline __m256i MixFour(__m256i channels, __m256i luma, __m256i u) noexcept {
-    const __m256i products = _mm256_madd_epi16(channels, luma);
-    const __m256i sum =
-        _mm256_srli_epi32(_mm256_add_epi32(products, _mm256_shuffle_epi32(products, 0xB1)), 8);
-    const __m256i grey = _mm256_or_si256(sum, _mm256_slli_epi32(sum, 16));
-    const __m256i away = _mm256_mullo_epi16(_mm256_sub_epi16(channels, grey), u);
-    const __m256i scaled = _mm256_sub_epi16(_mm256_slli_epi16(channels, 7), channels);
-    return _mm256_srai_epi16(_mm256_adds_epi16(scaled, away), 7);
-}
-
-VM_AVX2 void MixRow(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t weight) noexcept {
-    const __m256i zero = _mm256_setzero_si256();
-    const __m256i luma = _mm256_set1_epi64x(0x0000004C0095001E);  // 30, 149, 76, 0
-    const __m256i u = _mm256_set1_epi16(static_cast<short>(-weight));
-    const __m256i alpha = _mm256_set1_epi32(static_cast<int>(0xFF000000u));
-    std::int32_t x = 0;
-    for (; x + 8 <= width; x += 8) {
-        const __m256i pixels = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x));
-        const __m256i mixed = _mm256_packus_epi16(MixFour(_mm256_unpacklo_epi8(pixels, zero), luma, u),
-                                                  MixFour(_mm256_unpackhi_epi8(pixels, zero), luma, u));
-        _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), _mm256_blendv_epi8(mixed, pixels, alpha));
-    }
-    kSse2Kernels.tone(in + x, out + x, width - x, Tone{nullptr, true, weight, nullptr});
-}
 
 // As in the 16-byte form, eight factors.
 class FactorReader {
@@ -120,12 +93,8 @@ void EndStream() noexcept {
     _mm_sfence();
 }
 
-void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
-    ToneInPasses(TablesRowByWords, MixRow, in, out, width, tone);
-}
-
 }  // namespace
 
-const RowKernels kAvx2Kernels = {ToneRow, WearRow, CopyRow, StreamRow, EndStream};
+const RowKernels kAvx2Kernels = {ToneRowAvx2, WearRow, CopyRow, StreamRow, EndStream};
 
 }  // namespace velmora::render

@@ -1,5 +1,4 @@
-// 16-byte forms. Also the table look-up that the wider forms without byte permutations use: words loaded
-// whole and three look-ups, which beats in-register shuffles over 256 entries.
+// 16-byte forms. Tables are looked up one pixel at a time, words loaded whole: there are no byte permutations.
 
 #include <emmintrin.h>
 
@@ -17,9 +16,7 @@ std::uint32_t LookUp(std::uint32_t pixel, const ChannelTables& t) noexcept {
            (pixel & 0xFF000000u);
 }
 
-}  // namespace
-
-void TablesRowByWords(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept {
+void TablesRow(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept {
     std::int32_t x = 0;
     for (; x + 4 <= width; x += 4) {
         // Two pixels a load where words are that wide.
@@ -37,8 +34,6 @@ void TablesRowByWords(const Bgra* in, Bgra* out, std::int32_t width, const Chann
     }
     kPlainKernels.tone(in + x, out + x, width - x, Tone{&tables, false, 0, nullptr});
 }
-
-namespace {
 
 // 16-bit channels of two pixels: 127 X + u (X - Y) with u = -w, saturating where the result is above white
 // anyway.
@@ -143,7 +138,7 @@ void EndStream() noexcept {
 }
 
 void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
-    ToneInPasses(TablesRowByWords, MixRow, in, out, width, tone);
+    ToneInPasses(TablesRow, MixRow, in, out, width, tone);
 }
 
 }  // namespace

@@ -17,7 +17,7 @@
 namespace velmora::render {
 namespace {
 
-constexpr std::int32_t kWidest = 70;
+constexpr std::int32_t kWidest = 140;
 constexpr std::size_t kGuard = 80;  // bytes before and behind a row
 
 std::vector<Form> FasterForms() {

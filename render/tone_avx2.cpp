@@ -1,0 +1,156 @@
+// Tables and saturation mix over 32 pixels, apart by channels: in-register look-ups, which know 16 entries each, then
+// serve 32 bytes of one channel, and the mix needs no bytes of alpha.
+
+#include <immintrin.h>
+
+#include <algorithm>
+#include <array>
+
+#include "render/kernels.h"
+
+#define VM_AVX2 __attribute__((target("avx2")))
+
+namespace velmora::render {
+namespace {
+
+constexpr std::int32_t kBlock = 32;  // pixels
+
+// 32 pixels, either as four registers of eight or as one register a channel, the pixels in an order of its own.
+struct Block {
+    __m256i v[4];
+};
+
+// Swaps rows and columns of the 4 × 4 words of each half.
+VM_AVX2 inline Block Transposed(const Block& b) noexcept {
+    const __m256i low01 = _mm256_unpacklo_epi32(b.v[0], b.v[1]),
+                  low23 = _mm256_unpacklo_epi32(b.v[2], b.v[3]);
+    const __m256i high01 = _mm256_unpackhi_epi32(b.v[0], b.v[1]),
+                  high23 = _mm256_unpackhi_epi32(b.v[2], b.v[3]);
+    return {{_mm256_unpacklo_epi64(low01, low23), _mm256_unpackhi_epi64(low01, low23),
+             _mm256_unpacklo_epi64(high01, high23), _mm256_unpackhi_epi64(high01, high23)}};
+}
+
+// Gathers equal channels of four pixels in a word, or undoes it.
+VM_AVX2 inline __m256i Regrouped(__m256i pixels) noexcept {
+    return _mm256_shuffle_epi8(pixels, _mm256_broadcastsi128_si256(_mm_setr_epi8(0, 4, 8, 12, 1, 5, 9, 13, 2,
+                                                                                 6, 10, 14, 3, 7, 11, 15)));
+}
+
+VM_AVX2 inline Block ToChannels(Block b) noexcept {
+    for (__m256i& v : b.v) v = Regrouped(v);
+    return Transposed(b);
+}
+
+VM_AVX2 inline Block ToPixels(const Block& channels) noexcept {
+    Block b = Transposed(channels);
+    for (__m256i& v : b.v) v = Regrouped(v);
+    return b;
+}
+
+VM_AVX2 inline __m256i Sixteen(const ByteTable& table, std::size_t first) noexcept {
+    return _mm256_broadcastsi128_si256(
+        _mm_load_si128(reinterpret_cast<const __m128i*>(table.data() + first)));
+}
+
+// Looks up 32 bytes of each of two blocks. A look-up in 16 entries gives 0 where its index is negative: with 16 less
+// from step to step the differences add up to an entry of the right sixteen, of either half of the table at once.
+VM_AVX2 inline void LookUp(__m256i& first, __m256i& second, const ByteTable& differences) noexcept {
+    const __m256i zero = _mm256_setzero_si256(), step = _mm256_set1_epi8(16);
+    __m256i at0 = _mm256_and_si256(first, _mm256_set1_epi8(127));
+    __m256i at1 = _mm256_and_si256(second, _mm256_set1_epi8(127));
+    __m256i low0 = zero, low1 = zero, high0 = zero, high1 = zero;
+#pragma GCC \
+    unroll 1  // else each step's index is made of the first one, by more numbers than there are registers
+    for (std::size_t i = 0; i < 128; i += 16) {
+        const __m256i lower = Sixteen(differences, i), upper = Sixteen(differences, 128 + i);
+        low0 = _mm256_xor_si256(low0, _mm256_shuffle_epi8(lower, at0));
+        low1 = _mm256_xor_si256(low1, _mm256_shuffle_epi8(lower, at1));
+        high0 = _mm256_xor_si256(high0, _mm256_shuffle_epi8(upper, at0));
+        high1 = _mm256_xor_si256(high1, _mm256_shuffle_epi8(upper, at1));
+        at0 = _mm256_sub_epi8(at0, step);
+        at1 = _mm256_sub_epi8(at1, step);
+    }
+    first = _mm256_blendv_epi8(low0, high0, first);
+    second = _mm256_blendv_epi8(low1, high1, second);
+}
+
+VM_AVX2 inline void LookUpAll(Block& a, Block& b, const ChannelTables& tables) noexcept {
+    LookUp(a.v[0], b.v[0], tables.blueDifferences);
+    LookUp(a.v[1], b.v[1], tables.greenDifferences);
+    LookUp(a.v[2], b.v[2], tables.redDifferences);
+}
+
+// Two numbers of 8 bits, unsigned, in each word of 16; their products with these signed ones are added up.
+VM_AVX2 inline __m256i Pair(int first, int second) noexcept {
+    return _mm256_set1_epi16(static_cast<short>((first & 0xFF) | second * 256));
+}
+
+VM_AVX2 inline __m256i Luma(__m256i blueGreen, __m256i redGreen) noexcept {
+    // 149 green in two parts: neither sum leaves 15 bits.
+    return _mm256_srli_epi16(_mm256_add_epi16(_mm256_maddubs_epi16(blueGreen, Pair(30, 97)),
+                                              _mm256_maddubs_epi16(redGreen, Pair(76, 52))),
+                             8);
+}
+
+// 127 X + u (X - Y) with u = -w, saturating where the result is above white anyway.
+VM_AVX2 inline __m256i Mixed(__m256i channelAndLuma, __m256i away) noexcept {
+    const __m256i scaled = _mm256_maddubs_epi16(channelAndLuma, Pair(127, 0));
+    return _mm256_srai_epi16(_mm256_adds_epi16(scaled, _mm256_maddubs_epi16(channelAndLuma, away)), 7);
+}
+
+VM_AVX2 inline void Mix(Block& b, std::int32_t weight) noexcept {
+    const __m256i low = Luma(_mm256_unpacklo_epi8(b.v[0], b.v[1]), _mm256_unpacklo_epi8(b.v[2], b.v[1]));
+    const __m256i high = Luma(_mm256_unpackhi_epi8(b.v[0], b.v[1]), _mm256_unpackhi_epi8(b.v[2], b.v[1]));
+    const __m256i luma = _mm256_packus_epi16(low, high);
+    const __m256i away = Pair(-weight, weight);
+    for (int c = 0; c < 3; ++c) {
+        b.v[c] = _mm256_packus_epi16(Mixed(_mm256_unpacklo_epi8(b.v[c], luma), away),
+                                     Mixed(_mm256_unpackhi_epi8(b.v[c], luma), away));
+    }
+}
+
+// Two blocks, so that entries are loaded for both.
+VM_AVX2 inline void ToneTwo(Block& a, Block& b, const Tone& tone) noexcept {
+    a = ToChannels(a);
+    b = ToChannels(b);
+    if (tone.before != nullptr) LookUpAll(a, b, *tone.before);
+    if (tone.mixes) {
+        Mix(a, tone.weight);
+        Mix(b, tone.weight);
+    }
+    if (tone.after != nullptr) LookUpAll(a, b, *tone.after);
+    a = ToPixels(a);
+    b = ToPixels(b);
+}
+
+VM_AVX2 inline Block LoadBlock(const Bgra* in) noexcept {
+    FetchAhead(in);
+    FetchAhead(in + kBlock / 2);
+    Block b;
+    for (int i = 0; i < 4; ++i) b.v[i] = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + 8 * i));
+    return b;
+}
+
+VM_AVX2 inline void StoreBlock(Bgra* out, const Block& b) noexcept {
+    for (int i = 0; i < 4; ++i) _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + 8 * i), b.v[i]);
+}
+
+}  // namespace
+
+VM_AVX2 void ToneRowAvx2(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
+    const auto toneTwo = [&tone](const Bgra* from, Bgra* to) VM_AVX2 {
+        Block a = LoadBlock(from), b = LoadBlock(from + kBlock);
+        ToneTwo(a, b, tone);
+        StoreBlock(to, a);
+        StoreBlock(to + kBlock, b);
+    };
+    std::int32_t x = 0;
+    for (; x + 2 * kBlock <= width; x += 2 * kBlock) toneTwo(in + x, out + x);
+    if (x == width) return;
+    std::array<Bgra, 2 * kBlock> rest{};
+    std::copy(in + x, in + width, rest.begin());
+    toneTwo(rest.data(), rest.data());
+    std::copy_n(rest.begin(), width - x, out + x);
+}
+
+}  // namespace velmora::render
