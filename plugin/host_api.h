@@ -17,7 +17,6 @@
 // Dialogs, presets, texts and help belong to the user-interface thread.
 #pragma once
 
-#include <cstddef>
 #include <cstdint>
 
 #if defined(_WIN32) && (defined(__i386__) || defined(_M_IX86))
@@ -25,6 +24,9 @@
 #else
 #define VM_CALL
 #endif
+
+// The compiler's own form of offsetof, which would need another header.
+#define VM_OFFSET(record, field) __builtin_offsetof(record, field)
 
 namespace velmora {
 
@@ -104,18 +106,18 @@ struct ParamDescriptor {
     std::uint32_t visible;
 };
 static_assert(sizeof(ParamDescriptor) == 276);
-static_assert(offsetof(ParamDescriptor, defaultValue) == 0);
-static_assert(offsetof(ParamDescriptor, second) == 4);
-static_assert(offsetof(ParamDescriptor, kind) == 8);
-static_assert(offsetof(ParamDescriptor, minimum) == 12);
-static_assert(offsetof(ParamDescriptor, slider) == 16);
-static_assert(offsetof(ParamDescriptor, itemTexts) == 16);
-static_assert(offsetof(ParamDescriptor, name) == 216);
-static_assert(offsetof(ParamDescriptor, x) == 256);
-static_assert(offsetof(ParamDescriptor, y) == 260);
-static_assert(offsetof(ParamDescriptor, width) == 264);
-static_assert(offsetof(ParamDescriptor, height) == 268);
-static_assert(offsetof(ParamDescriptor, visible) == 272);
+static_assert(VM_OFFSET(ParamDescriptor, defaultValue) == 0);
+static_assert(VM_OFFSET(ParamDescriptor, second) == 4);
+static_assert(VM_OFFSET(ParamDescriptor, kind) == 8);
+static_assert(VM_OFFSET(ParamDescriptor, minimum) == 12);
+static_assert(VM_OFFSET(ParamDescriptor, slider) == 16);
+static_assert(VM_OFFSET(ParamDescriptor, itemTexts) == 16);
+static_assert(VM_OFFSET(ParamDescriptor, name) == 216);
+static_assert(VM_OFFSET(ParamDescriptor, x) == 256);
+static_assert(VM_OFFSET(ParamDescriptor, y) == 260);
+static_assert(VM_OFFSET(ParamDescriptor, width) == 264);
+static_assert(VM_OFFSET(ParamDescriptor, height) == 268);
+static_assert(VM_OFFSET(ParamDescriptor, visible) == 272);
 
 // A parameter's value as it is exchanged while rendering and in presets that a user saves.
 struct ValueCell {
@@ -124,9 +126,9 @@ struct ValueCell {
     std::uint32_t kind;  // ParamKind
 };
 static_assert(sizeof(ValueCell) == 12);
-static_assert(offsetof(ValueCell, value) == 0);
-static_assert(offsetof(ValueCell, second) == 4);
-static_assert(offsetof(ValueCell, kind) == 8);
+static_assert(VM_OFFSET(ValueCell, value) == 0);
+static_assert(VM_OFFSET(ValueCell, second) == 4);
+static_assert(VM_OFFSET(ValueCell, kind) == 8);
 
 // A parameter's value in a built-in preset. The second word is 0.
 struct PresetCell {
@@ -134,7 +136,7 @@ struct PresetCell {
     std::uint32_t second;
 };
 static_assert(sizeof(PresetCell) == 8);
-static_assert(offsetof(PresetCell, second) == 4);
+static_assert(VM_OFFSET(PresetCell, second) == 4);
 
 // A picture in the host's memory: 32-bit pixels, bytes blue, green, red, alpha. The processed region is
 // width x height pixels with its left top corner at (xOrigin, yOrigin) of the buffer; the buffer is
@@ -150,12 +152,12 @@ struct FrameRecord {
 };
 #if defined(_WIN32) && (defined(__i386__) || defined(_M_IX86))
 static_assert(sizeof(FrameRecord) == 28);
-static_assert(offsetof(FrameRecord, width) == 4);
-static_assert(offsetof(FrameRecord, height) == 8);
-static_assert(offsetof(FrameRecord, rowStep) == 12);
-static_assert(offsetof(FrameRecord, reserved) == 16);
-static_assert(offsetof(FrameRecord, xOrigin) == 20);
-static_assert(offsetof(FrameRecord, yOrigin) == 24);
+static_assert(VM_OFFSET(FrameRecord, width) == 4);
+static_assert(VM_OFFSET(FrameRecord, height) == 8);
+static_assert(VM_OFFSET(FrameRecord, rowStep) == 12);
+static_assert(VM_OFFSET(FrameRecord, reserved) == 16);
+static_assert(VM_OFFSET(FrameRecord, xOrigin) == 20);
+static_assert(VM_OFFSET(FrameRecord, yOrigin) == 24);
 #endif
 
 // The host's timing of a frame. Only the frame time is read.
@@ -165,7 +167,7 @@ struct TimingRecord {
     double frameTime;  // seconds from the start of the clip; not a number counts as 0
 };
 static_assert(sizeof(TimingRecord) == 24);
-static_assert(offsetof(TimingRecord, frameTime) == 16);
+static_assert(VM_OFFSET(TimingRecord, frameTime) == 16);
 
 inline constexpr std::int32_t kPresetNameWidth = 260;
 inline constexpr std::int32_t kPresetCellCapacity = 100;
@@ -180,10 +182,10 @@ struct PresetRecord {
     std::int32_t count;                     // cells in use, 0..100
 };
 static_assert(sizeof(PresetRecord) == 1984);
-static_assert(offsetof(PresetRecord, libraryName) == 260);
-static_assert(offsetof(PresetRecord, effectName) == 520);
-static_assert(offsetof(PresetRecord, values) == 780);
-static_assert(offsetof(PresetRecord, count) == 1980);
+static_assert(VM_OFFSET(PresetRecord, libraryName) == 260);
+static_assert(VM_OFFSET(PresetRecord, effectName) == 520);
+static_assert(VM_OFFSET(PresetRecord, values) == 780);
+static_assert(VM_OFFSET(PresetRecord, count) == 1980);
 
 // ---------------------------------------------------------------------------------------------------------
 // Interfaces. None has a destructor in its table: compilers lay destructors out differently. The protected
@@ -360,3 +362,5 @@ using GetEffectsLibraryFunction = IEffectLibrary*(VM_CALL*)();
 using CanUnloadDLLNowFunction = bool(VM_CALL*)();
 
 }  // namespace velmora
+
+#undef VM_OFFSET
