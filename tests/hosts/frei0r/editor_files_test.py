@@ -115,7 +115,7 @@ class EditorFiles(unittest.TestCase):
             script = hosts.ROOT / "scripts/install-user"
             for _ in range(2):  # also over itself
                 said = subprocess.run([script], env=environment, capture_output=True, check=True).stdout.decode()
-            installed = [p for p in Path(home).rglob("*velmora_*") if p.is_file()] + list(Path(home).rglob("*.qml"))
+            installed = [p for p in Path(home).rglob("*") if p.is_file() and p != own and p.name != "installed-files"]
             self.assertEqual(sorted(str(p) for p in installed), sorted(line.strip() for line in said.splitlines()))
 
             environment.update(LD_PRELOAD=os.environ.get("PRELOAD", ""), ASAN_OPTIONS="detect_leaks=0")
