@@ -29,6 +29,14 @@ std::string UserInterfaceLanguage() {
     return code;
 }
 
+// The module that this code and the dialogs' templates lie in, whichever module a host starts the services for.
+HMODULE OwnModule() noexcept {
+    HMODULE module = nullptr;
+    GetModuleHandleExW(GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,
+                       reinterpret_cast<const wchar_t*>(reinterpret_cast<const void*>(&OwnModule)), &module);
+    return module;
+}
+
 class WindowsShellServices final : public IShellServices {
   public:
     bool VM_CALL Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
@@ -45,7 +53,7 @@ class WindowsShellServices final : public IShellServices {
     void LoadDialogParts(const std::u16string& folder);
     void UseTextSource(IUnknown* source, const char* languageCode) noexcept;
 
-    HMODULE m_module = nullptr;  // of the library; null: not started
+    HMODULE m_module = nullptr;  // in whose folder the library's files lie; null: not started
     win32::Module m_resources;
     win32::Bitmap m_logo;
     HMODULE m_buttonModule = nullptr;  // for which the button class is registered; null: it is not
@@ -99,7 +107,7 @@ std::int32_t VM_CALL WindowsShellServices::ShowOptions(void* owner) try {
         return 0;
     }
     UseTextSource(m_textSource, UserInterfaceLanguage().c_str());
-    OptionsDialog dialog({.templates = m_module,
+    OptionsDialog dialog({.templates = OwnModule(),
                           .buttonModule = m_buttonModule,
                           .logo = m_logo.get(),
                           .texts = &m_texts,

@@ -90,6 +90,20 @@ TEST_F(DialogTest, IsUsableWithoutAMouse) {
     EXPECT_TRUE((**m_services).KnobsDragVertical());
 }
 
+TEST_F(DialogTest, IsShownWhicheverModuleTheServicesAreStartedFor) {
+    IShellServices& services = **m_services;
+    services.ShutDown();
+    EXPECT_TRUE(services.Start(GetModuleHandleW(L"kernel32.dll"), nullptr, nullptr, 1));
+    bool isShown = false;
+    EXPECT_EQ(Show([&](HWND dialog) {
+                  isShown = true;
+                  EXPECT_EQ(TextOf(GetDlgItem(dialog, VM_BUTTON_HELP)), L"Help");
+                  Type(dialog, VK_RETURN);
+              }),
+              1);
+    EXPECT_TRUE(isShown);
+}
+
 TEST_F(DialogTest, SecondDialogIsNotShown) {
     Show([&](HWND dialog) {
         std::int32_t inner = -1;
