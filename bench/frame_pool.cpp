@@ -1,7 +1,9 @@
 #include "bench/frame_pool.h"
 
 #include <algorithm>
+#include <chrono>
 #include <cstring>
+#include <ctime>
 
 namespace velmora::bench {
 namespace {
@@ -38,6 +40,16 @@ std::size_t FramePool::Bytes() const {
 
 void FramePool::Copy() {
     std::memcpy(Destination(), Source(), Bytes());
+}
+
+double SecondsOfThisThread() {
+#ifdef _WIN32
+    return std::chrono::duration<double>(std::chrono::steady_clock::now().time_since_epoch()).count();
+#else
+    timespec time;
+    clock_gettime(CLOCK_THREAD_CPUTIME_ID, &time);
+    return static_cast<double>(time.tv_sec) + 1e-9 * static_cast<double>(time.tv_nsec);
+#endif
 }
 
 double PairedTimes::Typical(std::vector<double> values) {

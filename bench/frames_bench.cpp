@@ -5,18 +5,21 @@
 
 #include <benchmark/benchmark.h>
 
-#include <cstdint>
 #include <cstdio>
 #include <string>
-#include <string_view>
 
 #include "bench/bench_cases.h"
 #include "bench/frame_pool.h"
-#include "effects/effect_session.h"
+#include "bench/session_of.h"
 #include "plugin/frame_processor.h"
 
 namespace velmora::bench {
 namespace {
+
+void Report(benchmark::State& state, const PairedTimes& times) {
+    state.counters["x_memcpy"] = times.Ratio();
+    state.counters["work_ms"] = 1000 * times.Work();
+}
 
 // Alternates a memcpy and the work; reports the ratio.
 template <typename Work>
@@ -26,32 +29,12 @@ void RunPaired(benchmark::State& state, FramePool& pool, Work&& work) {
         RunPair(pool, times, work);
         state.SetIterationTime(times.works.back());
     }
-    state.counters["x_memcpy"] = times.Ratio();
-    state.counters["memcpy_ms"] = 1000 * times.Copy();
-}
-
-void SetUp(effects::EffectSession& session, const BenchCase& test) {
-    const effects::EffectTable& effect = session.Effect();
-    for (std::uint32_t i = 0; i < effect.presetNames.size(); ++i) {
-        if (std::string_view(effect.presetNames[i]) == "Reset To None") session.ApplyPreset(i);
-    }
-    for (const CaseValue& value : test.values) {
-        ValueWord word = {};
-        switch (effect.params[value.parameter].kind) {
-            case kKindSlider:
-                word.number = static_cast<float>(value.value);
-                break;
-            default:
-                word.bits = static_cast<std::uint32_t>(value.value);
-        }
-        session.SetValue(value.parameter, word);
-    }
+    Report(state, times);
 }
 
 void RunCase(benchmark::State& state, const BenchCase& test, PictureSize size, double startSeconds) {
     FramePool pool(size);
-    const auto session = effects::EffectSession::Create(*effects::kAllEffects[test.effect]);
-    SetUp(*session, test);
+    const auto session = SessionOf(test);
     double frame = startSeconds * 30.0;
     RunPaired(state, pool, [&] {
         const bool done =
@@ -59,6 +42,22 @@ void RunCase(benchmark::State& state, const BenchCase& test, PictureSize size, d
         if (!done) state.SkipWithError("frame refused");
         frame += 1.0;
     });
+}
+
+// The first frame after a jump to 10 h.
+void RunJumps(benchmark::State& state, const BenchCase& test) {
+    FramePool pool(kFullHd);
+    const auto session = SessionOf(test);
+    PairedTimes times;
+    for (auto _ : state) {
+        RunJump(pool, times, [&](double seconds) {
+            const bool done =
+                session->Render(pool.Record(pool.Source()), pool.Record(pool.Destination()), seconds);
+            if (!done) state.SkipWithError("frame refused");
+        });
+        state.SetIterationTime(times.works.back());
+    }
+    Report(state, times);
 }
 
 // The frame processor's conversion to 32 bits or back; the 4:2:2 frame lies in the first half of its buffer.
@@ -74,8 +73,10 @@ void RunConversion(benchmark::State& state, bool toBgra) {
     });
 }
 
-void RegisterConversion(const char* name, bool toBgra) {
-    benchmark::RegisterBenchmark(name, [toBgra](benchmark::State& state) { RunConversion(state, toBgra); })
+// The library keeps what is registered until the program ends.
+template <typename Run>
+void Register(const std::string& name, Run&& run) {
+    benchmark::RegisterBenchmark(name.c_str(), run)
         ->UseManualTime()
         ->Unit(benchmark::kMillisecond)
         ->MinTime(0.4);
@@ -91,20 +92,16 @@ class MarkdownReporter : public benchmark::BenchmarkReporter {
     void ReportRuns(const std::vector<Run>& runs) override {
         for (const Run& run : runs) {
             std::printf("| %s | %.2f | %.2f |\n", run.run_name.function_name.c_str(),
-                        run.GetAdjustedRealTime(), run.counters.at("x_memcpy").value);
+                        run.counters.at("work_ms").value, run.counters.at("x_memcpy").value);
             std::fflush(stdout);
         }
     }
 };
 
-// The library keeps what is registered until the program ends.
-void Register(const std::string& name, const BenchCase& test, PictureSize size, double startSeconds) {
-    benchmark::RegisterBenchmark(
-        name.c_str(),
-        [&test, size, startSeconds](benchmark::State& state) { RunCase(state, test, size, startSeconds); })
-        ->UseManualTime()
-        ->Unit(benchmark::kMillisecond)
-        ->MinTime(0.4);
+void RegisterCase(const std::string& name, const BenchCase& test, PictureSize size, double startSeconds) {
+    Register(name, [&test, size, startSeconds](benchmark::State& state) {
+        RunCase(state, test, size, startSeconds);
+    });
 }
 
 }  // namespace
@@ -113,14 +110,18 @@ void Register(const std::string& name, const BenchCase& test, PictureSize size, 
 int main(int argc, char** argv) {
     using namespace velmora::bench;
     for (const BenchCase& test : BenchCases()) {
-        Register(test.name + std::string(" (goal ") + std::to_string(test.goalNative).substr(0, 3) + ")",
-                 test, kFullHd, 1.0);
+        RegisterCase(test.name + std::string(" (goal ") + std::to_string(test.goalNative).substr(0, 3) + ")",
+                     test, kFullHd, 1.0);
     }
     const BenchCase& everything = BenchCases()[7];
-    Register("Film Pro, everything, played at 10 h", everything, kFullHd, 36000.0);
-    Register("Film Pro, everything, 3840x2160", everything, kUltraHd, 1.0);
-    RegisterConversion("frame processor, 4:2:2 to 32 bits (goal 1.5)", true);
-    RegisterConversion("frame processor, 32 bits to 4:2:2 (goal 1.5)", false);
+    RegisterCase("Film Pro, everything, played at 10 h", everything, kFullHd, 36000.0);
+    Register("Film Pro, everything, first frame after a jump to 10 h (at most 30 ms)",
+             [&everything](benchmark::State& state) { RunJumps(state, everything); });
+    RegisterCase("Film Pro, everything, 3840x2160", everything, kUltraHd, 1.0);
+    Register("frame processor, 4:2:2 to 32 bits (goal 1.5)",
+             [](benchmark::State& state) { RunConversion(state, true); });
+    Register("frame processor, 32 bits to 4:2:2 (goal 1.5)",
+             [](benchmark::State& state) { RunConversion(state, false); });
     benchmark::Initialize(&argc, argv);
     if (benchmark::ReportUnrecognizedArguments(argc, argv)) return 2;
     MarkdownReporter reporter;

@@ -60,4 +60,10 @@ Reference<IVideoEffect> EffectLibrary::CreateEffect(std::uint32_t index) const {
     return effect;
 }
 
+Reference<IFrameProcessor> EffectLibrary::CreateFrameProcessor() const {
+    Reference<IFrameProcessor> processor(m_library->CreateFrameProcessor());
+    if (!processor) throw std::runtime_error("VMReelEffects.dll cannot create the frame processor");
+    return processor;
+}
+
 }  // namespace velmora::hosts

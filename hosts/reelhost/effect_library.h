@@ -25,8 +25,10 @@ class EffectLibrary {
     explicit EffectLibrary(const std::string& path);
 
     [[nodiscard]] const std::vector<EffectInfo>& Effects() const { return m_effects; }
-    // Throws std::runtime_error when the library gives none.
+    // Both throw std::runtime_error when the library gives none.
     [[nodiscard]] Reference<IVideoEffect> CreateEffect(std::uint32_t index) const;
+
+    [[nodiscard]] Reference<IFrameProcessor> CreateFrameProcessor() const;
 
     // Tick counts just before and just after loading: the library's random sequence began in between.
     [[nodiscard]] std::uint32_t TickBefore() const { return m_tickBefore; }

@@ -1,0 +1,77 @@
+// What a second worker brings to reelfx: "Film Pro" on frames that lie in memory, through reelfx' own pipeline, so
+// that neither decoding nor encoding takes part. Prints a Markdown table.
+
+#include <algorithm>
+#include <chrono>
+#include <cstdio>
+#include <stdexcept>
+#include <vector>
+
+#include "bench/frame_pool.h"
+#include "bench/session_of.h"
+#include "hosts/reelfx/frame_pipeline.h"
+
+namespace velmora::bench {
+namespace {
+
+constexpr int kFrames = 150;
+constexpr int kRounds = 9;
+
+// Frames a second, from the first frame's start to the last one's end.
+double FramesPerSecond(FramePool& pool, const BenchCase& test, std::size_t workerCount) {
+    std::vector<hosts::FramePipeline::Worker> workers;
+    for (std::size_t i = 0; i < workerCount; ++i) {
+        std::shared_ptr<effects::EffectSession> session = SessionOf(test);
+        workers.push_back([&pool, session](hosts::PipelineItem& item) {
+            const auto at = static_cast<std::size_t>(item.index);
+            const bool done = session->Render(pool.Record(pool.SourceAt(at)),
+                                              pool.Record(pool.DestinationAt(at)), item.seconds);
+            if (!done) throw std::runtime_error("frame refused");
+        });
+    }
+    int next = 0;
+    const auto source = [&next]() -> hosts::PipelineItemPtr {
+        if (next == kFrames) return nullptr;
+        auto item = std::make_unique<hosts::PipelineItem>();
+        item->index = next;
+        item->seconds = 1.0 + next++ / 30.0;
+        return item;
+    };
+    const auto start = std::chrono::steady_clock::now();
+    hosts::FramePipeline pipeline(source, std::move(workers));
+    while (pipeline.Next()) {
+    }
+    return kFrames / std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+}
+
+// The upper quartile: what a run reaches when nothing else wants the machine.
+double Typical(std::vector<double> values) {
+    std::sort(values.begin(), values.end());
+    return values[values.size() * 3 / 4];
+}
+
+void PrintTable() {
+    const BenchCase& test = BenchCases()[7];
+    FramePool pool(kFullHd);
+    std::vector<double> one, two;
+    for (int round = 0; round < kRounds; ++round) {
+        one.push_back(FramesPerSecond(pool, test, 1));
+        two.push_back(FramesPerSecond(pool, test, 2));
+    }
+    std::printf("| %s | frames a second | x one worker |\n|---|---|---|\n", test.name);
+    std::printf("| one worker | %.0f | |\n", Typical(one));
+    std::printf("| two workers (goal 1.9) | %.0f | %.2f |\n", Typical(two), Typical(two) / Typical(one));
+}
+
+}  // namespace
+}  // namespace velmora::bench
+
+int main() {
+    try {
+        velmora::bench::PrintTable();
+    } catch (const std::exception& error) {
+        std::fprintf(stderr, "pipeline_bench: %s\n", error.what());
+        return 1;
+    }
+    return 0;
+}

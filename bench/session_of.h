@@ -1,0 +1,14 @@
+// A case's effect with its settings.
+#pragma once
+
+#include <memory>
+
+#include "bench/bench_cases.h"
+#include "effects/effect_session.h"
+
+namespace velmora::bench {
+
+// Throws std::bad_alloc when memory is short.
+[[nodiscard]] std::unique_ptr<effects::EffectSession> SessionOf(const BenchCase& test);
+
+}  // namespace velmora::bench
