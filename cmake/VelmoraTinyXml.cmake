@@ -16,8 +16,25 @@ else()
   if(NOT EXISTS ${folder}/tinyxml.cpp)
     message(FATAL_ERROR "The sources of TinyXML are not in ${folder}: run scripts/setup")
   endif()
+  # Its parser loses what it is parsing when memory ends in the middle: each such node gets an owner for that time.
+  file(READ ${folder}/tinyxmlparser.cpp parser)
+  foreach(call "node->Parse( p, &data" "node->Parse( p, data" "attrib->Parse( p, data" "textNode->Parse( p, data"
+      "textNode->Parse( pWithWhiteSpace, data")
+    string(REGEX MATCH "^[a-zA-Z]+" pointer "${call}")
+    set(bare "p = ${call}, encoding );")
+    string(FIND "${parser}" "${bare}" place)
+    if(place EQUAL -1)
+      message(FATAL_ERROR "TinyXML's parser has changed: there is no ${bare}")
+    endif()
+    string(REPLACE "${bare}" "{ std::unique_ptr<std::remove_pointer_t<decltype(${pointer})>> owner( ${pointer} ); ${bare} owner.release(); }"
+      parser "${parser}")
+  endforeach()
+  set(made ${CMAKE_BINARY_DIR}/tinyxml/tinyxmlparser.cpp)
+  file(CONFIGURE OUTPUT ${made} CONTENT "#include <memory>\n#include <type_traits>\n@parser@" @ONLY)
+  unset(parser)
   add_library(velmora_tinyxml STATIC EXCLUDE_FROM_ALL
-    ${folder}/tinyxml.cpp ${folder}/tinyxmlerror.cpp ${folder}/tinyxmlparser.cpp)
+    ${folder}/tinyxml.cpp ${folder}/tinyxmlerror.cpp ${made})
+  unset(made)
   target_include_directories(velmora_tinyxml SYSTEM PUBLIC ${folder})
   # Its warnings are not ours to mend.
   target_compile_options(velmora_tinyxml PRIVATE -w)

@@ -1,16 +1,27 @@
 #include "presets/file_access.h"
 
+#include <memory>
+
 #include "presets/file_system.h"
 
 namespace velmora {
 
 namespace {
 
+// False also when memory is too short for writing: the file must be closed, and a half-written one removed.
+bool Writes(std::FILE* file, const TextWriter& write) noexcept try { return write(file); } catch (...) {
+    return false;
+}
+
 // Reports what buffered writing finds out only at the end: a full disk.
-bool WriteAndClose(std::FILE* file, const TextWriter& write) {
-    const bool isWritten = write(file) && std::fflush(file) == 0 && std::ferror(file) == 0;
+bool WriteAndClose(std::FILE* file, const TextWriter& write) noexcept {
+    const bool isWritten = Writes(file, write) && std::fflush(file) == 0 && std::ferror(file) == 0;
     return std::fclose(file) == 0 && isWritten;
 }
+
+struct FileCloser {
+    void operator()(std::FILE* file) const noexcept { std::fclose(file); }
+};
 
 bool WriteInPlace(const NativePath& path, const TextWriter& write) {
     std::FILE* file = OpenForWriting(path);
@@ -22,17 +33,15 @@ bool WriteInPlace(const NativePath& path, const TextWriter& write) {
 bool ReadWholeFile(const char* fileName, std::size_t limit, std::string* content) {
     NativePath path;
     if (!MakeNativePath(fileName, &path)) return false;
-    std::FILE* file = OpenForReading(path);
+    const std::unique_ptr<std::FILE, FileCloser> file(OpenForReading(path));
     if (file == nullptr) return false;
     content->clear();
     char block[16384];
     std::size_t count = 0;
-    while (content->size() <= limit && (count = std::fread(block, 1, sizeof block, file)) > 0) {
+    while (content->size() <= limit && (count = std::fread(block, 1, sizeof block, file.get())) > 0) {
         content->append(block, count);
     }
-    const bool isRead = std::ferror(file) == 0;
-    std::fclose(file);
-    return isRead && !content->empty() && content->size() <= limit;
+    return std::ferror(file.get()) == 0 && !content->empty() && content->size() <= limit;
 }
 
 bool ReplaceTextFile(const char* fileName, const TextWriter& write) {

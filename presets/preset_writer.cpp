@@ -13,12 +13,14 @@ namespace velmora {
 
 namespace {
 
-// The declaration's odd form belongs to the document: it is printed in the usual one.
-constexpr const char* kTemplate =
-    "<?xml version=\"1.0\"  standalone='no' >\n"
-    "<!-- Effect's Preset File -->\n"
-    "<Preset>\n"
-    "</Preset>";
+// Adds a new last child to a node, which then owns it. Returns the child.
+template <typename Node, typename... Arguments>
+Node& Append(TiXmlNode& parent, const Arguments&... arguments) {
+    auto child = std::make_unique<Node>(arguments...);
+    Node& added = *child;
+    parent.LinkEndChild(child.release());
+    return added;
+}
 
 void SetName(TiXmlElement& preset, const char* attribute, const char (&field)[kPresetNameWidth]) {
     preset.SetAttribute(attribute, std::string(field, std::find(field, field + kPresetNameWidth, '\0')));
@@ -48,22 +50,21 @@ void SetValue(TiXmlElement& parameter, const ValueCell& cell) {
 }
 
 void AppendParameter(TiXmlElement& preset, const ValueCell& cell) {
-    auto parameter = std::make_unique<TiXmlElement>("parameter");
-    parameter->SetAttribute(std::string("type"), FormatInteger(static_cast<std::int32_t>(cell.kind)));
-    SetValue(*parameter, cell);
-    preset.LinkEndChild(parameter.release());
+    auto& parameter = Append<TiXmlElement>(preset, "parameter");
+    parameter.SetAttribute(std::string("type"), FormatInteger(static_cast<std::int32_t>(cell.kind)));
+    SetValue(parameter, cell);
 }
 
 bool WriteDocument(const char* fileName, const PresetRecord& record) {
     TiXmlDocument document;
-    document.Parse(kTemplate, nullptr, TIXML_ENCODING_LEGACY);
-    TiXmlElement* preset = document.FirstChildElement("Preset");
-    if (preset == nullptr) return false;
-    SetName(*preset, "Name", record.name);
-    SetName(*preset, "LibraryName", record.libraryName);
-    SetName(*preset, "EffectName", record.effectName);
+    Append<TiXmlDeclaration>(document, "1.0", "", "no");
+    Append<TiXmlComment>(document, " Effect's Preset File ");
+    auto& preset = Append<TiXmlElement>(document, "Preset");
+    SetName(preset, "Name", record.name);
+    SetName(preset, "LibraryName", record.libraryName);
+    SetName(preset, "EffectName", record.effectName);
     const std::int32_t count = std::clamp(record.count, 0, kPresetCellCapacity);
-    std::for_each_n(record.values, count, [&](const ValueCell& cell) { AppendParameter(*preset, cell); });
+    std::for_each_n(record.values, count, [&](const ValueCell& cell) { AppendParameter(preset, cell); });
     return ReplaceTextFile(fileName, [&](std::FILE* file) { return document.SaveFile(file); });
 }
 
