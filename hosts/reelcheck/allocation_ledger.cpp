@@ -9,11 +9,12 @@ namespace {
 // A set of addresses that itself allocates nothing: open addressing, a removed place stays marked.
 class AddressSet {
   public:
-    void Add(void* block) noexcept {
+    void Add(void* block, const void* heap) noexcept {
         for (std::size_t at = Start(block);; at = (at + 1) % kCapacity) {
             if (m_places[at] == block) return;
             if (m_places[at] == nullptr || m_places[at] == Removed()) {
                 m_places[at] = block;
+                m_heaps[at] = heap;
                 ++m_count;
                 return;
             }
@@ -30,6 +31,13 @@ class AddressSet {
             return;
         }
     }
+    void RemoveHeap(const void* heap) noexcept {
+        for (std::size_t at = 0; at < kCapacity; ++at) {
+            if (m_places[at] == nullptr || m_places[at] == Removed() || m_heaps[at] != heap) continue;
+            m_places[at] = Removed();
+            --m_count;
+        }
+    }
     [[nodiscard]] std::uint64_t Count() const noexcept { return m_count; }
 
   private:
@@ -41,6 +49,7 @@ class AddressSet {
     }
 
     void* m_places[kCapacity];
+    const void* m_heaps[kCapacity];
     std::uint64_t m_count;
 };
 
@@ -83,20 +92,29 @@ std::uint64_t LiveBlocks() noexcept {
 
 namespace ledger {
 
+bool IsWatching() noexcept {
+    return g_isWatching;
+}
+
 bool Refuses() noexcept {
     return g_isWatching && ++g_count == g_failing;
 }
 
-void Add(void* block) noexcept {
+void Add(void* block, const void* heap) noexcept {
     if (block == nullptr || !g_isWatching) return;
     const Locked lock;
-    g_live.Add(block);
+    g_live.Add(block, heap);
 }
 
 void Remove(void* block) noexcept {
     if (block == nullptr) return;
     const Locked lock;
     g_live.Remove(block);
+}
+
+void RemoveHeap(const void* heap) noexcept {
+    const Locked lock;
+    g_live.RemoveHeap(heap);
 }
 
 }  // namespace ledger

@@ -35,9 +35,12 @@ class AllocationWatch {
 namespace ledger {
 
 // For the hooks. True when an allocation that is asked for now is to be refused.
+[[nodiscard]] bool IsWatching() noexcept;
 [[nodiscard]] bool Refuses() noexcept;
-void Add(void* block) noexcept;
+// `heap`: any mark for the blocks that go together; may be null.
+void Add(void* block, const void* heap = nullptr) noexcept;
 void Remove(void* block) noexcept;
+void RemoveHeap(const void* heap) noexcept;
 
 }  // namespace ledger
 

@@ -39,6 +39,21 @@ void CheckHostileValues(CheckContext& context);
 void CheckAlternating(CheckContext& context);
 void CheckReplay(CheckContext& context);
 
+// checks_allocation.cpp
+void CheckLoading(CheckContext& context);
+void CheckLoadFailures(CheckContext& context);
+void CheckCreateFailures(CheckContext& context);
+void CheckTableAllocations(CheckContext& context);
+void CheckFrameAllocations(CheckContext& context);
+void CheckFrameFailures(CheckContext& context);
+void CheckEndurance(CheckContext& context);
+
+// checks_dialogs.cpp
+void CheckPresetFiles(CheckContext& context);
+void CheckPresetFailures(CheckContext& context);
+void CheckDialogFailures(CheckContext& context);
+void CheckSystemDialogs(CheckContext& context);
+
 // checks_processor.cpp
 void CheckProcessorState(CheckContext& context);
 void CheckStack(CheckContext& context);

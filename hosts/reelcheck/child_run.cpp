@@ -9,6 +9,7 @@
 
 #include "hosts/reelcheck/allocation_ledger.h"
 #include "hosts/reelcheck/child_process.h"
+#include "hosts/reelcheck/dialog_answers.h"
 
 namespace velmora::reelcheck {
 namespace {
@@ -63,6 +64,7 @@ void RunOne(const Check& check, const Options& options) {
 int RunChild(const Options& options) {
     ReportCrashes();
     InstallAllocationHooks();
+    InstallDialogHooks();
     std::thread(WatchDeadline).detach();
     const std::vector<const Check*> checks = ChosenChecks(options);
     for (std::size_t i = static_cast<std::size_t>(*options.childFrom); i < checks.size(); ++i) {

@@ -15,6 +15,7 @@ void RequireNoGrowth(const ProcessFigures& before, const ProcessFigures& after, 
         {"threads", before.threads, after.threads, 0},
         {"window objects", before.windowObjects, after.windowObjects, 0},
         {"drawing objects", before.drawingObjects, after.drawingObjects, 0},
+        {"thread-local slots", before.threadSlots, after.threadSlots, 0},
         {"bytes", before.memoryBytes, after.memoryBytes, memorySlack},
     };
     for (const Row& row : rows) {

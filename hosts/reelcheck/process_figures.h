@@ -11,6 +11,7 @@ struct ProcessFigures {
     std::int64_t memoryBytes = 0;  // set aside for this process alone
     std::int64_t threads = 0;
     std::int64_t windowObjects = 0;   // Windows: windows, menus, hooks
+    std::int64_t threadSlots = 0;     // Windows: slots of thread-local storage
     std::int64_t drawingObjects = 0;  // Windows: bitmaps, fonts, device contexts
 };
 
