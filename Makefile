@@ -45,6 +45,7 @@ format:
 
 tidy: setup
 	scripts/tidy
+	scripts/cppcheck
 
 clean:
 	rm -rf build

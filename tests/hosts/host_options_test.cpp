@@ -40,7 +40,7 @@ struct Outcome {
     int frames = 0;
     std::string refusal;
 };
-Outcome ReadAll(std::string stream) {
+Outcome ReadAll(const std::string& stream) {
     std::FILE* const file = std::tmpfile();
     std::fwrite(stream.data(), 1, stream.size(), file);
     std::rewind(file);
