@@ -159,10 +159,10 @@ class CRsFX_Group final : public CRsFX_Param {
         : CRsFX_Param(id, name), m_isBegin(isBegin) {}
 
     [[nodiscard]] bool IsKind(std::uint32_t code) const noexcept override { return code == kClassGroup; }
-    [[nodiscard]] bool IsBegin() const noexcept { return m_isBegin; }
 
   private:
-    bool m_isBegin;
+    // Part of the entry; nothing in the library asks for it, as hosts draw their groups from the effects' tables.
+    [[maybe_unused]] bool m_isBegin;
 };
 
 }  // namespace velmora

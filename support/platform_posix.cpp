@@ -1,36 +1,12 @@
 #include <dlfcn.h>
-#include <unistd.h>
 
 #include <chrono>
+#include <filesystem>
+#include <system_error>
 
 #include "support/platform.h"
 
 namespace velmora::support {
-namespace {
-
-std::string Narrow8(const char16_t* text) {
-    std::string out;
-    for (; *text != 0; ++text) {
-        char32_t c = *text;
-        if (c >= 0xD800 && c < 0xDC00 && text[1] >= 0xDC00 && text[1] < 0xE000) {
-            c = 0x10000 + ((c - 0xD800) << 10) + (*++text - char32_t{0xDC00});
-        }
-        const auto add = [&out](char32_t byte) { out.push_back(static_cast<char>(byte)); };
-        if (c < 0x80) {
-            add(c);
-        } else if (c < 0x800) {
-            add(0xC0 | c >> 6), add(0x80 | (c & 0x3F));
-        } else if (c < 0x10000) {
-            add(0xE0 | c >> 12), add(0x80 | (c >> 6 & 0x3F)), add(0x80 | (c & 0x3F));
-        } else {
-            add(0xF0 | c >> 18), add(0x80 | (c >> 12 & 0x3F)), add(0x80 | (c >> 6 & 0x3F));
-            add(0x80 | (c & 0x3F));
-        }
-    }
-    return out;
-}
-
-}  // namespace
 
 std::uint32_t TickCount() noexcept {
     const auto now = std::chrono::steady_clock::now().time_since_epoch();
@@ -38,7 +14,7 @@ std::uint32_t TickCount() noexcept {
 }
 
 ModuleHandle LoadModule(const char16_t* name) noexcept try {
-    return dlopen(Narrow8(name).c_str(), RTLD_NOW | RTLD_LOCAL);
+    return dlopen(std::filesystem::path(name).c_str(), RTLD_NOW | RTLD_LOCAL);
 } catch (...) {
     return nullptr;
 }
@@ -53,12 +29,9 @@ void* FindExport(ModuleHandle module, const char* name) noexcept {
 
 // The native library is linked into its program, so every module's folder is the program's.
 std::u16string ModuleFolder(ModuleHandle) noexcept try {
-    char path[4096];
-    const ssize_t length = readlink("/proc/self/exe", path, sizeof path);
-    if (length <= 0) return {};
-    std::string folder(path, static_cast<std::size_t>(length));
-    folder.resize(folder.find_last_of('/') + 1);
-    return std::u16string(folder.begin(), folder.end());
+    std::error_code error;
+    const std::filesystem::path program = std::filesystem::read_symlink("/proc/self/exe", error);
+    return error ? std::u16string() : (program.parent_path() / "").u16string();
 } catch (...) {
     return {};
 }
