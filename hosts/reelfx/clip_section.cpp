@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 
+#include "hosts/common/usage_error.h"
 #include "hosts/reelfx/interrupt.h"
 
 namespace velmora::hosts {
@@ -14,6 +15,19 @@ constexpr double kTimeTolerance = 1e-6;
 constexpr double kInterleaving = 1.0;
 
 }  // namespace
+
+SectionOptions ResolveFarm(const FarmPart& farm, std::int64_t frames) {
+    if (frames < farm.parts) {
+        throw UsageError("--farm: a clip of " + std::to_string(frames) + " frames has no " +
+                         std::to_string(farm.parts) + " parts");
+    }
+    // Without a product that could overflow: the first parts take one of the frames that are left over.
+    const std::int64_t each = frames / farm.parts, over = frames % farm.parts;
+    SectionOptions section;
+    section.firstFrame = each * (farm.part - 1) + std::min(over, farm.part - 1);
+    if (farm.part < farm.parts) section.endFrame = each * farm.part + std::min(over, farm.part);
+    return section;
+}
 
 ClipSection::ClipSection(MediaReader& reader, const SectionOptions& options)
     : m_reader(reader), m_options(options) {

@@ -11,14 +11,25 @@
 
 namespace velmora::hosts {
 
+// One of the parts into which a clip is divided so that many machines render it.
+struct FarmPart {
+    std::int64_t part = 1;  // counted from 1
+    std::int64_t parts = 1;
+};
+
 struct SectionOptions {
     std::int64_t firstFrame = 0;           // counted from 0
     std::optional<std::int64_t> endFrame;  // the first that is left out
     std::optional<double> start;           // seconds since the clip's first frame
     std::optional<double> duration;        // seconds
+    std::optional<FarmPart> farm;          // instead of all of these; see ResolveFarm
 
     [[nodiscard]] bool IsWholeClip() const { return firstFrame == 0 && !endFrame && !start && !duration; }
 };
+
+// The frames of a part of a clip of `frames` frames. The parts lie side by side, the last one goes to the
+// clip's end. Throws UsageError when there are more parts than frames.
+SectionOptions ResolveFarm(const FarmPart& farm, std::int64_t frames);
 
 class ClipSection {
   public:

@@ -24,6 +24,16 @@ std::optional<std::string> Given(const std::string& text) {
     return text.empty() ? std::nullopt : std::optional(text);
 }
 
+FarmPart ReadFarm(const std::string& text) {
+    const std::size_t slash = text.find('/');
+    const auto part = ParseInteger(text.substr(0, slash));
+    const auto parts = slash == std::string::npos ? std::nullopt : ParseInteger(text.substr(slash + 1));
+    if (!part || !parts || *part < 1 || *part > *parts) {
+        throw UsageError("--farm takes N/M, part N of M counted from 1, not \"" + text + '"');
+    }
+    return {*part, *parts};
+}
+
 SectionOptions ReadSection(const TypedOptions& typed) {
     SectionOptions section;
     if (!typed.frames.empty()) {
@@ -38,6 +48,7 @@ SectionOptions ReadSection(const TypedOptions& typed) {
         section.firstFrame = *first;
         section.endFrame = end;
     }
+    if (!typed.farm.empty()) section.farm = ReadFarm(typed.farm);
     constexpr const char* kTime = "seconds or HH:MM:SS";
     if (!typed.start.empty()) section.start = Parsed("--start", typed.start, ParseTime, kTime);
     if (!typed.duration.empty()) {
@@ -46,6 +57,12 @@ SectionOptions ReadSection(const TypedOptions& typed) {
     }
     if (!typed.frames.empty() && (section.start || section.duration)) {
         throw UsageError("--frames does not go with --start and --duration");
+    }
+    if (section.farm && (!typed.frames.empty() || section.start || section.duration)) {
+        throw UsageError("--farm does not go with --frames, --start and --duration");
+    }
+    if (section.farm && !typed.randomState.empty()) {
+        throw UsageError("--farm does not go with --random-state: its sequence runs through the whole clip");
     }
     return section;
 }
@@ -103,7 +120,7 @@ RenderOptions ReadRender(const TypedOptions& typed) {
     options.threads = typed.threads;
     options.mayOverwrite = typed.overwrite;
     options.isMatte = typed.matte;
-    options.withSound = !typed.noSound && !typed.matte;
+    options.withSound = !typed.noSound && !typed.matte && !options.section.farm;
     options.withDigests = typed.digests;
     options.isDryRun = typed.dryRun;
     options.progress = ReadProgress(typed);

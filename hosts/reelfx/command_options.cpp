@@ -45,6 +45,12 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
     AddRandom(render, typed);
     render.add_option("--frames", typed.frames, "Frames A up to but not including B; either may be left out")
         ->type_name("A:B");
+    render
+        .add_option(
+            "--farm", typed.farm,
+            "Part N of M parts of about the same length, without sound, for rendering one clip on many "
+            "machines; farm-join puts the parts together")
+        ->type_name("N/M");
     render.add_option("--start", typed.start, "Begin at this time of the clip")->type_name("TIME");
     render.add_option("--duration", typed.duration, "Length of the part")->type_name("TIME");
     render.add_option("--threads,-j", typed.threads, "Frames rendered at once; 0: all processors")

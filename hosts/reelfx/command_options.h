@@ -46,7 +46,8 @@ struct TypedOptions {
     InputOptions input;
     EffectOptions effect;
     OutputOptions output;
-    std::string outPath, size, rate, seed = "0", randomState, preset, presetFile, frames, start, duration;
+    std::string outPath, size, rate, seed = "0", randomState, preset, presetFile, frames, farm, start,
+                                     duration;
     std::string format, codec, crf, pixelFormat, progress = "auto";
     int threads = 0;
     bool overwrite = false, noSound = false, digests = false, quiet = false, dryRun = false, matte = false;

@@ -21,8 +21,10 @@ const AVInputFormat* FormatOf(const InputOptions& options) {
 
 }  // namespace
 
-MediaReader::MediaReader(const InputOptions& options)
-    : m_name(options.path == "-" ? "standard input" : options.path) {
+MediaReader::MediaReader(const InputOptions& options, Closed)
+    : m_name(options.path == "-" ? "standard input" : options.path) {}
+
+MediaReader::MediaReader(const InputOptions& options) : MediaReader(options, Closed{}) {
     Open(options);
     OpenDecoder();
     while (!m_firstFrame && !m_ended) ReadMore();
@@ -68,6 +70,24 @@ void MediaReader::OpenDecoder() {
     m_decoder->thread_count = 0;  // as many as the machine has; the decoded frames do not depend on it
     if (error >= 0) error = avcodec_open2(m_decoder.get(), codec, nullptr);
     if (error < 0) throw Failure(kExitInput, m_name + ": cannot be decoded: " + AvText(error));
+}
+
+std::int64_t MediaReader::CountFrames(const InputOptions& options) {
+    MediaReader reader(options, Closed{});
+    if (options.path == "-") throw Failure(kExitInput, reader.m_name + ": has no length known beforehand");
+    reader.Open(options);
+    reader.OpenDecoder();
+    if (reader.m_stream->nb_frames > 0) return reader.m_stream->nb_frames;
+    // These count their files or bytes.
+    const std::string format = reader.m_container->iformat->name;
+    if (format == "image2" || format == "rawvideo") return reader.FrameCountGuess();
+    std::int64_t count = 0;
+    const PacketPtr packet = NewPacket();
+    for (; av_read_frame(reader.m_container.get(), packet.get()) >= 0; av_packet_unref(packet.get())) {
+        const bool isShown = (packet->flags & AV_PKT_FLAG_DISCARD) == 0;
+        count += packet->stream_index == reader.m_stream->index && isShown;
+    }
+    return count;
 }
 
 MediaReader::Item MediaReader::Next() {

@@ -33,6 +33,10 @@ class MediaReader {
     // no frame.
     explicit MediaReader(const InputOptions& options);
 
+    // The number of the input's frames, counted where the container does not tell it; the same wherever it is
+    // asked. Throws Failure (kExitInput), also for an input that can be read only once.
+    static std::int64_t CountFrames(const InputOptions& options);
+
     Item Next();
 
     // Goes on reading somewhere before `seconds` if the input can jump; else from where it is. The caller
@@ -60,6 +64,9 @@ class MediaReader {
     struct CloseInput {
         void operator()(AVFormatContext* container) const { avformat_close_input(&container); }
     };
+
+    struct Closed {};
+    MediaReader(const InputOptions& options, Closed);  // nothing is opened yet
 
     void Open(const InputOptions& options);
     void OpenDecoder();

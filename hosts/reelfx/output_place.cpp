@@ -21,11 +21,11 @@ std::string ExistsText(const std::string& name) {
 }
 
 // The first file that a pattern names, for either usual start of counting; the path itself without one.
-bool SomethingStandsAt(const std::string& path) {
+bool SomethingStandsAt(const std::string& path, std::int64_t firstImage) {
     std::error_code ignored;
     char name[4096];
-    for (const int number : {0, 1}) {
-        if (av_get_frame_filename(name, sizeof name, path.c_str(), number) < 0) break;
+    for (const std::int64_t number : {firstImage == 1 ? 0 : firstImage, firstImage}) {
+        if (av_get_frame_filename(name, sizeof name, path.c_str(), static_cast<int>(number)) < 0) break;
         if (fs::exists(name, ignored)) return true;
     }
     return fs::exists(path, ignored);
@@ -41,7 +41,7 @@ fs::path MakeHiddenFolder(const fs::path& beside, const std::string& name) {
 
 }  // namespace
 
-void CheckOutputPlace(const std::string& path, bool mayOverwrite) {
+void CheckOutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage) {
     if (path == "-") {
         if (isatty(STDOUT_FILENO) == 0) return;
         throw Failure(kExitOutput, "standard output is a terminal; pipe it into a program or name a file");
@@ -50,19 +50,19 @@ void CheckOutputPlace(const std::string& path, bool mayOverwrite) {
     const fs::file_status status = fs::status(path, ignored);
     if (fs::is_directory(status)) throw Failure(kExitOutput, path + ": is a folder");
     if (fs::exists(status) && !fs::is_regular_file(status)) return;
-    if (!mayOverwrite && SomethingStandsAt(path)) throw Failure(kExitOutput, ExistsText(path));
+    if (!mayOverwrite && SomethingStandsAt(path, firstImage)) throw Failure(kExitOutput, ExistsText(path));
     if (access(fs::absolute(path).parent_path().c_str(), W_OK | X_OK) != 0) {
         throw Failure(kExitOutput, path + ": cannot be written: " + std::strerror(errno));
     }
 }
 
-OutputPlace::OutputPlace(const std::string& path, bool mayOverwrite)
+OutputPlace::OutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage)
     : m_path(path), m_name(path == "-" ? "standard output" : path), m_mayOverwrite(mayOverwrite) {
-    CheckOutputPlace(path, mayOverwrite);
+    CheckOutputPlace(path, mayOverwrite, firstImage);
     std::error_code ignored;
     const fs::file_status status = fs::status(m_path, ignored);
     if (path == "-" || (fs::exists(status) && !fs::is_regular_file(status))) return;
-    m_replaces = SomethingStandsAt(path);
+    m_replaces = SomethingStandsAt(path, firstImage);
     // Absolute: a relative name with a colon would be taken for an address.
     const fs::path beside = fs::absolute(m_path).parent_path();
     m_folder = MakeHiddenFolder(beside, m_name);

@@ -2,20 +2,21 @@
 // when they are whole: a command that fails leaves nothing behind, and what was there before stays.
 #pragma once
 
+#include <cstdint>
 #include <filesystem>
 #include <string>
 
 namespace velmora::hosts {
 
 // Throws what the constructor of OutputPlace would, as far as it shows without writing.
-void CheckOutputPlace(const std::string& path, bool mayOverwrite);
+void CheckOutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage = 1);
 
 class OutputPlace {
   public:
     // `path` is a file's name, a pattern of image files ("frames-%04d.png"), or "-" for standard output.
-    // Throws Failure: the file exists and may not be overwritten (kExitOutput), its folder cannot be written
+    // `firstImage` is the number of a pattern's first image. Throws Failure: the file exists and may not be overwritten (kExitOutput), its folder cannot be written
     // to, or standard output is a terminal.
-    OutputPlace(const std::string& path, bool mayOverwrite);
+    OutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage = 1);
     ~OutputPlace();  // discards what was not kept
     OutputPlace(const OutputPlace&) = delete;
     OutputPlace& operator=(const OutputPlace&) = delete;

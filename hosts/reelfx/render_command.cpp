@@ -17,33 +17,39 @@ namespace {
 class RenderRun {
   public:
     explicit RenderRun(const RenderOptions& options)
-        : m_options(options), m_choice(options.effect), m_reader(options.input) {
+        : m_options(options),
+          m_choice(options.effect),
+          m_section(options.section.farm
+                        ? ResolveFarm(*options.section.farm, MediaReader::CountFrames(options.input))
+                        : options.section),
+          m_reader(options.input) {
         if (options.isMatte) CheckMatte(m_choice);
         if (!options.output) return;
+        const std::int64_t firstImage = m_section.firstFrame + 1;
         if (options.isDryRun) {
-            CheckOutputPlace(options.output->path, options.mayOverwrite);
+            CheckOutputPlace(options.output->path, options.mayOverwrite, firstImage);
         } else {
-            m_place.emplace(options.output->path, options.mayOverwrite);
+            m_place.emplace(options.output->path, options.mayOverwrite, firstImage);
         }
         const std::string address = m_place ? m_place->Address() : options.output->path;
         m_writer.emplace(*options.output, address, m_reader, options.withSound);
-        if (options.section.firstFrame > 0) m_writer->NumberImagesFrom(options.section.firstFrame + 1);
+        if (firstImage > 1) m_writer->NumberImagesFrom(firstImage);
     }
 
     // Everything but the frames.
     ExitCode Rehearse() {
-        const std::int64_t frames = ClipSection::FrameCountGuess(m_reader, m_options.section);
+        const std::int64_t frames = ClipSection::FrameCountGuess(m_reader, m_section);
         if (frames == 0 && m_reader.FrameCountGuess() > 0) FailEmpty();
         if (m_writer) m_writer->Rehearse(frames);
-        const std::string text =
-            PlanText(m_options, m_choice, m_reader, m_writer ? &*m_writer : nullptr, ThreadCount());
+        const std::string text = PlanText(m_options, m_section, m_choice, m_reader,
+                                          m_writer ? &*m_writer : nullptr, ThreadCount());
         std::fputs(text.c_str(), stdout);
         return kExitDone;
     }
 
     ExitCode Run() {
         if (m_writer) m_writer->Begin();
-        Progress progress(ClipSection::FrameCountGuess(m_reader, m_options.section), m_options.progress);
+        Progress progress(ClipSection::FrameCountGuess(m_reader, m_section), m_options.progress);
         RenderAll(progress);
         if (m_frames == 0 && Interrupts() == 0) FailEmpty();
         if (m_reader.DamagedPackets() > 0) {
@@ -64,7 +70,7 @@ class RenderRun {
 
   private:
     void RenderAll(Progress& progress) {
-        ClipSection section(m_reader, m_options.section);
+        ClipSection section(m_reader, m_section);
         FramePipeline pipeline([&] { return section.Next(); }, MakeWorkers());
         while (const PipelineItemPtr item = pipeline.Next()) {
             if (Interrupts() > 1) throw Failure(kExitInterrupted, "interrupted; nothing was kept");
@@ -103,7 +109,7 @@ class RenderRun {
         }
         if (m_options.withDigests) std::printf("%s\n", DigestLine(item.index, item.digest).c_str());
         if (!m_writer) return;
-        if (m_frames == 0 && !m_options.section.IsWholeClip()) m_writer->StartAt(item.frame->pts);
+        if (m_frames == 0 && !m_section.IsWholeClip()) m_writer->StartAt(item.frame->pts);
         m_writer->WriteFrame(std::move(item.frame));
     }
 
@@ -127,6 +133,7 @@ class RenderRun {
 
     const RenderOptions& m_options;
     EffectChoice m_choice;
+    SectionOptions m_section;
     MediaReader m_reader;
     std::optional<OutputPlace> m_place;
     std::optional<MediaWriter> m_writer;

@@ -42,15 +42,15 @@ std::string RandomText(const EffectOptions& options) {
 
 }  // namespace
 
-std::string PlanText(const RenderOptions& options, const EffectChoice& choice, const MediaReader& reader,
-                     const MediaWriter* writer, unsigned threads) {
+std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectChoice& choice,
+                     const MediaReader& reader, const MediaWriter* writer, unsigned threads) {
     const MediaFacts facts = FactsOf(reader);
     std::string effect = choice.Info().name;
     if (options.effect.preset) effect += ", preset " + *options.effect.preset;
     if (options.effect.presetFile) effect += ", preset file " + *options.effect.presetFile;
     std::string text = Line("input", reader.Name() + ": " + ShortText(facts));
     for (const std::string& note : NotesOn(facts)) text += Line("note", note);
-    text += Line("part", SectionText(options.section, ClipSection::FrameCountGuess(reader, options.section)));
+    text += Line("part", SectionText(section, ClipSection::FrameCountGuess(reader, section)));
     text += Line("effect", effect);
     if (options.isMatte) text += Line("matte", "the damage alone, with straight alpha");
     text += Line("settings", SettingsText(choice));

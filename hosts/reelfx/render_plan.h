@@ -9,8 +9,8 @@
 
 namespace velmora::hosts {
 
-// Lines of text, each with its end. `writer` null: digests only.
-std::string PlanText(const RenderOptions& options, const EffectChoice& choice, const MediaReader& reader,
-                     const MediaWriter* writer, unsigned threads);
+// `section` is where the frames come from, a farm's part resolved. Lines of text, each with its end. `writer` null: digests only.
+std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectChoice& choice,
+                     const MediaReader& reader, const MediaWriter* writer, unsigned threads);
 
 }  // namespace velmora::hosts

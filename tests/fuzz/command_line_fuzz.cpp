@@ -77,6 +77,7 @@ void Check(const velmora::hosts::RenderOptions& options) {
     Require(section.firstFrame >= 0 && (!section.endFrame || *section.endFrame > section.firstFrame));
     Require(!section.start || *section.start >= 0.0);
     Require(!section.duration || *section.duration > 0.0);
+    Require(!section.farm || (section.farm->part >= 1 && section.farm->part <= section.farm->parts));
     Require(options.threads >= 0 && options.threads <= 256);
     Require(options.output || options.withDigests);
 }
