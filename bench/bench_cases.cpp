@@ -34,6 +34,8 @@ constexpr BenchCase kCases[] = {
 
 }  // namespace
 
-std::span<const BenchCase> BenchCases() noexcept { return kCases; }
+std::span<const BenchCase> BenchCases() noexcept {
+    return kCases;
+}
 
 }  // namespace velmora::bench

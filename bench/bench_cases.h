@@ -15,9 +15,9 @@ struct CaseValue {
 
 struct BenchCase {
     const char* name;
-    std::uint32_t effect;            // as the library offers them
+    std::uint32_t effect;               // as the library offers them
     std::span<const CaseValue> values;  // other parameters: "Reset To None"
-    double goalNative;               // x memcpy of a frame
+    double goalNative;                  // x memcpy of a frame
     double goalDll;
 };
 

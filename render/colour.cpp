@@ -88,15 +88,23 @@ ColourStage PrepareColour(const StageSettings& settings, double seconds, Contras
         offset = std::clamp(Narrow(double{offset} + brightness), -1.0f, 1.0f);
     }
     stage.m_tone = BrightnessTable(offset);
+    if (offset != 0.0f) stage.AddLine(stage.m_tone, 1.0 - std::abs(double{offset}));
     if (!IsNearZero(contrast)) {
         if (cache.contrast != contrast) {
             cache.contrast = contrast;
             cache.table = ContrastTable(contrast);
         }
+        stage.AddLine(cache.table, ContrastGain(contrast));
         for (std::uint8_t& entry : stage.m_tone) entry = cache.table[entry];
     }
     stage.m_weight = static_cast<std::int16_t>(Truncate((0.0f - settings.saturation) * 127.0));
     return stage;
+}
+
+void ColourStage::AddLine(const ByteTable& table, double slope) noexcept {
+    const std::optional<ToneLine> line = LineOf(table, slope);
+    m_isLines = m_isLines && line;
+    if (m_isLines) m_lines[m_lineCount++] = *line;
 }
 
 Bgra MixWithGrey(Bgra pixel, std::int32_t weight) noexcept {

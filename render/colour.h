@@ -11,16 +11,18 @@
 #pragma once
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
+#include <span>
 
+#include "render/byte_table.h"
 #include "render/cpu.h"
 #include "render/image.h"
 #include "render/render_state.h"
 #include "render/stage_settings.h"
+#include "render/tone_line.h"
 
 namespace velmora::render {
-
-using ByteTable = std::array<std::uint8_t, 256>;
 
 // The flicker's share of the brightness offset at a time: a value that changes `rate` times a second, the
 // k-th of a sequence that the settings alone seed, so that it is the same on every run. Costs the same at any
@@ -41,18 +43,26 @@ class ColourStage {
     // Pixels are mixed with their grey value: more than a table.
     [[nodiscard]] bool Mixes() const noexcept { return m_mixes; }
     [[nodiscard]] const ByteTable& Tone() const noexcept { return m_tone; }
+    // Lines that one after the other make that table; none where it is not made of lines.
+    [[nodiscard]] std::span<const ToneLine> Lines() const noexcept {
+        return {m_lines.data(), m_isLines ? m_lineCount : 0};
+    }
     [[nodiscard]] std::int16_t Weight() const noexcept { return m_weight; }
 
     // The plain form. `in` may be `out`.
     void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
   private:
+    void AddLine(const ByteTable& table, double slope) noexcept;
     friend ColourStage PrepareColour(const StageSettings&, double, ContrastCache&) noexcept;
 
     bool m_active = false;
     bool m_mixes = false;
     std::int16_t m_weight = 0;  // w above
     ByteTable m_tone{};
+    bool m_isLines = true;  // so far
+    std::size_t m_lineCount = 0;
+    std::array<ToneLine, 2> m_lines{};
 };
 
 // `seconds`: the frame's time. The contrast table is rebuilt only when its value changes.

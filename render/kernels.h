@@ -8,10 +8,12 @@
 #include <array>
 #include <cstdint>
 #include <limits>
+#include <span>
 
 #include "render/colour.h"
 #include "render/cpu.h"
 #include "render/image.h"
+#include "render/tone_line.h"
 #include "render/wear_factors.h"
 
 namespace velmora::render {
@@ -44,6 +46,7 @@ struct Tone {
     bool mixes = false;
     std::int32_t weight = 0;  // of the mix, -127..127
     const ChannelTables* after = nullptr;
+    std::span<const ToneLine> lines = {};  // one or two that give the same as `before`, if there are
 
     [[nodiscard]] bool IsActive() const noexcept { return before != nullptr || mixes || after != nullptr; }
 };

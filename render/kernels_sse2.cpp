@@ -137,8 +137,47 @@ void EndStream() noexcept {
     _mm_sfence();
 }
 
+// Eight bytes on a line, those in the upper halves.
+struct Line {
+    __m128i times, plus, minus, shift;
+
+    explicit Line(const ToneLine& line) noexcept
+        : times(_mm_set1_epi16(static_cast<short>(line.times))),
+          plus(_mm_set1_epi16(static_cast<short>(line.plus))),
+          minus(_mm_set1_epi16(static_cast<short>(line.minus))),
+          shift(_mm_cvtsi32_si128(line.shift)) {}
+
+    __m128i At(__m128i upperBytes) const noexcept {
+        const __m128i sum = _mm_adds_epu16(_mm_mulhi_epu16(upperBytes, times), plus);
+        return _mm_srl_epi16(_mm_subs_epu16(sum, minus), shift);
+    }
+};
+
+void LineRow(const Bgra* in, Bgra* out, std::int32_t width, const ToneLine& toneLine) noexcept {
+    const __m128i colour = _mm_set1_epi32(0x00FFFFFF), zero = _mm_setzero_si128();
+    const Line line(toneLine);
+    std::int32_t x = 0;
+    for (; x + 4 <= width; x += 4) {
+        FetchAhead(in + x);
+        const __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in + x));
+        const __m128i toned = _mm_packus_epi16(line.At(_mm_unpacklo_epi8(zero, pixels)),
+                                               line.At(_mm_unpackhi_epi8(zero, pixels)));
+        const __m128i kept = _mm_or_si128(_mm_and_si128(colour, toned), _mm_andnot_si128(colour, pixels));
+        _mm_storeu_si128(reinterpret_cast<__m128i*>(out + x), kept);
+    }
+    for (; x < width; ++x) {
+        const Bgra p = in[x];
+        out[x] = {EntryOf(toneLine, p.blue), EntryOf(toneLine, p.green), EntryOf(toneLine, p.red), p.alpha};
+    }
+}
+
 void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
-    ToneInPasses(TablesRow, MixRow, in, out, width, tone);
+    if (tone.lines.empty()) return ToneInPasses(TablesRow, MixRow, in, out, width, tone);
+    for (const ToneLine& line : tone.lines) {
+        LineRow(in, out, width, line);
+        in = out;
+    }
+    ToneInPasses(TablesRow, MixRow, out, out, width, Tone{nullptr, tone.mixes, tone.weight, tone.after});
 }
 
 }  // namespace

@@ -40,19 +40,23 @@ RowProgram::RowProgram(const FramePlan& plan, Form form) noexcept : m_plan(plan)
 
 void RowProgram::PlanTables() noexcept {
     const ByteTable identity = Identity();
-    const ByteTable& tone = m_plan.colour.IsActive() ? m_plan.colour.Tone() : identity;
-    m_tone.mixes = m_plan.colour.IsActive() && m_plan.colour.Mixes();
-    m_tone.weight = m_tone.mixes ? m_plan.colour.Weight() : 0;
-    if (m_tone.mixes && tone != identity) {
+    const ColourStage& colour = m_plan.colour;
+    const TintStage& tint = m_plan.tint;
+    const ByteTable& tone = colour.IsActive() ? colour.Tone() : identity;
+    m_tone.mixes = colour.IsActive() && colour.Mixes();
+    m_tone.weight = m_tone.mixes ? colour.Weight() : 0;
+    const bool staysLines = colour.IsActive() && !colour.Lines().empty() && !tint.IsActive();
+    const bool goesBefore = m_tone.mixes || staysLines;
+    if (goesBefore && tone != identity) {
         m_before.Set(tone, tone, tone);
         m_tone.before = &m_before;
+        m_tone.lines = colour.Lines();
     }
 
-    const ByteTable& first = m_tone.mixes ? identity : tone;
-    const bool tints = m_plan.tint.IsActive();
-    const ByteTable blue = tints ? Joined(first, m_plan.tint.Blue()) : first;
-    const ByteTable green = tints ? Joined(first, m_plan.tint.Green()) : first;
-    const ByteTable red = tints ? Joined(first, m_plan.tint.Red()) : first;
+    const ByteTable& first = goesBefore ? identity : tone;
+    const ByteTable blue = tint.IsActive() ? Joined(first, tint.Blue()) : first;
+    const ByteTable green = tint.IsActive() ? Joined(first, tint.Green()) : first;
+    const ByteTable red = tint.IsActive() ? Joined(first, tint.Red()) : first;
     if (blue != identity || green != identity || red != identity) {
         m_after.Set(blue, green, red);
         m_tone.after = &m_after;

@@ -80,6 +80,48 @@ VM_AVX2 inline void LookUpAll(Block& a, Block& b, const ChannelTables& tables) n
     LookUp(a.v[2], b.v[2], tables.redDifferences);
 }
 
+struct Line {
+    __m256i times, plus, minus;
+    __m128i shift;
+
+    VM_AVX2 explicit Line(const ToneLine& line) noexcept
+        : times(_mm256_set1_epi16(static_cast<short>(line.times))),
+          plus(_mm256_set1_epi16(static_cast<short>(line.plus))),
+          minus(_mm256_set1_epi16(static_cast<short>(line.minus))),
+          shift(_mm_cvtsi32_si128(line.shift)) {}
+
+    VM_AVX2 __m256i At(__m256i upperBytes) const noexcept {
+        const __m256i sum = _mm256_adds_epu16(_mm256_mulhi_epu16(upperBytes, times), plus);
+        return _mm256_srl_epi16(_mm256_subs_epu16(sum, minus), shift);
+    }
+    VM_AVX2 __m256i Bytes(__m256i bytes) const noexcept {
+        const __m256i zero = _mm256_setzero_si256();
+        return _mm256_packus_epi16(At(_mm256_unpacklo_epi8(zero, bytes)),
+                                   At(_mm256_unpackhi_epi8(zero, bytes)));
+    }
+};
+
+// A tone's lines, one or two; for what has none, one that is not used.
+class Lines {
+  public:
+    VM_AVX2 explicit Lines(std::span<const ToneLine> lines) noexcept
+        : m_first(lines.empty() ? ToneLine{} : lines.front()),
+          m_second(lines.empty() ? ToneLine{} : lines.back()),
+          m_areTwo(lines.size() == 2) {}
+
+    VM_AVX2 __m256i Bytes(__m256i bytes) const noexcept {
+        const __m256i once = m_first.Bytes(bytes);
+        return m_areTwo ? m_second.Bytes(once) : once;
+    }
+    VM_AVX2 void Put(Block& b) const noexcept {
+        for (int c = 0; c < 3; ++c) b.v[c] = Bytes(b.v[c]);
+    }
+
+  private:
+    Line m_first, m_second;
+    bool m_areTwo;
+};
+
 // Two numbers of 8 bits, unsigned, in each word of 16; their products with these signed ones are added up.
 VM_AVX2 inline __m256i Pair(int first, int second) noexcept {
     return _mm256_set1_epi16(static_cast<short>((first & 0xFF) | second * 256));
@@ -110,10 +152,15 @@ VM_AVX2 inline void Mix(Block& b, std::int32_t weight) noexcept {
 }
 
 // Two blocks, so that entries are loaded for both.
-VM_AVX2 inline void ToneTwo(Block& a, Block& b, const Tone& tone) noexcept {
+VM_AVX2 inline void ToneTwo(Block& a, Block& b, const Tone& tone, const Lines& lines) noexcept {
     a = ToChannels(a);
     b = ToChannels(b);
-    if (tone.before != nullptr) LookUpAll(a, b, *tone.before);
+    if (!tone.lines.empty()) {
+        lines.Put(a);
+        lines.Put(b);
+    } else if (tone.before != nullptr) {
+        LookUpAll(a, b, *tone.before);
+    }
     if (tone.mixes) {
         Mix(a, tone.weight);
         Mix(b, tone.weight);
@@ -135,12 +182,28 @@ VM_AVX2 inline void StoreBlock(Bgra* out, const Block& b) noexcept {
     for (int i = 0; i < 4; ++i) _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + 8 * i), b.v[i]);
 }
 
+// Lines alone need no channels apart.
+VM_AVX2 void LinesRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
+    const __m256i alpha = _mm256_set1_epi32(static_cast<int>(0xFF000000u));
+    const Lines lines(tone.lines);
+    std::int32_t x = 0;
+    for (; x + 8 <= width; x += 8) {
+        FetchAhead(in + x);
+        const __m256i pixels = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + x));
+        const __m256i toned = lines.Bytes(pixels);
+        _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + x), _mm256_blendv_epi8(toned, pixels, alpha));
+    }
+    kSse2Kernels.tone(in + x, out + x, width - x, tone);
+}
+
 }  // namespace
 
 VM_AVX2 void ToneRowAvx2(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
-    const auto toneTwo = [&tone](const Bgra* from, Bgra* to) VM_AVX2 {
+    if (!tone.lines.empty() && !tone.mixes && tone.after == nullptr) return LinesRow(in, out, width, tone);
+    const Lines lines(tone.lines);
+    const auto toneTwo = [&tone, &lines](const Bgra* from, Bgra* to) VM_AVX2 {
         Block a = LoadBlock(from), b = LoadBlock(from + kBlock);
-        ToneTwo(a, b, tone);
+        ToneTwo(a, b, tone, lines);
         StoreBlock(to, a);
         StoreBlock(to + kBlock, b);
     };

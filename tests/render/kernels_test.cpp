@@ -79,6 +79,27 @@ TEST(RowKernels, TonesAreEqualInAllForms) {
     }
 }
 
+TEST(RowKernels, LinesAreEqualToTheirTableInAllForms) {
+    const ToneLine up = {200 << 8, 3000, 0, 8}, cut = {60000, 0, 9000, 6};
+    std::mt19937 numbers(6);
+    const ChannelTables after = AnyTables(numbers);
+    for (const std::vector<ToneLine>& lines : {std::vector{up}, std::vector{cut}, std::vector{up, cut}}) {
+        ByteTable table;
+        for (std::size_t i = 0; i < table.size(); ++i) {
+            table[i] = static_cast<std::uint8_t>(i);
+            for (const ToneLine& line : lines) table[i] = EntryOf(line, table[i]);
+        }
+        ChannelTables before;
+        before.Set(table, table, table);
+        for (Tone tone : {Tone{&before, true, 40, &after}, Tone{&before, false, 0, nullptr}}) {
+            tone.lines = lines;
+            ExpectEqualForms([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
+                                 std::int32_t width) { kernels.tone(in, out, width, tone); },
+                             true);
+        }
+    }
+}
+
 TEST(RowKernels, WearIsEqualInAllForms) {
     constexpr std::int32_t kHeight = 9;
     std::mt19937 numbers(3);

@@ -8,6 +8,7 @@
 
 #include "render/colour.h"
 #include "render/tint.h"
+#include "render/tone_line.h"
 
 namespace velmora::render {
 namespace {
@@ -30,6 +31,42 @@ TEST(BrightnessTable, MatchesWholeNumbers) {
     }
     EXPECT_EQ(BrightnessTable(0.5f)[0], 128);
     EXPECT_EQ(BrightnessTable(0.5f)[255], 255);
+}
+
+int CountOffLine(const ByteTable& table, const ToneLine& line) {
+    int count = 0;
+    for (int i = 0; i < 256; ++i) {
+        const auto level = static_cast<std::uint8_t>(i);
+        count += EntryOf(line, level) != table[level];
+    }
+    return count;
+}
+
+// Some tables are missed by all numbers of 16 bits, which only costs time.
+TEST(ToneLine, GivesNearlyAllTablesOfBrightnessAndContrast) {
+    int tables = 0, missed = 0;
+    const auto check = [&](const ByteTable& table, double slope) {
+        const auto line = LineOf(table, slope);
+        ++tables;
+        missed += !line;
+        if (line) {
+            EXPECT_EQ(CountOffLine(table, *line), 0) << slope;
+        }
+    };
+    for (int step = -500; step <= 500; ++step) {
+        const float part = static_cast<float>(step) / 1000.0f;
+        check(BrightnessTable(2 * part), 1.0 - std::abs(2.0 * part));
+        check(ContrastTable(part), step < 0 ? 1.0 + part : 1.0 + 10.0 * part * part);
+    }
+    EXPECT_LT(missed, tables / 20);
+}
+
+TEST(ToneLine, IsNotMadeOfOtherTables) {
+    ByteTable bent = BrightnessTable(0.25f);
+    bent[100] = static_cast<std::uint8_t>(bent[100] + 2);
+    EXPECT_FALSE(LineOf(bent, 0.75));
+    EXPECT_FALSE(LineOf(BrightnessTable(0.25f), 0.5));
+    EXPECT_FALSE(LineOf(ContrastTable(0.95f), 254.0));
 }
 
 TEST(ContrastTable, MatchesWholeNumbers) {

@@ -1,0 +1,11 @@
+// What a channel's levels become.
+#pragma once
+
+#include <array>
+#include <cstdint>
+
+namespace velmora::render {
+
+using ByteTable = std::array<std::uint8_t, 256>;
+
+}  // namespace velmora::render
