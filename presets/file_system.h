@@ -15,7 +15,7 @@ using NativePath = std::string;
 // The path that an 8-bit name stands for, past any link to another file; false when there is none.
 [[nodiscard]] bool MakeNativePath(const char* fileName, NativePath* path);
 
-// Binary, for reading; null when it cannot be opened or is a folder.
+// Binary, for reading; null when it cannot be opened, or is a folder or a device.
 [[nodiscard]] std::FILE* OpenForReading(const NativePath& path);
 // As text, emptied; null when it cannot be opened or is write-protected.
 [[nodiscard]] std::FILE* OpenForWriting(const NativePath& path);

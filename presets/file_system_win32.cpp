@@ -22,7 +22,13 @@ bool MakeNativePath(const char* fileName, NativePath* path) {
 }
 
 std::FILE* OpenForReading(const NativePath& path) {
-    return _wfopen(path.c_str(), L"rb");
+    std::FILE* file = _wfopen(path.c_str(), L"rb");
+    if (file == nullptr) return nullptr;
+    // "COM1" in any folder is a device: reading from it would wait for ever.
+    const auto handle = reinterpret_cast<HANDLE>(_get_osfhandle(_fileno(file)));
+    if (GetFileType(handle) == FILE_TYPE_DISK) return file;
+    std::fclose(file);
+    return nullptr;
 }
 
 // "t", as the host may have made binary files the default.

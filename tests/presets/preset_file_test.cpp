@@ -2,6 +2,10 @@
 
 #include <gtest/gtest.h>
 
+#ifdef _WIN32
+#include <windows.h>
+#endif
+
 #include <algorithm>
 #include <bit>
 #include <clocale>
@@ -374,6 +378,18 @@ TEST(ReadPreset, FailsOnWhatIsNoFile) {
     EXPECT_FALSE(ReadPreset(nullptr, &record));
     EXPECT_FALSE(ReadPreset(folder.Write("a", Document("<parameter/>")).c_str(), nullptr));
 }
+
+#ifdef _WIN32
+// As "COM1" does in every folder, this pipe keeps its reader waiting.
+TEST(ReadPreset, DoesNotWaitForADevice) {
+    const std::string name = "\\\\.\\pipe\\velmora-" + std::to_string(GetCurrentProcessId());
+    const HANDLE pipe = CreateNamedPipeA(name.c_str(), PIPE_ACCESS_OUTBOUND, 0, 1, 0, 0, 0, nullptr);
+    ASSERT_NE(pipe, INVALID_HANDLE_VALUE);
+    PresetRecord record = {};
+    EXPECT_FALSE(ReadPreset(name.c_str(), &record));
+    CloseHandle(pipe);
+}
+#endif
 
 }  // namespace
 }  // namespace velmora
