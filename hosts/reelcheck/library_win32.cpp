@@ -23,6 +23,12 @@ std::wstring PathOf(const std::string& path) {
     return wide;
 }
 
+void* Load(const std::string& path) {
+    void* const module = LoadLibraryW(PathOf(path).c_str());
+    if (module == nullptr) Fail(Text("the library cannot be loaded, system error %lu", GetLastError()));
+    return module;
+}
+
 template <typename Function>
 Function Export(void* module, const char* name) {
     return reinterpret_cast<Function>(
@@ -36,8 +42,7 @@ Library::Library(void* module) noexcept
       canUnload(Export<CanUnloadDLLNowFunction>(module, "CanUnloadDLLNow")),
       m_module(module) {}
 
-Library::Library(const std::string& path) : Library(static_cast<void*>(LoadLibraryW(PathOf(path).c_str()))) {
-    if (m_module == nullptr) Fail(Text("the library cannot be loaded, system error %lu", GetLastError()));
+Library::Library(const std::string& path) : Library(Load(path)) {
     if (getEffectsLibrary == nullptr || canUnload == nullptr) Fail("an export is missing");
 }
 
