@@ -6,15 +6,15 @@
 
 #include <climits>
 #include <cstdlib>
+#include <memory>
 
 namespace velmora {
 
 bool MakeNativePath(const char* fileName, NativePath* path) {
     if (fileName == nullptr || *fileName == '\0') return false;
     // A name that is a link stays one: what it points to is replaced.
-    char* resolved = realpath(fileName, nullptr);
-    *path = resolved != nullptr ? resolved : fileName;
-    std::free(resolved);
+    const std::unique_ptr<char, decltype(&std::free)> resolved(realpath(fileName, nullptr), &std::free);
+    *path = resolved != nullptr ? resolved.get() : fileName;
     return true;
 }
 

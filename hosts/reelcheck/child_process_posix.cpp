@@ -69,14 +69,22 @@ std::string ChildProcess::HowItEnded() {
     return code == 0 ? "" : Text("exit code %d", code);
 }
 
-namespace {
-
-// A sanitizer tells more of a crash by itself.
 #if defined(__SANITIZE_ADDRESS__)
-constexpr bool kSanitizerReports = true;
+
+extern "C" void __sanitizer_set_death_callback(void (*callback)());
+
+// The sanitizer tells of the crash itself, on the standard error output.
+void ReportCrashes() {
+    __sanitizer_set_death_callback([] {
+        char line[512];
+        std::snprintf(line, sizeof line, "crash %s: stopped by the sanitizer\n", Place());
+        WriteLine(line);
+    });
+}
+
 #else
-constexpr bool kSanitizerReports = false;
-#endif
+
+namespace {
 
 void OnCrash(int signal, siginfo_t* info, void*) {
     char line[512];
@@ -90,12 +98,13 @@ void OnCrash(int signal, siginfo_t* info, void*) {
 }  // namespace
 
 void ReportCrashes() {
-    if (kSanitizerReports) return;
     struct sigaction action = {};
     action.sa_sigaction = OnCrash;
     action.sa_flags = SA_SIGINFO | SA_RESETHAND;
     for (const int signal : {SIGSEGV, SIGBUS, SIGILL, SIGFPE, SIGABRT}) sigaction(signal, &action, nullptr);
 }
+
+#endif
 
 void WriteLine(const char* text) noexcept {
     std::size_t length = std::strlen(text);
