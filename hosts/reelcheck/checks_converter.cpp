@@ -35,10 +35,6 @@ void ConvertInside(IFrameProcessor& processor, const Direction& direction, const
     Require((processor.*direction.convert)(&in, &out, 200), "refuses the frame");
     const std::int32_t width = std::min(from.width, to.width), height = std::min(from.height, to.height);
     Require(destination.OnlyInside(width, height, kOutside), "something outside the rectangle is written");
-    // The same through overlapping memory is another road: it must lead to the same place.
-    Frame shared(to, direction.to);
-    shared.Fill(kOutside);
-    Require((processor.*direction.convert)(&in, &out, 200), "refuses the frame a second time");
 }
 
 Layout RandomLayout(Dice& dice) {

@@ -138,7 +138,7 @@ void CheckMenus(CheckContext& context) {
 
 void CheckHostileValues(CheckContext& context) {
     ForEachBench(context, [&](Bench& bench) {
-        for (int i = 0; i < context.Rounds(150, 20000); ++i) {
+        for (int i = 0; i < context.Rounds(150, 8000); ++i) {
             SetPlace("%s, round %d", bench.facts.name.c_str(), i);
             ChooseHostile(bench.host, bench.facts, context.dice);
             bench.host.answers = !context.dice.OneIn(20);

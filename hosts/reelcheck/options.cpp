@@ -15,7 +15,7 @@ const char* const kHelp =
     "\n"
     "  --level     from 1, a first look, to 10, everything and long (default 5)\n"
     "  --seed      brings back the random values of an earlier run, which printed it\n"
-    "  --timeout   seconds that one check may take before it counts as hanging (default 300)\n"
+    "  --timeout   seconds that one check may take before it counts as hanging (default 900)\n"
     "  --only      run this check, whatever its level; several are possible\n"
     "  --json      print the results as one JSON object\n"
     "  --library   the library to check (Windows; default: the one beside this program)\n"

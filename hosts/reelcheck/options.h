@@ -13,7 +13,7 @@ namespace velmora::reelcheck {
 struct Options {
     int level = kUsualLevel;
     std::uint64_t seed = 0;    // drawn from the clock when none is given
-    int timeoutSeconds = 300;  // for one check
+    int timeoutSeconds = 900;  // for one check
     std::vector<std::string> only;
     std::string library;
     bool help = false;

@@ -6,8 +6,10 @@ REELCHECK is the command that runs the program, its words apart by ";".
 import os
 import subprocess
 import unittest
+from pathlib import Path
 
 COMMAND = os.environ["REELCHECK"].split(";")
+PAGE = Path(__file__).resolve().parents[3] / "docs" / "reelcheck.md"
 
 # fault -> the check that must find it, and what its line says
 FAULTS = {
@@ -58,6 +60,12 @@ class FindsFaults(unittest.TestCase):
         checks = sorted({check for check, _ in FAULTS.values()})
         code, output = run("none", *[word for check in checks for word in ("--only", check)])
         self.assertEqual(code, 0, output)
+
+    def test_the_page_tells_of_every_check(self):
+        listed = subprocess.run([*COMMAND, "--list"], stdout=subprocess.PIPE, text=True, check=True).stdout
+        rows = [line.split(None, 2) for line in listed.splitlines()]
+        table = "".join(f"| {name} | {level} | {what} |\n" for level, name, what in rows)
+        self.assertIn(table, PAGE.read_text())
 
     def test_a_wrong_command_line_is_told(self):
         for words in (["--level", "11"], ["--level"], ["--only", "no-such-check"], ["--seed", "x"], ["--what"]):
