@@ -20,14 +20,17 @@ struct Block {
     __m256i v[4];
 };
 
-// Swaps rows and columns of the 4 × 4 words of each half.
-VM_AVX2 inline Block Transposed(const Block& b) noexcept {
+// Swaps rows and columns of the 4 × 4 words of each half. In place, as what follows: 32-bit builds copy blocks by
+// halves of registers, and loads of whole ones then wait for both.
+VM_AVX2 inline void Transpose(Block& b) noexcept {
     const __m256i low01 = _mm256_unpacklo_epi32(b.v[0], b.v[1]),
                   low23 = _mm256_unpacklo_epi32(b.v[2], b.v[3]);
     const __m256i high01 = _mm256_unpackhi_epi32(b.v[0], b.v[1]),
                   high23 = _mm256_unpackhi_epi32(b.v[2], b.v[3]);
-    return {{_mm256_unpacklo_epi64(low01, low23), _mm256_unpackhi_epi64(low01, low23),
-             _mm256_unpacklo_epi64(high01, high23), _mm256_unpackhi_epi64(high01, high23)}};
+    b.v[0] = _mm256_unpacklo_epi64(low01, low23);
+    b.v[1] = _mm256_unpackhi_epi64(low01, low23);
+    b.v[2] = _mm256_unpacklo_epi64(high01, high23);
+    b.v[3] = _mm256_unpackhi_epi64(high01, high23);
 }
 
 // Gathers equal channels of four pixels in a word, or undoes it.
@@ -36,15 +39,22 @@ VM_AVX2 inline __m256i Regrouped(__m256i pixels) noexcept {
                                                                                  6, 10, 14, 3, 7, 11, 15)));
 }
 
-VM_AVX2 inline Block ToChannels(Block b) noexcept {
+VM_AVX2 inline void Regroup(Block& b) noexcept {
     for (__m256i& v : b.v) v = Regrouped(v);
-    return Transposed(b);
 }
 
-VM_AVX2 inline Block ToPixels(const Block& channels) noexcept {
-    Block b = Transposed(channels);
-    for (__m256i& v : b.v) v = Regrouped(v);
-    return b;
+VM_AVX2 inline void LoadChannels(const Bgra* in, Block& b) noexcept {
+    FetchAhead(in);
+    FetchAhead(in + kBlock / 2);
+    for (int i = 0; i < 4; ++i) b.v[i] = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + 8 * i));
+    Regroup(b);
+    Transpose(b);
+}
+
+VM_AVX2 inline void StoreChannels(Bgra* out, Block& b) noexcept {
+    Transpose(b);
+    Regroup(b);
+    for (int i = 0; i < 4; ++i) _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + 8 * i), b.v[i]);
 }
 
 VM_AVX2 inline __m256i Sixteen(const ByteTable& table, std::size_t first) noexcept {
@@ -52,32 +62,44 @@ VM_AVX2 inline __m256i Sixteen(const ByteTable& table, std::size_t first) noexce
         _mm_load_si128(reinterpret_cast<const __m128i*>(table.data() + first)));
 }
 
-// Looks up 32 bytes of each of two blocks. A look-up in 16 entries gives 0 where its index is negative: with 16 less
-// from step to step the differences add up to an entry of the right sixteen, of either half of the table at once.
-VM_AVX2 inline void LookUp(__m256i& first, __m256i& second, const ByteTable& differences) noexcept {
-    const __m256i zero = _mm256_setzero_si256(), step = _mm256_set1_epi8(16);
-    __m256i at0 = _mm256_and_si256(first, _mm256_set1_epi8(127));
-    __m256i at1 = _mm256_and_si256(second, _mm256_set1_epi8(127));
-    __m256i low0 = zero, low1 = zero, high0 = zero, high1 = zero;
-#pragma GCC \
-    unroll 1  // else each step's index is made of the first one, by more numbers than there are registers
+// Looks up 32 bytes in each of `kCount` registers. A look-up in 16 entries gives 0 where its index is negative: with 16
+// less from step to step the differences add up to an entry of the right sixteen, of either half of the table at once.
+template <std::size_t kCount>
+VM_AVX2 inline void LookUp(__m256i* const (&bytes)[kCount], const ByteTable& differences) noexcept {
+    const __m256i step = _mm256_set1_epi8(16);
+    __m256i at[kCount], low[kCount], high[kCount];
+    for (std::size_t k = 0; k < kCount; ++k) {
+        at[k] = _mm256_and_si256(*bytes[k], _mm256_set1_epi8(127));
+        low[k] = high[k] = _mm256_setzero_si256();
+    }
+    // Unrolled, each step's index would be made of the first one, by more numbers than there are registers.
+#pragma GCC unroll 1
     for (std::size_t i = 0; i < 128; i += 16) {
         const __m256i lower = Sixteen(differences, i), upper = Sixteen(differences, 128 + i);
-        low0 = _mm256_xor_si256(low0, _mm256_shuffle_epi8(lower, at0));
-        low1 = _mm256_xor_si256(low1, _mm256_shuffle_epi8(lower, at1));
-        high0 = _mm256_xor_si256(high0, _mm256_shuffle_epi8(upper, at0));
-        high1 = _mm256_xor_si256(high1, _mm256_shuffle_epi8(upper, at1));
-        at0 = _mm256_sub_epi8(at0, step);
-        at1 = _mm256_sub_epi8(at1, step);
+        for (std::size_t k = 0; k < kCount; ++k) {
+            low[k] = _mm256_xor_si256(low[k], _mm256_shuffle_epi8(lower, at[k]));
+            high[k] = _mm256_xor_si256(high[k], _mm256_shuffle_epi8(upper, at[k]));
+            at[k] = _mm256_sub_epi8(at[k], step);
+        }
     }
-    first = _mm256_blendv_epi8(low0, high0, first);
-    second = _mm256_blendv_epi8(low1, high1, second);
+    for (std::size_t k = 0; k < kCount; ++k) *bytes[k] = _mm256_blendv_epi8(low[k], high[k], *bytes[k]);
+}
+
+// Entries are loaded for both blocks where there are registers for it.
+VM_AVX2 inline void LookUpBoth(__m256i& first, __m256i& second, const ByteTable& differences) noexcept {
+    constexpr bool kHasSixteenRegisters = sizeof(void*) == 8;
+    if constexpr (kHasSixteenRegisters) {
+        LookUp<2>({&first, &second}, differences);
+    } else {
+        LookUp<1>({&first}, differences);
+        LookUp<1>({&second}, differences);
+    }
 }
 
 VM_AVX2 inline void LookUpAll(Block& a, Block& b, const ChannelTables& tables) noexcept {
-    LookUp(a.v[0], b.v[0], tables.blueDifferences);
-    LookUp(a.v[1], b.v[1], tables.greenDifferences);
-    LookUp(a.v[2], b.v[2], tables.redDifferences);
+    LookUpBoth(a.v[0], b.v[0], tables.blueDifferences);
+    LookUpBoth(a.v[1], b.v[1], tables.greenDifferences);
+    LookUpBoth(a.v[2], b.v[2], tables.redDifferences);
 }
 
 struct Line {
@@ -153,8 +175,6 @@ VM_AVX2 inline void Mix(Block& b, std::int32_t weight) noexcept {
 
 // Two blocks, so that entries are loaded for both.
 VM_AVX2 inline void ToneTwo(Block& a, Block& b, const Tone& tone, const Lines& lines) noexcept {
-    a = ToChannels(a);
-    b = ToChannels(b);
     if (!tone.lines.empty()) {
         lines.Put(a);
         lines.Put(b);
@@ -166,20 +186,6 @@ VM_AVX2 inline void ToneTwo(Block& a, Block& b, const Tone& tone, const Lines& l
         Mix(b, tone.weight);
     }
     if (tone.after != nullptr) LookUpAll(a, b, *tone.after);
-    a = ToPixels(a);
-    b = ToPixels(b);
-}
-
-VM_AVX2 inline Block LoadBlock(const Bgra* in) noexcept {
-    FetchAhead(in);
-    FetchAhead(in + kBlock / 2);
-    Block b;
-    for (int i = 0; i < 4; ++i) b.v[i] = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in + 8 * i));
-    return b;
-}
-
-VM_AVX2 inline void StoreBlock(Bgra* out, const Block& b) noexcept {
-    for (int i = 0; i < 4; ++i) _mm256_storeu_si256(reinterpret_cast<__m256i*>(out + 8 * i), b.v[i]);
 }
 
 // Lines alone need no channels apart.
@@ -202,10 +208,12 @@ VM_AVX2 void ToneRowAvx2(const Bgra* in, Bgra* out, std::int32_t width, const To
     if (!tone.lines.empty() && !tone.mixes && tone.after == nullptr) return LinesRow(in, out, width, tone);
     const Lines lines(tone.lines);
     const auto toneTwo = [&tone, &lines](const Bgra* from, Bgra* to) VM_AVX2 {
-        Block a = LoadBlock(from), b = LoadBlock(from + kBlock);
+        Block a, b;
+        LoadChannels(from, a);
+        LoadChannels(from + kBlock, b);
         ToneTwo(a, b, tone, lines);
-        StoreBlock(to, a);
-        StoreBlock(to + kBlock, b);
+        StoreChannels(to, a);
+        StoreChannels(to + kBlock, b);
     };
     std::int32_t x = 0;
     for (; x + 2 * kBlock <= width; x += 2 * kBlock) toneTwo(in + x, out + x);
