@@ -14,9 +14,14 @@ constexpr double kTimeTolerance = 1e-6;
 // How far sound may lag behind the picture in a file.
 constexpr double kInterleaving = 1.0;
 
+// A jump lands so many frames early at least: some decoders, begun at a picture that is not quite a beginning,
+// lose a frame when the stream ends soon after it.
+constexpr int kFramesAhead = 32;
+
 }  // namespace
 
-SectionOptions ResolveFarm(const FarmPart& farm, std::int64_t frames) {
+SectionOptions ResolveFarm(const FarmPart& farm, std::vector<std::int64_t> frameTimes) {
+    const auto frames = static_cast<std::int64_t>(frameTimes.size());
     if (frames < farm.parts) {
         throw UsageError("--farm: a clip of " + std::to_string(frames) + " frames has no " +
                          std::to_string(farm.parts) + " parts");
@@ -26,6 +31,7 @@ SectionOptions ResolveFarm(const FarmPart& farm, std::int64_t frames) {
     SectionOptions section;
     section.firstFrame = each * (farm.part - 1) + std::min(over, farm.part - 1);
     if (farm.part < farm.parts) section.endFrame = each * farm.part + std::min(over, farm.part);
+    section.frameTimes = std::move(frameTimes);
     return section;
 }
 
@@ -33,8 +39,21 @@ ClipSection::ClipSection(MediaReader& reader, const SectionOptions& options)
     : m_reader(reader), m_options(options) {
     if (options.start && *options.start > 0.0) {
         m_hasJumped = true;
-        reader.SeekBefore(*options.start);
+        reader.SeekBefore(std::max(0.0, *options.start - kFramesAhead / av_q2d(reader.FrameRateGuess())));
     }
+    if (options.firstFrame > 0 && !options.frameTimes.empty()) JumpToFirstFrame();
+}
+
+void ClipSection::JumpToFirstFrame() {
+    const std::vector<std::int64_t>& times = m_options.frameTimes;
+    // A frame must be known by its time, and the first frame decoded is the first of these.
+    const bool isClear = times.front() == m_reader.FirstFrame().pts &&
+                         std::ranges::adjacent_find(times, std::ranges::equal_to()) == times.end();
+    if (!isClear) return;
+    const auto goal = std::max<std::int64_t>(m_options.firstFrame - kFramesAhead, 0);
+    const auto landing = m_reader.SeekToFrame(times[static_cast<std::size_t>(goal)]);
+    m_isByFrameTime = landing == MediaReader::Landing::kBefore;
+    if (landing == MediaReader::Landing::kElsewhere) m_reader.Rewind();
 }
 
 PipelineItemPtr ClipSection::Next() {
@@ -67,9 +86,7 @@ bool ClipSection::IsBehind(std::int64_t index, double seconds) const {
 void ClipSection::TakeFrame(FramePtr frame) {
     if (m_endSeconds) return;
     const double seconds = m_reader.SecondsOf(frame->pts);
-    // After a jump nobody has counted the frames.
-    const std::int64_t index =
-        m_hasJumped ? std::llround(seconds * av_q2d(m_reader.FrameRateGuess())) : m_nextIndex++;
+    const std::int64_t index = IndexOf(frame->pts, seconds);
     if (IsBefore(index, seconds)) return;
     if (IsBehind(index, seconds)) {
         m_endSeconds = seconds;
@@ -86,6 +103,16 @@ void ClipSection::TakeFrame(FramePtr frame) {
     m_firstSeconds = seconds;
     for (PacketPtr& packet : m_held) TakePacket(std::move(packet));
     m_held.clear();
+}
+
+std::int64_t ClipSection::IndexOf(std::int64_t pts, double seconds) {
+    if (m_isByFrameTime) {
+        const std::vector<std::int64_t>& times = m_options.frameTimes;
+        return std::ranges::lower_bound(times, pts) - times.begin();
+    }
+    // After a jump nobody has counted the frames.
+    if (m_hasJumped) return std::llround(seconds * av_q2d(m_reader.FrameRateGuess()));
+    return m_nextIndex++;
 }
 
 void ClipSection::TakePacket(PacketPtr packet) {

@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <deque>
 #include <optional>
+#include <vector>
 
 #include "hosts/reelfx/frame_pipeline.h"
 #include "hosts/reelfx/media_reader.h"
@@ -23,13 +24,16 @@ struct SectionOptions {
     std::optional<double> start;           // seconds since the clip's first frame
     std::optional<double> duration;        // seconds
     std::optional<FarmPart> farm;          // instead of all of these; see ResolveFarm
+    // Of all frames of the clip in order, where they are known: with them a section that begins late jumps to
+    // its first frame instead of decoding those before it.
+    std::vector<std::int64_t> frameTimes = {};
 
     [[nodiscard]] bool IsWholeClip() const { return firstFrame == 0 && !endFrame && !start && !duration; }
 };
 
-// The frames of a part of a clip of `frames` frames. The parts lie side by side, the last one goes to the
-// clip's end. Throws UsageError when there are more parts than frames.
-SectionOptions ResolveFarm(const FarmPart& farm, std::int64_t frames);
+// The frames of a part of a clip with frames at these times (MediaReader::FrameTimes). The parts lie side by
+// side, the last one goes to the clip's end. Throws UsageError when there are more parts than frames.
+SectionOptions ResolveFarm(const FarmPart& farm, std::vector<std::int64_t> frameTimes);
 
 class ClipSection {
   public:
@@ -45,7 +49,9 @@ class ClipSection {
                                                       const SectionOptions& options);
 
   private:
+    void JumpToFirstFrame();
     void TakeFrame(FramePtr frame);
+    [[nodiscard]] std::int64_t IndexOf(std::int64_t pts, double seconds);
     void TakePacket(PacketPtr packet);
     [[nodiscard]] bool IsBefore(std::int64_t index, double seconds) const;
     [[nodiscard]] bool IsBehind(std::int64_t index, double seconds) const;
@@ -58,7 +64,8 @@ class ClipSection {
     std::optional<double> m_firstSeconds;  // of the first frame in the section
     std::optional<double> m_endSeconds;    // set when the section's last frame has come
     std::int64_t m_nextIndex = 0;
-    bool m_hasJumped = false;
+    bool m_hasJumped = false;      // by time
+    bool m_isByFrameTime = false;  // has jumped to a frame
     bool m_isOver = false;
 };
 

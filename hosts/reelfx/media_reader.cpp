@@ -1,6 +1,8 @@
 #include "hosts/reelfx/media_reader.h"
 
+#include <algorithm>
 #include <filesystem>
+#include <numeric>
 
 #include "hosts/reelfx/failure.h"
 
@@ -22,7 +24,7 @@ const AVInputFormat* FormatOf(const InputOptions& options) {
 }  // namespace
 
 MediaReader::MediaReader(const InputOptions& options, Closed)
-    : m_name(options.path == "-" ? "standard input" : options.path) {}
+    : m_options(options), m_name(options.path == "-" ? "standard input" : options.path) {}
 
 MediaReader::MediaReader(const InputOptions& options) : MediaReader(options, Closed{}) {
     Open(options);
@@ -72,22 +74,30 @@ void MediaReader::OpenDecoder() {
     if (error < 0) throw Failure(kExitInput, m_name + ": cannot be decoded: " + AvText(error));
 }
 
-std::int64_t MediaReader::CountFrames(const InputOptions& options) {
+std::vector<std::int64_t> MediaReader::FrameTimes(const InputOptions& options) {
     MediaReader reader(options, Closed{});
     if (options.path == "-") throw Failure(kExitInput, reader.m_name + ": has no length known beforehand");
     reader.Open(options);
     reader.OpenDecoder();
-    if (reader.m_stream->nb_frames > 0) return reader.m_stream->nb_frames;
-    // These count their files or bytes.
-    const std::string format = reader.m_container->iformat->name;
-    if (format == "image2" || format == "rawvideo") return reader.FrameCountGuess();
-    std::int64_t count = 0;
-    const PacketPtr packet = NewPacket();
-    for (; av_read_frame(reader.m_container.get(), packet.get()) >= 0; av_packet_unref(packet.get())) {
-        const bool isShown = (packet->flags & AV_PKT_FLAG_DISCARD) == 0;
-        count += packet->stream_index == reader.m_stream->index && isShown;
+    AVFormatContext& container = *reader.m_container;
+    const std::string format = container.iformat->name;
+    if (format == "image2" ||
+        format == "rawvideo") {  // a tick for each, and too large to be read for nothing
+        std::vector<std::int64_t> ticks(static_cast<std::size_t>(reader.FrameCountGuess()));
+        std::iota(ticks.begin(), ticks.end(), std::int64_t{0});
+        return ticks;
     }
-    return count;
+    for (unsigned i = 0; i < container.nb_streams; ++i) {
+        if (container.streams[i] != reader.m_stream) container.streams[i]->discard = AVDISCARD_ALL;
+    }
+    std::vector<std::int64_t> times;
+    const PacketPtr packet = NewPacket();
+    for (; av_read_frame(&container, packet.get()) >= 0; av_packet_unref(packet.get())) {
+        const bool isShown = (packet->flags & AV_PKT_FLAG_DISCARD) == 0;
+        if (packet->stream_index == reader.m_stream->index && isShown) times.push_back(packet->pts);
+    }
+    std::ranges::sort(times);
+    return times;
 }
 
 MediaReader::Item MediaReader::Next() {
@@ -148,12 +158,46 @@ void MediaReader::TakeFrames() {
 
 void MediaReader::SeekBefore(double seconds) {
     const double tick = av_q2d(m_stream->time_base);
-    const auto target = m_firstFrame->pts + static_cast<std::int64_t>(seconds / tick);
-    if (av_seek_frame(m_container.get(), m_stream->index, target, AVSEEK_FLAG_BACKWARD) < 0) return;
+    Jump(m_firstFrame->pts + static_cast<std::int64_t>(seconds / tick));
+}
+
+MediaReader::Landing MediaReader::SeekToFrame(std::int64_t pts) {
+    // Streams without an index are searched by other times than those of presentation.
+    for (const double early : {0.0, 1.0, 5.0}) {
+        const auto ticks = static_cast<std::int64_t>(early / av_q2d(m_stream->time_base));
+        if (!Jump(std::max(pts - ticks, m_firstFrame->pts))) return Landing::kStayed;
+        const AVFrame* next = Peek();
+        if (next && next->pts <= pts) return Landing::kBefore;
+    }
+    return Landing::kElsewhere;
+}
+
+void MediaReader::Rewind() {
+    m_items.clear();
+    m_lastPts = AV_NOPTS_VALUE;
+    m_ended = false;
+    m_damaged = 0;
+    Open(m_options);
+    OpenDecoder();
+}
+
+bool MediaReader::Jump(std::int64_t pts) {
+    if (av_seek_frame(m_container.get(), m_stream->index, pts, AVSEEK_FLAG_BACKWARD) < 0) return false;
     avcodec_flush_buffers(m_decoder.get());
     m_items.clear();
     m_lastPts = AV_NOPTS_VALUE;
     m_ended = false;
+    return true;
+}
+
+const AVFrame* MediaReader::Peek() {
+    for (;;) {
+        for (const Item& item : m_items) {
+            if (item.frame) return item.frame.get();
+        }
+        if (m_ended) return nullptr;
+        ReadMore();
+    }
 }
 
 double MediaReader::SecondsOf(std::int64_t pts) const {

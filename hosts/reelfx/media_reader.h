@@ -9,6 +9,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "hosts/common/number_text.h"
 #include "hosts/reelfx/av_handles.h"
@@ -33,15 +34,25 @@ class MediaReader {
     // no frame.
     explicit MediaReader(const InputOptions& options);
 
-    // The number of the input's frames, counted where the container does not tell it; the same wherever it is
-    // asked. Throws Failure (kExitInput), also for an input that can be read only once.
-    static std::int64_t CountFrames(const InputOptions& options);
+    // The times of the input's frames in order, in the picture's time base, as its packets carry them. Only
+    // their count means something where two have the same time or one has none. Reads through the input, but for
+    // image sequences, without decoding it. Throws Failure (kExitInput), also for an input that can be read only once.
+    static std::vector<std::int64_t> FrameTimes(const InputOptions& options);
 
     Item Next();
 
     // Goes on reading somewhere before `seconds` if the input can jump; else from where it is. The caller
     // skips what comes too early.
     void SeekBefore(double seconds);
+    enum class Landing {
+        kStayed,     // the input cannot jump
+        kBefore,     // at the frame or one before it
+        kElsewhere,  // the input jumps badly
+    };
+    // Jumps to the frame of the time `pts`, in the picture's time base, or not far before it.
+    Landing SeekToFrame(std::int64_t pts);
+    // Back to the first frame, by opening the input anew. Throws Failure (kExitInput).
+    void Rewind();
 
     // The picture is not decoded any more; packets of other streams still come.
     void StopPicture() { m_pictureStopped = true; }
@@ -69,11 +80,15 @@ class MediaReader {
     MediaReader(const InputOptions& options, Closed);  // nothing is opened yet
 
     void Open(const InputOptions& options);
+    bool Jump(std::int64_t pts);
+    // The next frame, which stays the next one; null at the end.
+    const AVFrame* Peek();
     void OpenDecoder();
     void ReadMore();  // moves at least one packet on
     void Decode(const AVPacket* packet);
     void TakeFrames();
 
+    InputOptions m_options;
     std::string m_name;
     std::unique_ptr<AVFormatContext, CloseInput> m_container;
     AVStream* m_stream = nullptr;

@@ -20,7 +20,7 @@ class RenderRun {
         : m_options(options),
           m_choice(options.effect),
           m_section(options.section.farm
-                        ? ResolveFarm(*options.section.farm, MediaReader::CountFrames(options.input))
+                        ? ResolveFarm(*options.section.farm, MediaReader::FrameTimes(options.input))
                         : options.section),
           m_reader(options.input) {
         if (options.isMatte) CheckMatte(m_choice);
