@@ -159,6 +159,7 @@ void CheckThreads(CheckContext& context) {
     constexpr int kThreads = 4;
     const int rounds = context.Rounds(5000, 500000);
     std::vector<std::thread> counting;
+    counting.reserve(kThreads);
     for (int i = 0; i < kThreads; ++i) {
         counting.emplace_back([&effect, rounds] {
             for (int k = 0; k < rounds; ++k) effect->AddRef(), effect->Release();

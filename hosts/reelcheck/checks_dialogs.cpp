@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 #include <filesystem>
+#include <string>
 
 #include "hosts/reelcheck/checks.h"
 #include "hosts/reelcheck/dialog_answers.h"
@@ -63,12 +64,12 @@ struct Desk {
     // Tries to save or load with the dialog answered by `path`; fails unless it ends with `expected` and tells the user
     // of a failure, once.
     void Save(const char* path, std::uint32_t effect, PresetRecord* record, std::int32_t expected,
-              const char* language = nullptr) {
+              const char* language = nullptr) const {
         const DialogAnswers answers(path);
         Judge(answers, saver->SavePreset(nullptr, library.Get(), effect, record, language), expected);
     }
     void Load(const char* path, std::uint32_t effect, PresetRecord* record, std::int32_t expected,
-              const char* language = nullptr) {
+              const char* language = nullptr) const {
         const DialogAnswers answers(path);
         Judge(answers, saver->LoadPreset(nullptr, library.Get(), effect, record, language), expected);
     }
@@ -83,11 +84,12 @@ struct Desk {
 }  // namespace
 
 void CheckPresetFiles(CheckContext& context) {
-    Desk desk(context);
+    const Desk desk(context);
     for (std::uint32_t index = 0; index < kEffectCount; ++index) {
         const Owned<IVideoEffect> effect = desk.library.Effect(index);
         const EffectFacts facts = EffectFacts::Of(*effect);
-        const char* const path = desk.folder.PathOf("one.preset");
+        const std::string file = desk.folder.PathOf("one.preset");
+        const char* const path = file.c_str();
         PresetRecord read = {};
         for (std::uint32_t preset = 0; preset < facts.presets.size(); ++preset) {
             SetPlace("%s, %s", facts.name.c_str(), facts.presets[preset].c_str());
@@ -107,19 +109,21 @@ void CheckPresetFiles(CheckContext& context) {
         desk.Save(path, index, nullptr, kFailed);
         desk.Load(path, index, nullptr, kFailed);
         SetPlace("%s, no such folder", facts.name.c_str());
-        const char* const nowhere = desk.folder.PathOf("none/one.preset");
+        const std::string missing = desk.folder.PathOf("none/one.preset");
+        const char* const nowhere = missing.c_str();
         desk.Save(nowhere, index, &read, kFailed);
         desk.Load(nowhere, index, &read, kFailed);
         SetPlace("%s, an effect that there is not", facts.name.c_str());
         read.count = 3;
-        desk.Save(desk.folder.PathOf("two.preset"), 77, &read, kDone);
+        desk.Save(desk.folder.PathOf("two.preset").c_str(), 77, &read, kDone);
     }
     SetPlace("hostile record");
     for (const std::int32_t count : {-1, 101, 0x7FFFFFFF, -0x7FFFFFFF - 1}) {
         PresetRecord record;
         std::memset(&record, 0xEE, sizeof record);  // names without an end, values of no kind
         record.count = count;
-        const DialogAnswers answers(desk.folder.PathOf("hostile.preset"));
+        const std::string file = desk.folder.PathOf("hostile.preset");
+        const DialogAnswers answers(file.c_str());
         desk.saver->SavePreset(nullptr, nullptr, 0, &record, "de");
         desk.saver->LoadPreset(nullptr, nullptr, 0, &record, "de");
         Require(record.count <= kPresetCellCapacity || record.count == count,
@@ -129,13 +133,14 @@ void CheckPresetFiles(CheckContext& context) {
 
 // A failed save says so and leaves the preset that was there; a failed load says so.
 void CheckPresetFailures(CheckContext& context) {
-    Desk desk(context);
+    const Desk desk(context);
     const auto most = static_cast<std::uint64_t>(context.Rounds(150, 100000));
     const std::uint32_t index = kEffectCount - 1;
     const Owned<IVideoEffect> effect = desk.library.Effect(index);
     const EffectFacts facts = EffectFacts::Of(*effect);
     PresetRecord old = RecordOf(*effect, facts, 1), fresh = RecordOf(*effect, facts, 2), read = {};
-    const char* const path = desk.folder.PathOf("one.preset");
+    const std::string file = desk.folder.PathOf("one.preset");
+    const char* const path = file.c_str();
     for (const char* language : {static_cast<const char*>(nullptr), "de"}) {
         const auto run = [&](bool isSaving, PresetRecord& record, std::uint64_t failing) {
             const DialogAnswers answers(path);
@@ -203,7 +208,7 @@ void CheckDialogFailures(CheckContext& context) {
 // The system's own dialogs, which really appear.
 void CheckSystemDialogs(CheckContext& context) {
     if (!IsModule()) return;
-    Desk desk(context);
+    const Desk desk(context);
     PresetRecord record = {};
     for (int round = 0; round < context.Rounds(1, 2); ++round) {
         for (const char* language : kLanguages) {

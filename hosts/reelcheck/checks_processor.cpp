@@ -108,13 +108,19 @@ std::uint64_t TryEffect(const Caller& caller, IEffectLibrary* library, std::uint
     caller.Slot("AddRef", effect, kAdd, {});
     const FrameRecord from = pictures.source.Record(), to = pictures.destination.Record();
     const TimingRecord timing = {0, 0, 3.0};
-    Require(caller.Yes("Process", effect, kProcess,
-                       {WordOf(&host), WordOf(&from), 0, WordOf(&to), WordOf(&timing)}),
-            "the effect refuses the frame");
+    std::uint64_t digest = 0;
+    for (const bool spoils : {false, true}) {
+        host.spoilsRounding = spoils;
+        Require(caller.Yes("Process", effect, kProcess,
+                           {WordOf(&host), WordOf(&from), 0, WordOf(&to), WordOf(&timing)}),
+                "the effect refuses the frame");
+        if (!spoils) digest = pictures.destination.Digest();
+    }
+    Require(pictures.destination.Digest() == digest, "what a host's answers leave in the processor shows");
     for (std::uint32_t left = 3; left-- > 0;) {
         if (caller.Slot("Release", effect, kDrop, {}) != left) Fail("Release counts wrongly");
     }
-    return pictures.destination.Digest();
+    return digest;
 }
 
 void TryProcessor(const Caller& caller, IEffectLibrary* library, Pictures& pictures) {

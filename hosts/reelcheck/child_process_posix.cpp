@@ -11,8 +11,6 @@
 #include "hosts/reelcheck/check.h"
 #include "hosts/reelcheck/child_process.h"
 
-extern char** environ;
-
 namespace velmora::reelcheck {
 
 struct ChildProcess::System {

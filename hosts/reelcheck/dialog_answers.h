@@ -4,6 +4,8 @@
 // then really appear and are cancelled (Windows only).
 #pragma once
 
+#include <string>
+
 namespace velmora::reelcheck {
 
 // Once in a process, before the library is loaded.
@@ -28,7 +30,7 @@ class DialogAnswers {
 class DialogCanceller {
   public:
     DialogCanceller() noexcept;
-    ~DialogCanceller();
+    ~DialogCanceller();  // NOLINT(performance-trivially-destructible): on Windows it has something to do
     DialogCanceller(const DialogCanceller&) = delete;
     DialogCanceller& operator=(const DialogCanceller&) = delete;
 
@@ -46,11 +48,10 @@ class WorkFolder {
     WorkFolder(const WorkFolder&) = delete;
     WorkFolder& operator=(const WorkFolder&) = delete;
 
-    [[nodiscard]] const char* PathOf(const char* name) noexcept;
+    [[nodiscard]] std::string PathOf(const char* name) const { return m_folder + "/" + name; }
 
   private:
-    char m_folder[300];
-    char m_path[400];
+    std::string m_folder;
 };
 
 }  // namespace velmora::reelcheck

@@ -67,6 +67,13 @@ ValueWord HostileWord(const ParamDescriptor& param, Dice& dice) noexcept {
     return word;
 }
 
+// Truncating, single precision, denormals flushed.
+void SpoilRounding() noexcept {
+    const std::uint16_t x87Control = 0x0C7F;
+    const std::uint32_t vectorControl = 0xFFC0;
+    __asm__ __volatile__("fldcw %0\n\tldmxcsr %1" : : "m"(x87Control), "m"(vectorControl));
+}
+
 }  // namespace
 
 Status VM_CALL PlayingHost::QueryInterface(const Guid*, void** out) {
@@ -77,6 +84,7 @@ Status VM_CALL PlayingHost::QueryInterface(const Guid*, void** out) {
 
 bool VM_CALL PlayingHost::GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) {
     ++questions;
+    if (spoilsRounding) SpoilRounding();
     if (!answers || index >= kCapacity || cell == nullptr) return false;
     cell->value = values[index];
     cell->kind = kind;

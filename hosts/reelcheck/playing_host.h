@@ -17,7 +17,8 @@ class PlayingHost final : public IVideoHost {
     static constexpr std::uint32_t kCapacity = 64;
 
     std::array<ValueWord, kCapacity> values = {};
-    bool answers = true;  // false: every question fails and no cell is written
+    bool answers = true;          // false: every question fails and no cell is written
+    bool spoilsRounding = false;  // every answer leaves other floating-point control words behind
     std::uint32_t questions = 0;
 
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override;

@@ -1,4 +1,3 @@
-#include <cstdio>
 #include <filesystem>
 #include <random>
 
@@ -13,17 +12,12 @@ WorkFolder::WorkFolder() {
     do {
         folder = base / ("reelcheck-" + std::to_string(random()));
     } while (!std::filesystem::create_directory(folder));
-    std::snprintf(m_folder, sizeof m_folder, "%s", folder.string().c_str());
+    m_folder = folder.string();
 }
 
 WorkFolder::~WorkFolder() {
     std::error_code ignored;
     std::filesystem::remove_all(m_folder, ignored);
-}
-
-const char* WorkFolder::PathOf(const char* name) noexcept {
-    std::snprintf(m_path, sizeof m_path, "%s/%s", m_folder, name);
-    return m_path;
 }
 
 }  // namespace velmora::reelcheck
