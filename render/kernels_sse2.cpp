@@ -4,33 +4,46 @@
 
 #include <algorithm>
 #include <cstring>
-#include <type_traits>
 
 #include "render/kernels.h"
 
 namespace velmora::render {
 namespace {
 
-std::uint32_t LookUp(std::uint32_t pixel, const ChannelTables& t) noexcept {
-    return t.blueWord[pixel & 0xFFu] | t.greenWord[(pixel >> 8) & 0xFFu] | t.redWord[(pixel >> 16) & 0xFFu] |
-           (pixel & 0xFF000000u);
+// Two pixels in a 64-bit word, for 64-bit builds.
+std::uint64_t LookUpTwo(std::uint64_t pixels, const ChannelTables& t) noexcept {
+    const auto one = [&t](std::uint32_t pixel) {
+        return t.blueWord[pixel & 0xFFu] | t.greenWord[(pixel >> 8) & 0xFFu] |
+               t.redWord[(pixel >> 16) & 0xFFu] | (pixel & 0xFF000000u);
+    };
+    return one(static_cast<std::uint32_t>(pixels)) |
+           std::uint64_t{one(static_cast<std::uint32_t>(pixels >> 32))} << 32;
 }
 
+// Byte by byte, for 32-bit builds, which have few registers to take words apart in.
+std::uint32_t LookUpOne(const Bgra& pixel, const ChannelTables& t) noexcept {
+    return t.blueWord[pixel.blue] | t.greenWord[pixel.green] | t.redWord[pixel.red] |
+           std::uint32_t{pixel.alpha} << 24;
+}
+
+// Words are stored one by one: gathered for a wide store they would wait for each other.
 void TablesRow(const Bgra* in, Bgra* out, std::int32_t width, const ChannelTables& tables) noexcept {
     std::int32_t x = 0;
     for (; x + 4 <= width; x += 4) {
-        // Two pixels a load where words are that wide.
-        using Word = std::conditional_t<sizeof(void*) == 8, std::uint64_t, std::uint32_t>;
-        Word words[4 * sizeof(Bgra) / sizeof(Word)];
         FetchAhead(in + x);
-        std::memcpy(words, in + x, sizeof words);
-        for (Word& word : words) {
-            Word result = LookUp(static_cast<std::uint32_t>(word), tables);
-            if constexpr (sizeof(Word) == 8)
-                result |= Word{LookUp(static_cast<std::uint32_t>(word >> 32), tables)} << 32;
-            word = result;
+        if constexpr (sizeof(void*) == 8) {
+            for (std::int32_t i = x; i < x + 4; i += 2) {
+                std::uint64_t pixels;
+                std::memcpy(&pixels, in + i, sizeof pixels);
+                pixels = LookUpTwo(pixels, tables);
+                std::memcpy(out + i, &pixels, sizeof pixels);
+            }
+        } else {
+            for (std::int32_t i = x; i < x + 4; ++i) {
+                const std::uint32_t pixel = LookUpOne(in[i], tables);
+                std::memcpy(out + i, &pixel, sizeof pixel);
+            }
         }
-        std::memcpy(out + x, words, sizeof words);
     }
     kPlainKernels.tone(in + x, out + x, width - x, Tone{&tables, false, 0, nullptr});
 }
