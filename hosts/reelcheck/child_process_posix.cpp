@@ -98,7 +98,7 @@ void OnCrash(int signal, siginfo_t* info, void*) {
 void ReportCrashes() {
     struct sigaction action = {};
     action.sa_sigaction = OnCrash;
-    action.sa_flags = SA_SIGINFO | SA_RESETHAND;
+    action.sa_flags = static_cast<int>(SA_SIGINFO | SA_RESETHAND);
     for (const int signal : {SIGSEGV, SIGBUS, SIGILL, SIGFPE, SIGABRT}) sigaction(signal, &action, nullptr);
 }
 

@@ -37,7 +37,7 @@ class DialogCanceller {
     [[nodiscard]] int Cancelled() const noexcept;
 
   private:
-    void* m_hook;
+    [[maybe_unused]] void* m_hook;  // null where dialogs are linked in
 };
 
 // A folder for this process's files; removed with all that is in it.

@@ -108,6 +108,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     if (lines.back().empty()) lines.pop_back();  // the line's own end
     if (lines.empty()) return 0;
     std::vector<char*> arguments;
+    arguments.reserve(lines.size());
     for (std::string& line : lines) arguments.push_back(line.data());
     try {
         if (lines.front() == "reelhost") {

@@ -38,7 +38,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     const std::optional<LanguageTable> table = LanguageTable::Read(file);
     if (!table) return 0;
     // The reader must not have taken bytes that are no text.
-    Require(file.find('\0') == file.npos);
+    Require(file.find('\0') == std::string_view::npos);
     for (const char* language : {"en", "DE", "ja", "xx"}) {
         for (const std::int32_t category : {0, 4, 8}) {
             for (const char* key : {"OK", "Help", "Open Preset"}) {

@@ -64,6 +64,8 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     std::memset(&record, 0x5A, sizeof record);
     const velmora::PresetRecord untouched = record;
     const bool isRead = velmora::ParsePreset(text.data(), text.size(), &record);
+    // Every byte counts here, whatever it stands for.
+    // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison)
     if (isRead || std::memcmp(&record, &untouched, sizeof record) != 0) {
         Require(record.count >= (isRead ? 1 : 0) && record.count <= velmora::kPresetCellCapacity);
         Require(IsTerminated(record.name) && IsTerminated(record.libraryName) &&

@@ -15,6 +15,7 @@ namespace {
 HostOptions Read(std::vector<std::string> words) {
     words.insert(words.begin(), "reelhost");
     std::vector<char*> arguments;
+    arguments.reserve(words.size());
     for (std::string& word : words) arguments.push_back(word.data());
     return ReadHostOptions(static_cast<int>(arguments.size()), arguments.data());
 }
