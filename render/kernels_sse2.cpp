@@ -11,7 +11,7 @@ namespace velmora::render {
 namespace {
 
 // Two pixels in a 64-bit word, for 64-bit builds.
-std::uint64_t LookUpTwo(std::uint64_t pixels, const ChannelTables& t) noexcept {
+[[maybe_unused]] std::uint64_t LookUpTwo(std::uint64_t pixels, const ChannelTables& t) noexcept {
     const auto one = [&t](std::uint32_t pixel) {
         return t.blueWord[pixel & 0xFFu] | t.greenWord[(pixel >> 8) & 0xFFu] |
                t.redWord[(pixel >> 16) & 0xFFu] | (pixel & 0xFF000000u);
@@ -21,7 +21,7 @@ std::uint64_t LookUpTwo(std::uint64_t pixels, const ChannelTables& t) noexcept {
 }
 
 // Byte by byte, for 32-bit builds, which have few registers to take words apart in.
-std::uint32_t LookUpOne(const Bgra& pixel, const ChannelTables& t) noexcept {
+[[maybe_unused]] std::uint32_t LookUpOne(const Bgra& pixel, const ChannelTables& t) noexcept {
     return t.blueWord[pixel.blue] | t.greenWord[pixel.green] | t.redWord[pixel.red] |
            std::uint32_t{pixel.alpha} << 24;
 }
