@@ -1,6 +1,7 @@
 // Owners of the media libraries' objects, and their error codes as text.
 #pragma once
 
+#include <cerrno>
 #include <memory>
 #include <new>
 #include <string>
@@ -9,6 +10,7 @@ extern "C" {
 #include <libavcodec/avcodec.h>
 #include <libavformat/avformat.h>
 #include <libavutil/frame.h>
+#include <libavutil/mem.h>
 #include <libswresample/swresample.h>
 #include <libswscale/swscale.h>
 }
@@ -46,6 +48,19 @@ inline std::string AvText(int error) {
     char text[AV_ERROR_MAX_STRING_SIZE] = {};
     av_strerror(error, text, sizeof text);
     return text;
+}
+
+// Where a library reports an error among others: that memory, or room for another thread, is short is no fault of
+// input or output. Some say only that something went wrong.
+inline void ThrowIfNoMemory(int error) {
+    constexpr std::size_t kWorkingRoom = std::size_t{64} << 20;
+    const auto isRoom = [] {
+        void* const room = av_malloc(kWorkingRoom);
+        av_free(room);
+        return room != nullptr;
+    };
+    const bool isShort = error == AVERROR(ENOMEM) || error == AVERROR(EAGAIN);
+    if (isShort || (error == AVERROR_EXTERNAL && !isRoom())) throw std::bad_alloc();
 }
 
 // A dictionary of options; what a call did not take stays in it.

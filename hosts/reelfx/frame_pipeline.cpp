@@ -1,19 +1,47 @@
 #include "hosts/reelfx/frame_pipeline.h"
 
 #include <algorithm>
+#include <utility>
 
 namespace velmora::hosts {
 
 FramePipeline::FramePipeline(Source source, std::vector<Worker> workers)
     // Enough that no worker waits for another, few enough that large frames fit into memory.
     : m_capacity(2 * workers.size() + 2) {
-    m_threads.emplace_back([this, source = std::move(source)] { Fill(source); });
+    try {
+        Start(std::move(source), workers);
+    } catch (...) {
+        Stop();  // the system has no more threads to give
+        throw;
+    }
+}
+
+FramePipeline::~FramePipeline() {
+    Stop();
+}
+
+void FramePipeline::Start(Source source, std::vector<Worker>& workers) {
+    m_threads.reserve(workers.size() + 1);
+    m_threads.emplace_back([this, fill = std::move(source)] {
+        std::exception_ptr error;
+        try {
+            Fill(fill);
+        } catch (...) {
+            error = std::current_exception();
+        }
+        {
+            const std::lock_guard lock(m_mutex);
+            m_fillError = error;
+            m_isFilled = true;
+        }
+        m_changed.notify_all();
+    });
     for (Worker& worker : workers) {
         m_threads.emplace_back([this, work = std::move(worker)] { Work(work); });
     }
 }
 
-FramePipeline::~FramePipeline() {
+void FramePipeline::Stop() {
     {
         const std::lock_guard lock(m_mutex);
         m_isStopping = true;
@@ -23,17 +51,10 @@ FramePipeline::~FramePipeline() {
 }
 
 void FramePipeline::Fill(const Source& source) {
-    bool isLast = false;
-    while (!isLast) {
-        auto slot = std::make_shared<Slot>();
-        try {
-            slot->item = source();
-            isLast = !slot->item;
-        } catch (...) {
-            slot->error = std::current_exception();
-            isLast = true;
-        }
-        const bool hasWork = slot->item && !slot->item->packet;
+    while (PipelineItemPtr item = source()) {
+        const auto slot = std::make_shared<Slot>();
+        const bool hasWork = !item->packet;
+        slot->item = std::move(item);
         if (!hasWork) slot->stage = Stage::kDone;
         std::unique_lock lock(m_mutex);
         // Packets are small and many; only frames count against the capacity.
@@ -44,8 +65,7 @@ void FramePipeline::Fill(const Source& source) {
         };
         m_changed.wait(lock, isRoom);
         if (m_isStopping) return;
-        if (slot->item || slot->error) m_slots.push_back(std::move(slot));
-        m_isFilled = isLast;
+        m_slots.push_back(slot);
         lock.unlock();
         m_changed.notify_all();
     }
@@ -83,7 +103,10 @@ PipelineItemPtr FramePipeline::Next() {
     std::unique_lock lock(m_mutex);
     m_changed.wait(lock,
                    [&] { return m_slots.empty() ? m_isFilled : m_slots.front()->stage == Stage::kDone; });
-    if (m_slots.empty()) return nullptr;
+    if (m_slots.empty()) {
+        if (m_fillError) std::rethrow_exception(std::exchange(m_fillError, nullptr));
+        return nullptr;
+    }
     const std::shared_ptr<Slot> slot = std::move(m_slots.front());
     m_slots.pop_front();
     lock.unlock();

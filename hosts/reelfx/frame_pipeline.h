@@ -48,6 +48,8 @@ class FramePipeline {
         std::exception_ptr error;
     };
 
+    void Start(Source source, std::vector<Worker>& workers);
+    void Stop();
     void Fill(const Source& source);
     void Work(const Worker& worker);
     Slot* FirstWaiting();
@@ -57,7 +59,8 @@ class FramePipeline {
     std::deque<std::shared_ptr<Slot>> m_slots;
     std::size_t m_capacity;
     bool m_isStopping = false;
-    bool m_isFilled = false;  // the source has ended
+    bool m_isFilled = false;         // the source has ended
+    std::exception_ptr m_fillError;  // with this, behind the last item
     std::vector<std::thread> m_threads;
 };
 

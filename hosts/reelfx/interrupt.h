@@ -1,5 +1,5 @@
 // Ctrl-C, a polite stop and a broken pipe. The first signal asks the running command to finish what it has
-// begun; the second to give up at once.
+// begun; the second to give up at once; the third ends the program where it stands.
 #pragma once
 
 namespace velmora::hosts {

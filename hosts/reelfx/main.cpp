@@ -3,6 +3,7 @@
 #include <cstdio>
 #include <exception>
 #include <new>
+#include <system_error>
 
 #include "hosts/common/usage_error.h"
 #include "hosts/reelfx/command_line.h"
@@ -17,7 +18,12 @@ int main(int count, char** arguments) {
     av_log_set_level(AV_LOG_QUIET);  // one clear line of our own instead
     WatchInterrupts();
     try {
-        return RunCommand(ReadCommandLine(count, arguments));
+        const ExitCode code = RunCommand(ReadCommandLine(count, arguments));
+        // Texts and digests may still be on their way.
+        if (std::fflush(stdout) != 0 || std::ferror(stdout) != 0) {
+            throw Failure(kExitOutput, "standard output cannot be written");
+        }
+        return code;
     } catch (const Failure& failure) {
         std::fprintf(stderr, "reelfx: %s\n", failure.what());
         return failure.Code();
@@ -26,6 +32,9 @@ int main(int count, char** arguments) {
         return kExitUsage;
     } catch (const std::bad_alloc&) {
         std::fprintf(stderr, "reelfx: memory is short\n");
+        return kExitInternal;
+    } catch (const std::system_error& error) {
+        std::fprintf(stderr, "reelfx: memory or threads are short: %s\n", error.what());
         return kExitInternal;
     } catch (const std::exception& error) {
         std::fprintf(stderr, "reelfx: %s\n", error.what());

@@ -1,17 +1,18 @@
 #include "hosts/reelfx/media_reader.h"
 
 #include <algorithm>
+#include <cstring>
 #include <filesystem>
 #include <numeric>
 
 #include "hosts/reelfx/failure.h"
+#include "hosts/reelfx/interrupt.h"
 
 namespace velmora::hosts {
 namespace {
 
 // A file's name may look like an address ("take:2.mov"); existing files are taken as files.
 std::string AddressOf(const std::string& path) {
-    if (path == "-") return "pipe:0";
     std::error_code ignored;
     return std::filesystem::exists(path, ignored) ? "file:" + path : path;
 }
@@ -30,10 +31,9 @@ MediaReader::MediaReader(const InputOptions& options) : MediaReader(options, Clo
     Open(options);
     OpenDecoder();
     while (!m_firstFrame && !m_ended) ReadMore();
-    if (!m_firstFrame) {
-        throw Failure(kExitInput, m_damaged > 0 ? m_name + ": no frame can be decoded"
-                                                : m_name + ": there is no frame in it");
-    }
+    if (m_firstFrame) return;
+    if (!m_breakOff.empty()) FailReading(m_breakOff);
+    FailReading(m_damaged > 0 ? "no frame can be decoded" : "there is no frame in it");
 }
 
 void MediaReader::Open(const InputOptions& options) {
@@ -51,14 +51,26 @@ void MediaReader::Open(const InputOptions& options) {
         entries.Set("framerate", std::to_string(options.rate->numerator) + "/" +
                                      std::to_string(options.rate->denominator));
     }
-    AVFormatContext* container = nullptr;
-    const int error = avformat_open_input(&container, AddressOf(options.path).c_str(), FormatOf(options),
-                                          entries.Entries());
-    if (error < 0) throw Failure(kExitInput, m_name + ": cannot be read: " + AvText(error));
-    m_container.reset(container);
-    if (avformat_find_stream_info(container, nullptr) < 0) {
-        throw Failure(kExitInput, m_name + ": cannot be read: no stream is known");
+    AVFormatContext* container = avformat_alloc_context();
+    if (!container) throw std::bad_alloc();
+    container->interrupt_callback.callback = [](void*) { return Interrupts() > 0 ? 1 : 0; };
+    if (options.path == "-") {
+        m_standardInput = OpenStandardInput();
+        container->pb = m_standardInput.get();
     }
+    int error = avformat_open_input(&container, AddressOf(options.path).c_str(), FormatOf(options),
+                                    entries.Entries());
+    if (error < 0) FailReading("cannot be read: " + AvText(error), error);
+    m_container.reset(container);
+    error = avformat_find_stream_info(container, nullptr);
+    if (error < 0) FailReading("cannot be read: no stream is known", error);
+}
+
+// A signal ends the waiting for input too.
+void MediaReader::FailReading(const std::string& text, int error) const {
+    ThrowIfNoMemory(error);
+    if (Interrupts() > 0) throw Failure(kExitInterrupted, "interrupted; nothing was written");
+    throw Failure(kExitInput, m_name + ": " + text);
 }
 
 void MediaReader::OpenDecoder() {
@@ -71,7 +83,7 @@ void MediaReader::OpenDecoder() {
     m_decoder->pkt_timebase = m_stream->time_base;
     m_decoder->thread_count = 0;  // as many as the machine has; the decoded frames do not depend on it
     if (error >= 0) error = avcodec_open2(m_decoder.get(), codec, nullptr);
-    if (error < 0) throw Failure(kExitInput, m_name + ": cannot be decoded: " + AvText(error));
+    if (error < 0) FailReading("cannot be decoded: " + AvText(error), error);
 }
 
 std::vector<std::int64_t> MediaReader::FrameTimes(const InputOptions& options) {
@@ -112,16 +124,54 @@ void MediaReader::ReadMore() {
     PacketPtr packet = NewPacket();
     const int error = av_read_frame(m_container.get(), packet.get());
     if (error < 0) {
-        // A file that breaks off ends here like a whole one: what was there has been rendered.
+        ThrowIfNoMemory(error);
         m_ended = true;
+        m_breakOff = BreakOffAt(error);
         if (!m_pictureStopped) Decode(nullptr);
         return;
+    }
+    m_isLastPartial = (packet->flags & AV_PKT_FLAG_CORRUPT) != 0;
+    m_packetsEnd = std::max(m_packetsEnd, packet->pos + packet->size);
+    if (packet->pts != AV_NOPTS_VALUE) {
+        const double tick = av_q2d(m_container->streams[packet->stream_index]->time_base);
+        m_secondsEnd = std::max(m_secondsEnd, static_cast<double>(packet->pts + packet->duration) * tick);
     }
     if (packet->stream_index != m_stream->index) {
         m_items.push_back({nullptr, std::move(packet)});
     } else if (!m_pictureStopped) {
         Decode(packet.get());
     }
+}
+
+std::string MediaReader::BreakOffAt(int error) const {
+    if (error == AVERROR_EXIT) return {};  // interrupted
+    if (error != AVERROR_EOF) return "breaks off: " + AvText(error);
+    AVIOContext* const file = m_container->pb;
+    if (!file) return {};
+    if (file->error < 0) return "breaks off: " + AvText(file->error);
+    // This format has nothing behind its frames.
+    const bool isY4m = std::strcmp(m_container->iformat->name, "yuv4mpegpipe") == 0;
+    if (m_isLastPartial || (isY4m && m_packetsEnd > 0 && avio_tell(file) > m_packetsEnd))
+        return "ends inside a frame";
+    const std::int64_t size = avio_size(file);
+    for (unsigned i = 0; i < m_container->nb_streams && size > 0; ++i) {
+        AVStream* const stream = m_container->streams[i];
+        const int count = avformat_index_get_entries_count(stream);
+        const AVIndexEntry* const last = avformat_index_get_entry(stream, count - 1);
+        if (last && last->pos + last->size > size) return "is cut off";
+    }
+    return {};
+}
+
+double MediaReader::MissingSeconds() const {
+    constexpr double kTolerance = 0.5;  // headers round, and streams end unevenly
+    const AVFormatContext& container = *m_container;
+    const bool isTold =
+        container.duration > 0 && container.duration_estimation_method == AVFMT_DURATION_FROM_STREAM;
+    if (!m_ended || m_pictureStopped || !isTold) return 0.0;
+    const std::int64_t start = container.start_time == AV_NOPTS_VALUE ? 0 : container.start_time;
+    const double missing = static_cast<double>(start + container.duration) / AV_TIME_BASE - m_secondsEnd;
+    return missing > kTolerance ? missing : 0.0;
 }
 
 void MediaReader::Decode(const AVPacket* packet) {
@@ -176,6 +226,7 @@ void MediaReader::Rewind() {
     m_items.clear();
     m_lastPts = AV_NOPTS_VALUE;
     m_ended = false;
+    m_breakOff.clear();
     m_damaged = 0;
     Open(m_options);
     OpenDecoder();
@@ -187,6 +238,7 @@ bool MediaReader::Jump(std::int64_t pts) {
     m_items.clear();
     m_lastPts = AV_NOPTS_VALUE;
     m_ended = false;
+    m_breakOff.clear();
     return true;
 }
 

@@ -13,6 +13,7 @@
 
 #include "hosts/common/number_text.h"
 #include "hosts/reelfx/av_handles.h"
+#include "hosts/reelfx/standard_input.h"
 
 namespace velmora::hosts {
 
@@ -70,6 +71,10 @@ class MediaReader {
     [[nodiscard]] const std::string& Name() const { return m_name; }
     // Packets that could not be decoded and were left out.
     [[nodiscard]] std::int64_t DamagedPackets() const { return m_damaged; }
+    // Seconds that the container promises but does not hold; 0 as far as it is known to be whole.
+    [[nodiscard]] double MissingSeconds() const;
+    // Why reading ended before the clip did: the file is cut off or went away. Empty when it is whole as far as known.
+    [[nodiscard]] const std::string& BreakOff() const { return m_breakOff; }
 
   private:
     struct CloseInput {
@@ -83,6 +88,8 @@ class MediaReader {
     bool Jump(std::int64_t pts);
     // The next frame, which stays the next one; null at the end.
     const AVFrame* Peek();
+    [[noreturn]] void FailReading(const std::string& text, int error = 0) const;
+    [[nodiscard]] std::string BreakOffAt(int error) const;
     void OpenDecoder();
     void ReadMore();  // moves at least one packet on
     void Decode(const AVPacket* packet);
@@ -90,6 +97,8 @@ class MediaReader {
 
     InputOptions m_options;
     std::string m_name;
+    std::string m_breakOff;
+    InputStreamPtr m_standardInput;  // outlives the container
     std::unique_ptr<AVFormatContext, CloseInput> m_container;
     AVStream* m_stream = nullptr;
     CodecPtr m_decoder;
@@ -97,6 +106,9 @@ class MediaReader {
     FramePtr m_firstFrame;
     std::int64_t m_lastPts = AV_NOPTS_VALUE;
     std::int64_t m_damaged = 0;
+    std::int64_t m_packetsEnd = 0;  // in the file: behind the last packet
+    double m_secondsEnd = 0.0;      // by the container's clock: of the last packet
+    bool m_isLastPartial = false;
     bool m_pictureStopped = false;
     bool m_ended = false;
 };

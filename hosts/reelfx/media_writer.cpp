@@ -72,6 +72,7 @@ void MediaWriter::AddPicture(const OutputOptions& options) {
     m_encoder = Allocated<CodecPtr>(avcodec_alloc_context3(&codec));
     SetUpEncoder(options, codec);
     const int error = avcodec_open2(m_encoder.get(), &codec, nullptr);
+    ThrowIfNoMemory(error);
     if (error < 0) {
         throw Failure(kExitOutput, m_name + ": codec " + codec.name + " does not take frames of " +
                                        std::to_string(m_encoder->width) + "x" +
@@ -314,6 +315,7 @@ void MediaWriter::FailOnePicture() const {
 }
 
 void MediaWriter::Fail(int error) const {
+    ThrowIfNoMemory(error);
     throw Failure(kExitOutput, m_name + ": cannot be written: " + AvText(error));
 }
 

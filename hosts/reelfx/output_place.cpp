@@ -3,6 +3,9 @@
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include "hosts/reelfx/failure.h"
@@ -31,12 +34,54 @@ bool SomethingStandsAt(const std::string& path, std::int64_t firstImage) {
     return fs::exists(path, ignored);
 }
 
-fs::path MakeHiddenFolder(const fs::path& beside, const std::string& name) {
-    std::string pattern = (beside / ".reelfx-XXXXXX").string();
-    if (!mkdtemp(pattern.data())) {
-        throw Failure(kExitOutput, name + ": cannot be written: " + std::strerror(errno));
+constexpr char kHiddenFolder[] = ".reelfx-XXXXXX";
+constexpr std::size_t kPrefixLength = sizeof kHiddenFolder - 1 - 6;
+
+// A handle that holds the lock of a folder of this user, until it is closed or the process ends; -1 with `isTaken`
+// when another has the lock.
+int LockFolder(const fs::path& folder, bool& isTaken) {
+    isTaken = false;
+    const int handle = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC);
+    struct stat status {};
+    if (handle >= 0 && fstat(handle, &status) == 0 && status.st_uid == geteuid()) {
+        if (flock(handle, LOCK_EX | LOCK_NB) == 0) return handle;
+        isTaken = errno == EWOULDBLOCK;
     }
-    return pattern;
+    if (handle >= 0) close(handle);
+    return -1;
+}
+
+// What commands left behind that were killed: hidden folders that nobody holds.
+void RemoveLeftOvers(const fs::path& beside) {
+    std::error_code ignored;
+    for (fs::directory_iterator entry(beside, ignored), end; !ignored && entry != end;
+         entry.increment(ignored)) {
+        const std::string name = entry->path().filename().string();
+        if (name.size() != sizeof kHiddenFolder - 1 ||
+            !name.starts_with(std::string(kHiddenFolder, kPrefixLength)))
+            continue;
+        bool isTaken = false;
+        const int lock = LockFolder(entry->path(), isTaken);
+        if (lock < 0) continue;
+        std::error_code kept;
+        fs::remove_all(entry->path(), kept);
+        close(lock);
+    }
+}
+
+// Makes and locks a folder. Another command may take it for a left-over before it is locked: then another is made.
+fs::path MakeHiddenFolder(const fs::path& beside, const std::string& name, int& lock) {
+    for (;;) {
+        std::string path = (beside / kHiddenFolder).string();
+        if (!mkdtemp(path.data())) {
+            throw Failure(kExitOutput, name + ": cannot be written: " + std::strerror(errno));
+        }
+        bool isTaken = false;
+        lock = LockFolder(path, isTaken);
+        struct stat status {};
+        if (!isTaken && stat(path.c_str(), &status) == 0) return path;
+        if (lock >= 0) close(lock);
+    }
 }
 
 }  // namespace
@@ -64,13 +109,17 @@ OutputPlace::OutputPlace(const std::string& path, bool mayOverwrite, std::int64_
     if (path == "-" || (fs::exists(status) && !fs::is_regular_file(status))) return;
     m_replaces = SomethingStandsAt(path, firstImage);
     // Absolute: a relative name with a colon would be taken for an address.
-    const fs::path beside = fs::absolute(m_path).parent_path();
-    m_folder = MakeHiddenFolder(beside, m_name);
+    m_path = fs::absolute(m_path);
+    // A name that is a link stays one: what it points to is replaced.
+    if (const fs::path target = fs::canonical(m_path, ignored); !target.empty()) m_path = target;
+    RemoveLeftOvers(m_path.parent_path());
+    m_folder = MakeHiddenFolder(m_path.parent_path(), m_name, m_lock);
 }
 
 OutputPlace::~OutputPlace() {
     std::error_code ignored;
     if (!m_folder.empty()) fs::remove_all(m_folder, ignored);
+    if (m_lock >= 0) close(m_lock);
 }
 
 std::string OutputPlace::Address() const {

@@ -1,5 +1,6 @@
 // Where a result is written. Files come into being in a hidden folder beside their final place and move there
-// when they are whole: a command that fails leaves nothing behind, and what was there before stays.
+// when they are whole: a command that fails leaves nothing behind, and what was there before stays. The folder of a
+// command that was killed (".reelfx-" and six letters) goes with the next one that writes beside it.
 #pragma once
 
 #include <cstdint>
@@ -36,6 +37,7 @@ class OutputPlace {
   private:
     std::filesystem::path m_path;
     std::filesystem::path m_folder;  // hidden, beside the final place; empty when written directly
+    int m_lock = -1;                 // on the folder, so that others see that it is in use; -1: none
     std::string m_name;
     bool m_mayOverwrite;
     bool m_replaces = false;

@@ -1,5 +1,6 @@
 #include "hosts/reelfx/picture_commands.h"
 
+#include "hosts/reelfx/interrupt.h"
 #include "hosts/reelfx/picture_grid.h"
 #include "hosts/reelfx/picture_turn.h"
 #include "hosts/reelfx/pixel_converter.h"
@@ -9,6 +10,11 @@ namespace velmora::hosts {
 namespace {
 
 constexpr std::int32_t kSheetCellWidth = 480;
+
+// These commands write at their very end.
+void FailIfInterrupted() {
+    if (Interrupts() > 0) throw Failure(kExitInterrupted, "interrupted; nothing was written");
+}
 
 // A frame of the clip as a viewer sees it.
 struct SourcePicture {
@@ -20,6 +26,7 @@ SourcePicture ReadFrame(const PictureOptions& options) {
     MediaReader reader(options.input);
     std::int64_t index = 0;
     for (;;) {
+        FailIfInterrupted();
         MediaReader::Item item = reader.Next();
         if (!item.frame && !item.packet) break;
         if (!item.frame || index++ != options.frame) continue;
@@ -30,11 +37,13 @@ SourcePicture ReadFrame(const PictureOptions& options) {
         TurnPicture(lying, QuarterTurnsOf(reader.Picture()), source.picture);
         return source;
     }
+    if (!reader.BreakOff().empty()) throw Failure(kExitInput, reader.Name() + ": " + reader.BreakOff());
     throw Failure(kExitInput, reader.Name() + ": has no frame " + std::to_string(options.frame) +
                                   "; it has " + std::to_string(index));
 }
 
 BgraPicture Render(effects::EffectSession& session, SourcePicture& source) {
+    FailIfInterrupted();
     BgraPicture result(source.picture.Width(), source.picture.Height());
     if (!session.Render(source.picture.Record(), result.Record(), source.seconds)) {
         throw Failure(kExitInternal, "the frame cannot be rendered");

@@ -71,6 +71,8 @@ void PixelConverter::Prepare(Scaler& scaler, const Side& from, const Side& to) {
                              IsFullRange(to.format, to.range), 0, 1 << 16, 1 << 16);
     if (sws_init_context(context, nullptr, nullptr) < 0) {
         scaler.context.reset();
+        if (sws_isSupportedInput(from.format) != 0 && sws_isSupportedOutput(to.format) != 0)
+            throw std::bad_alloc();
         const char* name = av_get_pix_fmt_name(IsRgb(from.format) ? to.format : from.format);
         throw Failure(kExitInput,
                       std::string("pixels of the format ") + (name ? name : "?") + " cannot be converted");

@@ -3,7 +3,9 @@
 #include <algorithm>
 #include <filesystem>
 
+#include "hosts/common/usage_error.h"
 #include "hosts/reelfx/failure.h"
+#include "hosts/reelfx/output_place.h"
 #include "presets/compatibility.h"
 #include "presets/preset_file.h"
 
@@ -62,10 +64,8 @@ std::vector<Setting> PresetSettings(const PresetRecord& record, const EffectInfo
 
 void SavePresetFile(const std::string& path, const std::string& name, const EffectInfo& effect,
                     const std::vector<ValueWord>& values, bool mayOverwrite) {
-    std::error_code ignored;
-    if (!mayOverwrite && std::filesystem::exists(path, ignored)) {
-        throw Failure(kExitOutput, path + ": exists already; --overwrite replaces it");
-    }
+    if (path == "-") throw UsageError("a preset is saved in a file, not on standard output");
+    OutputPlace place(path, mayOverwrite);
     PresetRecord record{};
     FillField(record.name, name);
     FillField(record.libraryName, kLibraryName);
@@ -74,7 +74,10 @@ void SavePresetFile(const std::string& path, const std::string& name, const Effe
     for (std::size_t i = 0; i < effect.params.size(); ++i) {
         record.values[i] = {values[i], 0, effect.params[i].kind};
     }
-    if (!WritePreset(path.c_str(), &record)) throw Failure(kExitOutput, path + ": cannot be written");
+    if (!WritePreset(place.Address().c_str(), &record)) {
+        throw Failure(kExitOutput, path + ": cannot be written");
+    }
+    place.Keep();
 }
 
 }  // namespace velmora::hosts

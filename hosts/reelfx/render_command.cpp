@@ -4,6 +4,7 @@
 #include <thread>
 
 #include "hosts/common/digest.h"
+#include "hosts/common/number_text.h"
 #include "hosts/reelfx/frame_worker.h"
 #include "hosts/reelfx/interrupt.h"
 #include "hosts/reelfx/matte.h"
@@ -51,21 +52,17 @@ class RenderRun {
         if (m_writer) m_writer->Begin();
         Progress progress(ClipSection::FrameCountGuess(m_reader, m_section), m_options.progress);
         RenderAll(progress);
-        if (m_frames == 0 && Interrupts() == 0) FailEmpty();
-        if (m_reader.DamagedPackets() > 0) {
-            std::fprintf(stderr, "reelfx: %s: damaged in %lld places; what could be decoded was rendered\n",
-                         m_reader.Name().c_str(), static_cast<long long>(m_reader.DamagedPackets()));
+        if (Interrupts() > 0) FinishPart("interrupted", kExitInterrupted);
+        if (!m_reader.BreakOff().empty())
+            FinishPart(m_reader.Name() + ": " + m_reader.BreakOff(), kExitInput);
+        if (m_frames == 0) FailEmpty();
+        TellOfDamage();
+        if (m_writer) {
+            m_writer->Finish();
+            m_place->Keep();
         }
-        if (Interrupts() == 0) {
-            if (m_writer) {
-                m_writer->Finish();
-                m_place->Keep();
-            }
-            progress.End();
-            return kExitDone;
-        }
-        FinishInterrupted();
-        return kExitInterrupted;
+        progress.End();
+        return kExitDone;
     }
 
   private:
@@ -107,22 +104,37 @@ class RenderRun {
             if (m_writer) m_writer->WritePacket(*item.packet);
             return;
         }
-        if (m_options.withDigests) std::printf("%s\n", DigestLine(item.index, item.digest).c_str());
+        if (m_options.withDigests && std::printf("%s\n", DigestLine(item.index, item.digest).c_str()) < 0) {
+            throw Failure(kExitOutput, "standard output cannot be written");
+        }
         if (!m_writer) return;
         if (m_frames == 0 && !m_section.IsWholeClip()) m_writer->StartAt(item.frame->pts);
         m_writer->WriteFrame(std::move(item.frame));
     }
 
+    // One line of what the clip lacks; what could be decoded was rendered.
+    void TellOfDamage() const {
+        const double missing = m_reader.MissingSeconds();
+        std::string what;
+        if (m_reader.DamagedPackets() > 0) {
+            what = "damaged in " + std::to_string(m_reader.DamagedPackets()) + " places";
+        }
+        if (missing > 0.0)
+            what += (what.empty() ? "ends " : ", ends ") + NumberText(missing) + " s too early";
+        if (what.empty()) return;
+        std::fprintf(stderr, "reelfx: %s: %s; what could be decoded was rendered\n", m_reader.Name().c_str(),
+                     what.c_str());
+    }
+
     // A file that stood there before is worth more than a part of its successor.
-    void FinishInterrupted() {
+    [[noreturn]] void FinishPart(const std::string& why, ExitCode code) {
         if (!m_writer || m_frames == 0 || m_place->ReplacesFile()) {
-            std::fprintf(stderr, "reelfx: interrupted; nothing was written\n");
-            return;
+            throw Failure(code, why + "; nothing was written");
         }
         m_writer->Finish();
         m_place->Keep();
-        std::fprintf(stderr, "reelfx: interrupted; %s holds the first %lld frames\n", m_place->Name().c_str(),
-                     static_cast<long long>(m_frames));
+        throw Failure(
+            code, why + "; " + m_place->Name() + " holds the first " + std::to_string(m_frames) + " frames");
     }
 
     [[noreturn]] void FailEmpty() const {

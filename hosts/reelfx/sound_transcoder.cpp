@@ -29,7 +29,9 @@ CodecPtr OpenDecoder(const AVStream& source) {
     CodecPtr decoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
     avcodec_parameters_to_context(decoder.get(), source.codecpar);
     decoder->pkt_timebase = source.time_base;
-    if (avcodec_open2(decoder.get(), codec, nullptr) < 0) {
+    const int error = avcodec_open2(decoder.get(), codec, nullptr);
+    ThrowIfNoMemory(error);
+    if (error < 0) {
         throw Failure(kExitInput, "the sound cannot be decoded; --no-sound leaves it out");
     }
     return decoder;
@@ -50,7 +52,9 @@ SoundTranscoder::SoundTranscoder(const AVStream& source, AVCodecID target, bool 
     m_encoder->time_base = {1, m_encoder->sample_rate};
     m_encoder->thread_count = 1;
     if (globalHeader) m_encoder->flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
-    if (avcodec_open2(m_encoder.get(), codec, nullptr) < 0) {
+    const int error = avcodec_open2(m_encoder.get(), codec, nullptr);
+    ThrowIfNoMemory(error);
+    if (error < 0) {
         throw Failure(kExitOutput, "the sound cannot be encoded; --no-sound leaves it out");
     }
     m_resampler = Allocated<ResamplerPtr>(swr_alloc());
@@ -99,6 +103,7 @@ void SoundTranscoder::Resample(AVFrame& frame) {
         swr_close(m_resampler.get());
         error = swr_convert_frame(m_resampler.get(), converted.get(), &frame);
     }
+    ThrowIfNoMemory(error);
     if (error < 0) throw Failure(kExitInput, "the sound cannot be converted; --no-sound leaves it out");
     void** const samples = reinterpret_cast<void**>(converted->extended_data);
     if (av_audio_fifo_write(m_fifo, samples, converted->nb_samples) < 0) throw std::bad_alloc();

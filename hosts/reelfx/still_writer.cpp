@@ -60,6 +60,7 @@ PacketPtr Encode(const BgraPicture& picture, const StillFormat& format) {
     }
     if (error >= 0) error = avcodec_send_frame(encoder.get(), nullptr);
     if (error >= 0) error = avcodec_receive_packet(encoder.get(), packet.get());
+    ThrowIfNoMemory(error);
     if (error < 0) throw Failure(kExitOutput, "the picture cannot be encoded: " + AvText(error));
     return packet;
 }

@@ -1,0 +1,20 @@
+// Standard input for the media libraries, read so that a signal ends the waiting for it.
+#pragma once
+
+#include <memory>
+
+extern "C" {
+#include <libavformat/avio.h>
+}
+
+namespace velmora::hosts {
+
+struct CloseInputStream {
+    void operator()(AVIOContext* stream) const;
+};
+using InputStreamPtr = std::unique_ptr<AVIOContext, CloseInputStream>;
+
+// Throws std::bad_alloc.
+InputStreamPtr OpenStandardInput();
+
+}  // namespace velmora::hosts
