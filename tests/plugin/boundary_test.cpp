@@ -257,6 +257,9 @@ TEST_F(Boundary, ConvertsFramesBothWays) {
 
     source.rowStep = 7;
     EXPECT_FALSE(processor->ConvertYcbcrToBgra(&source, &destination, 0)) << "two groups need 8 bytes";
+    source.rowStep = 8;
+    source.xOrigin = 4;
+    EXPECT_FALSE(processor->ConvertYcbcrToBgra(&source, &destination, 0)) << "and two more before the region";
     EXPECT_FALSE(processor->ConvertYcbcrToBgra(nullptr, &destination, 0));
     EXPECT_FALSE(processor->ConvertBgraToYcbcr(&destination, nullptr, 0));
     EXPECT_FALSE(processor->Reserved3(&source, &destination, 1));

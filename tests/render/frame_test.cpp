@@ -2,7 +2,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <limits>
+#include <vector>
 
 #include "render/frame_context.h"
 #include "render/random.h"
@@ -123,6 +125,23 @@ TEST(FrameContext, GivesEachStageTheResultOfTheOnesBefore) {
     EXPECT_EQ(destination.Bytes(), before.Bytes()) << "claimed: nothing to copy";
 }
 
+TEST(FrameContext, CopiesRowsThatOverlapAsIfTheSourceHadBeenTakenFirst) {
+    constexpr std::int32_t kWidth = 3, kHeight = 5, kStep = 16;  // a gap after each row
+    for (const std::int32_t shift : {1, -1}) {
+        std::vector<std::uint8_t> memory(kStep * (kHeight + 2));
+        for (std::size_t i = 0; i < memory.size(); ++i) memory[i] = static_cast<std::uint8_t>(i);
+        std::vector<std::uint8_t> expected = memory;
+        for (std::int32_t y = 1; y <= kHeight; ++y) {
+            std::copy_n(memory.begin() + y * kStep, kWidth * 4, expected.begin() + (y + shift) * kStep);
+        }
+        std::uint8_t* const from = memory.data() + kStep;
+        FrameContext({from, kWidth, kHeight, kStep, 0, 0},
+                     {from + shift * kStep, kWidth, kHeight, kStep, 0, 0})
+            .Finish();
+        EXPECT_EQ(memory, expected) << shift;
+    }
+}
+
 TEST(Random, MatchesLongArithmeticAndSkips) {
     // state x 1103515245 + 12345 modulo 2^32, restated with a wide product.
     Random random(12345);
@@ -150,6 +169,10 @@ TEST(Random, DrawsBetweenIntegersInEitherOrder) {
     }
     Random random(1);
     EXPECT_EQ(random.Draw(5, 5), 5);
+    // The upper end comes with the largest number only: here from the state before the one that holds it.
+    Random last(0x7FFF0000u);
+    last.Skip(0xFFFFFFFFu);
+    EXPECT_EQ(last.Draw(-7, 12), 12);
 }
 
 TEST(Random, DecimalDrawsKeepTheirEnds) {
