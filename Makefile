@@ -1,6 +1,6 @@
 # The commands of daily work. Each sets up first what it needs; see CONTRIBUTING.md.
 
-.PHONY: help setup build test package demo demo-ffmpeg install-user uninstall-user format tidy clean
+.PHONY: help setup build test check-deep package demo demo-ffmpeg install-user uninstall-user format tidy clean
 
 help:
 	@echo 'make demo            build everything and see footage through the library and the native core'
@@ -9,6 +9,7 @@ help:
 	@echo 'make install-user    put reelfx and the frei0r plug-ins where programs look in your home'
 	@echo 'make uninstall-user  take them away again'
 	@echo 'make test            build everything and run all tests'
+	@echo 'make check-deep      hours of it: careless hosts, fuzzing, sanitizers, faults, a soak, faults in the code'
 	@echo 'make setup           install packages and 32-bit Wine; the other commands do it by themselves'
 	@echo 'make build           build the Windows library and the native programs into build/*/dist'
 	@echo 'make format          bring the sources into their form'
@@ -23,6 +24,9 @@ build: setup
 
 test: setup
 	scripts/test
+
+check-deep: setup
+	scripts/check-deep
 
 demo: setup
 	scripts/demo
