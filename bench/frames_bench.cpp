@@ -21,15 +21,21 @@ void Report(benchmark::State& state, const PairedTimes& times) {
     state.counters["work_ms"] = 1000 * times.Work();
 }
 
-// Alternates a memcpy and the work; reports the ratio.
-template <typename Work>
-void RunPaired(benchmark::State& state, FramePool& pool, Work&& work) {
+// Takes the times of rounds and reports them: `round(times)` adds a pair.
+template <typename Round>
+void RunRounds(benchmark::State& state, Round&& round) {
     PairedTimes times;
     for (auto _ : state) {
-        RunPair(pool, times, work);
+        round(times);
         state.SetIterationTime(times.works.back());
     }
     Report(state, times);
+}
+
+// Alternates a memcpy and the work; reports the ratio.
+template <typename Work>
+void RunPaired(benchmark::State& state, FramePool& pool, Work&& work) {
+    RunRounds(state, [&](PairedTimes& times) { RunPair(pool, times, work); });
 }
 
 void RunCase(benchmark::State& state, const BenchCase& test, PictureSize size, double startSeconds) {
@@ -48,16 +54,12 @@ void RunCase(benchmark::State& state, const BenchCase& test, PictureSize size, d
 void RunJumps(benchmark::State& state, const BenchCase& test) {
     FramePool pool(kFullHd);
     const auto session = SessionOf(test);
-    PairedTimes times;
-    for (auto _ : state) {
-        RunJump(pool, times, [&](double seconds) {
-            const bool done =
-                session->Render(pool.Record(pool.Source()), pool.Record(pool.Destination()), seconds);
-            if (!done) state.SkipWithError("frame refused");
-        });
-        state.SetIterationTime(times.works.back());
-    }
-    Report(state, times);
+    const auto render = [&](double seconds) {
+        const bool done =
+            session->Render(pool.Record(pool.Source()), pool.Record(pool.Destination()), seconds);
+        if (!done) state.SkipWithError("frame refused");
+    };
+    RunRounds(state, [&](PairedTimes& times) { RunJump(pool, times, render); });
 }
 
 // The frame processor's conversion to 32 bits or back; the 4:2:2 frame lies in the first half of its buffer.

@@ -22,7 +22,7 @@ double FramesPerSecond(FramePool& pool, const BenchCase& test, std::size_t worke
     std::vector<hosts::FramePipeline::Worker> workers;
     for (std::size_t i = 0; i < workerCount; ++i) {
         std::shared_ptr<effects::EffectSession> session = SessionOf(test);
-        workers.push_back([&pool, session](hosts::PipelineItem& item) {
+        workers.emplace_back([&pool, session](hosts::PipelineItem& item) {
             const auto at = static_cast<std::size_t>(item.index);
             const bool done = session->Render(pool.Record(pool.SourceAt(at)),
                                               pool.Record(pool.DestinationAt(at)), item.seconds);
