@@ -1,3 +1,4 @@
+// The entry of a module that has nothing of its own to do there.
 #include <windows.h>
 
 #include "support/module_detach.h"
