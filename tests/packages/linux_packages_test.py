@@ -15,7 +15,8 @@ from packing import CLIP, DIST, check_digest_list, check_no_build_paths, files_b
 
 PRODUCT = "velmora-reel-effects-1.0-linux-x86_64"
 PLUGINS = [f"velmora_film_{name}" for name in ("camera", "damage", "express", "look", "pro")]
-DEB_FILES = ["usr/bin/reelfx", "usr/lib/velmora-reel-effects/farm-join", "usr/share/man/man1/reelfx.1.gz", "usr/share/bash-completion/completions/reelfx",
+DEB_FILES = ["usr/bin/reelfx", *(f"usr/lib/velmora-reel-effects/{name}" for name in ("farm-slurm", "farm-join")),
+             "usr/share/man/man1/reelfx.1.gz", "usr/share/bash-completion/completions/reelfx",
              "usr/share/zsh/vendor-completions/_reelfx", "usr/share/fish/vendor_completions.d/reelfx.fish",
              *(f"usr/lib/frei0r-1/{name}.so" for name in PLUGINS),
              *(f"usr/share/mlt-7/frei0r/filter_frei0r.{name}.yml" for name in PLUGINS),
