@@ -22,7 +22,7 @@ TEST(Platform, LoadsModulesByAnyName) {
     std::filesystem::create_directory(folder);
     const std::filesystem::path name = folder / "module.so";
     std::filesystem::create_symlink(std::filesystem::canonical(library.dli_fname), name);
-    const ModuleHandle module = LoadModule(name.u16string().c_str());
+    ModuleHandle module = LoadModule(name.u16string().c_str());
     EXPECT_NE(module, nullptr);
     EXPECT_NE(FindExport(module, "cos"), nullptr);
     UnloadModule(module);
