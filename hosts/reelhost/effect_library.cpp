@@ -2,24 +2,10 @@
 
 #include <stdexcept>
 
+#include "hosts/common/library_file.h"
+
 namespace velmora::hosts {
 namespace {
-
-constexpr wchar_t kFileName[] = L"VMReelEffects.dll";
-
-std::wstring BesideThisProgram() {
-    std::wstring path(32768, L'\0');
-    path.resize(GetModuleFileNameW(nullptr, path.data(), static_cast<DWORD>(path.size())));
-    return path.substr(0, path.find_last_of(L"\\/") + 1) + kFileName;
-}
-
-std::wstring Wide(const std::string& text) {
-    std::wstring wide(text.size(), L'\0');
-    const int count = MultiByteToWideChar(CP_ACP, 0, text.data(), static_cast<int>(text.size()), wide.data(),
-                                          static_cast<int>(wide.size()));
-    wide.resize(static_cast<std::size_t>(count));
-    return wide;
-}
 
 EffectInfo Describe(IVideoEffect& effect) {
     EffectInfo info;
@@ -39,7 +25,7 @@ EffectInfo Describe(IVideoEffect& effect) {
 
 EffectLibrary::EffectLibrary(const std::string& path) {
     m_tickBefore = GetTickCount();
-    m_module.reset(LoadLibraryW(path.empty() ? BesideThisProgram().c_str() : Wide(path).c_str()));
+    m_module.reset(LoadLibraryW(LibraryFile(path).c_str()));
     m_tickAfter = GetTickCount();
     if (!m_module) {
         throw std::runtime_error("VMReelEffects.dll cannot be loaded, system error " +
