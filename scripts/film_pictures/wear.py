@@ -1,134 +1,107 @@
 """The seven wear pictures: 0 where the film is intact, 1 where it is worn down to the base.
 
-Each function gives one picture as a field of 0..1 that tiles by height. They hold little: about nine tenths
-of the film is intact, else wear would read as fog.
+A picture stands about 140 times in a large frame, and each strip of it starts at another row in every frame. A texture
+without figures therefore becomes grain that lives; anything that can be told apart from its neighbours becomes a
+wallpaper. So every picture is grain, almost Gaussian, and has its character in the grain's size, strength and density.
+
+Wear lightens most where the picture is dark: means are low and upper tails short, else deep black turns to fog.
 """
 
 import math
 import random
 
-from .noise import (blurred, clouds, evened, field, highlights, lattice, multiplied, octaves, smoothstep,
-                    strip_ends, warped, white)
+from .noise import evened, faded_to_sides, field, mixed, noise, smoothstep, standardised
+
+
+def toned(grain, mean, deviation, most=2.6, skew=0.06):
+    """Grain of deviation 1 as wear of about this mean and deviation.
+
+    The upper tail is a little heavier than a Gaussian's and ends softly at `most` deviations.
+    """
+    def value(v):
+        v += skew * (v * v - 1.0)
+        if v > most - 0.6:
+            v = most - 0.36 / (v - most + 1.2)
+        return min(1.0, max(0.0, mean + deviation * v))
+
+    return [[value(v) for v in row] for row in grain]
+
+
+def with_density(grain, density, strength):
+    """Grain that is stronger where `density` (of deviation 1) is high, by `strength` for each deviation."""
+    return [[g * max(0.2, 1.0 + strength * d) for g, d in zip(row, densities)]
+            for row, densities in zip(grain, density)]
 
 
 def wavy(width, height):
-    """Long soft streaks that sway together along the film, each coming and going slowly."""
-    broad = lattice(11, width, height, width / 7, 3)
-    narrow = octaves(12, width, height, width / 14, 5, 2, 0.6)
-    presence = octaves(13, width, height, width / 4, 5, 2)
-    ends = strip_ends(14, width, height, 3)
+    """Fine grain that thickens along long soft streaks, which sway together along the film; half of them are absent."""
+    grain = mixed((1.0, noise(11, width, height, 0.55)), (0.35, noise(12, width, height, 0.9)))
+    streaks = noise(13, width, height, 1.7, 30.0)
 
-    def streak(x, y):
+    def swaying(x, y):
         turn = 2 * math.pi * y / height
-        bent = x + 0.06 * width * math.sin(2 * turn) + 0.035 * width * math.sin(5 * turn + 1)
-        return 0.35 * broad(bent, y) + 0.65 * narrow(bent, y) - 0.25 * ends[y][x]
+        shift = 3.2 * math.sin(3 * turn) + 1.6 * math.sin(7 * turn + 1)
+        left = math.floor(x + shift)
+        part = x + shift - left
+        return streaks[y][left % width] * (1 - part) + streaks[y][(left + 1) % width] * part
 
-    shown = field(width, height, lambda x, y: smoothstep(0.15, 0.6, presence(x, y)))
-    return multiplied(highlights(evened(field(width, height, streak), 10), 0.70, 0.97), shown)
+    shown = evened(field(width, height, lambda x, y: smoothstep(-0.2, 2.2, swaying(x, y))), 9)
+    density = faded_to_sides(standardised(shown), 5)
+    return toned(mixed((1.0, with_density(grain, density, 0.22)), (0.24, density)), 0.125, 0.072)
 
 
 def blotchy(width, height):
-    """Soft stains of a dozen pixels, many of them hardly begun, none with an edge.
-
-    Evened, so that no large stain tells that the strips repeat.
-    """
-    large, small, mottle = (clouds(21 + i, width, height, size) for i, size in enumerate((13, 6, 2)))
-    ends = strip_ends(25, width, height, 4)
-    ground = evened(field(width, height, lambda x, y:
-                          large[y][x] + 0.6 * small[y][x] + 0.25 * mottle[y][x]), 11)
-    stains = highlights(field(width, height, lambda x, y: ground[y][x] - 0.8 * ends[y][x]), 0.52, 1.0)
-    return blurred(multiplied(stains, field(width, height, lambda x, y: 1 - 0.8 * ends[y][x])))
+    """Grain of soft clumps over a coarser one, gently mottled."""
+    grain = mixed((1.0, noise(21, width, height, 0.66)),
+                  (0.5, faded_to_sides(noise(22, width, height, 1.2), 3)))
+    mottle = faded_to_sides(evened(noise(23, width, height, 3.0), 9), 6)
+    return toned(mixed((1.0, with_density(grain, mottle, 0.16)), (0.15, mottle)), 0.180, 0.106)
 
 
 def grainy(width, height):
-    """Clumps of grain rubbed open, denser in some places."""
-    clumps = lattice(32, width, height, 16, height // 16)
-    density = field(width, height, lambda x, y: smoothstep(0.1, 0.7, clumps(x, y)))
-    return multiplied(highlights(blurred(white(31, width, height)), 0.81, 0.975), density)
+    """Strong, crisp grain."""
+    grain = mixed((1.0, noise(31, width, height, 0.52)), (0.22, noise(32, width, height, 0.95)))
+    return toned(grain, 0.19, 0.125)
 
 
 def fine(width, height):
-    """Pin holes and short rubs along the film's run."""
-    source = random.Random(41)
-    area = width * height
-    worn = [[0.0] * width for _ in range(height)]
-    for _ in range(int(area * 0.028)):
-        worn[source.randrange(height)][source.randrange(width)] = 1.0
-    for _ in range(int(area * 0.025 / 5)):
-        x, y = source.randrange(width), source.randrange(height)
-        for run in range(5):
-            row = worn[(y + run) % height]
-            row[x] = max(row[x], 0.8)
-    patches = lattice(42, width, height, 18, height // 20)
-    return multiplied(worn, field(width, height, lambda x, y: smoothstep(0.05, 0.65, patches(x, y))))
-
-
-def cell_border(points, width, height):
-    """The distance from (x, y) to the nearest border between the cells of the points, around the edges."""
-    def offset(a, b, size):
-        return (b - a + size / 2) % size - size / 2
-
-    def at(x, y):
-        reach = sorted((math.hypot(dx, dy), dx, dy) for dx, dy in
-                       ((offset(x, px, width), offset(y, py, height)) for px, py in points))
-        (first, ax, ay), (second, bx, by) = reach[:2]
-        return (second**2 - first**2) / (2 * math.hypot(ax - bx, ay - by))
-
-    return at
-
-
-def scattered(seed, width, height, columns, rows):
-    """One point at a random place in each cell of a grid."""
-    source = random.Random(seed)
-    return [((i + source.random()) * width / columns, (j + source.random()) * height / rows)
-            for j in range(rows) for i in range(columns)]
+    """The finest grain, and a few hair-thin faint rubs along the film's run."""
+    source = random.Random(42)
+    rubs = [[0.0] * width for _ in range(height)]
+    for _ in range(26):
+        x, y, run = source.randrange(2, width - 2), source.randrange(height), source.randrange(10, 60)
+        strength = source.uniform(0.3, 0.8)
+        for i in range(run):
+            rubs[(y + i) % height][x] += strength * smoothstep(0, 6, i + 0.5) * smoothstep(0, 6, run - i - 0.5)
+    grain = noise(41, width, height, 0.40)
+    return toned([[g + r for g, r in zip(*rows)] for rows in zip(grain, rubs)], 0.12, 0.070)
 
 
 def splotchy(width, height):
-    """Large stains drawn out along the film, with lobed borders and mottled inside."""
-    source = random.Random(57)
-    stains = []
-    for i, radius in enumerate((7.5, 2.5, 5.0, 8.5, 3.0, 6.0)):
-        inside = min(radius, width / 2 - 2)
-        y = (i + source.uniform(0.0, 1.0)) * height / 6
-        stains.append((source.uniform(inside, width - inside), y, radius, source.uniform(0.6, 1.0)))
-    lobes, flakes, mottle = (clouds(52 + i, width, height, size) for i, size in enumerate((7, 3, 0)))
-    ends = strip_ends(55, width, height, 2.5)
-
-    def worn(x, y):
-        border = 0.30 * lobes[y][x] + 0.16 * flakes[y][x] + 0.05 * mottle[y][x]
-        most = 0.0
-        for px, py, radius, strength in stains:
-            down = abs(y - py) % height
-            away = math.hypot(x - px, min(down, height - down) / 2) / radius
-            most = max(most, strength * smoothstep(0.1, 0.7, 1 - away + border))
-        return most * (0.75 + 0.25 * smoothstep(-1.5, 1.5, mottle[y][x])) * (1 - ends[y][x])
-
-    return field(width, height, worn)
+    """Grain on a mottle as strong as it may be without showing where it repeats."""
+    grain = mixed((1.0, noise(51, width, height, 0.62)), (0.4, faded_to_sides(noise(52, width, height, 1.1), 3)))
+    mottle = faded_to_sides(evened(noise(53, width, height, 2.2), 7), 4)
+    return toned(mixed((1.0, with_density(grain, mottle, 0.30)), (0.50, mottle)), 0.150, 0.078)
 
 
 def lite(width, height):
-    """A few faint pin holes."""
-    source = random.Random(61)
-    worn = [[0.0] * width for _ in range(height)]
-    for _ in range(int(width * height * 0.012)):
-        worn[source.randrange(height)][source.randrange(width)] = source.uniform(0.25, 0.6)
-    return worn
+    """Very light grain."""
+    return toned(mixed((1.0, noise(61, width, height, 0.50)), (0.25, noise(62, width, height, 0.9))), 0.065, 0.040)
+
+
+def sheared(values, slope):
+    """Each column moved down by `slope` pixels more than the one before; in a square it still wraps."""
+    height, width = len(values), len(values[0])
+    return field(width, height, lambda x, y: values[(y + slope * x) % height][x])
 
 
 def crackly(width, height):
-    """A net of cracks in the emulsion, about half of it open."""
-    points = scattered(71, width, height, round(width / 13), round(height / 13))
-    border = warped(72, cell_border(points, width, height), width, height, 6, 3)
-    patches = octaves(74, width, height, 16, height // 16, 2)
-    ends = strip_ends(75, width, height, 2)
-    opening = evened(field(width, height, patches), 14)
-
-    def crack(x, y):
-        opened = smoothstep(-0.08, 0.06, opening[y][x]) * (1 - 0.5 * ends[y][x])
-        return opened * (1 - smoothstep(0.1, 0.4 + 0.6 * opened, border(x, y)))
-
-    return field(width, height, crack)
+    """Crisp grain broken by short cracks, finer than the grain, that run every way."""
+    grain = mixed((1.0, noise(71, width, height, 0.45)), (0.4, noise(72, width, height, 0.9)))
+    long = [sheared(noise(73 + i, width, height, *size), slope) for i, (size, slope) in enumerate((
+        ((1.3, 0.30), 1), ((1.3, 0.30), -1), ((0.9, 0.30), 2), ((0.9, 0.30), -2), ((1.5, 0.34), 0), ((0.34, 1.5), 0)))]
+    cracks = standardised(field(width, height, lambda x, y: max(0.0, max(way[y][x] for way in long) - 1.2)**1.3))
+    return toned(mixed((1.0, grain), (0.75, cracks)), 0.14, 0.085, most=3.2)
 
 
 # Menu value, width, height, drawing function.

@@ -1,7 +1,10 @@
 #include "render/pictures.h"
 
 #include <algorithm>
-#include <cstdlib>
+#include <cmath>
+#include <numeric>
+#include <sstream>
+#include <string>
 #include <vector>
 
 #include <gtest/gtest.h>
@@ -13,68 +16,190 @@ int At(const GreyPicture& picture, int x, int y) {
     return picture.pixels[y * picture.rowStep + x];
 }
 
-double MeanRowDifference(const GreyPicture& picture, int rowA, int rowB) {
-    int sum = 0;
-    for (int x = 0; x < picture.width; ++x) {
-        sum += std::abs(At(picture, x, rowA) - At(picture, x, rowB));
+// A wear picture as numbers about its mean, wrapping by height as strips of it do in a frame.
+class Texture {
+  public:
+    explicit Texture(const GreyPicture& picture) : m_width(picture.width), m_height(picture.height) {
+        for (int y = 0; y < m_height; ++y) {
+            for (int x = 0; x < m_width; ++x) m_values.push_back(At(picture, x, y) / 255.0);
+        }
+        m_mean = std::accumulate(m_values.begin(), m_values.end(), 0.0) / Count();
+        for (double& value : m_values) value -= m_mean;
+        m_deviation = std::sqrt(MeanOf([](double v) { return v * v; }));
     }
-    return double(sum) / picture.width;
-}
+
+    int Width() const { return m_width; }
+    int Height() const { return m_height; }
+    double Mean() const { return m_mean; }
+    double Deviation() const { return m_deviation; }
+    double Moment(int power) const {
+        return MeanOf([&](double v) { return std::pow(v / m_deviation, power); });
+    }
+    double ShareAbove(double level) const {
+        return MeanOf([&](double v) { return v + m_mean > level ? 1.0 : 0.0; });
+    }
+    double ValueAt(int x, int y) const {
+        return m_values[static_cast<std::size_t>((y + m_height) % m_height * m_width + x)];
+    }
+    void Add(int x, int y, double amount) {
+        m_values[static_cast<std::size_t>(y % m_height * m_width + x)] += amount;
+    }
+
+    // How alike pixels are that lie (dx, dy) apart; dx stays inside a strip.
+    double Correlation(int dx, int dy) const {
+        double sum = 0;
+        const int first = std::max(0, -dx), last = std::min(m_width, m_width - dx);
+        for (int y = 0; y < m_height; ++y) {
+            for (int x = first; x < last; ++x) sum += ValueAt(x, y) * ValueAt(x + dx, y + dy);
+        }
+        return sum / (m_height * (last - first)) / (m_deviation * m_deviation);
+    }
+    // Beyond 4 pixels grain is independent, while a lattice or an edge repeats.
+    double GreatestFarCorrelation() const {
+        double greatest = 0;
+        for (int dy = 0; dy <= std::min(60, m_height / 2); ++dy) {
+            for (int dx = -m_width / 2; dx <= m_width / 2; ++dx) {
+                if (dx * dx + dy * dy > 16) greatest = std::max(greatest, std::abs(Correlation(dx, dy)));
+            }
+        }
+        return greatest;
+    }
+    // How far the brightest or darkest square of `size` pixels stands out from all such squares, in deviations.
+    double GreatestFigure(int size) const {
+        std::vector<double> means;
+        for (int y = 0; y < m_height; ++y) {
+            for (int x = 0; x + size <= m_width; ++x) {
+                double sum = 0;
+                for (int i = 0; i < size * size; ++i) sum += ValueAt(x + i % size, y + i / size);
+                means.push_back(sum);
+            }
+        }
+        double squares = 0, most = 0;
+        for (double mean : means) {
+            squares += mean * mean;
+            most = std::max(most, std::abs(mean));
+        }
+        return most / std::sqrt(squares / static_cast<double>(means.size()));
+    }
+    // The contrast between neighbouring columns where two strips meet, whose rows are independent, as a multiple of
+    // the contrast inside.
+    double SeamContrast() const {
+        double inside = 0, seam = 0;
+        for (int y = 0; y < m_height; ++y) {
+            for (int x = 1; x < m_width; ++x) inside += std::abs(ValueAt(x, y) - ValueAt(x - 1, y));
+            for (int other = 0; other < m_height; other += 7) {
+                seam += std::abs(ValueAt(m_width - 1, y) - ValueAt(0, other));
+            }
+        }
+        return seam / ((m_height + 6) / 7) / (inside / (m_width - 1));
+    }
+    double RowContrast(int y) const {
+        double sum = 0;
+        for (int x = 0; x < m_width; ++x) sum += std::abs(ValueAt(x, y) - ValueAt(x, y - 1));
+        return sum;
+    }
+    // The contrast of the first row against the last, in deviations of such contrasts inside.
+    double WrapContrast() const {
+        double sum = 0, squares = 0;
+        for (int y = 1; y < m_height; ++y) {
+            sum += RowContrast(y);
+            squares += RowContrast(y) * RowContrast(y);
+        }
+        const double mean = sum / (m_height - 1);
+        return (RowContrast(0) - mean) / std::sqrt(squares / (m_height - 1) - mean * mean);
+    }
+
+  private:
+    double Count() const { return static_cast<double>(m_values.size()); }
+    template <typename Function>
+    double MeanOf(Function&& function) const {
+        double sum = 0;
+        for (double value : m_values) sum += function(value);
+        return sum / Count();
+    }
+
+    int m_width, m_height;
+    std::vector<double> m_values;
+    double m_mean = 0, m_deviation = 0;
+};
 
 struct WearCase {
-    int menuValue;
-    int width;
-    int height;
-    // What the named look needs, in parts of 1: how bright on average, how much of the film is worn through.
-    double leastMean, mostMean;
-    double leastWorn, mostWorn;
+    const char* name;
+    int menuValue, width, height;
+    // Strength of the grain, and its size: the correlation of neighbours.
+    double leastMean, mostMean, leastDeviation, mostDeviation, leastClump, mostClump;
 };
 
+// Means stay low and about 1.7 deviations above 0: higher ones would fog deep black, lower ones would cut the grain off.
 constexpr WearCase kWearCases[] = {
-    {2000, 50, 300, .06, .12, .06, .12},    // Wavy
-    {2001, 50, 300, .07, .13, .02, .08},    // Blotchy: soft, so that little of it reaches half
-    {2002, 50, 300, .03, .07, .03, .07},    // Grainy
-    {2003, 50, 300, .02, .05, .02, .06},    // Fine
-    {2004, 25, 150, .05, .11, .06, .12},    // Splotchy
-    {2005, 64, 64, .003, .010, .001, .01},  // Lite
-    {2006, 64, 64, .05, .11, .05, .11},     // Crackly
+    {"Wavy", 2000, 50, 300, .11, .15, .06, .09, 0.35, 0.49},
+    {"Blotchy", 2001, 50, 300, .15, .21, .09, .12, 0.51, 0.65},    // the largest clumps
+    {"Grainy", 2002, 50, 300, .17, .21, .11, .14, 0.25, 0.39},     // the strongest
+    {"Fine", 2003, 50, 300, .10, .14, .06, .09, 0.02, 0.16},       // the smallest clumps
+    {"Splotchy", 2004, 25, 150, .13, .18, .065, .09, 0.49, 0.63},  // on a mottle
+    {"Lite", 2005, 64, 64, .05, .08, .03, .05, 0.20, 0.34},        // the weakest
+    {"Crackly", 2006, 64, 64, .12, .16, .07, .10, 0.13, 0.27},
 };
 
-TEST(WearPictures, HaveTheirSizesAndBrightness) {
+// What gives a texture away once it stands a hundred times in a frame: empty when nothing does.
+//
+// Grain of a few hundred to a few thousand independent clumps shows correlations and squares of up to four and a half
+// deviations by chance, a correlation's deviation being about 2.2 by the root of the pixels for clumps of this size.
+std::string Flaw(const Texture& texture) {
+    const double chance = 2.2 / std::sqrt(texture.Width() * texture.Height());
+    std::ostringstream flaw;
+    const auto expect = [&](const char* what, double value, double least, double most) {
+        if (!(value >= least && value <= most)) {
+            flaw << what << ' ' << value << ", not " << least << " to " << most << "; ";
+        }
+    };
+    expect("skewness", texture.Moment(3), -0.1, 0.9);  // almost Gaussian, the upper tail light
+    expect("kurtosis", texture.Moment(4), 2.3, 4.2);
+    expect("share above half", texture.ShareAbove(0.5), 0, 0.003);  // no flake is worn through
+    expect("far correlation", texture.GreatestFarCorrelation(), 0, 4.5 * chance);
+    for (int size : {3, 7}) expect("figure", texture.GreatestFigure(size), 0, 4.6);
+    // Independent grain differs by the root of 1 / (1 - correlation of neighbours) times more: not seen up to half more.
+    expect("seam of strips", texture.SeamContrast(), 0.7, 1.55);
+    expect("seam of rows", texture.WrapContrast(), -3, 3);
+    return flaw.str();
+}
+
+TEST(WearPictures, AreGrainOfTheirCharacter) {
     for (const WearCase& wanted : kWearCases) {
-        SCOPED_TRACE(wanted.menuValue);
+        SCOPED_TRACE(wanted.name);
         const GreyPicture& picture = WearPicture(wanted.menuValue);
         ASSERT_EQ(picture.width, wanted.width);
         ASSERT_EQ(picture.height, wanted.height);
         ASSERT_EQ(picture.rowStep, wanted.width);
-        const double count = double(picture.width) * picture.height;
-        double sum = 0, worn = 0, intact = 0;
-        for (int y = 0; y < picture.height; ++y) {
-            for (int x = 0; x < picture.width; ++x) {
-                sum += At(picture, x, y) / 255.0;
-                worn += At(picture, x, y) > 127;
-                intact += At(picture, x, y) < 8;
-            }
-        }
-        EXPECT_GE(sum / count, wanted.leastMean);
-        EXPECT_LE(sum / count, wanted.mostMean);
-        EXPECT_GE(worn / count, wanted.leastWorn);
-        EXPECT_LE(worn / count, wanted.mostWorn);
-        EXPECT_GE(intact / count, 0.6);  // else the frame would look fogged
+        const Texture texture(picture);
+        const double clump = (texture.Correlation(1, 0) + texture.Correlation(0, 1)) / 2;
+        EXPECT_TRUE(texture.Mean() >= wanted.leastMean && texture.Mean() <= wanted.mostMean)
+            << texture.Mean();
+        EXPECT_TRUE(texture.Deviation() >= wanted.leastDeviation &&
+                    texture.Deviation() <= wanted.mostDeviation)
+            << texture.Deviation();
+        EXPECT_TRUE(clump >= wanted.leastClump && clump <= wanted.mostClump) << clump;
+        EXPECT_EQ(Flaw(texture), "");
     }
 }
 
-TEST(WearPictures, LastRowContinuesInTheFirst) {
-    for (const WearCase& wanted : kWearCases) {
-        SCOPED_TRACE(wanted.menuValue);
-        const GreyPicture& picture = WearPicture(wanted.menuValue);
-        std::vector<double> differences;
-        for (int y = 1; y < picture.height; ++y) {
-            differences.push_back(MeanRowDifference(picture, y - 1, y));
+// Faults that an artist may put into any of the pictures.
+TEST(WearPictures, AreRefusedWithAFigureAnEdgeOrALattice) {
+    for (const WearCase& drawn : kWearCases) {
+        SCOPED_TRACE(drawn.name);
+        const Texture good(WearPicture(drawn.menuValue));
+        const double d = good.Deviation();
+        Texture stain = good, edge = good, lattice = good;
+        for (int i = 0; i < 49; ++i) stain.Add(9 + i % 7, 40 + i / 7, 3 * d);
+        for (int y = 0; y < good.Height() / 2; ++y) {
+            for (int x = 0; x < good.Width(); ++x) edge.Add(x, y, d);
         }
-        std::sort(differences.begin(), differences.end());
-        EXPECT_LE(MeanRowDifference(picture, picture.height - 1, 0),
-                  differences[differences.size() * 19 / 20]);
+        for (int y = 0; y < good.Height(); ++y) {
+            for (int x = 0; x < good.Width(); ++x) lattice.Add(x, y, x % 8 == 0 || y % 8 == 0 ? d : 0);
+        }
+        EXPECT_NE(Flaw(stain), "");
+        EXPECT_NE(Flaw(edge), "");
+        EXPECT_NE(Flaw(lattice), "");
     }
 }
 
@@ -115,18 +240,34 @@ TEST(SpotPictures, LieOnTheirKeyWithoutARectangle) {
     }
 }
 
-// Dirt on the print is dark, dust that lay on the negative bright: mostly the first, but both are there.
-TEST(SpotPictures, AreMostlyDirtAndSometimesClear) {
-    int dark = 0, bright = 0;
+// Mostly specks of a few pixels, of very different contrast: a set of equal marks is recognised at once.
+TEST(SpotPictures, AreMostlySmallAndOfUnequalContrast) {
+    int dark = 0, bright = 0, small = 0, faint = 0, strong = 0;
     for (int index = 0; index < kSpotCount; ++index) {
         const GreyPicture& spot = SpotPicture(index);
-        const auto [least, most] = std::minmax_element(spot.pixels, spot.pixels + spot.width * spot.height);
-        dark += *least < spot.pixels[0] / 2;
-        bright += *most > 200;
-        EXPECT_TRUE(*least < spot.pixels[0] / 2 || *most > 200) << "spot " << index << " is hardly seen";
+        const int key = spot.pixels[0];
+        double most = 0, direction = 0;
+        int covered = 0;
+        for (int i = 0; i < spot.width * spot.height; ++i) {
+            const int difference = spot.pixels[i] - key;
+            const double contrast = difference / double(difference < 0 ? key : 255 - key);
+            covered += std::abs(contrast) > 0.15;
+            most = std::max(most, std::abs(contrast));
+            direction += contrast;
+        }
+        SCOPED_TRACE(index);
+        EXPECT_GE(covered, 1);
+        EXPECT_GE(most, 0.25) << "hardly seen";
+        small += covered <= 16;
+        faint += most < 0.55;
+        strong += most > 0.75;
+        (direction < 0 ? dark : bright) += 1;
     }
-    EXPECT_GT(dark, 2 * bright);
-    EXPECT_GE(bright, 1);
+    EXPECT_GE(small, 7);
+    EXPECT_GE(faint, 2);
+    EXPECT_GE(strong, 3);
+    EXPECT_GT(dark, 2 * bright);  // dirt on the print is dark, dust that lay on the negative bright
+    EXPECT_GE(bright, 2);
 }
 
 }  // namespace
