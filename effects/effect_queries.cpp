@@ -1,6 +1,6 @@
 #include "effects/effect_queries.h"
 
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 #include "plugin/params.h"
 #include "render/rounding.h"
 

@@ -4,7 +4,7 @@
 #include <span>
 
 #include "effects/effect_queries.h"
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 #include "plugin/render_session.h"
 #include "render/renderer.h"
 #include "render/rounding.h"

@@ -5,7 +5,7 @@
 #include <cstdint>
 #include <limits>
 
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 
 namespace velmora {
 namespace {

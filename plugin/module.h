@@ -2,7 +2,7 @@
 #pragma once
 
 #include "plugin/host_api.h"
-#include "support/platform.h"
+#include "platform/platform.h"
 
 namespace velmora {
 

@@ -1,7 +1,7 @@
 #include <windows.h>
 
 #include "plugin/module.h"
-#include "support/module_detach.h"
+#include "platform/module_detach.h"
 
 extern "C" BOOL WINAPI DllMain(HINSTANCE module, DWORD reason, LPVOID reserved) {
     if (reason == DLL_PROCESS_ATTACH) velmora::SetModuleHandle(module);

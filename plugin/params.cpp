@@ -2,7 +2,7 @@
 
 #include <cstring>
 
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 #include "render/rounding.h"
 
 namespace velmora {

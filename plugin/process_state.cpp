@@ -5,7 +5,7 @@
 #include <new>
 
 #include "plugin/render_options.h"
-#include "support/platform.h"
+#include "platform/platform.h"
 
 namespace velmora {
 namespace {

@@ -2,7 +2,7 @@
 
 #include <new>
 
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 #include "plugin/process_state.h"
 
 namespace velmora {

@@ -4,7 +4,7 @@
 #include <string>
 
 #include "effects/film_effect.h"
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 #include "plugin/frame_processor.h"
 #include "plugin/module.h"
 #include "plugin/velmora_effect.h"

@@ -5,7 +5,7 @@
 #include "plugin/com_object.h"
 #include "plugin/host_api.h"
 #include "plugin/process_state.h"
-#include "support/platform.h"
+#include "platform/platform.h"
 
 namespace velmora {
 

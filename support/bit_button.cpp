@@ -6,7 +6,7 @@
 #include <memory>
 #include <new>
 
-#include "support/win32_handles.h"
+#include "platform/win32_handles.h"
 
 namespace velmora::support {
 namespace {

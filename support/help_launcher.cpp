@@ -5,8 +5,8 @@
 
 #include <optional>
 
-#include "support/win32_handles.h"
-#include "support/win32_text.h"
+#include "platform/win32_handles.h"
+#include "text/win32_text.h"
 
 namespace velmora::support {
 namespace {

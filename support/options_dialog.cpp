@@ -10,8 +10,8 @@
 #include "support/bit_button.h"
 #include "support/product.h"
 #include "support/resource_ids.h"
-#include "support/win32_handles.h"
-#include "support/win32_text.h"
+#include "platform/win32_handles.h"
+#include "text/win32_text.h"
 
 namespace velmora::support {
 namespace {

@@ -4,7 +4,7 @@
 
 #include <cstring>
 
-#include "support/win32_handles.h"
+#include "platform/win32_handles.h"
 
 namespace velmora::support {
 namespace {

@@ -3,7 +3,7 @@
 #include <cstring>
 #include <new>
 
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 #include "support/bit_button.h"
 #include "support/help_launcher.h"
 #include "support/options_dialog.h"
@@ -11,8 +11,8 @@
 #include "support/resource_ids.h"
 #include "support/shell_services.h"
 #include "support/text_sources.h"
-#include "support/win32_handles.h"
-#include "support/win32_text.h"
+#include "platform/win32_handles.h"
+#include "text/win32_text.h"
 
 namespace velmora::support {
 namespace {

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
-#include "support/strings.h"
+#include "text/strings.h"
 
 namespace velmora {
 

@@ -3,7 +3,7 @@
 #include <optional>
 #include <vector>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/common/usage_error.h"
 
 namespace velmora::hosts {

@@ -11,7 +11,7 @@
 #include <string>
 #include <string_view>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts {
 

@@ -4,7 +4,7 @@
 
 #include <cstdio>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts::frei0r {
 namespace {

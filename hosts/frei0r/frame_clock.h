@@ -14,7 +14,7 @@
 #include <optional>
 #include <string_view>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/frei0r/host_time_unit.h"
 
 namespace velmora::hosts::frei0r {

@@ -7,7 +7,7 @@
 #include <limits>
 #include <new>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/frei0r/pixel_order.h"
 
 namespace velmora::hosts::frei0r {

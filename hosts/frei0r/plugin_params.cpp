@@ -4,7 +4,7 @@
 
 #include <algorithm>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts::frei0r {
 namespace {

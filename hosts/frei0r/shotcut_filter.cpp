@@ -1,6 +1,6 @@
 #include <frei0r.h>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/frei0r/editor_files.h"
 #include "hosts/frei0r/editor_values.h"
 

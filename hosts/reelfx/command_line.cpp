@@ -5,7 +5,7 @@
 #include <cstdio>
 #include <sstream>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/common/usage_error.h"
 #include "hosts/reelfx/command_options.h"
 

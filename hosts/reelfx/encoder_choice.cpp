@@ -2,7 +2,7 @@
 
 #include <vector>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/reelfx/failure.h"
 #include "hosts/reelfx/pixel_converter.h"
 

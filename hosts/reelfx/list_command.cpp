@@ -3,7 +3,7 @@
 #include <cstdio>
 #include <nlohmann/json.hpp>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/common/settings.h"
 #include "hosts/reelfx/effect_choice.h"
 

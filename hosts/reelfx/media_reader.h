@@ -11,7 +11,7 @@
 #include <string>
 #include <vector>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/reelfx/av_handles.h"
 #include "hosts/reelfx/standard_input.h"
 

@@ -4,7 +4,7 @@
 #include <thread>
 
 #include "hosts/common/digest.h"
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/reelfx/frame_worker.h"
 #include "hosts/reelfx/interrupt.h"
 #include "hosts/reelfx/matte.h"

@@ -1,6 +1,6 @@
 #include "hosts/reelfx/render_plan.h"
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/reelfx/media_facts.h"
 
 namespace velmora::hosts {

@@ -4,7 +4,7 @@
 #include <cstdint>
 #include <vector>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/common/settings.h"
 #include "hosts/reelhost/effect_library.h"
 #include "plugin/host_api.h"

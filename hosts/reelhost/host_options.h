@@ -6,7 +6,7 @@
 #include <string>
 #include <vector>
 
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/common/y4m.h"
 
 namespace velmora::hosts {

@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "bench/frame_pool.h"
-#include "hosts/common/number_text.h"
+#include "text/number_text.h"
 #include "hosts/reelhost/effect_run.h"
 
 #include <psapi.h>

@@ -1,4 +1,4 @@
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "presets/number_text.h"
+#include "text/c_locale_numbers.h"
 
 #include <gtest/gtest.h>
 

@@ -2,7 +2,7 @@
 // their choice, play the library objects and unload it.
 #include <windows.h>
 
-#include "support/module_detach.h"
+#include "platform/module_detach.h"
 #include "support/shell_services.h"
 
 namespace {

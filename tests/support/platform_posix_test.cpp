@@ -1,6 +1,6 @@
 // Modules in folders with any name.
 
-#include "support/platform.h"
+#include "platform/platform.h"
 
 #include <dlfcn.h>
 #include <gtest/gtest.h>

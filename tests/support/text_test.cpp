@@ -4,8 +4,8 @@
 #include <string>
 #include <type_traits>
 
-#include "support/code_page.h"
-#include "support/strings.h"
+#include "text/code_page.h"
+#include "text/strings.h"
 #include "support/translation.h"
 #include "tests/presets/fake_library.h"
 #ifdef _WIN32

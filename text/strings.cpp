@@ -1,4 +1,4 @@
-#include "support/strings.h"
+#include "text/strings.h"
 
 #include <algorithm>
 #include <cstdint>
@@ -6,7 +6,7 @@
 #include <new>
 #include <string>
 
-#include "support/code_page.h"
+#include "text/code_page.h"
 
 namespace velmora {
 

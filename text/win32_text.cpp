@@ -1,8 +1,8 @@
-#include "support/win32_text.h"
+#include "text/win32_text.h"
 
 #include <windows.h>
 
-#include "support/code_page.h"
+#include "text/code_page.h"
 
 namespace velmora::support::win32 {
 namespace {

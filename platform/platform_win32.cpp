@@ -1,6 +1,6 @@
 #include <windows.h>
 
-#include "support/platform.h"
+#include "platform/platform.h"
 
 namespace velmora::support {
 namespace {

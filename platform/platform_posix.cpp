@@ -4,7 +4,7 @@
 #include <filesystem>
 #include <system_error>
 
-#include "support/platform.h"
+#include "platform/platform.h"
 
 namespace velmora::support {
 

@@ -1,4 +1,4 @@
-#include "language/utf.h"
+#include "text/utf.h"
 
 #include <cstddef>
 #include <cstdint>
