@@ -11,7 +11,7 @@
 #include "bench/bench_cases.h"
 #include "bench/frame_pool.h"
 #include "bench/session_of.h"
-#include "plugin/frame_processor.h"
+#include "library/frame_processor.h"
 
 namespace velmora::bench {
 namespace {

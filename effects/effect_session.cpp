@@ -5,7 +5,7 @@
 
 #include "effects/effect_queries.h"
 #include "platform/float_guard.h"
-#include "plugin/render_session.h"
+#include "effects/render_session.h"
 #include "render/renderer.h"
 #include "render/rounding.h"
 

@@ -23,7 +23,7 @@
 
 #include <cstddef>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora {
 

@@ -1,7 +1,7 @@
 // The process-wide shell services and how the library objects take part in them.
 #pragma once
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 #include "platform/platform.h"
 
 namespace velmora::support {

@@ -6,7 +6,7 @@
 #include <new>
 #include <vector>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::support {
 

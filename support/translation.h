@@ -3,7 +3,7 @@
 
 #include <cstdint>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora {
 

@@ -8,7 +8,7 @@
 #include <string_view>
 #include <vector>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::hosts {
 

@@ -13,7 +13,7 @@
 #include <string_view>
 
 #include "hosts/common/effect_info.h"
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::hosts {
 

@@ -5,7 +5,7 @@
 
 #include "hosts/reelcheck/dice.h"
 #include "hosts/reelcheck/guarded_memory.h"
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::reelcheck {
 

@@ -5,7 +5,7 @@
 #include <memory>
 #include <string>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::reelcheck {
 

@@ -8,7 +8,7 @@
 
 #include "hosts/reelcheck/dice.h"
 #include "hosts/reelcheck/frame.h"
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::reelcheck {
 

@@ -6,7 +6,7 @@
 
 #include "hosts/common/effect_info.h"
 #include "hosts/common/settings.h"
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::hosts {
 

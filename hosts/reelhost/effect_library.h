@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "hosts/common/effect_info.h"
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 #include <windows.h>
 

@@ -7,7 +7,7 @@
 #include "text/number_text.h"
 #include "hosts/common/settings.h"
 #include "hosts/reelhost/effect_library.h"
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::hosts {
 

@@ -7,7 +7,7 @@
 #include <limits>
 #include <string>
 
-#include "plugin/master_settings.h"
+#include "effects/master_settings.h"
 #include "tests/common/fake_host.h"
 
 namespace velmora {

@@ -9,7 +9,7 @@
 #include <optional>
 #include <string>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::support::test {
 

@@ -6,7 +6,7 @@
 
 #include <cstdio>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 int main(int count, char** arguments) {
     if (count != 2) return 2;

@@ -1,7 +1,7 @@
 // The library with one fault of choice: what reelcheck must find. The fault is named in REELCHECK_FAULT.
 #pragma once
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::testing {
 

@@ -1,13 +1,13 @@
-#include "plugin/velmora_lib.h"
+#include "library/velmora_lib.h"
 
 #include <new>
 #include <string>
 
 #include "effects/film_effect.h"
 #include "platform/float_guard.h"
-#include "plugin/frame_processor.h"
-#include "plugin/module.h"
-#include "plugin/velmora_effect.h"
+#include "library/frame_processor.h"
+#include "library/module.h"
+#include "effects/velmora_effect.h"
 #include "presets/preset_saver.h"
 #include "support/shell_services.h"
 

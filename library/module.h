@@ -1,7 +1,7 @@
 // The loaded library itself and its two exports.
 #pragma once
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 #include "platform/platform.h"
 
 namespace velmora {

@@ -2,8 +2,8 @@
 // parameters and renders from them. Every effect contains one and poses to it as the host.
 #pragma once
 
-#include "plugin/com_object.h"
-#include "plugin/host_api.h"
+#include "api/com_object.h"
+#include "api/host_api.h"
 
 namespace velmora {
 

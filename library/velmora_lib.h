@@ -2,9 +2,9 @@
 #pragma once
 
 #include "language/lang_parser.h"
-#include "plugin/com_object.h"
-#include "plugin/host_api.h"
-#include "plugin/process_state.h"
+#include "api/com_object.h"
+#include "api/host_api.h"
+#include "effects/process_state.h"
 #include "platform/platform.h"
 
 namespace velmora {

@@ -1,4 +1,4 @@
-#include "plugin/frame_processor.h"
+#include "library/frame_processor.h"
 
 #include <algorithm>
 #include <cstddef>

@@ -1,10 +1,10 @@
 // The master settings as objects: each can describe itself to a host, read its value from one and tell its
-// kind. They live in a MasterSettingsList (plugin/master_settings.h) and are overwritten by every frame.
+// kind. They live in a MasterSettingsList (effects/master_settings.h) and are overwritten by every frame.
 #pragma once
 
 #include <cstdint>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora {
 

@@ -1,4 +1,4 @@
-#include "plugin/render_options.h"
+#include "effects/render_options.h"
 
 #include <algorithm>
 #include <cstdlib>

@@ -1,10 +1,10 @@
-#include "plugin/process_state.h"
+#include "effects/process_state.h"
 
 #include <atomic>
 #include <memory>
 #include <new>
 
-#include "plugin/render_options.h"
+#include "effects/render_options.h"
 #include "platform/platform.h"
 
 namespace velmora {

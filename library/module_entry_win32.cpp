@@ -1,6 +1,6 @@
 #include <windows.h>
 
-#include "plugin/module.h"
+#include "library/module.h"
 #include "platform/module_detach.h"
 
 extern "C" BOOL WINAPI DllMain(HINSTANCE module, DWORD reason, LPVOID reserved) {

@@ -1,4 +1,4 @@
-#include "plugin/render_session.h"
+#include "effects/render_session.h"
 
 #include "render/frame_context.h"
 #include "render/renderer.h"

@@ -1,9 +1,9 @@
 // The converter between packed YCbCr 4:2:2 frames and 32-bit frames that the library offers hosts.
 #pragma once
 
-#include "plugin/com_object.h"
-#include "plugin/host_api.h"
-#include "plugin/render_options.h"
+#include "api/com_object.h"
+#include "api/host_api.h"
+#include "effects/render_options.h"
 #include "render/ycbcr.h"
 
 namespace velmora {

@@ -4,8 +4,8 @@
 
 #include <cstdint>
 
-#include "plugin/master_settings.h"
-#include "plugin/render_session.h"
+#include "effects/master_settings.h"
+#include "effects/render_session.h"
 
 namespace velmora {
 

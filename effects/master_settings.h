@@ -5,7 +5,7 @@
 #include <array>
 #include <cstdint>
 
-#include "plugin/params.h"
+#include "effects/params.h"
 #include "render/stage_settings.h"
 
 namespace velmora {

@@ -1,10 +1,10 @@
-#include "plugin/module.h"
+#include "library/module.h"
 
 #include <new>
 
 #include "platform/float_guard.h"
-#include "plugin/process_state.h"
-#include "plugin/velmora_lib.h"
+#include "effects/process_state.h"
+#include "library/velmora_lib.h"
 
 namespace velmora {
 namespace {

@@ -1,4 +1,4 @@
-#include "plugin/master_settings.h"
+#include "effects/master_settings.h"
 
 #include <memory>
 #include <new>

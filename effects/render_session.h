@@ -3,8 +3,8 @@
 // links the core makes one for each of its threads.
 #pragma once
 
-#include "plugin/host_api.h"
-#include "plugin/master_settings.h"
+#include "api/host_api.h"
+#include "effects/master_settings.h"
 #include "render/render_state.h"
 #include "render/renderer.h"
 

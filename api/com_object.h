@@ -5,7 +5,7 @@
 #include <cstdint>
 #include <cstring>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora {
 

@@ -1,4 +1,4 @@
-#include "plugin/params.h"
+#include "effects/params.h"
 
 #include <cstring>
 

@@ -1,6 +1,6 @@
 // How the master settings' values become what the stages are to do.
 
-#include "plugin/master_settings.h"
+#include "effects/master_settings.h"
 #include "render/rounding.h"
 
 namespace velmora {

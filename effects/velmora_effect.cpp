@@ -1,9 +1,9 @@
-#include "plugin/velmora_effect.h"
+#include "effects/velmora_effect.h"
 
 #include <new>
 
 #include "platform/float_guard.h"
-#include "plugin/process_state.h"
+#include "effects/process_state.h"
 
 namespace velmora {
 
