@@ -1,0 +1,1 @@
+../api/host_api.h
