@@ -9,7 +9,7 @@
 #include "library/module.h"
 #include "effects/velmora_effect.h"
 #include "presets/preset_saver.h"
-#include "support/shell_services.h"
+#include "desktop/shell_services.h"
 
 namespace velmora {
 namespace {

@@ -3,7 +3,7 @@
 
 #include "api/com_object.h"
 #include "api/host_api.h"
-#include "support/translation.h"
+#include "language/translation.h"
 
 namespace velmora {
 

@@ -2,8 +2,8 @@
 #include <filesystem>
 
 #include "desktop_fixture.h"
-#include "support/bit_button.h"
-#include "support/resource_ids.h"
+#include "desktop/bit_button.h"
+#include "desktop/resource_ids.h"
 
 namespace velmora::support::test {
 namespace {

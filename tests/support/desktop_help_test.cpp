@@ -3,7 +3,7 @@
 
 #include "desktop_fixture.h"
 #include "help_control_standin.h"
-#include "support/resource_ids.h"
+#include "desktop/resource_ids.h"
 
 namespace velmora::support::test {
 namespace {

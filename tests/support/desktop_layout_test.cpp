@@ -8,9 +8,9 @@
 
 #include "desktop_fixture.h"
 #include "language/lang_parser.h"
-#include "support/bit_button.h"
-#include "support/options_dialog.h"
-#include "support/resource_ids.h"
+#include "desktop/bit_button.h"
+#include "desktop/options_dialog.h"
+#include "desktop/resource_ids.h"
 
 namespace velmora::support::test {
 namespace {

@@ -3,8 +3,8 @@
 #include <psapi.h>
 
 #include "desktop_fixture.h"
-#include "support/bit_button.h"
-#include "support/resource_ids.h"
+#include "desktop/bit_button.h"
+#include "desktop/resource_ids.h"
 
 namespace velmora::support::test {
 namespace {

@@ -3,8 +3,8 @@
 
 #include <functional>
 
-#include "support/bit_button_state.h"
-#include "support/text_sources.h"
+#include "desktop/bit_button_state.h"
+#include "desktop/text_sources.h"
 
 namespace velmora::support {
 namespace {

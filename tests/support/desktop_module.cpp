@@ -3,7 +3,7 @@
 #include <windows.h>
 
 #include "platform/module_detach.h"
-#include "support/shell_services.h"
+#include "desktop/shell_services.h"
 
 namespace {
 HINSTANCE ownModule = nullptr;

@@ -1,6 +1,6 @@
 // The preference in the registry, read at start and written by the dialog.
 #include "desktop_fixture.h"
-#include "support/resource_ids.h"
+#include "desktop/resource_ids.h"
 
 namespace velmora::support::test {
 namespace {

@@ -6,7 +6,7 @@
 
 #include "text/code_page.h"
 #include "text/strings.h"
-#include "support/translation.h"
+#include "language/translation.h"
 #include "tests/presets/fake_library.h"
 #ifdef _WIN32
 #include <windows.h>

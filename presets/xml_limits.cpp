@@ -1,4 +1,4 @@
-#include "support/xml_limits.h"
+#include "presets/xml_limits.h"
 
 #include <cstring>
 

@@ -1,4 +1,4 @@
-#include "support/options_dialog.h"
+#include "desktop/options_dialog.h"
 
 #include <shellapi.h>
 #include <windowsx.h>
@@ -7,9 +7,9 @@
 #include <cstdio>
 
 #include "help/topics.h"
-#include "support/bit_button.h"
-#include "support/product.h"
-#include "support/resource_ids.h"
+#include "desktop/bit_button.h"
+#include "desktop/product.h"
+#include "desktop/resource_ids.h"
 #include "platform/win32_handles.h"
 #include "text/win32_text.h"
 

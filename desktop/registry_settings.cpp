@@ -1,4 +1,4 @@
-#include "support/registry_settings.h"
+#include "desktop/registry_settings.h"
 
 #include <windows.h>
 

@@ -4,7 +4,7 @@
 
 #include <windows.h>
 
-#include "support/bit_button_state.h"
+#include "desktop/bit_button_state.h"
 
 namespace velmora::support {
 

@@ -1,4 +1,4 @@
-#include "support/help_launcher.h"
+#include "desktop/help_launcher.h"
 
 #include <windows.h>
 #include <shellapi.h>

@@ -1,4 +1,4 @@
-#include "support/bit_button_state.h"
+#include "desktop/bit_button_state.h"
 
 namespace velmora::support {
 

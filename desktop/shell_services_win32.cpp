@@ -4,13 +4,13 @@
 #include <new>
 
 #include "platform/float_guard.h"
-#include "support/bit_button.h"
-#include "support/help_launcher.h"
-#include "support/options_dialog.h"
-#include "support/preferences.h"
-#include "support/resource_ids.h"
-#include "support/shell_services.h"
-#include "support/text_sources.h"
+#include "desktop/bit_button.h"
+#include "desktop/help_launcher.h"
+#include "desktop/options_dialog.h"
+#include "desktop/preferences.h"
+#include "desktop/resource_ids.h"
+#include "desktop/shell_services.h"
+#include "desktop/text_sources.h"
 #include "platform/win32_handles.h"
 #include "text/win32_text.h"
 

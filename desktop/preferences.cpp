@@ -1,6 +1,6 @@
-#include "support/preferences.h"
+#include "desktop/preferences.h"
 
-#include "support/registry_settings.h"
+#include "desktop/registry_settings.h"
 
 namespace velmora::support {
 namespace {

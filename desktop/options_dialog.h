@@ -4,9 +4,9 @@
 
 #include <windows.h>
 
-#include "support/help_launcher.h"
-#include "support/preferences.h"
-#include "support/translation.h"
+#include "desktop/help_launcher.h"
+#include "desktop/preferences.h"
+#include "language/translation.h"
 
 namespace velmora::support {
 

@@ -1,4 +1,4 @@
-#include "support/translation.h"
+#include "language/translation.h"
 
 #include <algorithm>
 #include <cstring>

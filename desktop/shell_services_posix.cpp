@@ -1,6 +1,6 @@
 // Without a Windows desktop there are no dialogs and no help control: the services only keep their promises.
-#include "support/shell_services.h"
-#include "support/text_sources.h"
+#include "desktop/shell_services.h"
+#include "desktop/text_sources.h"
 
 namespace velmora::support {
 namespace {

@@ -1,4 +1,4 @@
-#include "support/bit_button.h"
+#include "desktop/bit_button.h"
 
 #include <windowsx.h>
 
