@@ -1,4 +1,4 @@
-#include "hosts/reelfx/frame_pipeline.h"
+#include "programs/reelfx/pipeline/frame_pipeline.h"
 
 #include <gtest/gtest.h>
 
@@ -6,8 +6,8 @@
 #include <chrono>
 #include <stdexcept>
 
-#include "hosts/reelfx/picture_turn.h"
-#include "hosts/reelfx/progress.h"
+#include "programs/reelfx/media/picture_turn.h"
+#include "programs/reelfx/common/progress.h"
 
 namespace velmora::hosts {
 namespace {

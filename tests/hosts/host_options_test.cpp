@@ -5,9 +5,9 @@
 #include <string>
 #include <vector>
 
-#include "hosts/common/usage_error.h"
-#include "hosts/reelhost/frame_stream.h"
-#include "hosts/reelhost/host_options.h"
+#include "programs/common/usage_error.h"
+#include "programs/reelhost/frame_stream.h"
+#include "programs/reelhost/host_options.h"
 
 namespace velmora::hosts {
 namespace {

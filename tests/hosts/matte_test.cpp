@@ -1,4 +1,4 @@
-#include "hosts/reelfx/matte.h"
+#include "programs/reelfx/pictures/matte.h"
 
 #include <gtest/gtest.h>
 

@@ -1,11 +1,11 @@
-#include "hosts/common/settings.h"
+#include "programs/common/settings.h"
 
 #include <gtest/gtest.h>
 
 #include <cstring>
 
-#include "hosts/common/digest.h"
-#include "hosts/common/usage_error.h"
+#include "programs/common/digest.h"
+#include "programs/common/usage_error.h"
 
 namespace velmora::hosts {
 namespace {

@@ -1,10 +1,10 @@
-#include "hosts/common/y4m.h"
+#include "programs/common/y4m.h"
 
 #include <gtest/gtest.h>
 
 #include <vector>
 
-#include "hosts/common/usage_error.h"
+#include "programs/common/usage_error.h"
 
 namespace velmora::hosts {
 namespace {

@@ -11,10 +11,10 @@
 #include <vector>
 
 #include "effects/effect_session.h"
-#include "hosts/frei0r/frame_clock.h"
-#include "hosts/frei0r/host_time_unit.h"
-#include "hosts/frei0r/instance.h"
-#include "hosts/frei0r/plugin_params.h"
+#include "faces/frei0r/frame_clock.h"
+#include "faces/frei0r/host_time_unit.h"
+#include "faces/frei0r/instance.h"
+#include "faces/frei0r/plugin_params.h"
 
 namespace velmora::hosts::frei0r {
 namespace {

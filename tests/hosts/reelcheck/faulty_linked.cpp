@@ -1,6 +1,6 @@
 // Natively the faulty library takes the place of the linked one.
 
-#include "hosts/reelcheck/library.h"
+#include "programs/reelcheck/library.h"
 #include "tests/hosts/reelcheck/faulty_library.h"
 
 extern "C" {
