@@ -2,7 +2,7 @@
 
 #include <windows.h>
 
-#include "tests/hosts/reelcheck/faulty_library.h"
+#include "tests/programs/reelcheck/faulty_library.h"
 
 namespace {
 

@@ -4,14 +4,16 @@ import os
 import shutil
 import socket
 import subprocess
+import sys
 import tempfile
 import time
 import unittest
 from pathlib import Path
 
-from clip import CLIP, Clips, REELFX, ffmpeg, frame_digests, frame_times, reelfx, run
+sys.path.insert(0, str(Path(__file__).resolve().parents[2] / "common"))
+from clip import CLIP, Clips, REELFX, ffmpeg, frame_digests, frame_times, reelfx, run  # noqa: E402
 
-SCRIPTS = Path(__file__).resolve().parents[2] / "scripts"
+SCRIPTS = Path(__file__).resolve().parents[3] / "scripts"
 OPTIONS = ("-e", "Film Pro", "-p", "Super 8", "--seed", "7")
 LOSSLESS = (*OPTIONS, "--codec", "ffv1")
 

@@ -17,7 +17,8 @@ import time
 import unittest
 from pathlib import Path
 
-from clip import CLIP, Clips, REELFX, ffmpeg, frame_digests, reelfx, run
+sys.path.insert(0, str(Path(__file__).resolve().parents[2] / "common"))
+from clip import CLIP, Clips, REELFX, ffmpeg, frame_digests, reelfx, run  # noqa: E402
 
 DAMAGE = ("--effect", "Film Pro", "--preset", "Super 8")
 OPTIONS = argparse.Namespace(rounds=5, seed=None)

@@ -32,7 +32,7 @@ TEST(Platform, LoadsModulesByAnyName) {
 
 TEST(Platform, KnowsTheProgramsFolder) {
     const std::filesystem::path folder(ModuleFolder(nullptr));
-    EXPECT_TRUE(std::filesystem::exists(folder / "support_text_test")) << folder;
+    EXPECT_TRUE(std::filesystem::exists(folder / "platform_test")) << folder;
     EXPECT_EQ(ModuleFolder(nullptr).back(), u'/');
 }
 

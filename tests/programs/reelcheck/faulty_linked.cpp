@@ -1,7 +1,7 @@
 // Natively the faulty library takes the place of the linked one.
 
 #include "programs/reelcheck/library.h"
-#include "tests/hosts/reelcheck/faulty_library.h"
+#include "tests/programs/reelcheck/faulty_library.h"
 
 extern "C" {
 velmora::IEffectLibrary* GetEffectsLibrary();

@@ -1,4 +1,4 @@
-#include "tests/hosts/reelcheck/faulty_library.h"
+#include "tests/programs/reelcheck/faulty_library.h"
 
 #include <xmmintrin.h>
 

@@ -10,7 +10,8 @@ import tempfile
 from concurrent.futures import ThreadPoolExecutor
 from pathlib import Path
 
-from clip import CLIP, REELFX, ffmpeg, reelfx, run
+sys.path.insert(0, str(Path(__file__).resolve().parents[2] / "common"))
+from clip import CLIP, REELFX, ffmpeg, reelfx, run  # noqa: E402
 
 FRAMES = 20
 SIZE = "160x90"

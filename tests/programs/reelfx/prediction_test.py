@@ -8,13 +8,15 @@ code. Narrowing to single precision is done through packed bytes.
 import math
 import random
 import struct
+import sys
 import tempfile
 import unittest
 from pathlib import Path
 
-from clip import reelfx
+sys.path.insert(0, str(Path(__file__).resolve().parents[2] / "common"))
+from clip import reelfx  # noqa: E402
 
-PICTURES = Path(__file__).resolve().parents[2] / "render" / "pictures"
+PICTURES = Path(__file__).resolve().parents[3] / "render" / "pictures"
 WIDTH, HEIGHT, FRAMES = 133, 61, 7
 STATE = 0x12345678
 

@@ -6,10 +6,13 @@ import re
 import resource
 import signal
 import subprocess
+import sys
 import time
 import unittest
+from pathlib import Path
 
-from clip import CLIP, Clips, REELFX, ffmpeg, frame_digests, frame_times, luma_psnr, probe, reelfx, run
+sys.path.insert(0, str(Path(__file__).resolve().parents[2] / "common"))
+from clip import CLIP, Clips, REELFX, ffmpeg, frame_digests, frame_times, luma_psnr, probe, reelfx, run  # noqa: E402
 
 CAMERA = ("--effect", "Film Camera")
 TRAIN = (*CAMERA, "--preset", "Train Ride")

@@ -14,12 +14,12 @@ import tempfile
 import unittest
 from pathlib import Path
 
-sys.path.insert(0, str(Path(__file__).parent.parent))
+sys.path.insert(0, str(Path(__file__).resolve().parents[2] / "common"))
 from clip import CLIP, ffmpeg, reelfx, run_host  # noqa: E402
 
 ROOT = Path(__file__).parents[3]
 TABLE_FILE = ROOT / "docs" / "hosts.md"
-TABLE_BEGIN, TABLE_END = "<!-- table: tests/hosts/frei0r -->\n", "<!-- end of table -->\n"
+TABLE_BEGIN, TABLE_END = "<!-- table: tests/faces/frei0r -->\n", "<!-- end of table -->\n"
 
 # Debian 12's FFmpeg pads rows to 64 bytes and does not tell plug-ins; of 320 pixels nothing is padded.
 WIDTH, HEIGHT, FRAMES, SEED = 320, 180, 20, 7
