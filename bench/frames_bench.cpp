@@ -8,10 +8,10 @@
 #include <cstdio>
 #include <string>
 
-#include "bench/bench_cases.h"
-#include "bench/frame_pool.h"
+#include "programs/common/bench_cases.h"
+#include "programs/common/frame_pool.h"
 #include "bench/session_of.h"
-#include "plugin/frame_processor.h"
+#include "library/frame_processor.h"
 
 namespace velmora::bench {
 namespace {

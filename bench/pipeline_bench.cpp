@@ -7,9 +7,9 @@
 #include <stdexcept>
 #include <vector>
 
-#include "bench/frame_pool.h"
+#include "programs/common/frame_pool.h"
 #include "bench/session_of.h"
-#include "hosts/reelfx/frame_pipeline.h"
+#include "programs/reelfx/pipeline/frame_pipeline.h"
 
 namespace velmora::bench {
 namespace {

@@ -3,7 +3,7 @@
 
 #include <memory>
 
-#include "bench/bench_cases.h"
+#include "programs/common/bench_cases.h"
 #include "effects/effect_session.h"
 
 namespace velmora::bench {

@@ -1,7 +1,7 @@
 #include "effects/effect_queries.h"
 
-#include "plugin/float_guard.h"
-#include "plugin/params.h"
+#include "platform/float_guard.h"
+#include "effects/params.h"
 #include "render/rounding.h"
 
 namespace velmora::effects {

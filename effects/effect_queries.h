@@ -4,7 +4,7 @@
 #include <cstdint>
 
 #include "effects/effect_table.h"
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::effects {
 

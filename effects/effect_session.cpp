@@ -4,8 +4,8 @@
 #include <span>
 
 #include "effects/effect_queries.h"
-#include "plugin/float_guard.h"
-#include "plugin/render_session.h"
+#include "platform/float_guard.h"
+#include "effects/render_session.h"
 #include "render/renderer.h"
 #include "render/rounding.h"
 

@@ -7,9 +7,9 @@
 #include <memory>
 
 #include "effects/effect_table.h"
-#include "plugin/host_api.h"
-#include "plugin/master_settings.h"
-#include "plugin/render_options.h"
+#include "api/host_api.h"
+#include "effects/master_settings.h"
+#include "effects/render_options.h"
 #include "render/render_state.h"
 
 namespace velmora::effects {

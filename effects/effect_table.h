@@ -6,7 +6,7 @@
 #include <cstdint>
 #include <span>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora::effects {
 

@@ -3,7 +3,7 @@
 #include <new>
 
 #include "effects/effect_queries.h"
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 
 namespace velmora::effects {
 

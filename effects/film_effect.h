@@ -6,9 +6,9 @@
 #pragma once
 
 #include "effects/effect_table.h"
-#include "plugin/com_object.h"
-#include "plugin/host_api.h"
-#include "plugin/velmora_effect.h"
+#include "api/com_object.h"
+#include "api/host_api.h"
+#include "effects/velmora_effect.h"
 
 namespace velmora::effects {
 

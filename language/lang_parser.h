@@ -1,10 +1,10 @@
 // The binary boundary of VMLang.dll, the module that translates the texts shown to the user. It is used by
-// the library (which loads the module) and by the module; the rules of plugin/host_api.h hold here too.
+// the library (which loads the module) and by the module; the rules of api/host_api.h hold here too.
 #pragma once
 
 #include <cstdint>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora {
 
@@ -48,6 +48,6 @@ class LangXMLParser : public IUnknown {
 // "GetLangXMLParser": a new parser without texts, with one reference that belongs to the caller; null when
 // memory is short.
 using GetLangXMLParserFunction = LangXMLParser*(VM_CALL*)();
-// "CanUnloadDLLNow" (CanUnloadDLLNowFunction in plugin/host_api.h): true when no parser is alive.
+// "CanUnloadDLLNow" (CanUnloadDLLNowFunction in api/host_api.h): true when no parser is alive.
 
 }  // namespace velmora

@@ -10,7 +10,7 @@
 #include <tinyxml.h>
 
 #include "language/markup_check.h"
-#include "language/utf.h"
+#include "text/utf.h"
 
 namespace velmora::language {
 namespace {

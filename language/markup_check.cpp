@@ -7,7 +7,7 @@
 #include <cstdint>
 #include <system_error>
 
-#include "language/utf.h"
+#include "text/utf.h"
 
 namespace velmora::language {
 namespace {

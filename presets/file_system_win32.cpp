@@ -7,7 +7,7 @@
 
 #include <cstring>
 
-#include "support/code_page.h"
+#include "text/code_page.h"
 
 namespace velmora {
 

@@ -23,7 +23,7 @@
 
 #include <cstddef>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 namespace velmora {
 
@@ -40,7 +40,7 @@ inline constexpr std::size_t kPresetFileLimit = 16u << 20;  // bytes; a longer f
 // 0, elements behind the hundredth are dropped, names are cut at 259 bytes, and a number that is infinite or
 // not a number is read as such.
 // After a failure the record is untouched, or, when the file has a "Preset" without values, holds its names
-// and a count of 0. A file over the limits of size, depth, attributes and nodes (support/xml_limits.h) is a
+// and a count of 0. A file over the limits of size, depth, attributes and nodes (presets/xml_limits.h) is a
 // failure, as is a null record.
 [[nodiscard]] bool ReadPreset(const char* fileName, PresetRecord* record) noexcept;
 

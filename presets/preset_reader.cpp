@@ -6,9 +6,9 @@
 #include <string>
 
 #include "presets/file_access.h"
-#include "presets/number_text.h"
+#include "text/c_locale_numbers.h"
 #include "presets/preset_file.h"
-#include "support/xml_limits.h"
+#include "presets/xml_limits.h"
 
 namespace velmora {
 

@@ -5,13 +5,13 @@
 #include <new>
 #include <string_view>
 
-#include "plugin/float_guard.h"
+#include "platform/float_guard.h"
 #include "presets/compatibility.h"
 #include "presets/dialogs.h"
 #include "presets/preset_file.h"
 #include "presets/preset_names.h"
-#include "support/code_page.h"
-#include "support/strings.h"
+#include "text/code_page.h"
+#include "text/strings.h"
 
 namespace velmora {
 

@@ -1,9 +1,9 @@
 // The object through which a host lets the user save an effect's settings and load them back.
 #pragma once
 
-#include "plugin/com_object.h"
-#include "plugin/host_api.h"
-#include "support/translation.h"
+#include "api/com_object.h"
+#include "api/host_api.h"
+#include "language/translation.h"
 
 namespace velmora {
 

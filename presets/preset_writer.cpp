@@ -6,7 +6,7 @@
 #include <string>
 
 #include "presets/file_access.h"
-#include "presets/number_text.h"
+#include "text/c_locale_numbers.h"
 #include "presets/preset_file.h"
 
 namespace velmora {

@@ -5,8 +5,8 @@
 #include <map>
 #include <vector>
 
-#include "plugin/com_object.h"
-#include "plugin/host_api.h"
+#include "api/com_object.h"
+#include "api/host_api.h"
 
 namespace velmora::testing {
 

@@ -6,7 +6,7 @@
 #include <random>
 #include <vector>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 #include "render/image.h"
 
 namespace velmora::testing {

@@ -2,7 +2,7 @@
 // in.
 #pragma once
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 
 #if defined(_WIN32)
 #include <windows.h>

@@ -12,7 +12,7 @@
 #include <vector>
 
 #include "effects/film_effect.h"
-#include "plugin/process_state.h"
+#include "effects/process_state.h"
 #include "tests/effects/test_hosts.h"
 
 namespace velmora::tests {

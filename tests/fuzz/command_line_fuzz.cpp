@@ -8,9 +8,9 @@
 #include <variant>
 #include <vector>
 
-#include "hosts/common/usage_error.h"
-#include "hosts/reelfx/command_line.h"
-#include "hosts/reelhost/host_options.h"
+#include "programs/common/usage_error.h"
+#include "programs/reelfx/commands/command_line.h"
+#include "programs/reelhost/host_options.h"
 #include "tests/fuzz/fuzz_input.h"
 
 namespace {

@@ -9,8 +9,8 @@
 #include <memory>
 #include <optional>
 
-#include "plugin/process_state.h"
-#include "plugin/render_session.h"
+#include "effects/process_state.h"
+#include "effects/render_session.h"
 #include "render/ycbcr.h"
 #include "tests/common/library_under_test.h"
 #include "tests/fuzz/fuzz_input.h"

@@ -6,7 +6,7 @@
 #include <cstdint>
 #include <vector>
 
-#include "plugin/host_api.h"
+#include "api/host_api.h"
 #include "tests/fuzz/fuzz_input.h"
 
 namespace velmora::fuzz {

@@ -9,7 +9,7 @@
 
 #include "language/copy_text.h"
 #include "language/language_table.h"
-#include "language/utf.h"
+#include "text/utf.h"
 
 namespace {
 

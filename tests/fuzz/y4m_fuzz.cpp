@@ -13,11 +13,11 @@
 #include <string_view>
 #include <vector>
 
-#include "hosts/common/usage_error.h"
-#include "hosts/common/y4m.h"
-#include "hosts/reelfx/failure.h"
-#include "hosts/reelfx/media_reader.h"
-#include "hosts/reelhost/frame_stream.h"
+#include "programs/common/usage_error.h"
+#include "programs/common/y4m.h"
+#include "programs/reelfx/common/failure.h"
+#include "programs/reelfx/media/media_reader.h"
+#include "programs/reelhost/frame_stream.h"
 #include "tests/fuzz/fuzz_input.h"
 
 extern "C" {

@@ -6,8 +6,8 @@
 #include <string>
 
 #include "effects/film_effect.h"
-#include "plugin/com_object.h"
-#include "plugin/host_api.h"
+#include "api/com_object.h"
+#include "api/host_api.h"
 
 namespace velmora::tests {
 

@@ -1,0 +1,50 @@
+// What every reference-counted object of the library does alike.
+#pragma once
+
+#include <atomic>
+#include <cstdint>
+#include <cstring>
+
+#include "api/host_api.h"
+
+namespace velmora {
+
+[[nodiscard]] inline bool SameId(const Guid* a, const Guid& b) noexcept {
+    return a != nullptr && std::memcmp(a, &b, sizeof(Guid)) == 0;
+}
+
+// One identifier that an object answers to, with the face that belongs to it.
+struct Face {
+    const Guid* iid;
+    void* pointer;
+};
+
+// The first face whose identifier matches; null when none does.
+template <std::size_t kCount>
+[[nodiscard]] void* FaceOf(const Face (&faces)[kCount], const Guid* iid) noexcept {
+    for (const Face& face : faces) {
+        if (SameId(iid, *face.iid)) return face.pointer;
+    }
+    return nullptr;
+}
+
+// Stores that face, or null. Does not count: the caller adds the reference when the result is kStatusOk.
+template <std::size_t kCount>
+[[nodiscard]] Status FindFace(const Face (&faces)[kCount], const Guid* iid, void** out) noexcept {
+    if (out == nullptr) return kStatusFailure;
+    *out = FaceOf(faces, iid);
+    return *out != nullptr ? kStatusOk : kStatusNoInterface;
+}
+
+// A count that starts with the creator's reference.
+class ReferenceCount {
+  public:
+    std::uint32_t Add() noexcept { return static_cast<std::uint32_t>(m_count.fetch_add(1) + 1); }
+    // The count left; at 0 the caller destroys the object.
+    std::uint32_t Drop() noexcept { return static_cast<std::uint32_t>(m_count.fetch_sub(1) - 1); }
+
+  private:
+    std::atomic<std::int32_t> m_count{1};
+};
+
+}  // namespace velmora

@@ -1,0 +1,366 @@
+// The one header a host needs to use "Velmora Reel Effects".
+//
+// A host loads VMReelEffects.dll, looks up the two exports named at the end of this header, calls
+// GetEffectsLibrary and works through the interfaces below. The header needs nothing but <cstdint>.
+//
+// Binary contract, on 32-bit Windows: little-endian; every operation is __stdcall with the object
+// pointer as first stack argument; the operations of an interface lie in its table in the order of their
+// declaration; booleans are one byte (read the low byte of the result); no exception leaves an operation.
+// A host may call with a stack aligned to 4 bytes only. The floating-point state of the calling thread is
+// after every call what it was before it.
+//
+// Ownership: whoever gets a pointer to a reference-counted interface owns one reference and gives it back
+// with Release. Texts are zero-terminated and stay owned by the library, for as long as it is loaded.
+//
+// Threads: AddRef and Release may be called on any thread. Everything else runs on the thread that calls it
+// without a lock, and the rendering state is shared by the whole process: render one frame at a time.
+// Dialogs, presets, texts and help belong to the user-interface thread.
+#pragma once
+
+#include <cstdint>
+
+#if defined(_WIN32) && (defined(__i386__) || defined(_M_IX86))
+#define VM_CALL __stdcall
+#else
+#define VM_CALL
+#endif
+
+// The compiler's own form of offsetof, which would need another header.
+#define VM_OFFSET(record, field) __builtin_offsetof(record, field)
+
+namespace velmora {
+
+// ---------------------------------------------------------------------------------------------------------
+// Identifiers and results
+
+// 16 bytes, compared as raw bytes.
+struct Guid {
+    std::uint32_t data1;
+    std::uint16_t data2;
+    std::uint16_t data3;
+    std::uint8_t data4[8];
+};
+static_assert(sizeof(Guid) == 16);
+
+using Status = std::int32_t;
+inline constexpr Status kStatusOk = 0;
+inline constexpr Status kStatusNoInterface = static_cast<Status>(0x80004002u);
+inline constexpr Status kStatusFailure = static_cast<Status>(0x80004005u);
+
+inline constexpr Guid kIidUnknown = {
+    0x00000000, 0x0000, 0x0000, {0xC0, 0x00, 0x00, 0x00, 0x00, 0x00, 0x00, 0x46}};
+inline constexpr Guid kIidEffectLibrary = {
+    0x9B8D0B5F, 0x065A, 0x46B1, {0x88, 0x9C, 0xF0, 0x57, 0x93, 0x4C, 0xE8, 0xA4}};
+inline constexpr Guid kIidMultiLingual = {
+    0xF6E85D4E, 0xDC38, 0x476C, {0xAC, 0x59, 0xEB, 0x50, 0x0B, 0xA9, 0x3C, 0xDC}};
+inline constexpr Guid kIidVideoEffect = {
+    0x0BCF7FCD, 0x6BE5, 0x4A40, {0x9A, 0x49, 0xA6, 0x8D, 0x6B, 0xF6, 0x60, 0x26}};
+inline constexpr Guid kIidVideoHost = {
+    0x4ABCB36F, 0x7FDC, 0x43E6, {0xB4, 0x5D, 0xFA, 0xD4, 0xD7, 0xAA, 0x80, 0xDD}};
+inline constexpr Guid kIidPresetSaver = {
+    0x44CD1462, 0x6E3D, 0x438E, {0x9B, 0x72, 0x8C, 0x53, 0x3A, 0xA8, 0xFD, 0x8C}};
+
+// ---------------------------------------------------------------------------------------------------------
+// Records
+
+// One 32-bit word that holds a value in the form of its kind.
+union ValueWord {
+    float number;          // slider: normalised to 0..1
+    std::uint32_t colour;  // colour: 0x00BBGGRR, red in the lowest byte
+    std::uint32_t count;   // menu: number of items
+    std::int32_t item;     // menu: item index, from 0
+    std::uint8_t flag;     // check box: 0 or 1; group marker: 0 begin, 1 end. The other bytes do not count
+    std::uint32_t bits;
+};
+static_assert(sizeof(ValueWord) == 4);
+
+enum ParamKind : std::uint32_t {
+    kKindNone = 0,
+    kKindMenu = 1,
+    kKindSlider = 2,
+    kKindColour = 3,
+    kKindCheckBox = 4,
+    kKindGroup = 5,  // a marker that holds no value: a frame drawn round the parameters between two of them
+};
+
+inline constexpr std::int32_t kMenuItemCapacity = 10;
+inline constexpr std::int32_t kMenuTextWidth = 20;
+inline constexpr std::int32_t kParamNameWidth = 40;
+
+// What parameter k of an effect is. An effect writes only the fields of the parameter's kind and leaves the
+// others as the caller passed them. A text that fills its whole field is not terminated inside it.
+struct ParamDescriptor {
+    ValueWord defaultValue;
+    std::uint32_t second;  // not written
+    std::uint32_t kind;    // ParamKind
+    ValueWord minimum;     // slider: lowest shown value; menu: item count; group: flag 0 begin, 1 end
+    union {
+        struct {
+            ValueWord maximum;  // highest shown value: the host shows minimum + value * (maximum - minimum)
+            std::uint32_t afterMaximum;
+        } slider;
+        char itemTexts[kMenuItemCapacity][kMenuTextWidth];
+    };
+    char name[kParamNameWidth];
+    std::int32_t x, y, width, height;  // layout, in the host's dialog units
+    std::uint32_t visible;
+};
+static_assert(sizeof(ParamDescriptor) == 276);
+static_assert(VM_OFFSET(ParamDescriptor, defaultValue) == 0);
+static_assert(VM_OFFSET(ParamDescriptor, second) == 4);
+static_assert(VM_OFFSET(ParamDescriptor, kind) == 8);
+static_assert(VM_OFFSET(ParamDescriptor, minimum) == 12);
+static_assert(VM_OFFSET(ParamDescriptor, slider) == 16);
+static_assert(VM_OFFSET(ParamDescriptor, itemTexts) == 16);
+static_assert(VM_OFFSET(ParamDescriptor, name) == 216);
+static_assert(VM_OFFSET(ParamDescriptor, x) == 256);
+static_assert(VM_OFFSET(ParamDescriptor, y) == 260);
+static_assert(VM_OFFSET(ParamDescriptor, width) == 264);
+static_assert(VM_OFFSET(ParamDescriptor, height) == 268);
+static_assert(VM_OFFSET(ParamDescriptor, visible) == 272);
+
+// A parameter's value as it is exchanged while rendering and in presets that a user saves.
+struct ValueCell {
+    ValueWord value;
+    std::uint32_t second;
+    std::uint32_t kind;  // ParamKind
+};
+static_assert(sizeof(ValueCell) == 12);
+static_assert(VM_OFFSET(ValueCell, value) == 0);
+static_assert(VM_OFFSET(ValueCell, second) == 4);
+static_assert(VM_OFFSET(ValueCell, kind) == 8);
+
+// A parameter's value in a built-in preset. The second word is 0.
+struct PresetCell {
+    ValueWord value;
+    std::uint32_t second;
+};
+static_assert(sizeof(PresetCell) == 8);
+static_assert(VM_OFFSET(PresetCell, second) == 4);
+
+// A picture in the host's memory: 32-bit pixels, bytes blue, green, red, alpha. The processed region is
+// width x height pixels with its left top corner at (xOrigin, yOrigin) of the buffer; the buffer is
+// xOrigin + width pixels wide and yOrigin + height rows high.
+struct FrameRecord {
+    void* pixels;            // first byte of the first stored row
+    std::int32_t width;      // of the region, in pixels, at least 1
+    std::int32_t height;     // of the region, in rows, at least 1
+    std::int32_t rowStep;    // bytes from one row to the next; negative: the buffer is stored bottom-up
+    std::uint32_t reserved;  // not read
+    std::int32_t xOrigin;    // at least 0
+    std::int32_t yOrigin;    // at least 0
+};
+#if defined(_WIN32) && (defined(__i386__) || defined(_M_IX86))
+static_assert(sizeof(FrameRecord) == 28);
+static_assert(VM_OFFSET(FrameRecord, width) == 4);
+static_assert(VM_OFFSET(FrameRecord, height) == 8);
+static_assert(VM_OFFSET(FrameRecord, rowStep) == 12);
+static_assert(VM_OFFSET(FrameRecord, reserved) == 16);
+static_assert(VM_OFFSET(FrameRecord, xOrigin) == 20);
+static_assert(VM_OFFSET(FrameRecord, yOrigin) == 24);
+#endif
+
+// The host's timing of a frame. Only the frame time is read.
+struct TimingRecord {
+    double first;
+    double second;
+    double frameTime;  // seconds from the start of the clip; not a number counts as 0
+};
+static_assert(sizeof(TimingRecord) == 24);
+static_assert(VM_OFFSET(TimingRecord, frameTime) == 16);
+
+inline constexpr std::int32_t kPresetNameWidth = 260;
+inline constexpr std::int32_t kPresetCellCapacity = 100;
+
+// The settings of an effect, as they are saved to and loaded from a preset file. Names are 8-bit text in
+// the system code page, zero-terminated.
+struct PresetRecord {
+    char name[kPresetNameWidth];
+    char libraryName[kPresetNameWidth];
+    char effectName[kPresetNameWidth];
+    ValueCell values[kPresetCellCapacity];  // in the effect's parameter order
+    std::int32_t count;                     // cells in use, 0..100
+};
+static_assert(sizeof(PresetRecord) == 1984);
+static_assert(VM_OFFSET(PresetRecord, libraryName) == 260);
+static_assert(VM_OFFSET(PresetRecord, effectName) == 520);
+static_assert(VM_OFFSET(PresetRecord, values) == 780);
+static_assert(VM_OFFSET(PresetRecord, count) == 1980);
+
+// ---------------------------------------------------------------------------------------------------------
+// Interfaces. None has a destructor in its table: compilers lay destructors out differently. The protected
+// ones below only keep a host from deleting what it has to release.
+
+class IUnknown {
+  public:
+    // Finds the face of this object that `iid` names. Stores it in *out with one more reference and returns
+    // kStatusOk; otherwise stores null and returns kStatusNoInterface. A null `out` is kStatusFailure.
+    virtual Status VM_CALL QueryInterface(const Guid* iid, void** out) = 0;
+    // Returns the new count.
+    virtual std::uint32_t VM_CALL AddRef() = 0;
+    // Returns the count left; at 0 the object is gone.
+    virtual std::uint32_t VM_CALL Release() = 0;
+
+  protected:
+    ~IUnknown() = default;
+};
+
+// What an effect asks the host while it renders. Implemented by the host; not kept beyond Process but for
+// the identifiers that the effect itself does not know (see IVideoEffect::QueryInterface).
+class IVideoHost : public IUnknown {
+  public:
+    // Writes the value of the effect's parameter `index` into cell->value, in the form of `kind`
+    // (ParamKind), and `kind` into cell->kind. Returns true when there is such a parameter; on false the
+    // value reads as whatever the cell holds (0 when untouched).
+    virtual bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) = 0;
+    // The next four are not called while rendering. An effect's own host face forwards the first two to the
+    // attached host, answers false to the third and does nothing in the fourth.
+    virtual bool VM_CALL HostOperation4(std::intptr_t a, std::intptr_t b, std::intptr_t c) = 0;
+    virtual std::uint32_t VM_CALL HostOperation5(std::intptr_t a, std::intptr_t b) = 0;
+    virtual bool VM_CALL HostOperation6(std::intptr_t a, std::intptr_t b) = 0;
+    virtual void VM_CALL HostOperation7(std::intptr_t a, std::intptr_t b) = 0;
+
+  protected:
+    ~IVideoHost() = default;
+};
+
+// One effect. QueryInterface answers to IUnknown, IVideoEffect and IVideoHost; other identifiers are passed
+// on to the host of the last Process call, so that host must stay alive as long as it is asked.
+class IVideoEffect : public IUnknown {
+  public:
+    // The name shown to the user, for example "Film Look".
+    virtual const char* VM_CALL GetName() = 0;
+    // Always 1.
+    virtual std::int32_t VM_CALL GetKind() = 0;
+    // Fills the descriptor of parameter `index`, from 0; false past the last one (nothing is written).
+    virtual bool VM_CALL GetParamInfo(std::uint32_t index, ParamDescriptor* descriptor) = 0;
+    // Renders one frame: reads the parameters from `host` (null: every value reads as 0), processes the
+    // smaller of the two regions of `source` and writes it to `destination`. Nothing outside that rectangle
+    // of the destination is written, the source never; both may be the same memory. `hostArgument` is not
+    // read. False when either frame or `timing` is missing or a frame is invalid: nothing is written then.
+    virtual bool VM_CALL Process(IVideoHost* host, const FrameRecord* source, void* hostArgument,
+                                 const FrameRecord* destination, const TimingRecord* timing) = 0;
+    // The name of built-in preset `index`, from 0; null past the last one.
+    virtual const char* VM_CALL GetPresetName(std::uint32_t index) = 0;
+    // Copies the value that a built-in preset gives a parameter. False when an index is past its end or
+    // `cell` is null.
+    virtual bool VM_CALL GetPresetValue(std::uint32_t preset, std::uint32_t parameter, PresetCell* cell) = 0;
+
+  protected:
+    ~IVideoEffect() = default;
+};
+
+// Converts between packed YCbCr 4:2:2 (bytes Y0 Cb Y1 Cr for each started pair of pixels) and 32-bit frames,
+// over the smaller of the two sizes, with the frame rules of IVideoEffect::Process. Answers to IUnknown only.
+class IFrameProcessor : public IUnknown {
+  public:
+    virtual bool VM_CALL Reserved3(const FrameRecord* source, const FrameRecord* destination,
+                                   std::uint8_t value) = 0;  // always false
+    virtual bool VM_CALL Reserved4(const FrameRecord* source, const FrameRecord* destination,
+                                   std::uint8_t value) = 0;  // always false
+    virtual bool VM_CALL Reserved5(const FrameRecord* source, const FrameRecord* destination,
+                                   std::uint8_t value) = 0;  // always false
+    // 4:2:2 to 32-bit; `alpha` is stored in every pixel. False when a frame is missing or invalid, or
+    // memory is short.
+    virtual bool VM_CALL ConvertYcbcrToBgra(const FrameRecord* source, const FrameRecord* destination,
+                                            std::uint8_t alpha) = 0;
+    // 32-bit to 4:2:2; the byte is not read.
+    virtual bool VM_CALL ConvertBgraToYcbcr(const FrameRecord* source, const FrameRecord* destination,
+                                            std::uint8_t unused) = 0;
+
+  protected:
+    ~IFrameProcessor() = default;
+};
+
+class IEffectLibrary;
+
+// Lets the user load and save the settings of one effect through the system's file dialogs.
+class IPresetSaver : public IUnknown {
+  public:
+    // `owner` is the dialog's owner window; `library` may be null; `effectIndex` as for CreateEffect;
+    // `languageCode` is null (plain dialogs) or a two-letter code (translated dialogs).
+    // Returns 0 when done or cancelled, 1 after a failure that the user has been told, 2 when the preset
+    // read does not belong to this effect (the user has been told; do not apply it). A null `record` is a
+    // failure.
+    virtual std::int32_t VM_CALL LoadPreset(void* owner, IEffectLibrary* library, std::uint32_t effectIndex,
+                                            PresetRecord* record, const char* languageCode) = 0;
+    // As above; 0 or 1. Stores the library's and the effect's name in the record; record->name is the host's.
+    virtual std::int32_t VM_CALL SavePreset(void* owner, IEffectLibrary* library, std::uint32_t effectIndex,
+                                            PresetRecord* record, const char* languageCode) = 0;
+
+  protected:
+    ~IPresetSaver() = default;
+};
+
+// Translated texts. Reached through QueryInterface of the library, when a language file was loaded; shares
+// the library's count.
+class IMultiLingual : public IUnknown {
+  public:
+    // Passes seven words on to the language module: language code, category, key, fallback text (16-bit, may
+    // be null), buffer, capacity in characters, pointer to a 32-bit found flag (may be null). Returns the
+    // characters written.
+    virtual std::int32_t VM_CALL LookUpText(std::intptr_t languageCode, std::intptr_t category,
+                                            std::intptr_t key, std::intptr_t fallback, std::intptr_t buffer,
+                                            std::intptr_t capacity, std::intptr_t found) = 0;
+    // Writes the text for a key in a language (two letters) into `buffer` of `capacity` 16-bit characters,
+    // cut and terminated. Returns the characters written, 0 when there is no such text.
+    virtual std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
+                                         char16_t* buffer, std::int32_t capacity) = 0;
+
+  protected:
+    ~IMultiLingual() = default;
+};
+
+// The process-wide settings, options dialog and help. Not reference-counted; valid while the library is
+// loaded.
+class IShellServices {
+  public:
+    // Called by the library itself when it is created; false when already started. `dialogs` is non-zero
+    // when the library shows dialogs of its own.
+    virtual bool VM_CALL Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
+                               std::int32_t dialogs) = 0;
+    // The user's preference: circular knobs are turned by dragging up and down.
+    virtual bool VM_CALL KnobsDragVertical() = 0;
+    // Shows the options dialog modally. 1: the user chose OK; 0: cancelled.
+    virtual std::int32_t VM_CALL ShowOptions(void* owner) = 0;
+    virtual void VM_CALL ShutDown() = 0;
+    // Opens the help at a numbered topic, in the system's viewer when `externalViewer` is non-zero, else
+    // inside the process. Non-zero when it was started.
+    virtual std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic, std::int32_t externalViewer) = 0;
+
+  protected:
+    ~IShellServices() = default;
+};
+
+class IEffectLibrary : public IUnknown {
+  public:
+    // "Velmora Reel Effects".
+    virtual const char* VM_CALL GetLibraryName() = 0;
+    // A new effect with one reference: 0 "Film Camera", 1 "Film Look", 2 "Film Damage", 3 "Film Express",
+    // 4 "Film Pro"; null past the last or when memory is short. It may outlive the library object.
+    virtual IVideoEffect* VM_CALL CreateEffect(std::uint32_t index) = 0;
+    // Opens the help file at a topic in the system's viewer; non-zero when it was started.
+    virtual std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic) = 0;
+    // Not reference-counted.
+    virtual IShellServices* VM_CALL GetShellServices() = 0;
+    // A new object with one reference, or null when memory is short.
+    virtual IFrameProcessor* VM_CALL CreateFrameProcessor() = 0;
+    // A new object with one reference, or null when memory is short.
+    virtual IPresetSaver* VM_CALL CreatePresetSaver() = 0;
+
+  protected:
+    ~IEffectLibrary() = default;
+};
+
+// ---------------------------------------------------------------------------------------------------------
+// Exports of VMReelEffects.dll, undecorated names.
+
+// "GetEffectsLibrary": a new library object with one reference that belongs to the caller; null when memory
+// is short.
+using GetEffectsLibraryFunction = IEffectLibrary*(VM_CALL*)();
+// "CanUnloadDLLNow": true when no library object is alive. Effects are not counted: release them first.
+using CanUnloadDLLNowFunction = bool(VM_CALL*)();
+
+}  // namespace velmora
+
+#undef VM_OFFSET

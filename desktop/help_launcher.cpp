@@ -1,0 +1,97 @@
+#include "desktop/help_launcher.h"
+
+#include <windows.h>
+#include <shellapi.h>
+
+#include <optional>
+
+#include "platform/win32_handles.h"
+#include "text/win32_text.h"
+
+namespace velmora::support {
+namespace {
+
+constexpr wchar_t kViewer[] = L"%SystemRoot%\\hh.exe";
+constexpr wchar_t kControlKey[] = L"CLSID\\{ADB880A6-D8FF-11CF-9377-00AA003B7A11}\\InprocServer32";
+constexpr wchar_t kControlName[] = L"hhctrl.ocx";
+constexpr WORD kControlOrdinal = 14;
+constexpr UINT kShowContext = 15;  // the control's command: show the topic with this context number
+constexpr DWORD kLongestControlPath = 260;
+
+using HtmlHelpFunction = HWND(WINAPI*)(HWND owner, const char* file, UINT command, DWORD_PTR data);
+
+// The HTML help control. Once loaded it stays: it may show windows for as long as the process lives.
+class HelpControl {
+  public:
+    // Null when there is none; a first failure is final.
+    HtmlHelpFunction Entry() noexcept {
+        if (m_givenUp) return nullptr;
+        if (m_module == nullptr) Load();
+        if (m_module != nullptr && m_entry == nullptr) {
+            m_entry = reinterpret_cast<HtmlHelpFunction>(
+                reinterpret_cast<void*>(GetProcAddress(m_module, MAKEINTRESOURCEA(kControlOrdinal))));
+        }
+        m_givenUp = m_entry == nullptr;
+        return m_entry;
+    }
+
+  private:
+    void Load() noexcept {
+        wchar_t path[kLongestControlPath + 1] = {};
+        DWORD size = kLongestControlPath * sizeof(wchar_t);
+        // Also reads, and expands, a path that is stored with environment variables.
+        if (RegGetValueW(HKEY_CLASSES_ROOT, kControlKey, nullptr, RRF_RT_REG_SZ, nullptr, path, &size) ==
+            ERROR_SUCCESS) {
+            m_module = LoadLibraryW(path);
+        }
+        if (m_module == nullptr) m_module = LoadLibraryW(kControlName);
+    }
+
+    HMODULE m_module = nullptr;
+    HtmlHelpFunction m_entry = nullptr;
+    bool m_givenUp = false;
+};
+
+constinit HelpControl helpControl;
+
+// An 8-bit form that names the same file: the path itself, else its short path; nothing when there is neither.
+std::optional<std::string> EightBitPath(const std::u16string& path) {
+    if (std::optional<std::string> exact = win32::ExactNarrow(path)) return exact;
+    const std::u16string shortPath = win32::ShortPath(path);
+    return shortPath.empty() ? std::nullopt : win32::ExactNarrow(shortPath);
+}
+
+}  // namespace
+
+void HelpLauncher::SetFile(std::u16string folder, const std::string& fileName) {
+    m_path = std::move(folder) + win32::Widen(fileName);
+}
+
+std::int32_t HelpLauncher::Show(void* owner, std::int32_t topic, bool externalViewer) const {
+    return externalViewer ? ShowInViewer(owner, topic) : ShowInProcess(owner, topic);
+}
+
+std::int32_t HelpLauncher::ShowInViewer(void* owner, std::int32_t topic) const {
+    const std::wstring parameters = L"-mapID " + std::to_wstring(topic) + L" " + win32::Wide(m_path.c_str());
+    SHELLEXECUTEINFOW execution = {};
+    execution.cbSize = sizeof execution;
+    execution.fMask = SEE_MASK_DOENVSUBST | SEE_MASK_FLAG_NO_UI;
+    execution.hwnd = static_cast<HWND>(owner);
+    execution.lpVerb = L"open";
+    execution.lpFile = kViewer;
+    execution.lpParameters = parameters.c_str();
+    execution.nShow = SW_SHOWNORMAL;
+    return ShellExecuteExW(&execution);
+}
+
+std::int32_t HelpLauncher::ShowInProcess(void* owner, std::int32_t topic) const {
+    const std::optional<std::string> path = EightBitPath(m_path);
+    if (!path) return 0;
+    const HtmlHelpFunction entry = helpControl.Entry();
+    if (entry == nullptr) return 0;
+    const HWND shown =
+        entry(static_cast<HWND>(owner), path->c_str(), kShowContext, static_cast<DWORD>(topic));
+    return static_cast<std::int32_t>(reinterpret_cast<INT_PTR>(shown));
+}
+
+}  // namespace velmora::support

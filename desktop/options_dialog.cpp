@@ -1,0 +1,180 @@
+#include "desktop/options_dialog.h"
+
+#include <shellapi.h>
+#include <windowsx.h>
+
+#include <algorithm>
+#include <cstdio>
+
+#include "help/topics.h"
+#include "desktop/bit_button.h"
+#include "desktop/product.h"
+#include "desktop/resource_ids.h"
+#include "platform/win32_handles.h"
+#include "text/win32_text.h"
+
+namespace velmora::support {
+namespace {
+
+constexpr RECT kLogoPlace = {10, 8, 230, 40};  // in dialog units
+
+// Over the middle of its owner, inside the screen's free area. Without an owner the system has centred it.
+void CentreOverOwner(HWND window) noexcept {
+    const HWND owner = GetWindow(window, GW_OWNER);
+    RECT over = {};
+    RECT own = {};
+    MONITORINFO monitor = {};
+    monitor.cbSize = sizeof monitor;
+    if (owner == nullptr || IsIconic(owner) || !GetWindowRect(owner, &over) || !GetWindowRect(window, &own) ||
+        !GetMonitorInfoW(MonitorFromWindow(owner, MONITOR_DEFAULTTONEAREST), &monitor)) {
+        return;
+    }
+    const auto placed = [](LONG from, LONG to, LONG size, LONG lowest, LONG highest) {
+        const LONG centred = from + (to - from - size) / 2;
+        return static_cast<int>(std::max(lowest, std::min(centred, highest - size)));
+    };
+    const RECT& area = monitor.rcWork;
+    SetWindowPos(window, nullptr, placed(over.left, over.right, own.right - own.left, area.left, area.right),
+                 placed(over.top, over.bottom, own.bottom - own.top, area.top, area.bottom), 0, 0,
+                 SWP_NOSIZE | SWP_NOZORDER | SWP_NOACTIVATE);
+}
+
+void OpenWebPage(HWND owner) noexcept {
+    SHELLEXECUTEINFOW execution = {};
+    execution.cbSize = sizeof execution;
+    execution.fMask = SEE_MASK_FLAG_NO_UI;
+    execution.hwnd = owner;
+    execution.lpVerb = L"open";
+    execution.lpFile = kWebPage;
+    execution.nShow = SW_SHOWNORMAL;
+    ShellExecuteExW(&execution);
+}
+
+}  // namespace
+
+bool OptionsDialog::Show(HWND owner) noexcept {
+    const win32::ManifestScope manifest(m_parts.templates);
+    const INT_PTR result =
+        DialogBoxParamW(m_parts.templates, MAKEINTRESOURCEW(VM_DIALOG_OPTIONS),
+                        IsWindow(owner) ? owner : nullptr, Procedure, reinterpret_cast<LPARAM>(this));
+    return result == IDOK;
+}
+
+void OptionsDialog::ToFront() const noexcept {
+    if (m_window != nullptr) SetForegroundWindow(m_window);
+}
+
+void OptionsDialog::Abandon() noexcept {
+    if (m_logo != nullptr) DestroyWindow(m_logo);
+    m_logo = nullptr;
+    if (m_window != nullptr) EndDialog(m_window, 0);
+}
+
+INT_PTR CALLBACK OptionsDialog::Procedure(HWND window, UINT message, WPARAM wParam, LPARAM lParam) noexcept {
+    if (message == WM_INITDIALOG) {
+        SetWindowLongPtrW(window, DWLP_USER, static_cast<LONG>(lParam));
+        auto* opened = reinterpret_cast<OptionsDialog*>(lParam);
+        opened->m_window = window;
+        opened->OnOpen();
+        return TRUE;  // the system puts the focus on the first control
+    }
+    auto* dialog = reinterpret_cast<OptionsDialog*>(GetWindowLongPtrW(window, DWLP_USER));
+    if (dialog == nullptr) return FALSE;
+    if (message == WM_NCDESTROY) {
+        SetWindowLongPtrW(window, DWLP_USER, 0);
+        dialog->m_window = nullptr;
+        dialog->m_logo = nullptr;
+        return FALSE;
+    }
+    return dialog->OnMessage(message, wParam);
+}
+
+INT_PTR OptionsDialog::OnMessage(UINT message, WPARAM wParam) noexcept {
+    switch (message) {
+        case WM_COMMAND:
+            OnCommand(LOWORD(wParam));
+            return TRUE;
+        case WM_HELP:
+            OpenHelp();
+            return TRUE;  // F1
+        default:
+            return FALSE;
+    }
+}
+
+void OptionsDialog::OnOpen() noexcept {
+    CreateLogo();
+    CheckDlgButton(m_window, VM_CHECK_KNOBS_VERTICAL,
+                   m_parts.preferences->KnobsDragVertical() ? BST_CHECKED : BST_UNCHECKED);
+    SetTexts();
+    CentreOverOwner(m_window);
+}
+
+void OptionsDialog::CreateLogo() noexcept {
+    if (m_parts.buttonModule == nullptr) return;
+    RECT place = kLogoPlace;
+    MapDialogRect(m_window, &place);
+    m_logo = CreateBitButton({.owner = m_window,
+                              .module = m_parts.buttonModule,
+                              .bitmap = m_parts.logo,
+                              .command = VM_BUTTON_LOGO,
+                              .position = {place.left, place.top}});
+}
+
+void OptionsDialog::SetTexts() noexcept {
+    char version[64];
+    std::snprintf(version, sizeof version, "Version %d.%d", kVersionMajor, kVersionMinor);
+    TranslationHelper& texts = *m_parts.texts;
+    const auto set = [&](int control, const char* key, const char* fallback) {
+        SetDlgItemTextW(m_window, control, win32::Wide(texts.Translate(kTextsOfOptions, key, fallback)));
+    };
+    set(VM_TEXT_PRODUCT, "ProductName", kProductText);
+    set(VM_TEXT_VERSION, "Version", version);
+    set(VM_TEXT_OPTIONS, "Options", "Options");
+    SetWindowTextW(m_window, win32::Wide(texts.Translate(kTextsOfOptions, "Title", kProductText)));
+    // Texts stand as they are: a translation brings its letter for the Alt key with it, and OK and Cancel have
+    // theirs, Enter and Escape.
+    set(VM_CHECK_KNOBS_VERTICAL, "Up/Down Knobs Control", "Up / Down mouse control of circular knobs");
+    const auto setButton = [&](int control, const char* key) {
+        SetDlgItemTextW(m_window, control, win32::Wide(texts.Translate(kTextsOfButtons, key)));
+    };
+    setButton(VM_BUTTON_OK, "OK");
+    setButton(VM_BUTTON_CANCEL, "Cancel");
+    setButton(VM_BUTTON_HELP, "Help");
+}
+
+void OptionsDialog::OnCommand(int control) noexcept {
+    switch (control) {
+        case VM_BUTTON_OK:
+            OnOk();
+            break;
+        case VM_BUTTON_CANCEL:
+            EndDialog(m_window, 0);
+            break;
+        case VM_BUTTON_HELP:
+            OpenHelp();
+            break;
+        case VM_BUTTON_LOGO:
+            OpenWebPage(m_window);
+            break;
+        default:
+            break;
+    }
+}
+
+void OptionsDialog::OnOk() noexcept {
+    // Stored before the dialog goes: a host that sees it go may ask for the preference at once.
+    if (GetDlgItem(m_window, VM_CHECK_KNOBS_VERTICAL) != nullptr) {
+        m_parts.preferences->SetKnobsDragVertical(IsDlgButtonChecked(m_window, VM_CHECK_KNOBS_VERTICAL) ==
+                                                  BST_CHECKED);
+    }
+    EndDialog(m_window, IDOK);
+}
+
+void OptionsDialog::OpenHelp() const noexcept try {
+    static_cast<void>(m_parts.help->Show(m_window, help::kOptions, false));
+} catch (...) {
+    // As with every help that cannot be opened, nothing is said.
+}
+
+}  // namespace velmora::support

@@ -1,0 +1,183 @@
+#include <windows.h>
+
+#include <cstring>
+#include <new>
+
+#include "platform/float_guard.h"
+#include "desktop/bit_button.h"
+#include "desktop/help_launcher.h"
+#include "desktop/options_dialog.h"
+#include "desktop/preferences.h"
+#include "desktop/resource_ids.h"
+#include "desktop/shell_services.h"
+#include "desktop/text_sources.h"
+#include "platform/win32_handles.h"
+#include "text/win32_text.h"
+
+namespace velmora::support {
+namespace {
+
+constexpr char16_t kResourceModule[] = u"resources.dll";
+constexpr std::size_t kLongestHelpFileName = 259;
+
+// The two letters of the language in which the user sees the system; the translations decide what an unknown or
+// longer code means.
+std::string UserInterfaceLanguage() {
+    char code[16] = {};
+    const LCID locale = MAKELCID(GetUserDefaultUILanguage(), SORT_DEFAULT);
+    GetLocaleInfoA(locale, LOCALE_SISO639LANGNAME, code, static_cast<int>(sizeof code));
+    return code;
+}
+
+// The module that this code and the dialogs' templates lie in, whichever module a host starts the services for.
+HMODULE OwnModule() noexcept {
+    HMODULE module = nullptr;
+    GetModuleHandleExW(GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,
+                       reinterpret_cast<const wchar_t*>(reinterpret_cast<const void*>(&OwnModule)), &module);
+    return module;
+}
+
+class WindowsShellServices final : public IShellServices {
+  public:
+    bool VM_CALL Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
+                       std::int32_t dialogs) override;
+    bool VM_CALL KnobsDragVertical() override { return m_preferences.KnobsDragVertical(); }
+    std::int32_t VM_CALL ShowOptions(void* owner) override;
+    void VM_CALL ShutDown() override;
+    std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic, std::int32_t externalViewer) override;
+
+    void Offer(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept;
+    void Withdraw(IUnknown* library) noexcept;
+
+  private:
+    void LoadDialogParts(const std::u16string& folder);
+    void UseTextSource(IUnknown* source, const char* languageCode) noexcept;
+
+    HMODULE m_module = nullptr;  // in whose folder the library's files lie; null: not started
+    win32::Module m_resources;
+    win32::Bitmap m_logo;
+    HMODULE m_buttonModule = nullptr;  // for which the button class is registered; null: it is not
+    Preferences m_preferences;
+    TranslationHelper m_texts;
+    IUnknown* m_textSource = nullptr;  // not owned
+    HelpLauncher m_help;
+    TextSources m_libraries;
+    OptionsDialog* m_dialog = nullptr;  // while one is shown
+};
+
+void WindowsShellServices::UseTextSource(IUnknown* source, const char* languageCode) noexcept {
+    m_textSource = source;
+    m_texts.SetContext(source, languageCode);
+}
+
+bool VM_CALL WindowsShellServices::Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
+                                         std::int32_t dialogs) try {
+    const FloatGuard guard;
+    if (m_module != nullptr || moduleHandle == nullptr) return false;
+    m_module = static_cast<HMODULE>(moduleHandle);
+    UseTextSource(textSource, nullptr);
+    const std::u16string folder = ModuleFolder(moduleHandle);
+    if (dialogs != 0) LoadDialogParts(folder);
+    m_preferences.Read();
+    const char* const name = helpFileName != nullptr ? helpFileName : "";
+    m_help.SetFile(folder, std::string(name, strnlen(name, kLongestHelpFileName)));
+    return true;
+} catch (...) {
+    return m_module != nullptr;  // short of memory: started with what there is
+}
+
+// The bitmap and the button class are the resource module's; without it the buttons are the library's own, empty.
+void WindowsShellServices::LoadDialogParts(const std::u16string& folder) {
+    if (!folder.empty()) {
+        m_resources.reset(static_cast<HMODULE>(LoadModule((folder + kResourceModule).c_str())));
+    }
+    if (m_resources != nullptr) {
+        m_logo.reset(static_cast<HBITMAP>(LoadImageW(m_resources.get(), MAKEINTRESOURCEW(VM_BITMAP_OPTIONS),
+                                                     IMAGE_BITMAP, 0, 0, LR_CREATEDIBSECTION)));
+    }
+    const HMODULE owner = m_resources != nullptr ? m_resources.get() : m_module;
+    if (RegisterBitButtonClass(owner)) m_buttonModule = owner;
+}
+
+std::int32_t VM_CALL WindowsShellServices::ShowOptions(void* owner) try {
+    const FloatGuard guard;
+    if (m_module == nullptr) return 0;
+    if (m_dialog != nullptr) {
+        m_dialog->ToFront();
+        return 0;
+    }
+    UseTextSource(m_textSource, UserInterfaceLanguage().c_str());
+    OptionsDialog dialog({.templates = OwnModule(),
+                          .buttonModule = m_buttonModule,
+                          .logo = m_logo.get(),
+                          .texts = &m_texts,
+                          .help = &m_help,
+                          .preferences = &m_preferences});
+    m_dialog = &dialog;
+    const bool accepted = dialog.Show(static_cast<HWND>(owner));
+    m_dialog = nullptr;
+    return accepted ? 1 : 0;
+} catch (...) {
+    return 0;
+}
+
+void VM_CALL WindowsShellServices::ShutDown() {
+    const FloatGuard guard;
+    if (m_dialog != nullptr) m_dialog->Abandon();  // its logo uses what goes now
+    m_logo.reset();
+    if (m_buttonModule != nullptr) UnregisterBitButtonClass(m_buttonModule);
+    m_buttonModule = nullptr;
+    m_resources.reset();
+    UseTextSource(nullptr, nullptr);
+    m_help = {};
+    m_module = nullptr;
+}
+
+std::int32_t VM_CALL WindowsShellServices::ShowHelp(void* owner, std::int32_t topic,
+                                                    std::int32_t externalViewer) try {
+    const FloatGuard guard;
+    return m_module != nullptr ? m_help.Show(owner, topic, externalViewer != 0) : 0;
+} catch (...) {
+    return 0;
+}
+
+void WindowsShellServices::Offer(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept {
+    constexpr std::int32_t kShowsDialogs = 1;
+    m_libraries.Add(library);
+    if (!Start(module, library, helpFileName, kShowsDialogs) && m_textSource == nullptr) {
+        UseTextSource(library, nullptr);
+    }
+}
+
+void WindowsShellServices::Withdraw(IUnknown* library) noexcept {
+    m_libraries.Remove(library);
+    if (m_libraries.Count() == 0) {
+        ShutDown();
+    } else if (m_textSource == library) {
+        UseTextSource(m_libraries.Current(), nullptr);
+    }
+}
+
+// Never destroyed: the last library object has shut it down, and when a module is unloaded it is too late to free
+// others.
+WindowsShellServices& Services() noexcept {
+    alignas(WindowsShellServices) static unsigned char storage[sizeof(WindowsShellServices)];
+    static WindowsShellServices* const services = new (storage) WindowsShellServices;
+    return *services;
+}
+
+}  // namespace
+
+IShellServices& ShellServices() noexcept {
+    return Services();
+}
+
+void OfferTextSource(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept {
+    Services().Offer(module, library, helpFileName);
+}
+
+void WithdrawTextSource(IUnknown* library) noexcept {
+    Services().Withdraw(library);
+}
+
+}  // namespace velmora::support

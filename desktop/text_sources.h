@@ -1,0 +1,41 @@
+// The living library objects, each of which can give translated texts.
+#pragma once
+
+#include <algorithm>
+#include <cstddef>
+#include <new>
+#include <vector>
+
+#include "api/host_api.h"
+
+namespace velmora::support {
+
+// Counts the library objects and remembers them without references of its own: each takes itself out before it
+// goes.
+class TextSources {
+  public:
+    void Add(IUnknown* library) noexcept {
+        ++m_count;
+        try {
+            m_sources.push_back(library);
+        } catch (const std::bad_alloc&) {
+            // The library counts all the same; its texts are asked for only while no other is needed.
+        }
+    }
+    void Remove(IUnknown* library) noexcept {
+        if (m_count > 0) --m_count;
+        std::erase(m_sources, library);
+        if (m_count == 0) m_sources = {};  // nothing stays allocated in a module about to be unloaded
+    }
+    // The oldest living library object, null when there is none.
+    [[nodiscard]] IUnknown* Current() const noexcept {
+        return m_sources.empty() ? nullptr : m_sources.front();
+    }
+    [[nodiscard]] std::size_t Count() const noexcept { return m_count; }
+
+  private:
+    std::vector<IUnknown*> m_sources;
+    std::size_t m_count = 0;
+};
+
+}  // namespace velmora::support

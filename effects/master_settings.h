@@ -1,0 +1,56 @@
+// The master settings list: the 21 settings of the renderer, with group markers between them, in the order
+// in which every frame reads them.
+#pragma once
+
+#include <array>
+#include <cstdint>
+
+#include "effects/params.h"
+#include "render/stage_settings.h"
+
+namespace velmora {
+
+class MasterSettingsList {
+  public:
+    static constexpr std::uint32_t kCapacity = 40;
+
+    MasterSettingsList() noexcept = default;
+    MasterSettingsList(const MasterSettingsList&) = delete;
+    MasterSettingsList& operator=(const MasterSettingsList&) = delete;
+    // Frees the entries. (The library keeps its lists until the process ends.)
+    ~MasterSettingsList();
+
+    // Adds the 33 entries; false when memory is short (the list is then incomplete and not to be used).
+    [[nodiscard]] bool Fill() noexcept;
+    // Describes the k-th exposed entry; false past the last one. Describing an entry exposes it, so that one
+    // walk to the end exposes all settings.
+    bool DescribeExposed(std::uint32_t index, ParamDescriptor& descriptor) noexcept;
+    // Exposes every setting, as the walk does.
+    void ExposeAll() noexcept;
+    // Lets every exposed entry read its value from `host`, with a running index from 0.
+    void ReadFromHost(IVideoHost& host) noexcept;
+
+    // Takes ownership. The caller keeps within the capacity.
+    void Append(CRsFX_Param* entry) noexcept { m_entries[m_count++] = entry; }
+    // The first entry with this id when it is of this kind; null otherwise.
+    [[nodiscard]] CRsFX_Param* Find(std::uint32_t id, std::uint32_t code) const noexcept;
+
+    // Typed getters: leave the destination alone when there is no such entry. They compute in double
+    // precision and narrow when they write.
+    void GetPercentRaw(std::uint32_t id, float& value) const noexcept;
+    void GetPercentNormalised(std::uint32_t id, float& value) const noexcept;  // 0..1 over the range
+    void GetPercentSigned(std::uint32_t id, float& value) const noexcept;      // 2 * normalised - 1
+    void GetInteger(std::uint32_t id, std::int32_t& value) const noexcept;
+    void GetCheckBox(std::uint32_t id, bool& value) const noexcept;
+    void GetMenu(std::uint32_t id, std::int32_t& value) const noexcept;
+    void GetColour(std::uint32_t id, std::uint32_t& value) const noexcept;  // 0xFFRRGGBB
+
+  private:
+    std::array<CRsFX_Param*, kCapacity> m_entries{};  // ends with the first null
+    std::uint32_t m_count = 0;
+};
+
+// What the stages are to do, from the list's present values.
+[[nodiscard]] render::StageSettings ReadStageSettings(const MasterSettingsList& list) noexcept;
+
+}  // namespace velmora

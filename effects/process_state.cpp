@@ -1,0 +1,63 @@
+#include "effects/process_state.h"
+
+#include <atomic>
+#include <memory>
+#include <new>
+
+#include "effects/render_options.h"
+#include "platform/platform.h"
+
+namespace velmora {
+namespace {
+
+std::atomic<std::int32_t> g_liveObjects{0};
+std::int32_t g_buildMode = 0;
+
+struct KeptList {
+    MasterSettingsList list;
+    KeptList* earlier = nullptr;
+};
+KeptList* g_currentList = nullptr;
+
+// Seeded when the library is loaded: initialisers of statics run then.
+struct SeededState : render::RenderState {
+    SeededState() noexcept { random.Seed(support::TickCount()); }
+} g_state;
+const render::RenderOptions g_options = ReadRenderOptions();
+
+}  // namespace
+
+DLLDependentObject::DLLDependentObject() noexcept {
+    g_liveObjects.fetch_add(1);
+}
+DLLDependentObject::~DLLDependentObject() {
+    g_liveObjects.fetch_sub(1);
+}
+std::int32_t DLLDependentObject::LiveObjectCount() noexcept {
+    return g_liveObjects.load();
+}
+
+void SetBuildMode(std::int32_t mode) noexcept {
+    g_buildMode = mode;
+}
+std::int32_t BuildMode() noexcept {
+    return g_buildMode;
+}
+
+bool RenewMasterSettings() noexcept {
+    std::unique_ptr<KeptList> fresh(new (std::nothrow) KeptList);
+    if (fresh == nullptr || (g_buildMode == kBuildModeReady && !fresh->list.Fill())) return false;
+    fresh->earlier = g_currentList;
+    g_currentList = fresh.release();
+    return true;
+}
+
+MasterSettingsList* CurrentMasterSettings() noexcept {
+    return g_currentList == nullptr ? nullptr : &g_currentList->list;
+}
+
+RenderSession ProcessSession() noexcept {
+    return {CurrentMasterSettings(), &g_state, g_options};
+}
+
+}  // namespace velmora

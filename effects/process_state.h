@@ -1,0 +1,39 @@
+// The state that the library keeps for the whole process, unguarded, as hosts of this kind expect: frames
+// are rendered one at a time.
+#pragma once
+
+#include <cstdint>
+
+#include "effects/master_settings.h"
+#include "effects/render_session.h"
+
+namespace velmora {
+
+// Library objects alive; changed atomically. Effects and other objects are not counted: the host may unload
+// the library as soon as all library objects are gone.
+class DLLDependentObject {
+  public:
+    DLLDependentObject() noexcept;
+    virtual ~DLLDependentObject();
+    DLLDependentObject(const DLLDependentObject&) = delete;
+    DLLDependentObject& operator=(const DLLDependentObject&) = delete;
+
+    [[nodiscard]] static std::int32_t LiveObjectCount() noexcept;
+};
+
+// The one value of the build mode under which the master settings are filled and read.
+inline constexpr std::int32_t kBuildModeReady = 2;
+
+void SetBuildMode(std::int32_t mode) noexcept;
+[[nodiscard]] std::int32_t BuildMode() noexcept;
+
+// Makes a new master settings list the current one; false when memory is short (the current list stays).
+// Earlier lists are kept until the process ends: effects that read them may outlive their library object.
+[[nodiscard]] bool RenewMasterSettings() noexcept;
+[[nodiscard]] MasterSettingsList* CurrentMasterSettings() noexcept;
+
+// The session of all effects created through the library. Its random numbers start from the system's tick
+// count at load, so that damage differs from run to run.
+[[nodiscard]] RenderSession ProcessSession() noexcept;
+
+}  // namespace velmora

@@ -1,0 +1,29 @@
+#include "effects/render_session.h"
+
+#include "render/frame_context.h"
+#include "render/renderer.h"
+
+namespace velmora {
+namespace {
+
+render::FrameDescription Describe(const FrameRecord& record) noexcept {
+    return {record.pixels, record.width, record.height, record.rowStep, record.xOrigin, record.yOrigin};
+}
+
+}  // namespace
+
+bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameRecord* source,
+                 const FrameRecord* destination, const TimingRecord* timing) noexcept {
+    if (source == nullptr || destination == nullptr || timing == nullptr) return false;
+    render::FrameContext context(Describe(*source), Describe(*destination));
+    context.SetTime(timing->frameTime);
+    // A frame that turns out to be invalid still counts as the last one.
+    session.state->random.BeginFrame(context.FrameNumber());
+    if (!context.IsValid(render::Slot::kSource) || !context.IsValid(render::Slot::kDestination)) return false;
+    session.settings->ReadFromHost(face);
+    render::RenderStages(context, ReadStageSettings(*session.settings), *session.state, session.options);
+    context.Finish();
+    return true;
+}
+
+}  // namespace velmora

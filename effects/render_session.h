@@ -1,0 +1,25 @@
+// What the renderer front works on: the list of master settings that every frame reads anew, and the state
+// that outlives a frame. The library has one session for the whole process, as hosts expect; a host that
+// links the core makes one for each of its threads.
+#pragma once
+
+#include "api/host_api.h"
+#include "effects/master_settings.h"
+#include "render/render_state.h"
+#include "render/renderer.h"
+
+namespace velmora {
+
+struct RenderSession {
+    MasterSettingsList* settings = nullptr;  // not owned
+    render::RenderState* state = nullptr;    // not owned
+    render::RenderOptions options;
+};
+
+// Renders one frame: builds the views, moves the random state on, reads every exposed setting through
+// `face` (an effect's host face) and runs the stages. False when a frame or `timing` is missing or invalid;
+// nothing is written then and no parameter is read.
+bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameRecord* source,
+                 const FrameRecord* destination, const TimingRecord* timing) noexcept;
+
+}  // namespace velmora

@@ -1,0 +1,30 @@
+// The renderer that all effects share, in the shape of an effect: it shows the master settings as its
+// parameters and renders from them. Every effect contains one and poses to it as the host.
+#pragma once
+
+#include "api/com_object.h"
+#include "api/host_api.h"
+
+namespace velmora {
+
+class CRsVelmoraEffect final : public IVideoEffect {
+  public:
+    Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
+    std::uint32_t VM_CALL AddRef() override;
+    // At zero the storage is freed and no destructor runs: there is nothing to destroy. Inside an effect
+    // the count stays at its first reference.
+    std::uint32_t VM_CALL Release() override;
+    const char* VM_CALL GetName() override;
+    std::int32_t VM_CALL GetKind() override;
+    // The k-th setting of the current master settings list.
+    bool VM_CALL GetParamInfo(std::uint32_t index, ParamDescriptor* descriptor) override;
+    bool VM_CALL Process(IVideoHost* host, const FrameRecord* source, void* hostArgument,
+                         const FrameRecord* destination, const TimingRecord* timing) override;
+    const char* VM_CALL GetPresetName(std::uint32_t index) override;
+    bool VM_CALL GetPresetValue(std::uint32_t preset, std::uint32_t parameter, PresetCell* cell) override;
+
+  private:
+    ReferenceCount m_references;
+};
+
+}  // namespace velmora

@@ -1,0 +1,204 @@
+#include "faces/frei0r/instance.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+#include <cstring>
+#include <limits>
+#include <new>
+
+#include "text/number_text.h"
+#include "faces/frei0r/pixel_order.h"
+
+namespace velmora::hosts::frei0r {
+namespace {
+
+std::uint32_t ColourByte(float channel) {
+    if (!(channel > 0.0f)) return 0;  // also what is not a number
+    return static_cast<std::uint32_t>(std::lround(std::min(channel, 1.0f) * 255.0f));
+}
+
+ValueWord WordOf(f0r_param_color_t colour) {
+    ValueWord word{};
+    word.colour = ColourByte(colour.r) | ColourByte(colour.g) << 8 | ColourByte(colour.b) << 16;
+    return word;
+}
+
+f0r_param_color_t ColourOf(ValueWord word) {
+    const auto channel = [&](int shift) {
+        return static_cast<float>((word.colour >> shift) & 0xFFu) / 255.0f;
+    };
+    return {channel(0), channel(8), channel(16)};
+}
+
+std::string DefaultText(const PluginDescription& plugin, const PluginParam& param) {
+    switch (param.role) {
+        case ParamRole::kSeed:
+        case ParamRole::kStartFrame:
+            return "0";
+        case ParamRole::kOwn:
+            if (param.type != F0R_PARAM_STRING) return "";
+            return plugin.effect.params[param.own].items[plugin.effect.params[param.own].defaultValue.count];
+        default:
+            return "";
+    }
+}
+
+// Editors may write a whole number with decimals.
+std::optional<std::int64_t> WholeNumber(std::string_view text) {
+    if (const auto number = ParseInteger(text)) return number;
+    const auto number = ParseNumber(text);
+    if (!number || std::abs(*number) > 1e15) return std::nullopt;
+    return std::llround(*number);
+}
+
+std::uint32_t SeedOf(std::string_view text) {
+    const auto seed = WholeNumber(text);
+    return seed && *seed >= 0 && *seed <= std::numeric_limits<std::uint32_t>::max()
+               ? static_cast<std::uint32_t>(*seed)
+               : 0;
+}
+
+void WarnOfPreset(const PluginDescription& plugin, const std::string& name) {
+    std::fprintf(stderr, "%s: there is no preset \"%s\". %s\n", plugin.fileName.c_str(), name.c_str(),
+                 plugin.params[0].explanation.c_str());
+}
+
+}  // namespace
+
+Instance::Instance(const PluginDescription& plugin, std::uint32_t width, std::uint32_t height,
+                   TimeUnit hostUnit)
+    : m_plugin(plugin),
+      m_pixelCount(std::size_t{width} * height),
+      m_width(width),
+      m_height(height),
+      m_session(effects::EffectSession::Create(plugin.effect)),
+      m_own(plugin.effect.params.size()),
+      m_clock(hostUnit) {
+    if (m_session == nullptr) throw std::bad_alloc();
+    for (const PluginParam& param : plugin.params) m_texts.push_back(DefaultText(plugin, param));
+    for (std::size_t i = 0; i < m_own.size(); ++i) m_own[i].value = plugin.effect.params[i].defaultValue;
+}
+
+void Instance::Set(int index, const void* value) {
+    const auto i = static_cast<std::size_t>(index);
+    if (i >= m_plugin.params.size() || value == nullptr) return;
+    const std::scoped_lock lock(m_mutex);
+    if (m_plugin.params[i].type != F0R_PARAM_STRING) {
+        SetOwn(m_plugin.params[i], value);
+        return;
+    }
+    const char* text = *static_cast<const char* const*>(value);
+    SetText(i, text == nullptr ? "" : text);
+}
+
+void Instance::SetText(std::size_t index, std::string text) {
+    const PluginParam& param = m_plugin.params[index];
+    const bool isNew = text != m_texts[index];
+    m_texts[index] = std::move(text);
+    const std::string& kept = m_texts[index];
+    switch (param.role) {
+        case ParamRole::kPreset:
+            m_preset = FindPreset(m_plugin.effect, kept);
+            if (isNew && !m_preset && !kept.empty() && !IsSameName(kept, "none"))
+                WarnOfPreset(m_plugin, kept);
+            break;
+        case ParamRole::kSeed:
+            m_seed = SeedOf(kept);
+            break;
+        case ParamRole::kStartFrame:
+            m_clock.SetStartFrame(WholeNumber(kept).value_or(0));
+            break;
+        case ParamRole::kFrameRate:
+            m_clock.SetFrameRate(kept);
+            break;
+        case ParamRole::kOwn:
+            const auto item = FindItem(m_plugin.effect.params[param.own], kept);
+            m_own[param.own].isSet = item.has_value();
+            if (item) m_own[param.own].value.count = *item;
+            break;
+    }
+}
+
+void Instance::SetOwn(const PluginParam& param, const void* value) {
+    OwnValue& own = m_own[param.own];
+    if (param.type == F0R_PARAM_COLOR) {
+        own.value = WordOf(*static_cast<const f0r_param_color_t*>(value));
+    } else if (param.type == F0R_PARAM_BOOL) {
+        own.value.bits = *static_cast<const f0r_param_bool*>(value) >= 0.5 ? 1 : 0;
+    } else {
+        own.value.number = static_cast<float>(*static_cast<const f0r_param_double*>(value));
+    }
+    own.isSet = true;
+}
+
+void Instance::Get(int index, void* value) {
+    const auto i = static_cast<std::size_t>(index);
+    if (i >= m_plugin.params.size() || value == nullptr) return;
+    const std::scoped_lock lock(m_mutex);
+    const PluginParam& param = m_plugin.params[i];
+    const ValueWord own = m_own[param.own].value;
+    switch (param.type) {
+        case F0R_PARAM_STRING:
+            *static_cast<f0r_param_string*>(value) = m_texts[i].data();
+            break;
+        case F0R_PARAM_COLOR:
+            *static_cast<f0r_param_color_t*>(value) = ColourOf(own);
+            break;
+        case F0R_PARAM_BOOL:
+            *static_cast<f0r_param_bool*>(value) = own.flag != 0 ? 1.0 : 0.0;
+            break;
+        default:
+            *static_cast<f0r_param_double*>(value) = double{own.number};
+    }
+}
+
+bool Instance::IsDefault(std::uint32_t own) const noexcept {
+    const effects::ParamRow& param = m_plugin.effect.params[own];
+    const ValueWord value = m_own[own].value;
+    switch (param.kind) {
+        case kKindSlider:
+            return value.number == param.defaultValue.number;
+        case kKindColour:
+            return ((value.colour ^ param.defaultValue.colour) & 0xFFFFFFu) == 0;
+        case kKindCheckBox:
+            return value.flag == param.defaultValue.flag;
+        default:
+            return value.bits == param.defaultValue.bits;
+    }
+}
+
+void Instance::TellSession() noexcept {
+    bool hostSetsAll = true;
+    for (const PluginParam& param : m_plugin.params) {
+        if (param.role == ParamRole::kOwn && !m_own[param.own].isSet) hostSetsAll = false;
+    }
+    if (m_preset) m_session->ApplyPreset(*m_preset);
+    for (std::uint32_t own = 0; own < m_own.size(); ++own) {
+        const bool yieldsToPreset = !m_own[own].isSet || (hostSetsAll && IsDefault(own));
+        if (!m_preset || !yieldsToPreset) m_session->SetValue(own, m_own[own].value);
+    }
+    m_session->PinRandom(m_seed);
+}
+
+void Instance::Update(double hostTime, const std::uint32_t* in, std::uint32_t* out) noexcept {
+    const std::scoped_lock lock(m_mutex);
+    if (!Render(hostTime, in, out) && in != out) std::memcpy(out, in, m_pixelCount * sizeof(*out));
+}
+
+bool Instance::Render(double hostTime, const std::uint32_t* in, std::uint32_t* out) noexcept {
+    constexpr std::uint32_t kLargestSide = std::numeric_limits<std::int32_t>::max() / 4;
+    if (m_width > kLargestSide || m_height > kLargestSide) return false;
+    if (m_source == nullptr) m_source.reset(new (std::nothrow) std::uint32_t[m_pixelCount]);
+    if (m_source == nullptr) return false;
+    TellSession();
+    SwapRedAndBlue(in, m_source.get(), m_pixelCount);
+    const auto width = static_cast<std::int32_t>(m_width), height = static_cast<std::int32_t>(m_height);
+    const FrameRecord source = {m_source.get(), width, height, width * 4, 0, 0, 0};
+    const FrameRecord destination = {out, width, height, width * 4, 0, 0, 0};
+    if (!m_session->Render(source, destination, m_clock.ClipSeconds(hostTime))) return false;
+    SwapRedAndBlue(out, out, m_pixelCount);
+    return true;
+}
+
+}  // namespace velmora::hosts::frei0r

@@ -1,0 +1,64 @@
+// One plug-in instance: the values that the host has set and a session of the effect. A host may enter an
+// instance from several threads at once; each call has it to itself.
+//
+// A preset gives all values that the host has not set. Some hosts always set every parameter, mostly to the
+// default that they were told: of such a host a value at its default leaves the preset's value standing.
+#pragma once
+
+#include <frei0r.h>
+
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <memory>
+#include <mutex>
+#include <string>
+#include <vector>
+
+#include "effects/effect_session.h"
+#include "faces/frei0r/frame_clock.h"
+#include "faces/frei0r/host_time_unit.h"
+#include "faces/frei0r/plugin_params.h"
+
+namespace velmora::hosts::frei0r {
+
+class Instance {
+  public:
+    // `plugin` outlives the instance. Throws std::bad_alloc.
+    Instance(const PluginDescription& plugin, std::uint32_t width, std::uint32_t height, TimeUnit hostUnit);
+
+    // As f0r_set_param_value and f0r_get_param_value. An index past the last parameter does nothing. A text
+    // that is no preset, item or number leaves no setting behind; of a wrong preset one line tells on standard
+    // error.
+    void Set(int index, const void* value);
+    void Get(int index, void* value);
+
+    // Width * height pixels of red, green, blue and alpha bytes, rows without padding; may be the same memory.
+    void Update(double hostTime, const std::uint32_t* in, std::uint32_t* out) noexcept;
+
+  private:
+    struct OwnValue {
+        ValueWord value{};
+        bool isSet = false;
+    };
+
+    void SetText(std::size_t index, std::string text);
+    void SetOwn(const PluginParam& param, const void* value);
+    [[nodiscard]] bool IsDefault(std::uint32_t own) const noexcept;
+    void TellSession() noexcept;
+    [[nodiscard]] bool Render(double hostTime, const std::uint32_t* in, std::uint32_t* out) noexcept;
+
+    const PluginDescription& m_plugin;
+    const std::size_t m_pixelCount;
+    const std::uint32_t m_width, m_height;
+    std::mutex m_mutex;  // guards all below
+    std::unique_ptr<effects::EffectSession> m_session;
+    std::vector<std::string> m_texts;  // by parameter of the plug-in; empty but for strings
+    std::vector<OwnValue> m_own;       // by parameter of the effect
+    FrameClock m_clock;
+    std::optional<std::uint32_t> m_preset;
+    std::uint32_t m_seed = 0;
+    std::unique_ptr<std::uint32_t[]> m_source;  // the input as the effect wants it, from the first frame on
+};
+
+}  // namespace velmora::hosts::frei0r

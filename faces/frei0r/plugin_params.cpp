@@ -1,0 +1,124 @@
+#include "faces/frei0r/plugin_params.h"
+
+#include <frei0r.h>
+
+#include <algorithm>
+
+#include "text/number_text.h"
+
+namespace velmora::hosts::frei0r {
+namespace {
+
+bool IsNameCharacter(char c) {
+    return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9');
+}
+
+char Lower(char c) {
+    return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
+}
+
+std::string Essence(std::string_view text) {
+    std::string essence;
+    for (const char c : text) {
+        if (IsNameCharacter(c)) essence += Lower(c);
+    }
+    return essence;
+}
+
+std::string FileName(std::string_view effectName) {
+    std::string name = "velmora_";
+    for (const char c : effectName) name += c == ' ' ? '_' : Lower(c);
+    return name;
+}
+
+int TypeOf(ParamKind kind) {
+    switch (kind) {
+        case kKindSlider:
+            return F0R_PARAM_DOUBLE;
+        case kKindColour:
+            return F0R_PARAM_COLOR;
+        case kKindCheckBox:
+            return F0R_PARAM_BOOL;
+        default:
+            return F0R_PARAM_STRING;
+    }
+}
+
+bool HoldsValue(const effects::ParamRow& param) {
+    return param.kind != kKindGroup && param.kind != kKindNone;
+}
+
+// A colour and the amount of it may share a name in the effect's own dialog.
+std::string OwnName(const effects::EffectTable& effect, const effects::ParamRow& param) {
+    const auto sharesName = [&](const effects::ParamRow& other) {
+        return &other != &param && HoldsValue(other) && IsSameName(other.name, param.name);
+    };
+    if (!std::ranges::any_of(effect.params, sharesName)) return param.name;
+    return std::string(param.name) + (param.kind == kKindColour ? " Colour" : " Amount");
+}
+
+std::string QuotedList(std::span<const char* const> texts) {
+    std::string list;
+    for (const char* text : texts) {
+        if (!list.empty()) list += ", ";
+        list += text;
+    }
+    return list;
+}
+
+std::string OwnExplanation(const effects::ParamRow& param) {
+    switch (param.kind) {
+        case kKindSlider:
+            return "0 to 1 for " + NumberText(param.minimum) + " to " + NumberText(param.maximum);
+        case kKindMenu:
+            return "One of " + QuotedList(param.items);
+        default:
+            return "";
+    }
+}
+
+}  // namespace
+
+PluginDescription DescribePlugin(const effects::EffectTable& effect) {
+    PluginDescription plugin{.effect = effect,
+                             .name = std::string("Velmora ") + effect.name,
+                             .fileName = FileName(effect.name),
+                             .explanation = "The look of old film, the same in every host",
+                             .params = {}};
+    plugin.params = {
+        {"preset", F0R_PARAM_STRING, "None or one of " + QuotedList(effect.presetNames), ParamRole::kPreset},
+        {"seed", F0R_PARAM_STRING, "0 to 4294967295; another seed gives other damage", ParamRole::kSeed},
+        {"start frame", F0R_PARAM_STRING, "The clip's frame at the host's time 0", ParamRole::kStartFrame},
+        {"frame rate", F0R_PARAM_STRING, "Frames per second, as 25 or 30000/1001", ParamRole::kFrameRate},
+    };
+    for (std::uint32_t i = 0; i < effect.params.size(); ++i) {
+        const effects::ParamRow& param = effect.params[i];
+        if (!HoldsValue(param)) continue;
+        plugin.params.push_back(
+            {OwnName(effect, param), TypeOf(param.kind), OwnExplanation(param), ParamRole::kOwn, i});
+    }
+    return plugin;
+}
+
+bool IsSameName(std::string_view a, std::string_view b) {
+    return Essence(a) == Essence(b);
+}
+
+std::optional<std::uint32_t> FindPreset(const effects::EffectTable& effect, std::string_view name) {
+    for (std::uint32_t i = 0; i < effect.presetNames.size(); ++i) {
+        if (IsSameName(effect.presetNames[i], name)) return i;
+    }
+    return std::nullopt;
+}
+
+std::optional<std::uint32_t> FindItem(const effects::ParamRow& menu, std::string_view text) {
+    for (std::uint32_t i = 0; i < menu.items.size(); ++i) {
+        if (IsSameName(menu.items[i], text)) return i;
+    }
+    const auto number = ParseInteger(text);
+    if (!number || *number < 0 || *number >= static_cast<std::int64_t>(menu.items.size()))
+        return std::nullopt;
+    return static_cast<std::uint32_t>(*number);
+}
+
+}  // namespace velmora::hosts::frei0r

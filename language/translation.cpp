@@ -1,0 +1,51 @@
+#include "language/translation.h"
+
+#include <algorithm>
+#include <cstring>
+
+#include "text/strings.h"
+
+namespace velmora {
+
+TranslationHelper::~TranslationHelper() = default;
+
+void TranslationHelper::SetContext(IUnknown* textSource, const char* languageCode) noexcept {
+    m_text[0] = 0;
+    m_textSource = textSource;
+    // At most three bytes of the code are looked at: a host may pass a long text.
+    const bool isCode = languageCode != nullptr && languageCode[0] != '\0' && languageCode[1] != '\0' &&
+                        languageCode[2] == '\0';
+    std::memcpy(m_languageCode, isCode ? languageCode : "en", sizeof m_languageCode);
+}
+
+const char16_t* TranslationHelper::Translate(std::int32_t category, const char* key, const char* fallback,
+                                             bool* wasFound) noexcept {
+    m_text[0] = 0;
+    const bool isFound = LookUp(category, key);
+    if (!isFound) CopyFallback(fallback != nullptr ? fallback : key);
+    if (wasFound != nullptr) *wasFound = isFound;
+    return m_text;
+}
+
+// The interface is asked for at every lookup and never kept: the source may gain or lose its language file.
+bool TranslationHelper::LookUp(std::int32_t category, const char* key) noexcept {
+    if (m_textSource == nullptr) return false;
+    void* face = nullptr;
+    if (m_textSource->QueryInterface(&kIidMultiLingual, &face) != kStatusOk || face == nullptr) return false;
+    auto* texts = static_cast<IMultiLingual*>(face);
+    const std::int32_t written = texts->GetText(m_languageCode, category, key, m_text, kCapacity);
+    texts->Release();
+    m_text[kCapacity - 1] = 0;  // whatever a language module of another maker wrote
+    return written > 0;
+}
+
+void TranslationHelper::CopyFallback(const char* fallback) noexcept {
+    m_text[0] = 0;
+    const VMUnicodeString wide = VMString(fallback, kMeasureText).ToUnicode();
+    if (!wide.IsNotEmpty()) return;
+    const std::uint32_t length = std::min<std::uint32_t>(wide.Length(), kCapacity - 1);
+    std::copy_n(wide.Text(), length, m_text);
+    m_text[length] = 0;
+}
+
+}  // namespace velmora

@@ -1,0 +1,152 @@
+#include "library/velmora_lib.h"
+
+#include <new>
+#include <string>
+
+#include "effects/film_effect.h"
+#include "platform/float_guard.h"
+#include "library/frame_processor.h"
+#include "library/module.h"
+#include "effects/velmora_effect.h"
+#include "presets/preset_saver.h"
+#include "desktop/shell_services.h"
+
+namespace velmora {
+namespace {
+
+constexpr char kLibraryName[] = "Velmora Reel Effects";
+constexpr char kHelpFile[] = "VMReelEffects.chm";
+constexpr char16_t kLanguageModule[] = u"VMLang.dll";
+constexpr char16_t kLanguageFile[] = u"VMReelEffectsLang.xml";
+
+// A module without the export may be freed.
+bool AllowsUnload(support::ModuleHandle module) noexcept {
+    const auto canUnload =
+        reinterpret_cast<CanUnloadDLLNowFunction>(support::FindExport(module, "CanUnloadDLLNow"));
+    return canUnload == nullptr || canUnload();
+}
+
+// The path of a file beside the library; empty when it cannot be told.
+std::u16string BesideLibrary(const char16_t* name) noexcept try {
+    std::u16string path = support::ModuleFolder(ModuleHandle());
+    return path.empty() ? path : path + name;
+} catch (...) {
+    return {};
+}
+
+support::ModuleHandle LoadBesideOrByName(const char16_t* name) noexcept {
+    const std::u16string path = BesideLibrary(name);
+    support::ModuleHandle module = path.empty() ? nullptr : support::LoadModule(path.c_str());
+    return module != nullptr ? module : support::LoadModule(name);
+}
+
+}  // namespace
+
+CRsVelmoraLib::CRsVelmoraLib() noexcept {
+    support::OfferTextSource(ModuleHandle(), static_cast<IEffectLibrary*>(this), kHelpFile);
+    // Frames read only the settings that have been described once.
+    if (MasterSettingsList* settings = CurrentMasterSettings()) settings->ExposeAll();
+    m_hasLanguage = LoadLanguage(kLanguageModule, kLanguageFile);
+}
+
+CRsVelmoraLib::~CRsVelmoraLib() {
+    support::WithdrawTextSource(static_cast<IEffectLibrary*>(this));
+    if (m_parser != nullptr) m_parser->Release();
+    m_parser = nullptr;
+    FreeLanguageModule();
+}
+
+bool CRsVelmoraLib::FreeLanguageModule() noexcept {
+    if (m_languageModule != nullptr && !AllowsUnload(m_languageModule)) return false;
+    support::UnloadModule(m_languageModule);  // also when none is held: freeing nothing does nothing
+    m_languageModule = nullptr;
+    return true;
+}
+
+bool CRsVelmoraLib::LoadLanguage(const char16_t* moduleName, const char16_t* fileName) noexcept {
+    if (m_parser != nullptr || moduleName == nullptr || fileName == nullptr) return false;
+    if (m_languageModule != nullptr) {
+        FreeLanguageModule();
+        m_languageModule = nullptr;  // a module that asks to be kept is forgotten, not freed
+    }
+    m_languageModule = LoadBesideOrByName(moduleName);
+    if (m_languageModule == nullptr) return false;
+    const auto getParser =
+        reinterpret_cast<GetLangXMLParserFunction>(support::FindExport(m_languageModule, "GetLangXMLParser"));
+    if (getParser == nullptr) return false;
+    m_parser = getParser();
+    if (m_parser == nullptr) return false;
+    const std::u16string path = BesideLibrary(fileName);
+    return m_parser->Load(path.c_str()) || m_parser->Load(fileName);
+}
+
+// IMultiLingual is given out only when it has texts to give.
+Status VM_CALL CRsVelmoraLib::QueryInterface(const Guid* iid, void** out) {
+    IEffectLibrary* const library = this;
+    const Face faces[] = {{&kIidUnknown, library}, {&kIidEffectLibrary, library}};
+    Status status = FindFace(faces, iid, out);
+    if (status == kStatusNoInterface && m_hasLanguage) {
+        const Face textFaces[] = {{&kIidMultiLingual, static_cast<IMultiLingual*>(this)}};
+        status = FindFace(textFaces, iid, out);
+    }
+    if (status == kStatusOk) AddRef();
+    return status;
+}
+
+std::uint32_t VM_CALL CRsVelmoraLib::AddRef() {
+    return m_references.Add();
+}
+
+std::uint32_t VM_CALL CRsVelmoraLib::Release() {
+    const std::uint32_t left = m_references.Drop();
+    if (left != 0) return left;
+    const FloatGuard guard;
+    delete this;
+    return 0;
+}
+
+const char* VM_CALL CRsVelmoraLib::GetLibraryName() {
+    return kLibraryName;
+}
+
+IVideoEffect* VM_CALL CRsVelmoraLib::CreateEffect(std::uint32_t index) {
+    const FloatGuard guard;
+    return effects::CreateEffectByIndex(index);
+}
+
+std::int32_t VM_CALL CRsVelmoraLib::ShowHelp(void* owner, std::int32_t topic) {
+    constexpr std::int32_t kInViewer = 1;
+    return GetShellServices()->ShowHelp(owner, topic, kInViewer);
+}
+
+IShellServices* VM_CALL CRsVelmoraLib::GetShellServices() {
+    return &support::ShellServices();
+}
+
+IFrameProcessor* VM_CALL CRsVelmoraLib::CreateFrameProcessor() {
+    const FloatGuard guard;
+    return new (std::nothrow) FrameProcessor;
+}
+
+IPresetSaver* VM_CALL CRsVelmoraLib::CreatePresetSaver() {
+    const FloatGuard guard;
+    return velmora::CreatePresetSaver();
+}
+
+std::int32_t VM_CALL CRsVelmoraLib::LookUpText(std::intptr_t languageCode, std::intptr_t category,
+                                               std::intptr_t key, std::intptr_t fallback,
+                                               std::intptr_t buffer, std::intptr_t capacity,
+                                               std::intptr_t found) {
+    if (!m_hasLanguage || m_parser == nullptr) return 0;
+    const FloatGuard guard;
+    return m_parser->LookUpText(languageCode, category, key, fallback, buffer, capacity, found);
+}
+
+std::int32_t VM_CALL CRsVelmoraLib::GetText(const char* languageCode, std::int32_t category, const char* key,
+                                            char16_t* buffer, std::int32_t capacity) {
+    if (!m_hasLanguage || m_parser == nullptr) return 0;
+    const FloatGuard guard;
+    return m_parser->GetText(languageCode, category, key, buffer, capacity);
+}
+
+}  // namespace velmora

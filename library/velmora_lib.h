@@ -1,0 +1,49 @@
+// The library object: the one thing that a host gets from GetEffectsLibrary.
+#pragma once
+
+#include "language/lang_parser.h"
+#include "api/com_object.h"
+#include "api/host_api.h"
+#include "effects/process_state.h"
+#include "platform/platform.h"
+
+namespace velmora {
+
+class CRsVelmoraLib final : public DLLDependentObject, public IEffectLibrary, public IMultiLingual {
+  public:
+    // Offers the texts to the shell services, exposes the master settings and loads the language.
+    CRsVelmoraLib() noexcept;
+
+    Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
+    std::uint32_t VM_CALL AddRef() override;
+    std::uint32_t VM_CALL Release() override;
+
+    const char* VM_CALL GetLibraryName() override;
+    IVideoEffect* VM_CALL CreateEffect(std::uint32_t index) override;
+    std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic) override;
+    IShellServices* VM_CALL GetShellServices() override;
+    IFrameProcessor* VM_CALL CreateFrameProcessor() override;
+    IPresetSaver* VM_CALL CreatePresetSaver() override;
+
+    std::int32_t VM_CALL LookUpText(std::intptr_t languageCode, std::intptr_t category, std::intptr_t key,
+                                    std::intptr_t fallback, std::intptr_t buffer, std::intptr_t capacity,
+                                    std::intptr_t found) override;
+    std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
+                                 char16_t* buffer, std::int32_t capacity) override;
+
+  private:
+    ~CRsVelmoraLib() override;
+
+    // Loads the module, from beside the library or else by its bare name, and lets its parser load the file
+    // the same way. False when there is no module, no parser or no readable file, or a name is missing.
+    bool LoadLanguage(const char16_t* moduleName, const char16_t* fileName) noexcept;
+    // False when the module's "CanUnloadDLLNow" asks to be kept; the handle is then kept as well.
+    bool FreeLanguageModule() noexcept;
+
+    ReferenceCount m_references;
+    LangXMLParser* m_parser = nullptr;
+    support::ModuleHandle m_languageModule = nullptr;
+    bool m_hasLanguage = false;
+};
+
+}  // namespace velmora

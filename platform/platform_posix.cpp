@@ -1,0 +1,39 @@
+#include <dlfcn.h>
+
+#include <chrono>
+#include <filesystem>
+#include <system_error>
+
+#include "platform/platform.h"
+
+namespace velmora::support {
+
+std::uint32_t TickCount() noexcept {
+    const auto now = std::chrono::steady_clock::now().time_since_epoch();
+    return static_cast<std::uint32_t>(std::chrono::duration_cast<std::chrono::milliseconds>(now).count());
+}
+
+ModuleHandle LoadModule(const char16_t* name) noexcept try {
+    return dlopen(std::filesystem::path(name).c_str(), RTLD_NOW | RTLD_LOCAL);
+} catch (...) {
+    return nullptr;
+}
+
+void UnloadModule(ModuleHandle module) noexcept {
+    if (module != nullptr) dlclose(module);
+}
+
+void* FindExport(ModuleHandle module, const char* name) noexcept {
+    return dlsym(module, name);
+}
+
+// The native library is linked into its program, so every module's folder is the program's.
+std::u16string ModuleFolder(ModuleHandle) noexcept try {
+    std::error_code error;
+    const std::filesystem::path program = std::filesystem::read_symlink("/proc/self/exe", error);
+    return error ? std::u16string() : (program.parent_path() / "").u16string();
+} catch (...) {
+    return {};
+}
+
+}  // namespace velmora::support

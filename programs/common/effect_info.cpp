@@ -1,0 +1,87 @@
+#include "programs/common/effect_info.h"
+
+#include <algorithm>
+
+#include "programs/common/usage_error.h"
+
+namespace velmora::hosts {
+namespace {
+
+// Texts that fill their field carry no terminating zero.
+std::string FieldText(const char* field, std::size_t width) {
+    return std::string(field, std::find(field, field + width, '\0'));
+}
+
+char Lower(char c) {
+    return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
+}
+
+}  // namespace
+
+ParamInfo ReadDescriptor(const ParamDescriptor& descriptor) {
+    ParamInfo info;
+    info.name = FieldText(descriptor.name, kParamNameWidth);
+    info.kind = descriptor.kind;
+    info.defaultValue = descriptor.defaultValue;
+    if (info.kind == kKindSlider) {
+        info.minimum = descriptor.minimum.number;
+        info.maximum = descriptor.slider.maximum.number;
+    } else if (info.kind == kKindMenu) {
+        const auto count = std::min<std::uint32_t>(descriptor.minimum.count, kMenuItemCapacity);
+        for (std::uint32_t item = 0; item < count; ++item) {
+            info.items.push_back(FieldText(descriptor.itemTexts[item], kMenuTextWidth));
+        }
+    } else if (info.kind == kKindGroup) {
+        info.isGroupEnd = descriptor.minimum.flag != 0;
+    }
+    return info;
+}
+
+bool NamesAreEqual(std::string_view a, std::string_view b) {
+    return std::ranges::equal(a, b, [](char x, char y) { return Lower(x) == Lower(y); });
+}
+
+std::string QuotedList(std::span<const std::string> names) {
+    std::string list;
+    for (const std::string& name : names) {
+        if (!list.empty()) list += ", ";
+        list += '"' + name + '"';
+    }
+    return list;
+}
+
+std::size_t FindEffect(std::span<const EffectInfo> effects, std::string_view name) {
+    std::vector<std::string> names;
+    for (std::size_t i = 0; i < effects.size(); ++i) {
+        if (NamesAreEqual(effects[i].name, name)) return i;
+        names.push_back(effects[i].name);
+    }
+    throw UsageError("there is no effect \"" + std::string(name) + "\"; there are " + QuotedList(names));
+}
+
+std::uint32_t FindPreset(const EffectInfo& effect, std::string_view name) {
+    for (std::size_t i = 0; i < effect.presets.size(); ++i) {
+        if (NamesAreEqual(effect.presets[i], name)) return static_cast<std::uint32_t>(i);
+    }
+    throw UsageError('"' + effect.name + "\" has no preset \"" + std::string(name) + "\"; it has " +
+                     QuotedList(effect.presets));
+}
+
+const char* KindName(std::uint32_t kind) {
+    switch (kind) {
+        case kKindMenu:
+            return "menu";
+        case kKindSlider:
+            return "slider";
+        case kKindColour:
+            return "colour";
+        case kKindCheckBox:
+            return "check box";
+        case kKindGroup:
+            return "group";
+        default:
+            return "none";
+    }
+}
+
+}  // namespace velmora::hosts

@@ -1,0 +1,53 @@
+// One check of the library, and what it is given.
+#pragma once
+
+#include <cstdint>
+#include <span>
+#include <stdexcept>
+#include <string>
+
+#include "programs/reelcheck/dice.h"
+#include "programs/reelcheck/text.h"
+
+namespace velmora::reelcheck {
+
+inline constexpr int kLowestLevel = 1;
+inline constexpr int kHighestLevel = 10;
+inline constexpr int kUsualLevel = 5;
+
+// The library does not keep a promise. The text says where and how.
+class CheckFailed : public std::runtime_error {
+  public:
+    using std::runtime_error::runtime_error;
+};
+
+// Where a check is, for the report of a crash or a hang. Cheap: it may be set for every frame.
+void SetPlace(const char* format, ...) REELCHECK_PRINTF(1, 2);
+[[nodiscard]] const char* Place() noexcept;
+// Fails with the place in front of the text.
+[[noreturn]] void Fail(const std::string& text);
+
+inline void Require(bool holds, const char* text) {
+    if (!holds) Fail(text);
+}
+
+struct CheckContext {
+    std::string libraryPath;  // empty: the usual one
+    int level = kUsualLevel;
+    Dice dice;
+
+    // How often something is tried: `few` up to the usual level, `many` at the highest, a geometric way between.
+    [[nodiscard]] int Rounds(int few, int many) const;
+};
+
+struct Check {
+    const char* name;
+    int level;  // the lowest level that runs it
+    void (*run)(CheckContext& context);
+    const char* what;
+};
+
+// In the order in which they run: by level.
+[[nodiscard]] std::span<const Check> AllChecks();
+
+}  // namespace velmora::reelcheck

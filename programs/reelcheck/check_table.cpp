@@ -1,0 +1,54 @@
+#include "programs/reelcheck/checks.h"
+
+namespace velmora::reelcheck {
+namespace {
+
+// clang-format off
+constexpr Check kChecks[] = {
+    {"exports",           1, CheckExports,        "the two exports, and when the library may be unloaded"},
+    {"references",        1, CheckReferences,     "counts and faces of every object"},
+    {"descriptions",      1, CheckDescriptions,   "every parameter of every effect describes itself within its record"},
+    {"presets",           1, CheckPresets,        "every preset has a name and a fitting value for every parameter"},
+    {"first-frames",      1, CheckFirstFrames,    "every effect renders a frame"},
+    {"small-sizes",       2, CheckSmallSizes,     "frames from 1x1 on between forbidden pages, sources that cannot be written"},
+    {"null-arguments",    2, CheckNullArguments,  "null wherever a pointer is passed"},
+    {"refused-frames",    2, CheckRefusedFrames,  "frames that cannot be are refused, nothing is touched or asked"},
+    {"layouts",           3, CheckLayouts,        "odd steps, origins, bottom-up: the same picture"},
+    {"in-place",          3, CheckInPlace,        "source and destination in the same memory: the same picture"},
+    {"clamping",          3, CheckClamping,       "values beyond their range count as its end, not a number as 0"},
+    {"times",             3, CheckTimes,          "any time: negative, huge, not a number"},
+    {"replay",            3, CheckReplay,         "a frame that is repeated at once has the same bytes"},
+    {"converter",         3, CheckConverter,      "4:2:2 to 32-bit and back, small sizes between forbidden pages"},
+    {"overlaps",          4, CheckOverlaps,       "frames that share some of their memory: as if the source were copied first"},
+    {"menus",             4, CheckMenus,          "any menu index"},
+    {"hostile-values",    4, CheckHostileValues,  "random bits for every parameter"},
+    {"alternating",       4, CheckAlternating,    "effects and sizes in turn do not disturb each other"},
+    {"processor-state",   4, CheckProcessorState, "x87, vector control and direction flag in any state, and kept"},
+    {"stack",             4, CheckStack,          "a stack aligned to 4 bytes only"},
+    {"outliving",         4, CheckOutliving,      "objects work on when the library object is gone"},
+    {"loading",           4, CheckLoading,         "200 rounds of loading and unloading: handles, modules and memory stay"},
+    {"preset-files",      5, CheckPresetFiles,     "every preset through a file and back, dialogs cancelled, nowhere to write"},
+    {"table-allocations", 5, CheckTableAllocations,"describing allocates nothing"},
+    {"frame-allocations", 5, CheckFrameAllocations,"rendering works in kept buffers"},
+    {"load-failures",     5, CheckLoadFailures,    "each allocation of loading fails once"},
+    {"create-failures",   5, CheckCreateFailures,  "each allocation of creating an object fails once"},
+    {"frame-failures",    5, CheckFrameFailures,   "each allocation of a frame fails once"},
+    {"preset-failures",   5, CheckPresetFailures,  "each allocation of saving and loading a preset fails once"},
+    {"threads",           6, CheckThreads,        "counting on several threads at once, frames on one after the other"},
+    {"random-shapes",     6, CheckRandomShapes,   "random sizes, origins, steps, values and times together"},
+    {"converter-shapes",  6, CheckConverterShapes,"random shapes for the converter"},
+    {"dialog-failures",   6, CheckDialogFailures,  "each allocation of the options and help fails once"},
+    {"video-sizes",       7, CheckVideoSizes,     "every preset at sizes that videos have"},
+    {"system-dialogs",    8, CheckSystemDialogs,   "the system's own dialogs, cancelled"},
+    {"endurance",         8, CheckEndurance,       "thousands of frames with changing presets: nothing grows"},
+    {"largest-sizes",     9, CheckLargestSizes,   "every effect at up to 8192x4320"},
+};
+// clang-format on
+
+}  // namespace
+
+std::span<const Check> AllChecks() {
+    return kChecks;
+}
+
+}  // namespace velmora::reelcheck

@@ -1,0 +1,188 @@
+// The objects: exports, counts, faces, null pointers, lifetime, threads.
+
+#include <cstring>
+#include <thread>
+#include <vector>
+
+#include "programs/reelcheck/checks.h"
+#include "programs/reelcheck/library.h"
+#include "programs/reelcheck/playing_host.h"
+
+namespace velmora::reelcheck {
+
+void CheckExports(CheckContext& context) {
+    const Library library(context.libraryPath);
+    Require(library.canUnload(), "a fresh library says that it must not be unloaded");
+    Owned<IEffectLibrary> first = library.Open(), second = library.Open();
+    Require(first != second, "two calls give one library object");
+    Require(!library.canUnload(), "the library may be unloaded while an object lives");
+    first.reset();
+    Require(!library.canUnload(), "the library may be unloaded while a second object lives");
+    Require(std::strlen(second->GetLibraryName()) > 0, "the library has no name");
+    Require(second->GetShellServices() != nullptr, "the library has no shell services");
+    for (std::uint32_t i = 0; i < kEffectCount; ++i) {
+        Require(Owned<IVideoEffect>(second->CreateEffect(i)) != nullptr, "an effect is missing");
+    }
+    for (const std::uint32_t index : {kEffectCount, 100u, 0x80000000u, 0xFFFFFFFFu}) {
+        Require(second->CreateEffect(index) == nullptr, "there is an effect behind the last");
+    }
+    second.reset();
+    Require(library.canUnload(), "the library may not be unloaded when its last object is gone");
+}
+
+namespace {
+
+constexpr Guid kStranger = {1, 2, 3, {4, 5, 6, 7, 8, 9, 10, 11}};
+
+// Every object answers to IUnknown and to its own identifier, if it has one, and to no other.
+void CheckFaces(IUnknown& object, const Guid* own) {
+    void* face = nullptr;
+    Require(object.QueryInterface(&kIidUnknown, &face) == kStatusOk && face == &object,
+            "does not answer to IUnknown with itself");
+    Require(object.Release() == 1, "QueryInterface does not count");
+    if (own != nullptr) {
+        Require(object.QueryInterface(own, &face) == kStatusOk && face == &object,
+                "does not answer to its own identifier");
+        Require(object.Release() == 1, "QueryInterface does not count");
+    }
+    face = &object;
+    Require(object.QueryInterface(&kStranger, &face) == kStatusNoInterface && face == nullptr,
+            "does not refuse a stranger's identifier");
+    face = &object;
+    Require(object.QueryInterface(nullptr, &face) == kStatusNoInterface && face == nullptr,
+            "does not refuse a null identifier");
+    Require(object.QueryInterface(&kIidUnknown, nullptr) == kStatusFailure, "does not refuse a null place");
+}
+
+void CheckCounts(IUnknown& object) {
+    constexpr std::uint32_t kMany = 1000;
+    for (std::uint32_t i = 0; i < kMany; ++i) Require(object.AddRef() == i + 2, "AddRef counts wrongly");
+    for (std::uint32_t i = kMany; i > 0; --i) Require(object.Release() == i, "Release counts wrongly");
+}
+
+void CheckObject(const char* name, IUnknown& object, const Guid* own) {
+    SetPlace("%s", name);
+    CheckFaces(object, own);
+    CheckCounts(object);
+}
+
+}  // namespace
+
+void CheckReferences(CheckContext& context) {
+    const OpenLibrary library(context.libraryPath);
+    CheckObject("library", *library.Get(), &kIidEffectLibrary);
+    CheckObject("frame processor", *library.Processor(), nullptr);
+    CheckObject("preset saver", *library.Saver(), &kIidPresetSaver);
+    for (std::uint32_t i = 0; i < kEffectCount; ++i) {
+        const Owned<IVideoEffect> effect = library.Effect(i);
+        CheckObject(effect->GetName(), *effect, &kIidVideoEffect);
+        void* face = nullptr;
+        Require(effect->QueryInterface(&kIidVideoHost, &face) == kStatusOk, "an effect has no host's face");
+        static_cast<IVideoHost*>(face)->Release();
+    }
+}
+
+void CheckNullArguments(CheckContext& context) {
+    const OpenLibrary library(context.libraryPath);
+    const Frame frame(Layout{8, 6});
+    const FrameRecord record = frame.Record();
+    const TimingRecord timing = {0, 0, 1.0};
+    for (std::uint32_t i = 0; i < kEffectCount; ++i) {
+        const Owned<IVideoEffect> effect = library.Effect(i);
+        SetPlace("%s", effect->GetName());
+        PlayingHost host;
+        Require(!effect->GetParamInfo(0, nullptr), "describes a parameter into nothing");
+        Require(!effect->GetPresetValue(0, 0, nullptr), "copies a preset's value into nothing");
+        Require(!effect->Process(&host, nullptr, nullptr, &record, &timing), "renders without a source");
+        Require(!effect->Process(&host, &record, nullptr, nullptr, &timing), "renders without a destination");
+        Require(!effect->Process(&host, &record, nullptr, &record, nullptr), "renders without a time");
+        Require(!effect->Process(nullptr, nullptr, nullptr, nullptr, nullptr), "renders without anything");
+        Require(effect->Process(nullptr, &record, nullptr, &record, &timing),
+                "does not render without a host");
+        void* face = nullptr;
+        Require(effect->QueryInterface(&kStranger, &face) == kStatusNoInterface,
+                "asks a host that there is not about a stranger");
+    }
+    SetPlace("frame processor");
+    const Owned<IFrameProcessor> processor = library.Processor();
+    Require(!processor->ConvertYcbcrToBgra(nullptr, &record, 0) &&
+                !processor->ConvertYcbcrToBgra(&record, nullptr, 0) &&
+                !processor->ConvertBgraToYcbcr(nullptr, &record, 0) &&
+                !processor->ConvertBgraToYcbcr(&record, nullptr, 0),
+            "converts from or to nothing");
+    Require(!processor->Reserved3(nullptr, nullptr, 0) && !processor->Reserved4(nullptr, nullptr, 0) &&
+                !processor->Reserved5(nullptr, nullptr, 0),
+            "a reserved operation does something");
+    SetPlace("texts");
+    void* face = nullptr;
+    if (library->QueryInterface(&kIidMultiLingual, &face) != kStatusOk) return;
+    const Owned<IMultiLingual> texts(static_cast<IMultiLingual*>(face));
+    char16_t buffer[4] = {u'?', u'?', u'?', u'?'};
+    for (const char* code : {static_cast<const char*>(nullptr), "", "x", "en", "english", "\xFF\xFF"}) {
+        for (const char* key : {static_cast<const char*>(nullptr), "", "no such key"}) {
+            Require(texts->GetText(code, 4, key, buffer, 4) == 0, "finds a text for nothing");
+            Require(texts->GetText(code, -1, key, nullptr, 4) == 0, "writes a text to nowhere");
+            Require(texts->GetText(code, 4, key, buffer, -5) == 0, "writes a text of negative size");
+            Require(texts->LookUpText(reinterpret_cast<std::intptr_t>(code), 4,
+                                      reinterpret_cast<std::intptr_t>(key), 0, 0, 0, 0) == 0,
+                    "finds a text for nothing");
+        }
+    }
+}
+
+void CheckOutliving(CheckContext& context) {
+    OpenLibrary library(context.libraryPath);
+    std::vector<Owned<IVideoEffect>> effects;
+    for (std::uint32_t i = 0; i < kEffectCount; ++i) effects.push_back(library.Effect(i));
+    const Owned<IFrameProcessor> processor = library.Processor();
+    const Owned<IPresetSaver> saver = library.Saver();
+    library.Close();
+    Frame source(Layout{40, 30}), destination(Layout{40, 30}), packed(Layout{40, 30}, Packing::kYcbcr);
+    source.Paint(context.dice);
+    for (const Owned<IVideoEffect>& effect : effects) {
+        SetPlace("%s", effect->GetName());
+        PlayingHost host;
+        ChooseFull(host, EffectFacts::Of(*effect));
+        for (int i = 0; i < 3; ++i) RenderInside(*effect, host, source, destination, i / 30.0);
+    }
+    SetPlace("frame processor");
+    const FrameRecord from = source.Record(), to = packed.Record();
+    Require(processor->ConvertBgraToYcbcr(&from, &to, 0), "does not convert");
+    CheckObject("preset saver", *saver, &kIidPresetSaver);
+}
+
+void CheckThreads(CheckContext& context) {
+    const OpenLibrary library(context.libraryPath);
+    const Owned<IVideoEffect> effect = library.Effect(4);
+    const EffectFacts facts = EffectFacts::Of(*effect);
+    SetPlace("counting");
+    constexpr int kThreads = 4;
+    const int rounds = context.Rounds(5000, 500000);
+    std::vector<std::thread> counting;
+    counting.reserve(kThreads);
+    for (int i = 0; i < kThreads; ++i) {
+        counting.emplace_back([&effect, rounds] {
+            for (int k = 0; k < rounds; ++k) effect->AddRef(), effect->Release();
+        });
+    }
+    for (std::thread& thread : counting) thread.join();
+    Require(effect->AddRef() == 2 && effect->Release() == 1, "a count is lost between threads");
+    SetPlace("rendering");
+    Frame source(Layout{64, 48}), destination(Layout{64, 48});
+    source.Paint(context.dice);
+    PlayingHost host;
+    ChooseFull(host, facts);
+    RenderInside(*effect, host, source, destination, 1.0);
+    const std::uint64_t expected = destination.Digest();
+    for (int i = 0; i < context.Rounds(20, 500); ++i) {
+        std::uint64_t digest = 0;
+        std::thread([&] {
+            const TimingRecord timing = {0, 0, 1.0};
+            const FrameRecord from = source.Record(), to = destination.Record();
+            if (effect->Process(&host, &from, nullptr, &to, &timing)) digest = destination.Digest();
+        }).join();
+        Require(digest == expected, "another thread gets another picture");
+    }
+}
+
+}  // namespace velmora::reelcheck

@@ -1,0 +1,62 @@
+// The host's side of an effect at work: answers what the effect asks with values that a check chooses.
+#pragma once
+
+#include <array>
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "programs/reelcheck/dice.h"
+#include "programs/reelcheck/frame.h"
+#include "api/host_api.h"
+
+namespace velmora::reelcheck {
+
+class PlayingHost final : public IVideoHost {
+  public:
+    static constexpr std::uint32_t kCapacity = 64;
+
+    std::array<ValueWord, kCapacity> values = {};
+    bool answers = true;          // false: every question fails and no cell is written
+    bool spoilsRounding = false;  // every answer leaves other floating-point control words behind
+    std::uint32_t questions = 0;
+
+    Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
+    std::uint32_t VM_CALL AddRef() override { return 1; }  // lives as long as its check
+    std::uint32_t VM_CALL Release() override { return 1; }
+    bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override;
+    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) override { return false; }
+    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) override { return 0; }
+    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return false; }
+    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
+};
+
+// What an effect tells of itself.
+struct EffectFacts {
+    std::string name;
+    std::vector<ParamDescriptor> params;
+    std::vector<std::string> presets;
+
+    [[nodiscard]] static EffectFacts Of(IVideoEffect& effect);
+    // The first preset of that name; throws CheckFailed when there is none.
+    [[nodiscard]] std::uint32_t Preset(const char* wanted) const;
+};
+
+[[nodiscard]] std::string ParamName(const ParamDescriptor& descriptor);
+
+// Sets of values. The effect's own preset; anything a control can show, with much of it on; anything at all.
+void ChoosePreset(PlayingHost& host, IVideoEffect& effect, std::uint32_t preset);
+void ChooseFair(PlayingHost& host, const EffectFacts& facts, Dice& dice);
+void ChooseHostile(PlayingHost& host, const EffectFacts& facts, Dice& dice);
+// Everything on, as far as it goes.
+void ChooseFull(PlayingHost& host, const EffectFacts& facts);
+
+[[nodiscard]] bool Process(IVideoEffect& effect, IVideoHost* host, const FrameRecord& source,
+                           const FrameRecord& destination, double seconds);
+
+// Renders into a destination filled with a value, and fails when the effect refuses, or writes outside the smaller of
+// the two regions.
+void RenderInside(IVideoEffect& effect, IVideoHost& host, const Frame& source, Frame& destination,
+                  double seconds);
+
+}  // namespace velmora::reelcheck

@@ -1,0 +1,46 @@
+#include <windows.h>
+#include <psapi.h>
+#include <tlhelp32.h>
+
+#include "programs/reelcheck/process_figures.h"
+
+namespace velmora::reelcheck {
+namespace {
+
+std::int64_t ThreadCount() {
+    const HANDLE snapshot = CreateToolhelp32Snapshot(TH32CS_SNAPTHREAD, 0);
+    if (snapshot == INVALID_HANDLE_VALUE) return 0;
+    std::int64_t count = 0;
+    THREADENTRY32 thread = {};
+    thread.dwSize = sizeof thread;
+    for (BOOL found = Thread32First(snapshot, &thread); found; found = Thread32Next(snapshot, &thread)) {
+        if (thread.th32OwnerProcessID == GetCurrentProcessId()) ++count;
+    }
+    CloseHandle(snapshot);
+    return count;
+}
+
+}  // namespace
+
+ProcessFigures FiguresNow() {
+    ProcessFigures figures;
+    const HANDLE process = GetCurrentProcess();
+    DWORD handles = 0, moduleBytes = 0;
+    GetProcessHandleCount(process, &handles);
+    figures.handles = handles;
+    HMODULE modules[512];
+    EnumProcessModules(process, modules, sizeof modules, &moduleBytes);
+    figures.modules = static_cast<std::int64_t>(moduleBytes / sizeof modules[0]);
+    figures.threads = ThreadCount();
+    PROCESS_MEMORY_COUNTERS counters = {};
+    GetProcessMemoryInfo(process, &counters, sizeof counters);
+    figures.memoryBytes = static_cast<std::int64_t>(counters.PagefileUsage);
+    const DWORD slot = TlsAlloc();  // the lowest that is free
+    figures.threadSlots = slot;
+    if (slot != TLS_OUT_OF_INDEXES) TlsFree(slot);
+    figures.windowObjects = GetGuiResources(process, GR_USEROBJECTS);
+    figures.drawingObjects = GetGuiResources(process, GR_GDIOBJECTS);
+    return figures;
+}
+
+}  // namespace velmora::reelcheck

@@ -1,0 +1,164 @@
+#include "programs/reelfx/commands/command_options.h"
+
+#include <CLI/CLI.hpp>
+
+namespace velmora::hosts {
+namespace {
+
+void AddInput(CLI::App& command, TypedOptions& typed) {
+    command
+        .add_option("IN", typed.input.path, "Clip, still, image sequence (frames-%03d.png) or - (YUV4MPEG2)")
+        ->type_name("FILE")
+        ->required();
+    command.add_option("--size", typed.size, "IN is raw BGRA of this size")->type_name("WxH");
+    command.add_option("--rate", typed.rate, "Frame rate of raw BGRA and image sequences")->type_name("FPS");
+}
+
+void AddEffect(CLI::App& command, TypedOptions& typed) {
+    command.add_option("--effect,-e", typed.effect.effect, "Effect, see reelfx list")
+        ->type_name("EFFECT")
+        ->envname("REELFX_EFFECT");
+    command.add_option("--preset,-p", typed.preset, "Preset of the effect")->type_name("PRESET");
+    command.add_option("--preset-file", typed.presetFile, "Preset file, as editors save it")
+        ->type_name("FILE");
+    command.add_option("--set,-s", typed.effect.settings, "One parameter, after the preset; repeatable")
+        ->type_name("NAME=VALUE")
+        ->allow_extra_args(false);
+}
+
+void AddRandom(CLI::App& command, TypedOptions& typed) {
+    command.add_option("--seed", typed.seed, "Another seed gives other damage")
+        ->type_name("N")
+        ->capture_default_str()
+        ->envname("REELFX_SEED");
+    command
+        .add_option("--random-state", typed.randomState,
+                    "Play one random sequence from this state, as a host of the library does")
+        ->type_name("HEX");
+}
+
+void AddRender(CLI::App& app, TypedOptions& typed) {
+    CLI::App& render = *app.add_subcommand("render", "Render a clip through an effect");
+    AddInput(render, typed);
+    render.add_option("OUT", typed.outPath, "File, image pattern, or - (YUV4MPEG2)")->type_name("FILE");
+    AddEffect(render, typed);
+    AddRandom(render, typed);
+    render.add_option("--frames", typed.frames, "Frames A up to but not including B; either may be left out")
+        ->type_name("A:B");
+    render
+        .add_option(
+            "--farm", typed.farm,
+            "Part N of M parts of about the same length, without sound, for rendering one clip on many "
+            "machines; farm-join puts the parts together")
+        ->type_name("N/M");
+    render.add_option("--start", typed.start, "Begin at this time of the clip")->type_name("TIME");
+    render.add_option("--duration", typed.duration, "Length of the part")->type_name("TIME");
+    render.add_option("--threads,-j", typed.threads, "Frames rendered at once; 0: all processors")
+        ->type_name("N")
+        ->check(CLI::Range(0, 256))
+        ->envname("REELFX_THREADS");
+    render.add_option("--format", typed.format, "Container, where OUT's ending does not tell")
+        ->type_name("FORMAT");
+    render.add_option("--codec", typed.codec, "Codec of the picture")
+        ->type_name("CODEC")
+        ->envname("REELFX_CODEC");
+    render.add_option("--crf", typed.crf, "Quality in the codec's own scale")
+        ->type_name("N")
+        ->envname("REELFX_CRF");
+    render.add_option("--pix-fmt", typed.pixelFormat, "Pixel format; default: the source's")
+        ->type_name("NAME")
+        ->envname("REELFX_PIX_FMT");
+    render.add_flag(
+        "--matte", typed.matte,
+        "Write the damage alone (wear, spots, scratches) on transparent, with straight alpha and without "
+        "sound, to lay over the picture in other programs");
+    render.add_flag("--raw-bgra", typed.output.isRawBgra, "OUT is raw BGRA frames");
+    render.add_flag("--hash", typed.digests, "Print the MD5 of each frame's BGRA; OUT may be left out");
+    render.add_flag("--no-sound", typed.noSound, "Leave sound and subtitles out");
+    render.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
+    render
+        .add_option(
+            "--progress", typed.progress,
+            "On standard error: text for people, a line of JSON each time for programs; auto is text at a "
+            "terminal, else none")
+        ->type_name("auto|none|text|json")
+        ->capture_default_str()
+        ->envname("REELFX_PROGRESS");
+    render.add_flag("--quiet,-q", typed.quiet, "As --progress none");
+    render.add_flag("--dry-run", typed.dryRun,
+                    "Check everything and tell what would be done, but write nothing");
+}
+
+CLI::App& AddPicture(CLI::App& app, TypedOptions& typed, const char* name, const char* what) {
+    CLI::App& command = *app.add_subcommand(name, what);
+    AddInput(command, typed);
+    command.add_option("OUT", typed.picture.out, "PNG or JPEG")->type_name("FILE")->required();
+    AddEffect(command, typed);
+    AddRandom(command, typed);
+    command.add_option("--frame,-n", typed.picture.frame, "Frame of the clip, counted from 0")
+        ->type_name("N")
+        ->check(CLI::NonNegativeNumber);
+    command.add_option("--width", typed.picture.width, "Width of each picture in pixels")
+        ->type_name("W")
+        ->check(CLI::Range(16, 8192));
+    command.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
+    return command;
+}
+
+void AddPreset(CLI::App& app, TypedOptions& typed) {
+    CLI::App& preset = *app.add_subcommand("preset", "Show and save preset files");
+    preset.require_subcommand(1);
+    CLI::App& show = *preset.add_subcommand("show", "Print what a preset file holds");
+    show.add_option("FILE", typed.presetShow.file, "Preset file")->type_name("FILE")->required();
+    show.add_flag("--json", typed.presetShow.asJson, "As JSON");
+    CLI::App& save = *preset.add_subcommand("save", "Write settings as a preset file");
+    save.add_option("FILE", typed.presetSave.file, "Preset file")->type_name("FILE")->required();
+    AddEffect(save, typed);
+    save.add_option("--name", typed.presetSave.name, "The preset's name; default: the file's")
+        ->type_name("TEXT");
+    save.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing FILE");
+}
+
+void AddList(CLI::App& app, TypedOptions& typed) {
+    CLI::App& list = *app.add_subcommand("list", "List effects, parameters and presets");
+    list.add_option("EFFECT", typed.listEffect, "Only this effect")->type_name("EFFECT");
+    list.add_flag("--json", typed.list.asJson, "As JSON");
+    CLI::App& presets = *app.add_subcommand("presets", "List an effect's presets with what each one sets");
+    presets.add_option("EFFECT", typed.presets.effect, "The effect")->type_name("EFFECT")->required();
+    presets.add_flag("--json", typed.presets.asJson, "As JSON");
+}
+
+void AddInfo(CLI::App& app, TypedOptions& typed) {
+    CLI::App& info = *app.add_subcommand("info", "Tell what a clip is and what rendering would do with it");
+    AddInput(info, typed);
+    info.add_flag("--json", typed.info.asJson, "As JSON");
+}
+
+std::string ExitCodesText() {
+    std::string text = "Exit codes:";
+    for (const ExitMeaning& exit : kExitMeanings) {
+        text += (exit.code == kExitDone ? " " : ", ") + std::to_string(exit.code) + ' ' + exit.meaning;
+    }
+    return text + ".\n" + kOnInterrupt;
+}
+
+}  // namespace
+
+void AddCommands(CLI::App& app, TypedOptions& typed) {
+    app.name("reelfx");
+    app.description("The look of old film for any footage.");
+    app.footer(ExitCodesText());
+    app.set_version_flag("--version", std::string("reelfx ") + kReelfxVersion);
+    app.require_subcommand(1);
+    AddList(app, typed);
+    AddRender(app, typed);
+    AddPicture(app, typed, "frame", "Write one frame before and after, side by side");
+    AddPicture(app, typed, "sheet", "Write one frame through all presets of an effect")
+        .add_option("--columns", typed.picture.columns, "Pictures in a row")
+        ->type_name("N")
+        ->check(CLI::Range(1, 32));
+    AddPreset(app, typed);
+    AddInfo(app, typed);
+}
+
+}  // namespace velmora::hosts

@@ -1,0 +1,17 @@
+// `reelfx info`: what a clip is, and what rendering would do with it.
+#pragma once
+
+#include "programs/reelfx/common/failure.h"
+#include "programs/reelfx/media/media_reader.h"
+
+namespace velmora::hosts {
+
+struct InfoOptions {
+    InputOptions input;
+    bool asJson = false;
+};
+
+// Throws Failure.
+ExitCode RunInfo(const InfoOptions& options);
+
+}  // namespace velmora::hosts

@@ -1,0 +1,57 @@
+#include "programs/reelfx/commands/preset_command.h"
+
+#include <cstdio>
+#include <filesystem>
+#include <nlohmann/json.hpp>
+
+#include "programs/reelfx/common/preset_io.h"
+
+namespace velmora::hosts {
+namespace {
+
+using Json = nlohmann::ordered_json;
+
+Json JsonOf(const PresetRecord& record, const EffectInfo& effect, const std::vector<Setting>& settings) {
+    Json values = Json::array();
+    for (const Setting& setting : settings) {
+        const ParamInfo& param = effect.params[setting.parameter];
+        values.push_back({{"name", param.name},
+                          {"kind", KindName(param.kind)},
+                          {"value", ShownValue(param, setting.value)}});
+    }
+    return {{"name", PresetName(record)}, {"effect", effect.name}, {"parameters", values}};
+}
+
+}  // namespace
+
+ExitCode RunPresetShow(const PresetShowOptions& options) {
+    const PresetRecord record = LoadPresetFile(options.file);
+    const EffectChoice choice({.presetFile = options.file});
+    const EffectInfo& effect = choice.Info();
+    const std::vector<Setting> settings = PresetSettings(record, effect, options.file);
+    if (options.asJson) {
+        // Names in preset files are 8-bit text of any code page: what is no UTF-8 is replaced.
+        const Json json = JsonOf(record, effect, settings);
+        std::printf("%s\n", json.dump(2, ' ', false, Json::error_handler_t::replace).c_str());
+        return kExitDone;
+    }
+    std::printf("%s\n%s\n", PresetName(record).c_str(), effect.name.c_str());
+    for (const Setting& setting : settings) {
+        const ParamInfo& param = effect.params[setting.parameter];
+        std::printf("  %-18s %s\n", param.name.c_str(), ShownValue(param, setting.value).c_str());
+    }
+    return kExitDone;
+}
+
+ExitCode RunPresetSave(const PresetSaveOptions& options) {
+    const EffectChoice choice(options.effect);
+    const auto session = choice.NewSession();
+    std::vector<ValueWord> values;
+    for (std::uint32_t i = 0; i < choice.Info().params.size(); ++i) values.push_back(session->Value(i));
+    const std::string name =
+        options.name.empty() ? std::filesystem::path(options.file).stem().string() : options.name;
+    SavePresetFile(options.file, name, choice.Info(), values, options.mayOverwrite);
+    return kExitDone;
+}
+
+}  // namespace velmora::hosts

@@ -1,0 +1,27 @@
+// `reelfx preset show` and `reelfx preset save`: preset files that an editor's users exchange.
+#pragma once
+
+#include <string>
+
+#include "programs/reelfx/common/effect_choice.h"
+#include "programs/reelfx/common/failure.h"
+
+namespace velmora::hosts {
+
+struct PresetShowOptions {
+    std::string file;
+    bool asJson = false;
+};
+
+struct PresetSaveOptions {
+    std::string file;
+    std::string name;  // empty: the file's name without its ending
+    EffectOptions effect;
+    bool mayOverwrite = false;
+};
+
+// Throw Failure or UsageError.
+ExitCode RunPresetShow(const PresetShowOptions& options);
+ExitCode RunPresetSave(const PresetSaveOptions& options);
+
+}  // namespace velmora::hosts

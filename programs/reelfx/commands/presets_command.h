@@ -1,0 +1,18 @@
+// `reelfx presets`: the built-in presets of an effect with what each one sets.
+#pragma once
+
+#include <string>
+
+#include "programs/reelfx/common/failure.h"
+
+namespace velmora::hosts {
+
+struct PresetsOptions {
+    std::string effect;
+    bool asJson = false;
+};
+
+// Throws UsageError when there is no such effect.
+ExitCode RunPresets(const PresetsOptions& options);
+
+}  // namespace velmora::hosts

@@ -1,0 +1,162 @@
+#include "programs/reelfx/commands/render_command.h"
+
+#include <cstdio>
+#include <thread>
+
+#include "programs/common/digest.h"
+#include "text/number_text.h"
+#include "programs/reelfx/pipeline/frame_worker.h"
+#include "programs/reelfx/common/interrupt.h"
+#include "programs/reelfx/pictures/matte.h"
+#include "programs/reelfx/common/output_place.h"
+#include "programs/reelfx/media/picture_turn.h"
+#include "programs/reelfx/commands/render_plan.h"
+
+namespace velmora::hosts {
+namespace {
+
+class RenderRun {
+  public:
+    explicit RenderRun(const RenderOptions& options)
+        : m_options(options),
+          m_choice(options.effect),
+          m_section(options.section.farm
+                        ? ResolveFarm(*options.section.farm, MediaReader::FrameTimes(options.input))
+                        : options.section),
+          m_reader(options.input) {
+        if (options.isMatte) CheckMatte(m_choice);
+        if (!options.output) return;
+        const std::int64_t firstImage = m_section.firstFrame + 1;
+        if (options.isDryRun) {
+            CheckOutputPlace(options.output->path, options.mayOverwrite, firstImage);
+        } else {
+            m_place.emplace(options.output->path, options.mayOverwrite, firstImage);
+        }
+        const std::string address = m_place ? m_place->Address() : options.output->path;
+        m_writer.emplace(*options.output, address, m_reader, options.withSound);
+        if (firstImage > 1) m_writer->NumberImagesFrom(firstImage);
+    }
+
+    // Everything but the frames.
+    ExitCode Rehearse() {
+        const std::int64_t frames = ClipSection::FrameCountGuess(m_reader, m_section);
+        if (frames == 0 && m_reader.FrameCountGuess() > 0) FailEmpty();
+        if (m_writer) m_writer->Rehearse(frames);
+        const std::string text = PlanText(m_options, m_section, m_choice, m_reader,
+                                          m_writer ? &*m_writer : nullptr, ThreadCount());
+        std::fputs(text.c_str(), stdout);
+        return kExitDone;
+    }
+
+    ExitCode Run() {
+        if (m_writer) m_writer->Begin();
+        Progress progress(ClipSection::FrameCountGuess(m_reader, m_section), m_options.progress);
+        RenderAll(progress);
+        if (Interrupts() > 0) FinishPart("interrupted", kExitInterrupted);
+        if (!m_reader.BreakOff().empty())
+            FinishPart(m_reader.Name() + ": " + m_reader.BreakOff(), kExitInput);
+        if (m_frames == 0) FailEmpty();
+        TellOfDamage();
+        if (m_writer) {
+            m_writer->Finish();
+            m_place->Keep();
+        }
+        progress.End();
+        return kExitDone;
+    }
+
+  private:
+    void RenderAll(Progress& progress) {
+        ClipSection section(m_reader, m_section);
+        FramePipeline pipeline([&] { return section.Next(); }, MakeWorkers());
+        while (const PipelineItemPtr item = pipeline.Next()) {
+            if (Interrupts() > 1) throw Failure(kExitInterrupted, "interrupted; nothing was kept");
+            Write(*item);
+            if (!item->packet) progress.Update(++m_frames);
+        }
+    }
+
+    [[nodiscard]] unsigned ThreadCount() const {
+        // A running sequence of random numbers goes through the frames one after the other.
+        if (m_choice.IsSequence()) return 1;
+        return m_options.threads > 0 ? static_cast<unsigned>(m_options.threads)
+                                     : std::max(1u, std::thread::hardware_concurrency());
+    }
+
+    std::vector<FramePipeline::Worker> MakeWorkers() {
+        const unsigned count = ThreadCount();
+        const AVFrame& first = m_reader.FirstFrame();
+        const FrameWorker::Job job = {.writer = m_writer ? &*m_writer : nullptr,
+                                      .size = {first.width, first.height},
+                                      .quarterTurns = QuarterTurnsOf(m_reader.Picture()),
+                                      .withDigest = m_options.withDigests,
+                                      .isMatte = m_options.isMatte};
+        std::vector<FramePipeline::Worker> workers;
+        for (unsigned i = 0; i < count; ++i) {
+            auto worker = std::make_shared<FrameWorker>(m_choice.NewSession(), job);
+            workers.emplace_back([worker](PipelineItem& item) { worker->Work(item); });
+        }
+        return workers;
+    }
+
+    void Write(PipelineItem& item) {
+        if (item.packet) {
+            if (m_writer) m_writer->WritePacket(*item.packet);
+            return;
+        }
+        if (m_options.withDigests && std::printf("%s\n", DigestLine(item.index, item.digest).c_str()) < 0) {
+            throw Failure(kExitOutput, "standard output cannot be written");
+        }
+        if (!m_writer) return;
+        if (m_frames == 0 && !m_section.IsWholeClip()) m_writer->StartAt(item.frame->pts);
+        m_writer->WriteFrame(std::move(item.frame));
+    }
+
+    // One line of what the clip lacks; what could be decoded was rendered.
+    void TellOfDamage() const {
+        const double missing = m_reader.MissingSeconds();
+        std::string what;
+        if (m_reader.DamagedPackets() > 0) {
+            what = "damaged in " + std::to_string(m_reader.DamagedPackets()) + " places";
+        }
+        if (missing > 0.0)
+            what += (what.empty() ? "ends " : ", ends ") + NumberText(missing) + " s too early";
+        if (what.empty()) return;
+        std::fprintf(stderr, "reelfx: %s: %s; what could be decoded was rendered\n", m_reader.Name().c_str(),
+                     what.c_str());
+    }
+
+    // A file that stood there before is worth more than a part of its successor.
+    [[noreturn]] void FinishPart(const std::string& why, ExitCode code) {
+        if (!m_writer || m_frames == 0 || m_place->ReplacesFile()) {
+            throw Failure(code, why + "; nothing was written");
+        }
+        m_writer->Finish();
+        m_place->Keep();
+        throw Failure(
+            code, why + "; " + m_place->Name() + " holds the first " + std::to_string(m_frames) + " frames");
+    }
+
+    [[noreturn]] void FailEmpty() const {
+        throw Failure(kExitInput, m_reader.Name() +
+                                      ": there is no frame in the part asked for; the clip has " +
+                                      std::to_string(m_reader.FrameCountGuess()) + " frames");
+    }
+
+    const RenderOptions& m_options;
+    EffectChoice m_choice;
+    SectionOptions m_section;
+    MediaReader m_reader;
+    std::optional<OutputPlace> m_place;
+    std::optional<MediaWriter> m_writer;
+    std::int64_t m_frames = 0;
+};
+
+}  // namespace
+
+ExitCode RunRender(const RenderOptions& options) {
+    RenderRun run(options);
+    return options.isDryRun ? run.Rehearse() : run.Run();
+}
+
+}  // namespace velmora::hosts

@@ -1,0 +1,32 @@
+// `reelfx render`: a clip through an effect.
+#pragma once
+
+#include <optional>
+
+#include "programs/reelfx/pipeline/clip_section.h"
+#include "programs/reelfx/common/effect_choice.h"
+#include "programs/reelfx/media/encoder_choice.h"
+#include "programs/reelfx/common/failure.h"
+#include "programs/reelfx/media/media_reader.h"
+#include "programs/reelfx/common/progress.h"
+
+namespace velmora::hosts {
+
+struct RenderOptions {
+    InputOptions input;
+    EffectOptions effect;
+    SectionOptions section;
+    std::optional<OutputOptions> output;  // none: digests only
+    int threads = 0;                      // 0: as many as the machine has
+    bool mayOverwrite = false;
+    bool withSound = true;
+    bool withDigests = false;  // a line for each frame on standard output
+    bool isMatte = false;      // the damage alone, without the picture
+    bool isDryRun = false;     // checks and tells, but writes nothing
+    ProgressKind progress = ProgressKind::kAuto;
+};
+
+// Throws Failure or UsageError.
+ExitCode RunRender(const RenderOptions& options);
+
+}  // namespace velmora::hosts

@@ -1,0 +1,63 @@
+#include "programs/reelfx/commands/render_plan.h"
+
+#include "text/number_text.h"
+#include "programs/reelfx/media/media_facts.h"
+
+namespace velmora::hosts {
+namespace {
+
+std::string Line(std::string name, const std::string& text) {
+    name.resize(10, ' ');
+    return name + text + '\n';
+}
+
+std::string SectionText(const SectionOptions& options, std::int64_t frames) {
+    if (options.IsWholeClip()) return "the whole clip";
+    std::string text;
+    if (options.start || options.duration) {
+        text = "from " + NumberText(options.start.value_or(0.0)) + " s";
+        if (options.duration) text += " for " + NumberText(*options.duration) + " s";
+    } else {
+        text = "from frame " + std::to_string(options.firstFrame);
+        if (options.endFrame) text += " up to but not including " + std::to_string(*options.endFrame);
+    }
+    return frames > 0 ? text + " (" + std::to_string(frames) + " frames)" : text;
+}
+
+std::string SettingsText(const EffectChoice& choice) {
+    const auto session = choice.NewSession();
+    std::string text;
+    for (std::uint32_t i = 0; i < choice.Info().params.size(); ++i) {
+        const ParamInfo& param = choice.Info().params[i];
+        if (!param.HoldsValue()) continue;
+        text += (text.empty() ? "" : ", ") + param.name + "=" + ShownValue(param, session->Value(i));
+    }
+    return text;
+}
+
+std::string RandomText(const EffectOptions& options) {
+    if (options.randomState) return "one sequence from state " + HexText(*options.randomState);
+    return "seed " + std::to_string(options.seed);
+}
+
+}  // namespace
+
+std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectChoice& choice,
+                     const MediaReader& reader, const MediaWriter* writer, unsigned threads) {
+    const MediaFacts facts = FactsOf(reader);
+    std::string effect = choice.Info().name;
+    if (options.effect.preset) effect += ", preset " + *options.effect.preset;
+    if (options.effect.presetFile) effect += ", preset file " + *options.effect.presetFile;
+    std::string text = Line("input", reader.Name() + ": " + ShortText(facts));
+    for (const std::string& note : NotesOn(facts)) text += Line("note", note);
+    text += Line("part", SectionText(section, ClipSection::FrameCountGuess(reader, section)));
+    text += Line("effect", effect);
+    if (options.isMatte) text += Line("matte", "the damage alone, with straight alpha");
+    text += Line("settings", SettingsText(choice));
+    text += Line("random", RandomText(options.effect));
+    text += Line("threads", std::to_string(threads));
+    text += Line("output", writer ? writer->Description() : "digests on standard output");
+    return text;
+}
+
+}  // namespace velmora::hosts

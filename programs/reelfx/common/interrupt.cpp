@@ -1,0 +1,31 @@
+#include "programs/reelfx/common/interrupt.h"
+
+#include <atomic>
+#include <csignal>
+
+namespace velmora::hosts {
+namespace {
+
+std::atomic<int> g_interrupts = 0;
+static_assert(std::atomic<int>::is_always_lock_free, "touched by a signal handler");
+
+extern "C" void CountInterrupt(int number) {
+    // Where nothing looks at the count any more, a pipe that nobody reads, only the system can help.
+    if (g_interrupts.fetch_add(1, std::memory_order_relaxed) >= 1) std::signal(number, SIG_DFL);
+}
+
+}  // namespace
+
+void WatchInterrupts() {
+    std::signal(SIGINT, CountInterrupt);
+    std::signal(SIGTERM, CountInterrupt);
+    // A reader that went away and a file size limit are errors of writing like a full disk.
+    std::signal(SIGPIPE, SIG_IGN);
+    std::signal(SIGXFSZ, SIG_IGN);
+}
+
+int Interrupts() {
+    return g_interrupts.load(std::memory_order_relaxed);
+}
+
+}  // namespace velmora::hosts

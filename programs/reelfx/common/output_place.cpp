@@ -1,0 +1,145 @@
+#include "programs/reelfx/common/output_place.h"
+
+#include <cerrno>
+#include <cstdlib>
+#include <cstring>
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include "programs/reelfx/common/failure.h"
+
+extern "C" {
+#include <libavformat/avformat.h>
+}
+
+namespace velmora::hosts {
+namespace {
+
+namespace fs = std::filesystem;
+
+std::string ExistsText(const std::string& name) {
+    return name + ": exists already; --overwrite replaces it";
+}
+
+// The first file that a pattern names, for either usual start of counting; the path itself without one.
+bool SomethingStandsAt(const std::string& path, std::int64_t firstImage) {
+    std::error_code ignored;
+    char name[4096];
+    for (const std::int64_t number : {firstImage == 1 ? 0 : firstImage, firstImage}) {
+        if (av_get_frame_filename(name, sizeof name, path.c_str(), static_cast<int>(number)) < 0) break;
+        if (fs::exists(name, ignored)) return true;
+    }
+    return fs::exists(path, ignored);
+}
+
+constexpr char kHiddenFolder[] = ".reelfx-XXXXXX";
+constexpr std::size_t kPrefixLength = sizeof kHiddenFolder - 1 - 6;
+
+// A handle that holds the lock of a folder of this user, until it is closed or the process ends; -1 with `isTaken`
+// when another has the lock.
+int LockFolder(const fs::path& folder, bool& isTaken) {
+    isTaken = false;
+    const int handle = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC);
+    struct stat status {};
+    if (handle >= 0 && fstat(handle, &status) == 0 && status.st_uid == geteuid()) {
+        if (flock(handle, LOCK_EX | LOCK_NB) == 0) return handle;
+        isTaken = errno == EWOULDBLOCK;
+    }
+    if (handle >= 0) close(handle);
+    return -1;
+}
+
+// What commands left behind that were killed: hidden folders that nobody holds.
+void RemoveLeftOvers(const fs::path& beside) {
+    std::error_code ignored;
+    for (fs::directory_iterator entry(beside, ignored), end; !ignored && entry != end;
+         entry.increment(ignored)) {
+        const std::string name = entry->path().filename().string();
+        if (name.size() != sizeof kHiddenFolder - 1 ||
+            !name.starts_with(std::string(kHiddenFolder, kPrefixLength)))
+            continue;
+        bool isTaken = false;
+        const int lock = LockFolder(entry->path(), isTaken);
+        if (lock < 0) continue;
+        std::error_code kept;
+        fs::remove_all(entry->path(), kept);
+        close(lock);
+    }
+}
+
+// Makes and locks a folder. Another command may take it for a left-over before it is locked: then another is made.
+fs::path MakeHiddenFolder(const fs::path& beside, const std::string& name, int& lock) {
+    for (;;) {
+        std::string path = (beside / kHiddenFolder).string();
+        if (!mkdtemp(path.data())) {
+            throw Failure(kExitOutput, name + ": cannot be written: " + std::strerror(errno));
+        }
+        bool isTaken = false;
+        lock = LockFolder(path, isTaken);
+        struct stat status {};
+        if (!isTaken && stat(path.c_str(), &status) == 0) return path;
+        if (lock >= 0) close(lock);
+    }
+}
+
+}  // namespace
+
+void CheckOutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage) {
+    if (path == "-") {
+        if (isatty(STDOUT_FILENO) == 0) return;
+        throw Failure(kExitOutput, "standard output is a terminal; pipe it into a program or name a file");
+    }
+    std::error_code ignored;
+    const fs::file_status status = fs::status(path, ignored);
+    if (fs::is_directory(status)) throw Failure(kExitOutput, path + ": is a folder");
+    if (fs::exists(status) && !fs::is_regular_file(status)) return;
+    if (!mayOverwrite && SomethingStandsAt(path, firstImage)) throw Failure(kExitOutput, ExistsText(path));
+    if (access(fs::absolute(path).parent_path().c_str(), W_OK | X_OK) != 0) {
+        throw Failure(kExitOutput, path + ": cannot be written: " + std::strerror(errno));
+    }
+}
+
+OutputPlace::OutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage)
+    : m_path(path), m_name(path == "-" ? "standard output" : path), m_mayOverwrite(mayOverwrite) {
+    CheckOutputPlace(path, mayOverwrite, firstImage);
+    std::error_code ignored;
+    const fs::file_status status = fs::status(m_path, ignored);
+    if (path == "-" || (fs::exists(status) && !fs::is_regular_file(status))) return;
+    m_replaces = SomethingStandsAt(path, firstImage);
+    // Absolute: a relative name with a colon would be taken for an address.
+    m_path = fs::absolute(m_path);
+    // A name that is a link stays one: what it points to is replaced.
+    if (const fs::path target = fs::canonical(m_path, ignored); !target.empty()) m_path = target;
+    RemoveLeftOvers(m_path.parent_path());
+    m_folder = MakeHiddenFolder(m_path.parent_path(), m_name, m_lock);
+}
+
+OutputPlace::~OutputPlace() {
+    std::error_code ignored;
+    if (!m_folder.empty()) fs::remove_all(m_folder, ignored);
+    if (m_lock >= 0) close(m_lock);
+}
+
+std::string OutputPlace::Address() const {
+    if (m_path == "-") return "pipe:1";
+    return (m_folder.empty() ? m_path : m_folder / m_path.filename()).string();
+}
+
+void OutputPlace::Keep() {
+    if (m_folder.empty()) return;
+    try {
+        for (const fs::directory_entry& file : fs::directory_iterator(m_folder)) {
+            const fs::path target = m_folder.parent_path() / file.path().filename();
+            // Somebody else may have written there while this command ran.
+            if (!m_mayOverwrite && fs::exists(target))
+                throw Failure(kExitOutput, ExistsText(target.string()));
+            fs::rename(file.path(), target);
+        }
+    } catch (const fs::filesystem_error& error) {
+        throw Failure(kExitOutput, m_name + ": cannot be written: " + error.code().message());
+    }
+}
+
+}  // namespace velmora::hosts

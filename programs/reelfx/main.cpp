@@ -1,0 +1,43 @@
+// reelfx: the effects on the command line, for any footage that the media libraries read.
+
+#include <cstdio>
+#include <exception>
+#include <new>
+#include <system_error>
+
+#include "programs/common/usage_error.h"
+#include "programs/reelfx/commands/command_line.h"
+#include "programs/reelfx/common/interrupt.h"
+
+extern "C" {
+#include <libavutil/log.h>
+}
+
+int main(int count, char** arguments) {
+    using namespace velmora::hosts;
+    av_log_set_level(AV_LOG_QUIET);  // one clear line of our own instead
+    WatchInterrupts();
+    try {
+        const ExitCode code = RunCommand(ReadCommandLine(count, arguments));
+        // Texts and digests may still be on their way.
+        if (std::fflush(stdout) != 0 || std::ferror(stdout) != 0) {
+            throw Failure(kExitOutput, "standard output cannot be written");
+        }
+        return code;
+    } catch (const Failure& failure) {
+        std::fprintf(stderr, "reelfx: %s\n", failure.what());
+        return failure.Code();
+    } catch (const UsageError& error) {
+        std::fprintf(stderr, "reelfx: %s\n", error.what());
+        return kExitUsage;
+    } catch (const std::bad_alloc&) {
+        std::fprintf(stderr, "reelfx: memory is short\n");
+        return kExitInternal;
+    } catch (const std::system_error& error) {
+        std::fprintf(stderr, "reelfx: memory or threads are short: %s\n", error.what());
+        return kExitInternal;
+    } catch (const std::exception& error) {
+        std::fprintf(stderr, "reelfx: %s\n", error.what());
+        return kExitInternal;
+    }
+}

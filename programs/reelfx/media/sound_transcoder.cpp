@@ -1,0 +1,132 @@
+#include "programs/reelfx/media/sound_transcoder.h"
+
+#include <algorithm>
+
+#include "programs/reelfx/common/failure.h"
+
+extern "C" {
+#include <libavutil/audio_fifo.h>
+#include <libavutil/channel_layout.h>
+}
+
+namespace velmora::hosts {
+namespace {
+
+constexpr std::int64_t kBitRatePerChannel = 96000;
+
+int NearestRate(const AVCodec& codec, int wanted) {
+    if (!codec.supported_samplerates) return wanted;
+    int best = *codec.supported_samplerates;
+    for (const int* rate = codec.supported_samplerates; *rate != 0; ++rate) {
+        if (std::abs(*rate - wanted) < std::abs(best - wanted)) best = *rate;
+    }
+    return best;
+}
+
+CodecPtr OpenDecoder(const AVStream& source) {
+    const AVCodec* codec = avcodec_find_decoder(source.codecpar->codec_id);
+    if (!codec) throw Failure(kExitInput, "the sound cannot be decoded; --no-sound leaves it out");
+    CodecPtr decoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
+    avcodec_parameters_to_context(decoder.get(), source.codecpar);
+    decoder->pkt_timebase = source.time_base;
+    const int error = avcodec_open2(decoder.get(), codec, nullptr);
+    ThrowIfNoMemory(error);
+    if (error < 0) {
+        throw Failure(kExitInput, "the sound cannot be decoded; --no-sound leaves it out");
+    }
+    return decoder;
+}
+
+}  // namespace
+
+SoundTranscoder::SoundTranscoder(const AVStream& source, AVCodecID target, bool globalHeader)
+    : m_sourceBase(source.time_base), m_decoder(OpenDecoder(source)) {
+    const AVCodec* codec = avcodec_find_encoder(target);
+    if (!codec) throw Failure(kExitOutput, "the sound cannot be encoded; --no-sound leaves it out");
+    m_encoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
+    const int channels = std::min(m_decoder->ch_layout.nb_channels, 8);
+    av_channel_layout_default(&m_encoder->ch_layout, channels);
+    m_encoder->sample_rate = NearestRate(*codec, m_decoder->sample_rate);
+    m_encoder->sample_fmt = codec->sample_fmts ? codec->sample_fmts[0] : m_decoder->sample_fmt;
+    m_encoder->bit_rate = kBitRatePerChannel * channels;
+    m_encoder->time_base = {1, m_encoder->sample_rate};
+    m_encoder->thread_count = 1;
+    if (globalHeader) m_encoder->flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
+    const int error = avcodec_open2(m_encoder.get(), codec, nullptr);
+    ThrowIfNoMemory(error);
+    if (error < 0) {
+        throw Failure(kExitOutput, "the sound cannot be encoded; --no-sound leaves it out");
+    }
+    m_resampler = Allocated<ResamplerPtr>(swr_alloc());
+    m_fifo = av_audio_fifo_alloc(m_encoder->sample_fmt, channels, 4096);
+    if (!m_fifo) throw std::bad_alloc();
+}
+
+SoundTranscoder::~SoundTranscoder() {
+    if (m_fifo) av_audio_fifo_free(m_fifo);
+}
+
+void SoundTranscoder::Send(const AVPacket* packet, const Sink& sink) {
+    // A damaged packet is a gap in the sound, no reason to stop.
+    avcodec_send_packet(m_decoder.get(), packet);
+    TakeDecoded(sink);
+    if (packet) return;
+    Encode(av_audio_fifo_size(m_fifo), sink);
+    avcodec_send_frame(m_encoder.get(), nullptr);
+    TakeEncoded(sink);
+}
+
+void SoundTranscoder::TakeDecoded(const Sink& sink) {
+    const FramePtr frame = NewFrame();
+    while (avcodec_receive_frame(m_decoder.get(), frame.get()) >= 0) {
+        if (m_nextPts == AV_NOPTS_VALUE) {
+            const std::int64_t pts = frame->best_effort_timestamp;
+            m_nextPts = pts == AV_NOPTS_VALUE ? 0 : av_rescale_q(pts, m_sourceBase, m_encoder->time_base);
+        }
+        Resample(*frame);
+        const int block = m_encoder->frame_size > 0 ? m_encoder->frame_size : 1024;
+        while (av_audio_fifo_size(m_fifo) >= block) Encode(block, sink);
+    }
+}
+
+void SoundTranscoder::Resample(AVFrame& frame) {
+    if (frame.ch_layout.order == AV_CHANNEL_ORDER_UNSPEC) {
+        av_channel_layout_default(&frame.ch_layout, frame.ch_layout.nb_channels);
+    }
+    const FramePtr converted = NewFrame();
+    converted->format = m_encoder->sample_fmt;
+    converted->sample_rate = m_encoder->sample_rate;
+    av_channel_layout_copy(&converted->ch_layout, &m_encoder->ch_layout);
+    // The first frame, and any that differs from the one before, tells what there is to convert.
+    int error = swr_convert_frame(m_resampler.get(), converted.get(), &frame);
+    if (error == AVERROR_INPUT_CHANGED) {
+        swr_close(m_resampler.get());
+        error = swr_convert_frame(m_resampler.get(), converted.get(), &frame);
+    }
+    ThrowIfNoMemory(error);
+    if (error < 0) throw Failure(kExitInput, "the sound cannot be converted; --no-sound leaves it out");
+    void** const samples = reinterpret_cast<void**>(converted->extended_data);
+    if (av_audio_fifo_write(m_fifo, samples, converted->nb_samples) < 0) throw std::bad_alloc();
+}
+
+void SoundTranscoder::Encode(int samples, const Sink& sink) {
+    if (samples <= 0) return;
+    const FramePtr frame = NewFrame();
+    frame->nb_samples = samples;
+    frame->format = m_encoder->sample_fmt;
+    frame->sample_rate = m_encoder->sample_rate;
+    av_channel_layout_copy(&frame->ch_layout, &m_encoder->ch_layout);
+    if (av_frame_get_buffer(frame.get(), 0) < 0) throw std::bad_alloc();
+    av_audio_fifo_read(m_fifo, reinterpret_cast<void**>(frame->extended_data), samples);
+    frame->pts = m_nextPts;
+    m_nextPts += samples;
+    avcodec_send_frame(m_encoder.get(), frame.get());
+    TakeEncoded(sink);
+}
+
+void SoundTranscoder::TakeEncoded(const Sink& sink) {
+    const PacketPtr packet = NewPacket();
+    while (avcodec_receive_packet(m_encoder.get(), packet.get()) >= 0) sink(*packet);
+}
+
+}  // namespace velmora::hosts

@@ -1,0 +1,72 @@
+#include "programs/reelfx/pipeline/frame_worker.h"
+
+#include <cstring>
+
+#include "programs/common/digest.h"
+#include "programs/reelfx/common/failure.h"
+#include "programs/reelfx/pictures/matte.h"
+#include "programs/reelfx/media/picture_turn.h"
+
+namespace velmora::hosts {
+namespace {
+
+bool IsSame(const BgraPicture& a, const BgraPicture& b) {
+    for (std::int32_t y = 0; y < a.Height(); ++y) {
+        if (std::memcmp(a.Row(y), b.Row(y), static_cast<std::size_t>(a.Width()) * 4) != 0) return false;
+    }
+    return true;
+}
+
+}  // namespace
+
+FrameWorker::FrameWorker(std::unique_ptr<effects::EffectSession> session, const Job& job)
+    : m_session(std::move(session)), m_job(job), m_source(job.size.width, job.size.height) {
+    if (job.isMatte) m_session->KeepDamageOnly();
+}
+
+void FrameWorker::Work(PipelineItem& item) {
+    const BgraPicture& result = Result(item);
+    if (m_job.withDigest) {
+        item.digest = FrameDigest(result.Row(0), result.Width(), result.Height(), result.Stride());
+    }
+    if (!m_job.writer) return;
+    // An untouched frame keeps its own samples, also those that 8-bit RGB cannot hold: more than 8 bits, and
+    // black below black.
+    if (!m_job.isMatte && &result != &m_source && m_job.writer->TakesAsItIs(*item.frame) &&
+        IsSame(m_source, result)) {
+        return;
+    }
+    FramePtr frame = m_job.writer->NewResult(*item.frame);
+    m_converter.FromBgra(result, *frame);
+    item.frame = std::move(frame);
+}
+
+BgraPicture& FrameWorker::Result(const PipelineItem& item) {
+    if (!m_job.isMatte) {
+        m_converter.ToBgra(*item.frame, m_source);
+        return Apply(item.seconds);
+    }
+    FillMatteGround(m_source);
+    BgraPicture& result = Apply(item.seconds);
+    ReadMatte(result);
+    return result;
+}
+
+BgraPicture& FrameWorker::Apply(double seconds) {
+    BgraPicture* input = &m_source;
+    if (m_job.quarterTurns != 0) {
+        TurnPicture(m_source, m_job.quarterTurns, m_upright);
+        input = &m_upright;
+    }
+    if (m_result.Width() != input->Width() || m_result.Height() != input->Height()) {
+        m_result.Resize(input->Width(), input->Height());
+    }
+    if (!m_session->Render(input->Record(), m_result.Record(), seconds)) {
+        throw Failure(kExitInternal, "a frame cannot be rendered");
+    }
+    if (m_job.quarterTurns == 0) return m_result;
+    TurnPicture(m_result, 4 - m_job.quarterTurns, m_source);
+    return m_source;
+}
+
+}  // namespace velmora::hosts

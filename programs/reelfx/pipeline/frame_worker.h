@@ -1,0 +1,39 @@
+// What one thread does with a frame: to BGRA, upright, through the effect, and back.
+#pragma once
+
+#include <functional>
+#include <memory>
+
+#include "effects/effect_session.h"
+#include "programs/reelfx/media/bgra_picture.h"
+#include "programs/reelfx/pipeline/frame_pipeline.h"
+#include "programs/reelfx/media/media_writer.h"
+#include "programs/reelfx/media/pixel_converter.h"
+
+namespace velmora::hosts {
+
+class FrameWorker {
+  public:
+    struct Job {
+        const MediaWriter* writer = nullptr;  // null: no frames are wanted, only digests
+        FrameSize size = {};                  // of the source's frames
+        int quarterTurns = 0;                 // see QuarterTurnsOf
+        bool withDigest = false;
+        bool isMatte = false;  // the result is the damage alone, see matte.h
+    };
+    FrameWorker(std::unique_ptr<effects::EffectSession> session, const Job& job);
+
+    // Replaces the frame by its result and fills in the digest.
+    void Work(PipelineItem& item);
+
+  private:
+    BgraPicture& Result(const PipelineItem& item);
+    BgraPicture& Apply(double seconds);  // of m_source; the result, lying as the source does
+
+    std::unique_ptr<effects::EffectSession> m_session;
+    Job m_job;
+    PixelConverter m_converter;
+    BgraPicture m_source, m_result, m_upright;
+};
+
+}  // namespace velmora::hosts

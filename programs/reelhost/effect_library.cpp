@@ -1,0 +1,55 @@
+#include "programs/reelhost/effect_library.h"
+
+#include <stdexcept>
+
+#include "programs/common/library_file.h"
+
+namespace velmora::hosts {
+namespace {
+
+EffectInfo Describe(IVideoEffect& effect) {
+    EffectInfo info;
+    info.name = effect.GetName();
+    ParamDescriptor descriptor{};
+    for (std::uint32_t i = 0; effect.GetParamInfo(i, &descriptor); ++i) {
+        info.params.push_back(ReadDescriptor(descriptor));
+        descriptor = {};
+    }
+    for (std::uint32_t i = 0; const char* name = effect.GetPresetName(i); ++i) {
+        info.presets.emplace_back(name);
+    }
+    return info;
+}
+
+}  // namespace
+
+EffectLibrary::EffectLibrary(const std::string& path) {
+    m_tickBefore = GetTickCount();
+    m_module.reset(LoadLibraryW(LibraryFile(path).c_str()));
+    m_tickAfter = GetTickCount();
+    if (!m_module) {
+        throw std::runtime_error("VMReelEffects.dll cannot be loaded, system error " +
+                                 std::to_string(GetLastError()));
+    }
+    void* const address = reinterpret_cast<void*>(GetProcAddress(m_module.get(), "GetEffectsLibrary"));
+    if (!address) throw std::runtime_error("VMReelEffects.dll has no GetEffectsLibrary");
+    m_library.reset(reinterpret_cast<GetEffectsLibraryFunction>(address)());
+    if (!m_library) throw std::runtime_error("VMReelEffects.dll gives no library object");
+    for (std::uint32_t i = 0; const Reference<IVideoEffect> effect{m_library->CreateEffect(i)}; ++i) {
+        m_effects.push_back(Describe(*effect));
+    }
+}
+
+Reference<IVideoEffect> EffectLibrary::CreateEffect(std::uint32_t index) const {
+    Reference<IVideoEffect> effect(m_library->CreateEffect(index));
+    if (!effect) throw std::runtime_error("VMReelEffects.dll cannot create the effect");
+    return effect;
+}
+
+Reference<IFrameProcessor> EffectLibrary::CreateFrameProcessor() const {
+    Reference<IFrameProcessor> processor(m_library->CreateFrameProcessor());
+    if (!processor) throw std::runtime_error("VMReelEffects.dll cannot create the frame processor");
+    return processor;
+}
+
+}  // namespace velmora::hosts

@@ -1,0 +1,48 @@
+// VMReelEffects.dll as an editor has it: loaded by LoadLibrary, used through its exports and interfaces alone.
+#pragma once
+
+#include <cstdint>
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "programs/common/effect_info.h"
+#include "api/host_api.h"
+
+#include <windows.h>
+
+namespace velmora::hosts {
+
+struct ReleaseReference {
+    void operator()(IUnknown* object) const { object->Release(); }
+};
+template <class Interface>
+using Reference = std::unique_ptr<Interface, ReleaseReference>;
+
+class EffectLibrary {
+  public:
+    // `path` empty: the DLL beside this program. Throws std::runtime_error when it cannot be loaded.
+    explicit EffectLibrary(const std::string& path);
+
+    [[nodiscard]] const std::vector<EffectInfo>& Effects() const { return m_effects; }
+    // Both throw std::runtime_error when the library gives none.
+    [[nodiscard]] Reference<IVideoEffect> CreateEffect(std::uint32_t index) const;
+
+    [[nodiscard]] Reference<IFrameProcessor> CreateFrameProcessor() const;
+
+    // Tick counts just before and just after loading: the library's random sequence began in between.
+    [[nodiscard]] std::uint32_t TickBefore() const { return m_tickBefore; }
+    [[nodiscard]] std::uint32_t TickAfter() const { return m_tickAfter; }
+
+  private:
+    struct FreeModule {
+        void operator()(HMODULE module) const { FreeLibrary(module); }
+    };
+
+    std::unique_ptr<HINSTANCE__, FreeModule> m_module;  // outlives what it made
+    Reference<IEffectLibrary> m_library;
+    std::vector<EffectInfo> m_effects;
+    std::uint32_t m_tickBefore = 0, m_tickAfter = 0;
+};
+
+}  // namespace velmora::hosts

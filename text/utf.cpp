@@ -1,0 +1,74 @@
+#include "text/utf.h"
+
+#include <cstddef>
+#include <cstdint>
+
+namespace velmora::language {
+namespace {
+
+// What a first byte promises. The lowest value that needs so many bytes tells overlong forms apart.
+struct Sequence {
+    std::size_t length;  // 0: no sequence begins with this byte
+    std::uint32_t firstBits;
+    std::uint32_t lowestValue;
+};
+
+constexpr Sequence SequenceOf(std::uint32_t first) {
+    if (first < 0x80) return {1, first, 0};
+    if (first < 0xC0) return {0, 0, 0};
+    if (first < 0xE0) return {2, first & 0x1F, 0x80};
+    if (first < 0xF0) return {3, first & 0x0F, 0x800};
+    if (first < 0xF8) return {4, first & 0x07, 0x10000};
+    return {0, 0, 0};
+}
+
+constexpr std::uint32_t ByteAt(std::string_view text, std::size_t index) {
+    return static_cast<unsigned char>(text[index]);
+}
+
+void Append(std::u16string& text, std::uint32_t value) {
+    if (value < 0x10000) {
+        text.push_back(static_cast<char16_t>(value));
+        return;
+    }
+    const std::uint32_t offset = value - 0x10000;
+    text.push_back(static_cast<char16_t>(0xD800 + (offset >> 10)));
+    text.push_back(static_cast<char16_t>(0xDC00 + (offset & 0x3FF)));
+}
+
+// Takes one character off the front of a text that is not empty; nothing when it is not well-formed.
+std::optional<std::uint32_t> TakeCharacter(std::string_view& text) {
+    const Sequence sequence = SequenceOf(ByteAt(text, 0));
+    if (sequence.length == 0 || sequence.length > text.size()) return std::nullopt;
+    std::uint32_t value = sequence.firstBits;
+    for (std::size_t i = 1; i < sequence.length; ++i) {
+        const std::uint32_t next = ByteAt(text, i);
+        if ((next & 0xC0) != 0x80) return std::nullopt;
+        value = value << 6 | (next & 0x3F);
+    }
+    const bool isSurrogate = value >= 0xD800 && value <= 0xDFFF;
+    if (value < sequence.lowestValue || value > 0x10FFFF || isSurrogate) return std::nullopt;
+    text.remove_prefix(sequence.length);
+    return value;
+}
+
+}  // namespace
+
+bool IsUtf8(std::string_view text) noexcept {
+    while (!text.empty()) {
+        if (!TakeCharacter(text)) return false;
+    }
+    return true;
+}
+
+std::optional<std::u16string> Utf16FromUtf8(std::string_view text) {
+    std::u16string result;
+    while (!text.empty()) {
+        const std::optional<std::uint32_t> value = TakeCharacter(text);
+        if (!value) return std::nullopt;
+        Append(result, *value);
+    }
+    return result;
+}
+
+}  // namespace velmora::language
