@@ -47,21 +47,22 @@ def wavy(width, height):
 
     shown = evened(field(width, height, lambda x, y: smoothstep(-0.2, 2.2, swaying(x, y))), 9)
     density = faded_to_sides(standardised(shown), 5)
-    return toned(mixed((1.0, with_density(grain, density, 0.22)), (0.24, density)), 0.125, 0.072)
+    return toned(mixed((1.0, with_density(grain, density, 0.22)), (0.24, density)), 0.145, 0.085)
 
 
 def blotchy(width, height):
     """Grain of soft clumps over a coarser one, gently mottled."""
-    grain = mixed((1.0, noise(21, width, height, 0.66)),
-                  (0.5, faded_to_sides(noise(22, width, height, 1.2), 3)))
+    # Three sizes: clumps of one size run together into worms.
+    grain = mixed((0.55, noise(24, width, height, 0.45)), (1.0, noise(21, width, height, 0.70)),
+                  (0.5, faded_to_sides(noise(22, width, height, 1.3), 3)))
     mottle = faded_to_sides(evened(noise(23, width, height, 3.0), 9), 6)
-    return toned(mixed((1.0, with_density(grain, mottle, 0.16)), (0.15, mottle)), 0.180, 0.106)
+    return toned(mixed((1.0, with_density(grain, mottle, 0.16)), (0.15, mottle)), 0.205, 0.122)
 
 
 def grainy(width, height):
     """Strong, crisp grain."""
     grain = mixed((1.0, noise(31, width, height, 0.52)), (0.22, noise(32, width, height, 0.95)))
-    return toned(grain, 0.19, 0.125)
+    return toned(grain, 0.22, 0.145)
 
 
 def fine(width, height):
@@ -74,19 +75,19 @@ def fine(width, height):
         for i in range(run):
             rubs[(y + i) % height][x] += strength * smoothstep(0, 6, i + 0.5) * smoothstep(0, 6, run - i - 0.5)
     grain = noise(41, width, height, 0.40)
-    return toned([[g + r for g, r in zip(*rows)] for rows in zip(grain, rubs)], 0.12, 0.070)
+    return toned([[g + r for g, r in zip(*rows)] for rows in zip(grain, rubs)], 0.145, 0.086)
 
 
 def splotchy(width, height):
     """Grain on a mottle as strong as it may be without showing where it repeats."""
     grain = mixed((1.0, noise(51, width, height, 0.62)), (0.4, faded_to_sides(noise(52, width, height, 1.1), 3)))
     mottle = faded_to_sides(evened(noise(53, width, height, 2.2), 7), 4)
-    return toned(mixed((1.0, with_density(grain, mottle, 0.30)), (0.50, mottle)), 0.150, 0.078)
+    return toned(mixed((1.0, with_density(grain, mottle, 0.30)), (0.50, mottle)), 0.175, 0.096)
 
 
 def lite(width, height):
     """Very light grain."""
-    return toned(mixed((1.0, noise(61, width, height, 0.50)), (0.25, noise(62, width, height, 0.9))), 0.065, 0.040)
+    return toned(mixed((1.0, noise(61, width, height, 0.50)), (0.25, noise(62, width, height, 0.9))), 0.07, 0.044)
 
 
 def sheared(values, slope):
@@ -101,7 +102,7 @@ def crackly(width, height):
     long = [sheared(noise(73 + i, width, height, *size), slope) for i, (size, slope) in enumerate((
         ((1.3, 0.30), 1), ((1.3, 0.30), -1), ((0.9, 0.30), 2), ((0.9, 0.30), -2), ((1.5, 0.34), 0), ((0.34, 1.5), 0)))]
     cracks = standardised(field(width, height, lambda x, y: max(0.0, max(way[y][x] for way in long) - 1.2)**1.3))
-    return toned(mixed((1.0, grain), (0.75, cracks)), 0.14, 0.085, most=3.2)
+    return toned(mixed((1.0, grain), (0.75, cracks)), 0.165, 0.102, most=3.2)
 
 
 # Menu value, width, height, drawing function.
