@@ -27,7 +27,10 @@ void AddEffect(CLI::App& command, TypedOptions& typed) {
 }
 
 void AddRandom(CLI::App& command, TypedOptions& typed) {
-    command.add_option("--seed", typed.seed, "Another seed gives other damage")
+    command
+        .add_option("--seed", typed.seed,
+                    "Another seed gives other shake, flicker and damage; with 0 flicker and scratches are "
+                    "the library's")
         ->type_name("N")
         ->capture_default_str()
         ->envname("REELFX_SEED");
