@@ -320,6 +320,26 @@ class Kinds(ReelfxTest):
             self.assertGreater(int(width), 320)
             self.assertGreater(int(height), 90)
 
+    def picture(self, command, name, *options, source=None, **more):
+        done = reelfx(command, source or clips.small, self.out / name, *options, **more)
+        self.assertEqual((done.returncode, done.stderr), (0, b""))
+        return self.out / name
+
+    def test_a_sheet_shows_the_middle_unless_told(self):
+        options = (*CAMERA, "--width", 64)
+        middle = self.picture("sheet", "a.png", *options).read_bytes()
+        self.assertEqual(middle, self.picture("sheet", "b.png", *options, "-n", 20).read_bytes())
+        self.assertEqual(middle, self.picture("sheet", "c.png", *options, "--start",
+                                              frame_times(clips.small)[20] - 0.001).read_bytes())
+        raw = ffmpeg("-i", clips.small, "-frames:v", 9, "-f", "yuv4mpegpipe", "-")
+        self.picture("sheet", "d.png", *options, source="-", input=raw)
+        folder = self.picture("sheet", "sheets", "--all", "--width", 64)
+        self.assertEqual(sorted(os.listdir(folder)), [f"film-{name}.png" for name in ("camera", "damage", "express",
+                                                                                      "look", "pro")])
+        self.assertEqual((folder / "film-camera.png").read_bytes(), middle)
+        self.picture("sheet", "%s-x.jpg", "--all", "--width", 64, env=dict(os.environ, REELFX_EFFECT="Film Pro"))
+        self.assertTrue((self.out / "film-pro-x.jpg").exists())
+
     def test_preset_files_carry_settings(self):
         file = self.out / "mine.fxp"
         options = ("-e", "Film Look", "-p", "Sepia", "-s", "Saturation=12.5")
@@ -382,6 +402,10 @@ class Refusing(ReelfxTest):
             (3, ["folder"], ("render", clips.root, out, *CAMERA)),
             (3, ["no frame", "41"], (*render, *CAMERA, "--frames", "99:")),
             (3, ["no frame 99"], ("frame", small, self.out / "out.png", *CAMERA, "--frame", "99")),
+            (2, ["--all", "folder"], ("sheet", small, self.out / "out.png", "--all")),
+            (2, ["--all", "--effect"], ("sheet", small, self.out / "new", "--all", *CAMERA)),
+            (3, ["no frame 99"], ("sheet", small, self.out / "new", "--all", "--frame", "99")),
+            (2, ["pixels"], ("sheet", small, self.out / "out.png", *CAMERA, "--width", "8192", "--columns", "9")),
             (3, ["not a preset"], (*render, "--preset-file", text)),
             (4, ["No such file"], ("render", small, self.out / "no" / "out.mp4", *CAMERA)),
             (4, ["exists already"], ("render", small, text, *CAMERA)),
