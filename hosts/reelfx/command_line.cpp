@@ -154,6 +154,13 @@ PictureOptions ReadSheet(const TypedOptions& typed) {
     return options;
 }
 
+StripOptions ReadStrip(const TypedOptions& typed) {
+    StripOptions options = {.picture = ReadPicture(typed), .frames = typed.stripFrames, .crop = {}};
+    if (!typed.crop.empty())
+        options.crop = Parsed("--crop", typed.crop, ParseCrop, "a part like 160x540+880+270");
+    return options;
+}
+
 PresetSaveOptions ReadPresetSave(const TypedOptions& typed) {
     PresetSaveOptions options = typed.presetSave;
     options.effect = ReadEffect(typed);
@@ -184,6 +191,7 @@ Command ReadCommandLine(int count, const char* const* arguments) {
     if (app.got_subcommand("info")) return InfoOptions{ReadInput(typed), typed.info.asJson};
     if (app.got_subcommand("frame")) return FrameCommand{ReadPicture(typed)};
     if (app.got_subcommand("sheet")) return SheetCommand{ReadSheet(typed)};
+    if (app.got_subcommand("strip")) return ReadStrip(typed);
     if (const CLI::App* preset = app.get_subcommand("preset"); preset->parsed()) {
         if (preset->got_subcommand("show")) return typed.presetShow;
         return ReadPresetSave(typed);
@@ -214,6 +222,9 @@ ExitCode Run(const FrameCommand& command) {
 }
 ExitCode Run(const SheetCommand& command) {
     return RunSheet(command.options);
+}
+ExitCode Run(const StripOptions& options) {
+    return RunStrip(options);
 }
 ExitCode Run(const PresetShowOptions& options) {
     return RunPresetShow(options);

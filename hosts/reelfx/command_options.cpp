@@ -141,6 +141,24 @@ void AddPictures(CLI::App& app, TypedOptions& typed) {
     AddWidth(sheet, typed);
     AddColumns(sheet, typed, "Pictures in a row; default: 4");
     sheet.add_flag("--all", typed.picture.allEffects, "A sheet of each effect, film-camera.png and so on");
+    CLI::App& strip = AddPicture(
+        app, typed, "strip",
+        {.what = "Write successive frames through an effect side by side at 100 %, to judge motion",
+         .out = "PNG or JPEG",
+         .frame =
+             "First frame, counted from 0; default: so that the frames are the clip's middle, of a pipe its "
+             "first"});
+    strip.add_option("--frames", typed.stripFrames, "How many frames; fewer come where the clip ends")
+        ->type_name("N")
+        ->capture_default_str()
+        ->check(CLI::Range(1, 240));
+    strip
+        .add_option(
+            "--crop", typed.crop,
+            "What each picture shows, in pixels from the left and the top; without +X+Y in the middle. "
+            "Default: the middle, 540 high and so wide that a row fills 1920 pixels")
+        ->type_name("WxH+X+Y");
+    AddColumns(strip, typed, "Pictures in a row; default: all");
 }
 
 void AddPreset(CLI::App& app, TypedOptions& typed) {

@@ -12,6 +12,7 @@
 #include "hosts/reelfx/preset_command.h"
 #include "hosts/reelfx/presets_command.h"
 #include "hosts/reelfx/render_command.h"
+#include "hosts/reelfx/strip_command.h"
 
 namespace CLI {
 class App;
@@ -56,6 +57,8 @@ struct TypedOptions {
     PresetsOptions presets;
     InfoOptions info;
     PictureOptions picture;
+    int stripFrames = 12;
+    std::string crop;
     PresetShowOptions presetShow;
     PresetSaveOptions presetSave;
 };

@@ -72,6 +72,13 @@ void Check(const FrameCommand& command) {
 void Check(const SheetCommand& command) {
     CheckPicture(command.options);
 }
+void Check(const StripOptions& options) {
+    CheckPicture(options.picture);
+    Require(options.frames >= 1 && options.frames <= 240);
+    Require(!options.crop || IsSize(options.crop->size));
+    Require(!options.crop || !options.crop->corner ||
+            (options.crop->corner->first >= 0 && options.crop->corner->second >= 0));
+}
 void Check(const velmora::hosts::RenderOptions& options) {
     CheckInput(options.input);
     CheckEffect(options.effect);

@@ -340,6 +340,16 @@ class Kinds(ReelfxTest):
         self.picture("sheet", "%s-x.jpg", "--all", "--width", 64, env=dict(os.environ, REELFX_EFFECT="Film Pro"))
         self.assertTrue((self.out / "film-pro-x.jpg").exists())
 
+    def test_a_strip_shows_frames_as_they_are_rendered(self):
+        effect = ("-e", "Film Damage", "-p", "Shredded", "--seed", 3)
+        strip = self.picture("strip", "s.png", *effect, "--frame", 38, "--crop", "64x100+32+16")
+        self.assertEqual(probe(strip, "-show_entries", "stream=width"), [[str(3 * 68 + 4)]])
+        self.render(clips.small, "r-%d.png", *effect, "--frames", "38:")
+        for place in range(3):
+            shown = frame_digests(strip, "-vf", f"crop=64:100:{4 + place * 68}:32", "-pix_fmt", "rgb24")
+            rendered = frame_digests(self.out / f"r-{39 + place}.png", "-vf", "crop=64:100:32:16", "-pix_fmt", "rgb24")
+            self.assertEqual(shown, rendered)
+
     def test_preset_files_carry_settings(self):
         file = self.out / "mine.fxp"
         options = ("-e", "Film Look", "-p", "Sepia", "-s", "Saturation=12.5")
@@ -405,7 +415,9 @@ class Refusing(ReelfxTest):
             (2, ["--all", "folder"], ("sheet", small, self.out / "out.png", "--all")),
             (2, ["--all", "--effect"], ("sheet", small, self.out / "new", "--all", *CAMERA)),
             (3, ["no frame 99"], ("sheet", small, self.out / "new", "--all", "--frame", "99")),
+            (2, ["900x10 ", "320x180"], ("strip", small, self.out / "out.png", *CAMERA, "--crop", "900x10")),
             (2, ["pixels"], ("sheet", small, self.out / "out.png", *CAMERA, "--width", "8192", "--columns", "9")),
+            (2, ["--crop", "9x9+1"], ("strip", small, self.out / "out.png", *CAMERA, "--crop", "9x9+1")),
             (3, ["not a preset"], (*render, "--preset-file", text)),
             (4, ["No such file"], ("render", small, self.out / "no" / "out.mp4", *CAMERA)),
             (4, ["exists already"], ("render", small, text, *CAMERA)),

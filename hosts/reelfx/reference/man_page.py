@@ -31,6 +31,8 @@ EXAMPLES = (
     ("Ten seconds with settings of one's own:",
      'reelfx render in.mp4 out.mp4 -e "Film Camera" -s "X Jitter=4" -s Flicker=20 --start 1:30 --duration 10'),
     ("All presets of an effect on one frame:", 'reelfx sheet in.mp4 sheet.png -e "Film Damage" -n 20'),
+    ("How scratches move, on paper:",
+     'reelfx strip in.mp4 strip.png -e "Film Damage" -p Shredded --crop 150x500+600+0'),
     ("Between two other programs:",
      'ffmpeg -i in.mov -f yuv4mpegpipe - | reelfx render - - -e "Film Look" -p Sepia | ffplay -'),
 )
