@@ -108,7 +108,8 @@ bool EffectSession::Render(const FrameRecord& source, const FrameRecord& destina
     if (m_isPinned) m_state.random.Pin(m_seed, render::TruncateTolerant(seconds * render::kFramesPerSecond));
     MasterFace face(m_effect, m_values);
     const TimingRecord timing = {0.0, 0.0, seconds};
-    return RenderFrame({&m_settings, &m_state, m_options}, face, &source, &destination, &timing);
+    const std::uint32_t hostSeed = m_isPinned ? m_seed : 0;
+    return RenderFrame({&m_settings, &m_state, m_options, hostSeed}, face, &source, &destination, &timing);
 }
 
 }  // namespace velmora::effects

@@ -32,10 +32,12 @@ class EffectSession {
     void ApplyPreset(std::uint32_t preset) noexcept;
 
     // From now on every frame's randomness follows from the seed and the frame number alone: frames may be
-    // rendered in any order, by any session.
+    // rendered in any order, by any session. Seed 0 leaves scratches and flicker where the library has them;
+    // any other seed moves them too.
     void PinRandom(std::uint32_t seed) noexcept;
     // From now on the randomness is a running sequence from `state`, as in the library: a frame goes on
-    // where the frame before left off, and a frame rendered twice in a row repeats itself.
+    // where the frame before left off, and a frame rendered twice in a row repeats itself. Scratches and
+    // flicker are the library's.
     void StartRandom(std::uint32_t state) noexcept;
     // How many random numbers a frame of this processed width takes with the present values. With it a host
     // finds the state that a later frame of a sequence starts from.

@@ -21,7 +21,9 @@ bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameReco
     session.state->random.BeginFrame(context.FrameNumber());
     if (!context.IsValid(render::Slot::kSource) || !context.IsValid(render::Slot::kDestination)) return false;
     session.settings->ReadFromHost(face);
-    render::RenderStages(context, ReadStageSettings(*session.settings), *session.state, session.options);
+    render::StageSettings settings = ReadStageSettings(*session.settings);
+    settings.hostSeed = session.hostSeed;
+    render::RenderStages(context, settings, *session.state, session.options);
     context.Finish();
     return true;
 }

@@ -14,6 +14,7 @@ struct RenderSession {
     MasterSettingsList* settings = nullptr;  // not owned
     render::RenderState* state = nullptr;    // not owned
     render::RenderOptions options;
+    std::uint32_t hostSeed = 0;  // StageSettings::hostSeed; the library's hosts give none
 };
 
 // Renders one frame: builds the views, moves the random state on, reads every exposed setting through

@@ -6,6 +6,7 @@
 #include <iterator>
 #include <limits>
 
+#include "render/mix_bits.h"
 #include "render/rounding.h"
 
 namespace velmora::render {
@@ -38,13 +39,15 @@ std::uint8_t Saturate(std::int32_t value) noexcept {
 
 }  // namespace
 
-float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds) noexcept {
+float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds,
+                    std::uint32_t hostSeed) noexcept {
     // So much less than a draw that only the error of the product is meant.
     constexpr double kTolerance = 1e-9;
     constexpr double kPeriod = 4294967296.0;  // of the generator: only the count modulo that matters
     double draws = std::ceil(seconds * rate - kTolerance);
     draws = draws >= 1.0 ? std::min(draws, std::numeric_limits<double>::max()) : 1.0;
-    Random random(std::bit_cast<std::uint32_t>(Narrow(double{saturation} + flicker)));
+    const auto own = std::bit_cast<std::uint32_t>(Narrow(double{saturation} + flicker));
+    Random random(SeedFor(own, hostSeed));
     random.Skip(static_cast<std::uint32_t>(std::fmod(draws, kPeriod)) - 1u);
     return Narrow(random.DrawDecimal(0.0f, flicker, 2) - 0.5 * flicker);
 }
@@ -82,7 +85,8 @@ ColourStage PrepareColour(const StageSettings& settings, double seconds, Contras
 
     float offset = 0.0f;
     if (!IsNearZero(settings.flicker)) {
-        offset = FlickerOffset(settings.saturation, settings.flicker, settings.flickerRate, seconds);
+        offset = FlickerOffset(settings.saturation, settings.flicker, settings.flickerRate, seconds,
+                               settings.hostSeed);
     }
     if (!IsNearZero(brightness)) {
         offset = std::clamp(Narrow(double{offset} + brightness), -1.0f, 1.0f);

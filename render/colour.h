@@ -25,10 +25,10 @@
 namespace velmora::render {
 
 // The flicker's share of the brightness offset at a time: a value that changes `rate` times a second, the
-// k-th of a sequence that the settings alone seed, so that it is the same on every run. Costs the same at any
-// time. Within +-0.5; single precision.
-[[nodiscard]] float FlickerOffset(float saturation, float flicker, std::uint32_t rate,
-                                  double seconds) noexcept;
+// k-th of a sequence that the settings and the host's seed give, so that it is the same on every run. Costs the
+// same at any time. Within +-0.5; single precision.
+[[nodiscard]] float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds,
+                                  std::uint32_t hostSeed = 0) noexcept;
 
 [[nodiscard]] ByteTable BrightnessTable(float offset) noexcept;
 // `contrast` is half of the setting.

@@ -13,4 +13,10 @@ constexpr std::uint32_t MixBits(std::uint32_t word) noexcept {
     return word ^ (word >> 16);
 }
 
+// The seed of a sequence whose own seed follows from the settings alone, in a host that gives a seed: without one
+// (0) it stays, and any two others give two different values.
+constexpr std::uint32_t SeedFor(std::uint32_t own, std::uint32_t hostSeed) noexcept {
+    return hostSeed == 0 ? own : MixBits(own ^ MixBits(hostSeed));
+}
+
 }  // namespace velmora::render

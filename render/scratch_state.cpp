@@ -34,7 +34,7 @@ void Move(ScratchState& scratch, std::int32_t frames) noexcept {
 
 ScratchReplayKey ReplayKeyOf(const StageSettings& settings) noexcept {
     const std::uint32_t either = settings.scratchKinds & (kScratchBlack | kScratchWhite);
-    return {std::bit_cast<std::uint32_t>(settings.scratchSeed),
+    return {SeedFor(std::bit_cast<std::uint32_t>(settings.scratchSeed), settings.hostSeed),
             std::min(settings.scratchCount, kMostScratches),
             either != kScratchBlack && either != kScratchWhite};
 }

@@ -37,9 +37,12 @@ struct StageSettings {
     std::uint32_t scratchCount = 0;    // 0..16
     std::int32_t scratchConstant = 0;  // bounds range and speed of a scratch's sideways movement, pixels
     float scratchDepth = 0.0f;         // 0..1
-    float scratchSeed = 0.0f;          // its bits seed the scratches' own generator
+    float scratchSeed = 0.0f;          // its bits seed the scratches' own generator, with hostSeed
 
     float spots = 0.0f;  // 0..100
+
+    // Moves scratches and flicker, whose seeds follow from the values above. 0 in hosts that give no seed.
+    std::uint32_t hostSeed = 0;
 };
 
 }  // namespace velmora::render

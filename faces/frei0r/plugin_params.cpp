@@ -87,7 +87,8 @@ PluginDescription DescribePlugin(const effects::EffectTable& effect) {
                              .params = {}};
     plugin.params = {
         {"preset", F0R_PARAM_STRING, "None or one of " + QuotedList(effect.presetNames), ParamRole::kPreset},
-        {"seed", F0R_PARAM_STRING, "0 to 4294967295; another seed gives other damage", ParamRole::kSeed},
+        {"seed", F0R_PARAM_STRING, "0 to 4294967295; another seed gives other shake, flicker and damage",
+         ParamRole::kSeed},
         {"start frame", F0R_PARAM_STRING, "The clip's frame at the host's time 0", ParamRole::kStartFrame},
         {"frame rate", F0R_PARAM_STRING, "Frames per second, as 25 or 30000/1001", ParamRole::kFrameRate},
     };

@@ -3,7 +3,7 @@
 //
 //   index  name           type    value
 //   0      preset         string  a preset's name, or empty for none
-//   1      seed           string  0..4294967295; another seed gives other damage
+//   1      seed           string  0..4294967295; another seed gives other shake, flicker and damage
 //   2      start frame    string  the clip's frame that the host's time 0 shows
 //   3      frame rate     string  "25", "30000/1001"; see frame_clock.h
 //   4...   the effect's   double  slider, 0..1 over its shown range

@@ -124,6 +124,8 @@ TEST(EffectSession, PinnedFramesDoNotDependOnTheirOrder) {
             SCOPED_TRACE(effect->presetNames[preset]);
             auto forward = SessionWith(*effect, preset);
             auto backward = SessionWith(*effect, preset);
+            forward->PinRandom(preset);
+            backward->PinRandom(preset);
             std::vector<Picture> frames;
             frames.reserve(4);
             for (int frame = 0; frame < 4; ++frame) frames.push_back(FrameOf(*forward, SecondsOf(frame)));
@@ -134,13 +136,42 @@ TEST(EffectSession, PinnedFramesDoNotDependOnTheirOrder) {
     }
 }
 
-TEST(EffectSession, SeedsGiveDifferentFrames) {
-    auto session = SessionWith(kFilmCamera, 0);
-    const Picture first = FrameOf(*session, 1.0);
-    session->PinRandom(1);
-    EXPECT_NE(FrameOf(*session, 1.0), first);
-    session->PinRandom(0);
-    EXPECT_EQ(FrameOf(*session, 1.0), first);
+// Of scratches alone and of flicker alone: what the library draws the same on every run.
+std::unique_ptr<EffectSession> ScratchesAlone() {
+    auto session = SessionWith(kFilmDamage, Neutral(kFilmDamage));
+    session->SetValue(5, {.number = 1.0f});  // Density
+    session->SetValue(6, {.number = 1.0f});  // Depth
+    session->SetValue(7, {.flag = 1});       // Black
+    return session;
+}
+std::unique_ptr<EffectSession> FlickerAlone() {
+    return SessionWith(kFilmCamera, PresetNamed(kFilmCamera, "Fire Light"));
+}
+
+TEST(EffectSession, SeedsMoveScratchesAndFlickerButSeed0) {
+    constexpr int kFrames[] = {0, 40, 3, 100000};
+    const auto framesOf = [&](EffectSession& session) {
+        std::vector<Picture> frames;
+        for (const int frame : kFrames) frames.push_back(FrameOf(session, SecondsOf(frame)));
+        return frames;
+    };
+    for (auto* const make : {&ScratchesAlone, &FlickerAlone}) {
+        SCOPED_TRACE(make()->Effect().name);
+        auto session = make();
+        session->StartRandom(99);  // as in the library
+        const std::vector<Picture> library = framesOf(*session);
+        std::vector<std::vector<Picture>> seen = {library};
+        for (const std::uint32_t seed : {1u, 2u, 0xFFFFFFFFu}) {
+            session->PinRandom(seed);
+            seen.push_back(framesOf(*session));
+            for (std::size_t i = 0; i + 1 < seen.size(); ++i) EXPECT_NE(seen[i], seen.back()) << seed;
+            auto late = make();
+            late->PinRandom(seed);
+            EXPECT_EQ(FrameOf(*late, SecondsOf(kFrames[2])), seen.back()[2]) << seed;
+        }
+        session->PinRandom(0);
+        EXPECT_EQ(framesOf(*session), library);
+    }
 }
 
 TEST(EffectSession, TwoThreadsDoNotDisturbEachOther) {

@@ -44,7 +44,9 @@ void CheckEffect(EffectOptions effect) {
 void CheckPicture(const PictureOptions& picture) {
     CheckInput(picture.input);
     CheckEffect(picture.effect);
-    Require(picture.frame >= 0 && picture.columns >= 1 && picture.columns <= 32);
+    Require(picture.place.frame.value_or(0) >= 0 && picture.place.start.value_or(0.0) >= 0.0);
+    Require(!picture.place.frame || !picture.place.start);
+    Require(picture.columns >= 0 && picture.columns <= 32);
     Require(picture.width == 0 || (picture.width >= 16 && picture.width <= 8192));
 }
 
@@ -69,6 +71,13 @@ void Check(const FrameCommand& command) {
 }
 void Check(const SheetCommand& command) {
     CheckPicture(command.options);
+}
+void Check(const StripOptions& options) {
+    CheckPicture(options.picture);
+    Require(options.frames >= 1 && options.frames <= 240);
+    Require(!options.crop || IsSize(options.crop->size));
+    Require(!options.crop || !options.crop->corner ||
+            (options.crop->corner->first >= 0 && options.crop->corner->second >= 0));
 }
 void Check(const velmora::hosts::RenderOptions& options) {
     CheckInput(options.input);

@@ -3,6 +3,7 @@
 #include <CLI/CLI.hpp>
 
 #include <cstdio>
+#include <cstdlib>
 #include <sstream>
 
 #include "text/number_text.h"
@@ -11,6 +12,8 @@
 
 namespace velmora::hosts {
 namespace {
+
+constexpr char kTimeText[] = "seconds or HH:MM:SS";
 
 // Runs `parse` over an option's text; nothing read is a usage error that says what is expected.
 template <class Parse>
@@ -49,10 +52,9 @@ SectionOptions ReadSection(const TypedOptions& typed) {
         section.endFrame = end;
     }
     if (!typed.farm.empty()) section.farm = ReadFarm(typed.farm);
-    constexpr const char* kTime = "seconds or HH:MM:SS";
-    if (!typed.start.empty()) section.start = Parsed("--start", typed.start, ParseTime, kTime);
+    if (!typed.start.empty()) section.start = Parsed("--start", typed.start, ParseTime, kTimeText);
     if (!typed.duration.empty()) {
-        section.duration = Parsed("--duration", typed.duration, ParseTime, kTime);
+        section.duration = Parsed("--duration", typed.duration, ParseTime, kTimeText);
         if (*section.duration <= 0.0) throw UsageError("--duration must be longer than nothing");
     }
     if (!typed.frames.empty() && (section.start || section.duration)) {
@@ -132,6 +134,30 @@ PictureOptions ReadPicture(const TypedOptions& typed) {
     options.input = ReadInput(typed);
     options.effect = ReadEffect(typed);
     options.mayOverwrite = typed.overwrite;
+    if (!typed.start.empty()) options.place.start = Parsed("--start", typed.start, ParseTime, kTimeText);
+    return options;
+}
+
+// An effect of the environment is only a default, which --all does not need.
+bool NamesEffect(const EffectOptions& effect) {
+    const char* const fallback = std::getenv("REELFX_EFFECT");
+    return (!effect.effect.empty() && (fallback == nullptr || effect.effect != fallback)) || effect.preset ||
+           effect.presetFile || !effect.settings.empty();
+}
+
+PictureOptions ReadSheet(const TypedOptions& typed) {
+    PictureOptions options = ReadPicture(typed);
+    if (options.allEffects && NamesEffect(options.effect)) {
+        throw UsageError(
+            "--all takes all presets of all effects: leave out --effect, --preset, --preset-file and --set");
+    }
+    return options;
+}
+
+StripOptions ReadStrip(const TypedOptions& typed) {
+    StripOptions options = {.picture = ReadPicture(typed), .frames = typed.stripFrames, .crop = {}};
+    if (!typed.crop.empty())
+        options.crop = Parsed("--crop", typed.crop, ParseCrop, "a part like 160x540+880+270");
     return options;
 }
 
@@ -164,7 +190,8 @@ Command ReadCommandLine(int count, const char* const* arguments) {
     if (app.got_subcommand("presets")) return typed.presets;
     if (app.got_subcommand("info")) return InfoOptions{ReadInput(typed), typed.info.asJson};
     if (app.got_subcommand("frame")) return FrameCommand{ReadPicture(typed)};
-    if (app.got_subcommand("sheet")) return SheetCommand{ReadPicture(typed)};
+    if (app.got_subcommand("sheet")) return SheetCommand{ReadSheet(typed)};
+    if (app.got_subcommand("strip")) return ReadStrip(typed);
     if (const CLI::App* preset = app.get_subcommand("preset"); preset->parsed()) {
         if (preset->got_subcommand("show")) return typed.presetShow;
         return ReadPresetSave(typed);
@@ -195,6 +222,9 @@ ExitCode Run(const FrameCommand& command) {
 }
 ExitCode Run(const SheetCommand& command) {
     return RunSheet(command.options);
+}
+ExitCode Run(const StripOptions& options) {
+    return RunStrip(options);
 }
 ExitCode Run(const PresetShowOptions& options) {
     return RunPresetShow(options);

@@ -11,6 +11,7 @@
 #include "programs/reelfx/commands/preset_command.h"
 #include "programs/reelfx/commands/presets_command.h"
 #include "programs/reelfx/commands/render_command.h"
+#include "programs/reelfx/commands/strip_command.h"
 
 namespace velmora::hosts {
 
@@ -25,7 +26,7 @@ struct SheetCommand {
     PictureOptions options;
 };
 using Command = std::variant<TextCommand, ListOptions, RenderOptions, FrameCommand, SheetCommand,
-                             PresetShowOptions, PresetSaveOptions, PresetsOptions, InfoOptions>;
+                             StripOptions, PresetShowOptions, PresetSaveOptions, PresetsOptions, InfoOptions>;
 
 // What the arguments ask for; opens and writes nothing. Throws UsageError.
 Command ReadCommandLine(int count, const char* const* arguments);

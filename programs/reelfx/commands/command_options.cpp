@@ -27,7 +27,10 @@ void AddEffect(CLI::App& command, TypedOptions& typed) {
 }
 
 void AddRandom(CLI::App& command, TypedOptions& typed) {
-    command.add_option("--seed", typed.seed, "Another seed gives other damage")
+    command
+        .add_option("--seed", typed.seed,
+                    "Another seed gives other shake, flicker and damage; with 0 flicker and scratches are "
+                    "the library's")
         ->type_name("N")
         ->capture_default_str()
         ->envname("REELFX_SEED");
@@ -89,20 +92,73 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
                     "Check everything and tell what would be done, but write nothing");
 }
 
-CLI::App& AddPicture(CLI::App& app, TypedOptions& typed, const char* name, const char* what) {
-    CLI::App& command = *app.add_subcommand(name, what);
+// What differs in the help of the commands that write stills.
+struct PictureTexts {
+    const char* what;
+    const char* out;
+    const char* frame;
+};
+
+CLI::App& AddPicture(CLI::App& app, TypedOptions& typed, const char* name, const PictureTexts& texts) {
+    CLI::App& command = *app.add_subcommand(name, texts.what);
     AddInput(command, typed);
-    command.add_option("OUT", typed.picture.out, "PNG or JPEG")->type_name("FILE")->required();
+    command.add_option("OUT", typed.picture.out, texts.out)->type_name("FILE")->required();
     AddEffect(command, typed);
     AddRandom(command, typed);
-    command.add_option("--frame,-n", typed.picture.frame, "Frame of the clip, counted from 0")
-        ->type_name("N")
-        ->check(CLI::NonNegativeNumber);
+    CLI::Option* const frame = command.add_option("--frame,-n", typed.picture.place.frame, texts.frame)
+                                   ->type_name("N")
+                                   ->check(CLI::NonNegativeNumber);
+    command
+        .add_option("--start", typed.start,
+                    "Instead of --frame: the first frame from this time of the clip on")
+        ->type_name("TIME")
+        ->excludes(frame);
+    command.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
+    return command;
+}
+
+void AddWidth(CLI::App& command, TypedOptions& typed) {
     command.add_option("--width", typed.picture.width, "Width of each picture in pixels")
         ->type_name("W")
         ->check(CLI::Range(16, 8192));
-    command.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
-    return command;
+}
+
+void AddColumns(CLI::App& command, TypedOptions& typed, const char* what) {
+    command.add_option("--columns", typed.picture.columns, what)->type_name("N")->check(CLI::Range(1, 32));
+}
+
+void AddPictures(CLI::App& app, TypedOptions& typed) {
+    CLI::App& frame = AddPicture(app, typed, "frame",
+                                 {.what = "Write one frame before and after, side by side",
+                                  .out = "PNG or JPEG",
+                                  .frame = "Frame of the clip, counted from 0; default: the first"});
+    AddWidth(frame, typed);
+    CLI::App& sheet = AddPicture(
+        app, typed, "sheet",
+        {.what = "Write one frame through all presets of an effect",
+         .out = "PNG or JPEG; with --all a folder, or a name with %s for the effect's: sheets/%s.jpg",
+         .frame = "Frame of the clip, counted from 0; default: the clip's middle, of a pipe the first"});
+    AddWidth(sheet, typed);
+    AddColumns(sheet, typed, "Pictures in a row; default: 4");
+    sheet.add_flag("--all", typed.picture.allEffects, "A sheet of each effect, film-camera.png and so on");
+    CLI::App& strip = AddPicture(
+        app, typed, "strip",
+        {.what = "Write successive frames through an effect side by side at 100 %, to judge motion",
+         .out = "PNG or JPEG",
+         .frame =
+             "First frame, counted from 0; default: so that the frames are the clip's middle, of a pipe its "
+             "first"});
+    strip.add_option("--frames", typed.stripFrames, "How many frames; fewer come where the clip ends")
+        ->type_name("N")
+        ->capture_default_str()
+        ->check(CLI::Range(1, 240));
+    strip
+        .add_option(
+            "--crop", typed.crop,
+            "What each picture shows, in pixels from the left and the top; without +X+Y in the middle. "
+            "Default: the middle, 540 high and so wide that a row fills 1920 pixels")
+        ->type_name("WxH+X+Y");
+    AddColumns(strip, typed, "Pictures in a row; default: all");
 }
 
 void AddPreset(CLI::App& app, TypedOptions& typed) {
@@ -152,11 +208,7 @@ void AddCommands(CLI::App& app, TypedOptions& typed) {
     app.require_subcommand(1);
     AddList(app, typed);
     AddRender(app, typed);
-    AddPicture(app, typed, "frame", "Write one frame before and after, side by side");
-    AddPicture(app, typed, "sheet", "Write one frame through all presets of an effect")
-        .add_option("--columns", typed.picture.columns, "Pictures in a row")
-        ->type_name("N")
-        ->check(CLI::Range(1, 32));
+    AddPictures(app, typed);
     AddPreset(app, typed);
     AddInfo(app, typed);
 }

@@ -12,6 +12,7 @@
 #include "programs/reelfx/commands/preset_command.h"
 #include "programs/reelfx/commands/presets_command.h"
 #include "programs/reelfx/commands/render_command.h"
+#include "programs/reelfx/commands/strip_command.h"
 
 namespace CLI {
 class App;
@@ -56,6 +57,8 @@ struct TypedOptions {
     PresetsOptions presets;
     InfoOptions info;
     PictureOptions picture;
+    int stripFrames = 12;
+    std::string crop;
     PresetShowOptions presetShow;
     PresetSaveOptions presetSave;
 };

@@ -5,50 +5,101 @@
 #include "programs/reelfx/media/picture_turn.h"
 #include "programs/reelfx/media/pixel_converter.h"
 #include "programs/reelfx/pictures/still_writer.h"
+#include <filesystem>
+#include <utility>
+#include <vector>
+
+#include "programs/common/usage_error.h"
+#include "programs/reelfx/common/output_place.h"
 
 namespace velmora::hosts {
 namespace {
 
 constexpr std::int32_t kSheetCellWidth = 480;
+constexpr int kSheetColumns = 4;
+constexpr char kNameMark[] = "%s";  // of the effect, in the names of several sheets
 
-// These commands write at their very end.
-void FailIfInterrupted() {
-    if (Interrupts() > 0) throw Failure(kExitInterrupted, "interrupted; nothing was written");
+BgraPicture DrawSheet(const EffectChoice& choice, ClipPicture& source, const PictureOptions& options) {
+    std::vector<GridCell> cells;
+    cells.push_back({"Source", source.picture});
+    for (std::uint32_t preset = 0; preset < choice.Info().presets.size(); ++preset) {
+        cells.push_back({choice.Info().presets[preset], Rendered(*choice.NewSession(preset), source)});
+    }
+    const std::int32_t width = options.width > 0 ? options.width : kSheetCellWidth;
+    return DrawGrid(cells,
+                    {choice.Info().name, options.columns > 0 ? options.columns : kSheetColumns, width});
 }
 
-// A frame of the clip as a viewer sees it.
-struct SourcePicture {
-    BgraPicture picture;
-    double seconds = 0.0;
+// "film-pro"
+std::string FileNameOf(std::string effect) {
+    for (char& letter : effect) {
+        letter = letter == ' '                    ? '-'
+                 : letter >= 'A' && letter <= 'Z' ? static_cast<char>(letter + 'a' - 'A')
+                                                  : letter;
+    }
+    return effect;
+}
+
+// Where sheets that share OUT go: their folder, made where there is none, and gone again if nothing comes of it.
+class SheetPlaces {
+  public:
+    explicit SheetPlaces(const std::string& out) : m_pattern(out) {
+        namespace fs = std::filesystem;
+        if (out.find(kNameMark) == std::string::npos) {
+            if (!IsFolder(out))
+                throw UsageError(out + ": --all takes a folder, or a name like sheets/%s.png");
+            m_pattern = (fs::path(out) / kNameMark).string() + ".png";
+        }
+        CheckStillName(m_pattern);
+        std::error_code error;
+        const fs::path folder = fs::path(m_pattern).parent_path();
+        if (folder.empty() || fs::is_directory(folder, error)) return;
+        if (!fs::create_directory(folder, error))
+            throw Failure(kExitOutput, folder.string() + ": the folder cannot be made: " + error.message());
+        m_made = folder;
+    }
+    ~SheetPlaces() {
+        std::error_code isNotEmpty;
+        if (!m_made.empty()) std::filesystem::remove(m_made, isNotEmpty);
+    }
+    SheetPlaces(const SheetPlaces&) = delete;
+    SheetPlaces& operator=(const SheetPlaces&) = delete;
+
+    [[nodiscard]] std::string Of(const std::string& effect) const {
+        std::string path = m_pattern;
+        const std::string name = FileNameOf(effect);
+        for (std::size_t at = 0; (at = path.find(kNameMark, at)) != std::string::npos; at += name.size())
+            path.replace(at, sizeof(kNameMark) - 1, name);
+        return path;
+    }
+
+  private:
+    // What has an ending is meant as a file, unless it is there and a folder.
+    static bool IsFolder(const std::string& path) {
+        namespace fs = std::filesystem;
+        std::error_code ignored;
+        const fs::file_status status = fs::status(path, ignored);
+        return fs::exists(status) ? fs::is_directory(status) : !fs::path(path).has_extension();
+    }
+
+    std::string m_pattern;
+    std::filesystem::path m_made;
 };
 
-SourcePicture ReadFrame(const PictureOptions& options) {
-    MediaReader reader(options.input);
-    std::int64_t index = 0;
-    for (;;) {
-        FailIfInterrupted();
-        MediaReader::Item item = reader.Next();
-        if (!item.frame && !item.packet) break;
-        if (!item.frame || index++ != options.frame) continue;
-        BgraPicture lying(item.frame->width, item.frame->height);
-        PixelConverter().ToBgra(*item.frame, lying);
-        SourcePicture source;
-        source.seconds = reader.SecondsOf(item.frame->pts);
-        TurnPicture(lying, QuarterTurnsOf(reader.Picture()), source.picture);
-        return source;
+// All are drawn before the first is written, so that what fails leaves no part of the five.
+ExitCode RunAllSheets(const PictureOptions& options) {
+    const SheetPlaces places(options.out);
+    for (const EffectInfo& info : CoreEffects()) CheckOutputPlace(places.Of(info.name), options.mayOverwrite);
+    ClipPicture source = *ClipPictures(options.input, options.place, 1).Next();
+    std::vector<BgraPicture> sheets;
+    for (const EffectInfo& info : CoreEffects()) {
+        EffectOptions effect = options.effect;
+        effect.effect = info.name;
+        sheets.push_back(DrawSheet(EffectChoice(effect), source, options));
     }
-    if (!reader.BreakOff().empty()) throw Failure(kExitInput, reader.Name() + ": " + reader.BreakOff());
-    throw Failure(kExitInput, reader.Name() + ": has no frame " + std::to_string(options.frame) +
-                                  "; it has " + std::to_string(index));
-}
-
-BgraPicture Render(effects::EffectSession& session, SourcePicture& source) {
-    FailIfInterrupted();
-    BgraPicture result(source.picture.Width(), source.picture.Height());
-    if (!session.Render(source.picture.Record(), result.Record(), source.seconds)) {
-        throw Failure(kExitInternal, "the frame cannot be rendered");
-    }
-    return result;
+    for (std::size_t i = 0; i < sheets.size(); ++i)
+        WriteStill(sheets[i], places.Of(CoreEffects()[i].name), options.mayOverwrite);
+    return kExitDone;
 }
 
 }  // namespace
@@ -56,29 +107,27 @@ BgraPicture Render(effects::EffectSession& session, SourcePicture& source) {
 ExitCode RunFrame(const PictureOptions& options) {
     CheckStillName(options.out);
     const EffectChoice choice(options.effect);
-    SourcePicture source = ReadFrame(options);
+    CheckOutputPlace(options.out, options.mayOverwrite);
+    FramePlace place = options.place;
+    if (!place.start && !place.frame) place.frame = 0;
+    ClipPicture source = *ClipPictures(options.input, place, 1).Next();
     std::string label = choice.Info().name;
     if (options.effect.preset) label += ": " + *options.effect.preset;
     std::vector<GridCell> cells;
     cells.push_back({"Source", source.picture});
-    cells.push_back({label, Render(*choice.NewSession(), source)});
+    cells.push_back({label, Rendered(*choice.NewSession(), source)});
     const std::int32_t width = options.width > 0 ? options.width : source.picture.Width();
     WriteStill(DrawGrid(cells, {"", 2, width}), options.out, options.mayOverwrite);
     return kExitDone;
 }
 
 ExitCode RunSheet(const PictureOptions& options) {
+    if (options.allEffects) return RunAllSheets(options);
     CheckStillName(options.out);
     const EffectChoice choice(options.effect);
-    SourcePicture source = ReadFrame(options);
-    std::vector<GridCell> cells;
-    cells.push_back({"Source", source.picture});
-    for (std::uint32_t preset = 0; preset < choice.Info().presets.size(); ++preset) {
-        cells.push_back({choice.Info().presets[preset], Render(*choice.NewSession(preset), source)});
-    }
-    const std::int32_t width = options.width > 0 ? options.width : kSheetCellWidth;
-    WriteStill(DrawGrid(cells, {choice.Info().name, options.columns, width}), options.out,
-               options.mayOverwrite);
+    CheckOutputPlace(options.out, options.mayOverwrite);
+    ClipPicture source = *ClipPictures(options.input, options.place, 1).Next();
+    WriteStill(DrawSheet(choice, source, options), options.out, options.mayOverwrite);
     return kExitDone;
 }
 

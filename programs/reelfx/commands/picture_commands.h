@@ -1,4 +1,5 @@
-// `reelfx frame`: one frame before and after; `reelfx sheet`: one frame through all presets of an effect.
+// `reelfx frame`: one frame before and after; `reelfx sheet`: one frame through all presets of an effect, or of
+// each effect.
 #pragma once
 
 #include <cstdint>
@@ -7,6 +8,7 @@
 #include "programs/reelfx/common/effect_choice.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/media_reader.h"
+#include "programs/reelfx/pictures/clip_pictures.h"
 
 namespace velmora::hosts {
 
@@ -14,10 +16,13 @@ struct PictureOptions {
     InputOptions input;
     EffectOptions effect;
     std::string out;         // .png or .jpg
-    std::int64_t frame = 0;  // of the clip
+    FramePlace place;        // of the clip
     std::int32_t width = 0;  // of each picture; 0: the command's own
-    int columns = 4;         // of a sheet
+    int columns = 0;         // pictures in a row; 0: the command's own
     bool mayOverwrite = false;
+    // A sheet of each effect: `out` is a folder, which is made where there is none, or a name with "%s" for the
+    // effect's, "film-pro". Of `effect` only the randomness counts.
+    bool allEffects = false;
 };
 
 // Throw Failure or UsageError.

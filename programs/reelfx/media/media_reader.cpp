@@ -33,6 +33,8 @@ MediaReader::MediaReader(const InputOptions& options) : MediaReader(options, Clo
     while (!m_firstFrame && !m_ended) ReadMore();
     if (m_firstFrame) return;
     if (!m_breakOff.empty()) FailReading(m_breakOff);
+    // Decoders that have no memory may call all packets invalid.
+    if (m_damaged > 0) ThrowIfNoMemory(AVERROR_EXTERNAL);
     FailReading(m_damaged > 0 ? "no frame can be decoded" : "there is no frame in it");
 }
 
@@ -180,6 +182,7 @@ void MediaReader::Decode(const AVPacket* packet) {
         TakeFrames();
         error = avcodec_send_packet(m_decoder.get(), packet);
     }
+    ThrowIfNoMemory(error);
     if (error < 0 && error != AVERROR_EOF) ++m_damaged;
     TakeFrames();
 }
@@ -189,6 +192,7 @@ void MediaReader::TakeFrames() {
         FramePtr frame = NewFrame();
         const int error = avcodec_receive_frame(m_decoder.get(), frame.get());
         if (error == AVERROR(EAGAIN) || error == AVERROR_EOF) return;
+        ThrowIfNoMemory(error);
         if (error < 0) {
             ++m_damaged;
             return;

@@ -7,6 +7,8 @@
 #include <memory>
 #include <new>
 
+#include "programs/common/usage_error.h"
+
 namespace velmora::hosts {
 namespace {
 
@@ -19,6 +21,7 @@ using ContextPtr = std::unique_ptr<cairo_t, CairoDelete>;
 
 constexpr double kPaper = 0.11;  // dark, so that it does not outshine the pictures
 constexpr double kInk = 0.87;
+constexpr int kMostPixels = 32767;  // of a side, that the drawing library takes
 
 // All lengths follow the cells' width, so that sheets of any size look alike.
 struct Measures {
@@ -78,6 +81,10 @@ void DrawPicture(cairo_t* context, const BgraPicture& picture, double x, double 
 
 BgraPicture DrawGrid(const std::vector<GridCell>& cells, const GridOptions& options) {
     const Measures measures(cells, options);
+    if (measures.Width() > kMostPixels || measures.Height() > kMostPixels) {
+        throw UsageError("the pictures together would be " + std::to_string(measures.Width()) + "x" +
+                         std::to_string(measures.Height()) + " pixels, more than can be drawn");
+    }
     BgraPicture sheet(measures.Width(), measures.Height());
     const SurfacePtr surface(cairo_image_surface_create_for_data(
         sheet.Row(0), CAIRO_FORMAT_RGB24, sheet.Width(), sheet.Height(), static_cast<int>(sheet.Stride())));

@@ -19,7 +19,8 @@ struct GridOptions {
     std::int32_t cellWidth;  // pixels; pictures are scaled to it
 };
 
-// All pictures have the shape of the first. Alpha is not shown; the result is opaque.
+// All pictures have the shape of the first. Alpha is not shown; the result is opaque. Throws UsageError when it would
+// be too large to draw.
 BgraPicture DrawGrid(const std::vector<GridCell>& cells, const GridOptions& options);
 
 }  // namespace velmora::hosts

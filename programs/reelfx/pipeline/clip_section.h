@@ -44,6 +44,9 @@ class ClipSection {
     // item is a frame, and packets that lie before it are left out.
     PipelineItemPtr Next();
 
+    // Frames read so far, those before the section too; 0 after a jump.
+    [[nodiscard]] std::int64_t FramesCounted() const { return m_nextIndex; }
+
     // Frames that will come, as far as can be told; 0 when it cannot.
     [[nodiscard]] static std::int64_t FrameCountGuess(const MediaReader& reader,
                                                       const SectionOptions& options);

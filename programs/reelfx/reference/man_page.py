@@ -10,7 +10,8 @@ reelfx renders footage through effects that give it the look of old film: shake,
 flicker and faded colours. It reads whatever FFmpeg reads and keeps sound, size, frame rate, times and colours.
 
 The same settings, seed and frames give the same bytes on every machine, with any number of threads, and for a part of a
-clip the same as for the whole. Another seed gives other damage.
+clip the same as for the whole. Another seed gives other shake, flicker, wear, spots and scratches; with seed 0, flicker and
+scratches are those of the Windows library.
 
 Names of effects, presets and parameters are taken in any case of the letters. A slider takes a number of its range, a
 colour #RRGGBB, a menu an item's text or its number from 0, a check box on or off. Settings are applied in this order: the
@@ -30,6 +31,8 @@ EXAMPLES = (
     ("Ten seconds with settings of one's own:",
      'reelfx render in.mp4 out.mp4 -e "Film Camera" -s "X Jitter=4" -s Flicker=20 --start 1:30 --duration 10'),
     ("All presets of an effect on one frame:", 'reelfx sheet in.mp4 sheet.png -e "Film Damage" -n 20'),
+    ("How scratches move, on paper:",
+     'reelfx strip in.mp4 strip.png -e "Film Damage" -p Shredded --crop 150x500+600+0'),
     ("Between two other programs:",
      'ffmpeg -i in.mov -f yuv4mpegpipe - | reelfx render - - -e "Film Look" -p Sepia | ffplay -'),
 )
