@@ -109,8 +109,8 @@ void Approach(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t cou
     }
 }
 
-std::uint8_t Screened(std::uint32_t channel, std::uint32_t veil) noexcept {
-    return static_cast<std::uint8_t>(channel + (((255 - channel) * veil + 0x4000) >> 15));
+std::uint8_t Screened(std::uint32_t channel, std::uint32_t layer) noexcept {
+    return static_cast<std::uint8_t>(channel + (((255 - channel) * layer + 0x4000) >> 15));
 }
 
 Bgra ScreenPixel(Bgra pixel, std::uint32_t blue, std::uint32_t green, std::uint32_t red) noexcept {
@@ -120,16 +120,16 @@ Bgra ScreenPixel(Bgra pixel, std::uint32_t blue, std::uint32_t green, std::uint3
             Screened(pixel.red, MulHigh(red, share)), pixel.alpha};
 }
 
-void Screen(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
-    for (std::int32_t x = 0; x < width; ++x, veil += kCellLanes) {
-        out[x] = ScreenPixel(in[x], veil[0], veil[1], veil[2]);
+void Screen(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width) noexcept {
+    for (std::int32_t x = 0; x < width; ++x, layer += kCellLanes) {
+        out[x] = ScreenPixel(in[x], layer[0], layer[1], layer[2]);
     }
 }
 
-void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
+void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width) noexcept {
     constexpr std::int32_t kShares[4] = {24576, 8192, 8192, 24576};  // 3/8 and 1/8 of the way to a neighbour
     for (std::int32_t x = 0; x < width; ++x) {
-        const ConstCellRow near = veil + x / 4 * kCellLanes;
+        const ConstCellRow near = layer + x / 4 * kCellLanes;
         const ConstCellRow far = x % 4 < 2 ? near - kCellLanes : near + kCellLanes;
         const auto at = [&](int c) {
             return static_cast<std::uint32_t>(Approached(near[c], far[c], kShares[x % 4]));

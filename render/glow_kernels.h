@@ -1,8 +1,8 @@
 // The inner loops of the glow stage, in the forms that processors offer.
 //
 // They work on rows of cells. A cell is four 16-bit numbers: blue, green and red of one or more pixels, 0 for
-// black to kCellWhite, and a fourth that carries nothing. Rows have kCellPad cells of room at either end, and
-// a loop may leave anything in the room behind the last cell.
+// black to kCellWhite, and a fourth that carries nothing. Rows have kCellPad cells of padding at either end,
+// and a loop may leave anything in the padding behind the last cell.
 #pragma once
 
 #include <array>
@@ -35,7 +35,7 @@ inline constexpr std::int32_t kHighlightFloor = 3300;
 inline constexpr std::int32_t kHighlightStretch = 35850;
 inline constexpr std::int32_t kLumaBlue = 29, kLumaGreen = 150, kLumaRed = 77;  // of 256
 
-// Up to this level of the brightest channel the veil comes in evenly; black gets none of it.
+// Up to this level of the brightest channel the glow layer comes in evenly; black gets none of it.
 inline constexpr std::int32_t kBlackRamp = 24;
 inline constexpr std::int32_t kBlackRampStep = 65535 / kBlackRamp;
 
@@ -59,15 +59,15 @@ struct GlowKernels {
     // out = out × ownShare + other × otherShare, shares of 65536.
     void (*mix)(CellRow out, ConstCellRow other, std::int32_t count, std::uint16_t ownShare,
                 std::uint16_t otherShare) noexcept;
-    // Makes a blur v the veil that lies over the picture: v (2 − v) × strength, of 65536. Light adds up before
-    // the film's curve, which lifts the faint parts; this does the same to what surrounds a highlight.
+    // Makes a blur v the glow layer: v (2 − v) × strength, of 65536. Light adds up before the film's curve,
+    // which lifts the faint parts; this does the same to what surrounds a highlight.
     void (*lift)(CellRow cells, std::int32_t count, std::uint16_t strength) noexcept;
     // near + (far − near) × share, a share of 65536 below a half.
     void (*approach)(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t count,
                      std::int16_t share) noexcept;
-    // Screens pixels with a veil of one cell for a pixel, or for four; then the veil's ends are continued.
-    void (*screen)(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept;
-    void (*screenFourfold)(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept;
+    // Screens pixels with a glow layer of one cell for a pixel, or for four; then its ends are continued.
+    void (*screen)(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width) noexcept;
+    void (*screenFourfold)(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width) noexcept;
 };
 
 [[nodiscard]] const GlowKernels& GlowKernelsOf(Form form) noexcept;

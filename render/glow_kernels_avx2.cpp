@@ -67,13 +67,13 @@ Lanes Luma(Lanes a) noexcept {
     return {_mm256_or_si256(luma, _mm256_slli_epi32(luma, 16))};
 }
 
-// The veil over eight pixels: over 0, 1, 4 and 5 and over 2, 3, 6 and 7, as bytes unpack in both halves.
+// The glow layer over eight pixels: over 0, 1, 4 and 5 and over 2, 3, 6 and 7, as bytes unpack in both halves.
 constexpr std::int32_t kScreenPixels = 8;
-struct Veil {
+struct GlowLayer {
     Lanes low, high;
 };
 
-Veil LoadVeil(ConstCellRow cells) noexcept {
+GlowLayer LoadLayer(ConstCellRow cells) noexcept {
     const __m256i first = Lanes::Load(cells).v, second = Lanes::Load(cells + Lanes::kSize).v;
     return {{_mm256_permute2x128_si256(first, second, 0x20)},
             {_mm256_permute2x128_si256(first, second, 0x31)}};
@@ -81,7 +81,7 @@ Veil LoadVeil(ConstCellRow cells) noexcept {
 
 // Over four pixels under one cell: 3/8 and 1/8 of the way to the cell before, as far to the one behind. Then
 // over the next four.
-Veil SpreadVeil(ConstCellRow cell) noexcept {
+GlowLayer SpreadLayer(ConstCellRow cell) noexcept {
     constexpr long long kFar = 0x6000600060006000, kNear = 0x2000200020002000;
     const Lanes lowShares = {_mm256_setr_epi64x(kFar, kNear, kFar, kNear)};
     const Lanes highShares = {_mm256_setr_epi64x(kNear, kFar, kNear, kFar)};
@@ -91,8 +91,8 @@ Veil SpreadVeil(ConstCellRow cell) noexcept {
             Approached(near, {_mm256_permute4x64_epi64(cells, _MM_SHUFFLE(3, 3, 2, 2))}, highShares)};
 }
 
-// The veil's fourth number is 0, so alpha stays as it is.
-void ScreenPixels(const Bgra* in, Bgra* out, const Veil& veil) noexcept {
+// The glow layer's fourth number is 0, so alpha stays as it is.
+void ScreenPixels(const Bgra* in, Bgra* out, const GlowLayer& layer) noexcept {
     const __m256i pixels = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in));
     const __m256i brighter = _mm256_max_epu8(pixels, _mm256_srli_epi32(pixels, 8));
     const __m256i brightest = _mm256_max_epu8(brighter, _mm256_srli_epi32(pixels, 16));
@@ -107,9 +107,9 @@ void ScreenPixels(const Bgra* in, Bgra* out, const Veil& veil) noexcept {
     const __m256i rest = _mm256_xor_si256(pixels, _mm256_set1_epi8(-1));
     const __m256i zero = _mm256_setzero_si256();
     const __m256i low =
-        _mm256_mulhrs_epi16(_mm256_unpacklo_epi8(rest, zero), _mm256_mulhi_epu16(veil.low.v, lowShare));
+        _mm256_mulhrs_epi16(_mm256_unpacklo_epi8(rest, zero), _mm256_mulhi_epu16(layer.low.v, lowShare));
     const __m256i high =
-        _mm256_mulhrs_epi16(_mm256_unpackhi_epi8(rest, zero), _mm256_mulhi_epu16(veil.high.v, highShare));
+        _mm256_mulhrs_epi16(_mm256_unpackhi_epi8(rest, zero), _mm256_mulhi_epu16(layer.high.v, highShare));
     const __m256i screened = _mm256_add_epi8(pixels, _mm256_packus_epi16(low, high));
     _mm256_storeu_si256(reinterpret_cast<__m256i*>(out), screened);
 }

@@ -113,7 +113,7 @@ TEST(Glow, ReachesAsFarAsThePictureIsHigh) {
     }
 }
 
-// Beside a light the veil falls without a step that the eye could take for an edge. The bound is the steepest
+// Beside a light the glow falls without a step that the eye could take for an edge. The bound is the steepest
 // fall of blurs as wide as these, in levels a pixel.
 TEST(Glow, FallsOffWithoutBands) {
     for (const std::int32_t height : {288, 576, 1080, 1440}) {
