@@ -4,6 +4,7 @@
 #include <new>
 
 #include "render/glow_taps.h"
+#include "render/mix_bits.h"
 #include "render/rounding.h"
 
 namespace velmora::render {
@@ -12,10 +13,10 @@ namespace {
 constexpr std::int32_t kMostLayerRows = 300;
 
 // Of the three blurs in the glow layer.
-constexpr double kNarrowShare = 0.30;
-constexpr double kMiddleShare = 0.32;
-constexpr double kWideShare = 0.38;
-constexpr double kStrongest = 0.75;  // of the glow layer at amount 1
+constexpr double kNarrowShare = 0.20;
+constexpr double kMiddleShare = 0.36;
+constexpr double kWideShare = 0.44;
+constexpr double kStrongest = 0.72;  // of the glow layer at amount 1
 
 // Half the size, the last cell of an odd one counted whole.
 constexpr std::int32_t Halved(std::int32_t size) noexcept {
@@ -264,6 +265,8 @@ void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
     // How far the row lies from the middle of its cells, in half pixels, and so on the way to the next ones.
     const std::int32_t away = 2 * (y & (side - 1)) + 1 - side;
     const std::int16_t share = static_cast<std::int16_t>(std::int64_t{std::abs(away)} * 32768 / side);
+    // A hash, so that rows make no pattern together; of the place alone, so that no division of work shows.
+    const auto dither = static_cast<std::uint16_t>(MixBits(static_cast<std::uint32_t>(y)));
     CellRow row = m_rows.Row(0), other = m_rows.Row(1);
     m_kernels->approach(m_layer.Row(cell), m_layer.Row(away < 0 ? cell - 1 : cell + 1), row, m_layer.width,
                         share);
@@ -275,9 +278,9 @@ void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
         std::swap(row, other);
         cells = Reduced(width, reduction - 1);
     }
-    if (wanted == 0) return m_kernels->screen(in, out, row, width);
+    if (wanted == 0) return m_kernels->screen(in, out, row, width, dither);
     ContinueEnds(row, cells);
-    m_kernels->screenFourfold(in, out, row, width);
+    m_kernels->screenFourfold(in, out, row, width, dither);
 }
 
 GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width, std::int32_t height,

@@ -1,6 +1,7 @@
 // Glow ("Diffusion"): what a mist filter before the lens does. Highlights spread as a wide soft glow layer,
-// whose radius is proportional to the picture's height, and which is laid over the picture by screening. Black
-// stays black, no channel gets darker, alpha is kept.
+// whose radius is proportional to the picture's height, and which is laid over the picture by screening: the
+// dark around a light gets most of it. A picture without lights stays as it is, no channel gets darker, alpha is
+// kept.
 //
 // The glow layer is made before the rows are worked on, from the whole picture: highlights of a reduced picture
 // (about 150 to 300 rows high) are blurred at three widths in a pyramid, integers all the way, so that the

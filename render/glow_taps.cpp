@@ -11,7 +11,7 @@ namespace {
 // the mist. Standard deviations are shares of the picture's height.
 constexpr double kNarrowSigma = 0.004;
 constexpr double kMiddleSigma = 0.020;
-constexpr double kWideSigma = 0.075;
+constexpr double kWideSigma = 0.090;
 
 // What two halvings, and two doublings as well, add to a blur's variance, in squares of the coarser cells.
 constexpr double kResamplingVariance = 0.1875 + 0.1875 / 4;
