@@ -4,18 +4,19 @@
 #include <new>
 
 #include "render/glow_taps.h"
+#include "render/mix_bits.h"
 #include "render/rounding.h"
 
 namespace velmora::render {
 namespace {
 
-constexpr std::int32_t kMostVeilRows = 300;
+constexpr std::int32_t kMostLayerRows = 300;
 
-// Of the three blurs in the veil.
-constexpr double kNarrowShare = 0.30;
-constexpr double kMiddleShare = 0.32;
-constexpr double kWideShare = 0.38;
-constexpr double kStrongest = 0.75;  // of the veil at amount 1
+// Of the three blurs in the glow layer.
+constexpr double kNarrowShare = 0.20;
+constexpr double kMiddleShare = 0.36;
+constexpr double kWideShare = 0.44;
+constexpr double kStrongest = 0.72;  // of the glow layer at amount 1
 
 // Half the size, the last cell of an odd one counted whole.
 constexpr std::int32_t Halved(std::int32_t size) noexcept {
@@ -35,16 +36,16 @@ void ContinueEnds(CellRow row, std::int32_t width) noexcept {
     }
 }
 
-class VeilMaker {
+class GlowLayerMaker {
   public:
-    VeilMaker(double amount, const RowReader& input, std::int32_t width, std::int32_t height,
-              const GlowKernels& kernels) noexcept
+    GlowLayerMaker(double amount, const RowReader& input, std::int32_t width, std::int32_t height,
+                   const GlowKernels& kernels) noexcept
         : m_input(input),
           m_width(width),
           m_height(height),
           m_kernels(kernels),
           m_strength(static_cast<std::uint16_t>(RoundHalfAway(kStrongest * amount * 65535.0))) {
-        while (Reduced(height, m_reduction) > kMostVeilRows) ++m_reduction;
+        while (Reduced(height, m_reduction) > kMostLayerRows) ++m_reduction;
     }
 
     [[nodiscard]] bool Allocate(GlowMemory& memory) noexcept;
@@ -77,7 +78,7 @@ class VeilMaker {
     Bgra* m_pixels = nullptr;            // four rows
 };
 
-bool VeilMaker::Allocate(GlowMemory& memory) noexcept {
+bool GlowLayerMaker::Allocate(GlowMemory& memory) noexcept {
     std::int32_t width = Reduced(m_width, m_reduction), height = Reduced(m_height, m_reduction);
     std::uint64_t lanes = static_cast<std::uint64_t>(m_width) * 4 * (sizeof(Bgra) / sizeof(std::uint16_t));
     for (int level = 0; level < kLevels; ++level) {
@@ -111,7 +112,7 @@ bool VeilMaker::Allocate(GlowMemory& memory) noexcept {
 }
 
 // Row `y` of the picture reduced by 2^reduction.
-void VeilMaker::ReadRow(int reduction, std::int32_t y, CellRow out) noexcept {
+void GlowLayerMaker::ReadRow(int reduction, std::int32_t y, CellRow out) noexcept {
     if (reduction < 2) return ReadSmallBlocks(1 << reduction, y, out);
     if (reduction == 2) return ReadBlocks(y, out);
     const CellPlane& halves = m_halves[reduction - 1];
@@ -130,7 +131,7 @@ void VeilMaker::ReadRow(int reduction, std::int32_t y, CellRow out) noexcept {
 }
 
 // Blocks of 4 × 4 pixels; those at the right and lower edges repeat the last pixels that there are.
-void VeilMaker::ReadBlocks(std::int32_t y, CellRow out) noexcept {
+void GlowLayerMaker::ReadBlocks(std::int32_t y, CellRow out) noexcept {
     const Bgra* rows[4];
     for (std::int32_t i = 0; i < 4; ++i) {
         const std::int64_t row = std::min(std::int64_t{y} * 4 + i, std::int64_t{m_height} - 1);
@@ -148,7 +149,7 @@ void VeilMaker::ReadBlocks(std::int32_t y, CellRow out) noexcept {
 }
 
 // One pixel for a cell, or 2 × 2: in small pictures only.
-void VeilMaker::ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept {
+void GlowLayerMaker::ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept {
     const Bgra* rows[2];
     for (std::int32_t i = 0; i < 2; ++i) {
         const std::int32_t row = std::min(y * side + i * (side - 1), m_height - 1);
@@ -166,7 +167,8 @@ void VeilMaker::ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept 
     }
 }
 
-void VeilMaker::BlurAlong(CellRow row, CellRow out, std::int32_t width, const GlowTaps& taps) const noexcept {
+void GlowLayerMaker::BlurAlong(CellRow row, CellRow out, std::int32_t width,
+                               const GlowTaps& taps) const noexcept {
     ContinueEnds(row, width);
     ConstCellRow before[GlowTaps::kMostPairs], after[GlowTaps::kMostPairs];
     for (int i = 0; i < taps.pairs; ++i) {
@@ -176,7 +178,8 @@ void VeilMaker::BlurAlong(CellRow row, CellRow out, std::int32_t width, const Gl
     m_kernels.filter(row, before, after, out, width, taps);
 }
 
-void VeilMaker::BlurAcross(const CellPlane& from, const CellPlane& to, const GlowTaps& taps) const noexcept {
+void GlowLayerMaker::BlurAcross(const CellPlane& from, const CellPlane& to,
+                                const GlowTaps& taps) const noexcept {
     for (std::int32_t y = 0; y < to.height; ++y) {
         ConstCellRow before[GlowTaps::kMostPairs], after[GlowTaps::kMostPairs];
         for (int i = 0; i < taps.pairs; ++i) {
@@ -187,7 +190,7 @@ void VeilMaker::BlurAcross(const CellPlane& from, const CellPlane& to, const Glo
     }
 }
 
-void VeilMaker::Blur(int level, const GlowTaps& taps) noexcept {
+void GlowLayerMaker::Blur(int level, const GlowTaps& taps) noexcept {
     const CellPlane& plane = m_levels[level];
     for (std::int32_t y = 0; y < plane.height; ++y) {
         BlurAlong(plane.Row(y), m_work[level].Row(y), plane.width, taps);
@@ -196,7 +199,7 @@ void VeilMaker::Blur(int level, const GlowTaps& taps) noexcept {
 }
 
 // Makes the next level from this one.
-void VeilMaker::Halve(int level) noexcept {
+void GlowLayerMaker::Halve(int level) noexcept {
     const CellPlane &from = m_levels[level], &to = m_levels[level + 1];
     CellRow narrowed = m_rows.Row(0);
     for (std::int32_t y = 0; y < to.height; ++y) {
@@ -208,8 +211,8 @@ void VeilMaker::Halve(int level) noexcept {
     }
 }
 
-// Adds the next level to this one. The last sum becomes the veil.
-void VeilMaker::AddDoubled(int level, double ownShare, double otherShare) noexcept {
+// Adds the next level to this one. The last sum becomes the glow layer.
+void GlowLayerMaker::AddDoubled(int level, double ownShare, double otherShare) noexcept {
     const CellPlane &fine = m_levels[level], &coarse = m_levels[level + 1];
     const auto share = [](double x) { return static_cast<std::uint16_t>(RoundHalfAway(x * 65535.0)); };
     for (std::int32_t y = 0; y < fine.height; ++y) {
@@ -222,15 +225,15 @@ void VeilMaker::AddDoubled(int level, double ownShare, double otherShare) noexce
     }
 }
 
-GlowStage VeilMaker::Make() noexcept {
-    const VeilTaps taps = MakeVeilTaps(m_height, 1 << m_reduction);
-    const CellPlane& veil = m_levels[0];
-    for (std::int32_t y = 0; y < veil.height; ++y) {
-        ReadRow(m_reduction, y, veil.Row(y));
-        m_kernels.keepHighlights(veil.Row(y), veil.width);
-        BlurAlong(veil.Row(y), m_work[0].Row(y), veil.width, taps.narrow);
+GlowStage GlowLayerMaker::Make() noexcept {
+    const GlowLayerTaps taps = MakeGlowLayerTaps(m_height, 1 << m_reduction);
+    const CellPlane& layer = m_levels[0];
+    for (std::int32_t y = 0; y < layer.height; ++y) {
+        ReadRow(m_reduction, y, layer.Row(y));
+        m_kernels.keepHighlights(layer.Row(y), layer.width);
+        BlurAlong(layer.Row(y), m_work[0].Row(y), layer.width, taps.narrow);
     }
-    BlurAcross(m_work[0], veil, taps.narrow);
+    BlurAcross(m_work[0], layer, taps.narrow);
     Halve(0);
     Halve(1);
     Blur(2, taps.middle);
@@ -241,7 +244,7 @@ GlowStage VeilMaker::Make() noexcept {
     AddDoubled(2, kMiddleShare, kWideShare);
     AddDoubled(1, 0.0, 1.0);
     AddDoubled(0, kNarrowShare, 1.0);
-    return {veil, m_reduction, m_rows, m_kernels};
+    return {layer, m_reduction, m_rows, m_kernels};
 }
 
 }  // namespace
@@ -262,10 +265,12 @@ void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
     // How far the row lies from the middle of its cells, in half pixels, and so on the way to the next ones.
     const std::int32_t away = 2 * (y & (side - 1)) + 1 - side;
     const std::int16_t share = static_cast<std::int16_t>(std::int64_t{std::abs(away)} * 32768 / side);
+    // A hash, so that rows make no pattern together; of the place alone, so that no division of work shows.
+    const auto dither = static_cast<std::uint16_t>(MixBits(static_cast<std::uint32_t>(y)));
     CellRow row = m_rows.Row(0), other = m_rows.Row(1);
-    m_kernels->approach(m_veil.Row(cell), m_veil.Row(away < 0 ? cell - 1 : cell + 1), row, m_veil.width,
+    m_kernels->approach(m_layer.Row(cell), m_layer.Row(away < 0 ? cell - 1 : cell + 1), row, m_layer.width,
                         share);
-    std::int32_t cells = m_veil.width;
+    std::int32_t cells = m_layer.width;
     const int wanted = m_reduction < 2 ? 0 : 2;  // one cell for each pixel or for four
     for (int reduction = m_reduction; reduction > wanted; --reduction) {
         ContinueEnds(row, cells);
@@ -273,15 +278,15 @@ void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
         std::swap(row, other);
         cells = Reduced(width, reduction - 1);
     }
-    if (wanted == 0) return m_kernels->screen(in, out, row, width);
+    if (wanted == 0) return m_kernels->screen(in, out, row, width, dither);
     ContinueEnds(row, cells);
-    m_kernels->screenFourfold(in, out, row, width);
+    m_kernels->screenFourfold(in, out, row, width, dither);
 }
 
 GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width, std::int32_t height,
                       GlowMemory& memory, Form form) noexcept {
     if (!(amount > 0.0f) || width < 1 || height < 1) return {};
-    VeilMaker maker(std::min<double>(amount, 1.0), input, width, height, GlowKernelsOf(form));
+    GlowLayerMaker maker(std::min<double>(amount, 1.0), input, width, height, GlowKernelsOf(form));
     if (!maker.Allocate(memory)) return {};
     return maker.Make();
 }

@@ -1,8 +1,9 @@
-// Glow ("Diffusion"): what a mist filter before the lens does. Highlights spread as a wide soft veil, whose
-// radius is proportional to the picture's height, and the veil is laid over the picture by screening. Black
-// stays black, no channel gets darker, alpha is kept.
+// Glow ("Diffusion"): what a mist filter before the lens does. Highlights spread as a wide soft glow layer,
+// whose radius is proportional to the picture's height, and which is laid over the picture by screening: the
+// dark around a light gets most of it. A picture without lights stays as it is, no channel gets darker, alpha is
+// kept.
 //
-// The veil is made before the rows are worked on, from the whole picture: highlights of a reduced picture
+// The glow layer is made before the rows are worked on, from the whole picture: highlights of a reduced picture
 // (about 150 to 300 rows high) are blurred at three widths in a pyramid, integers all the way, so that the
 // cost depends neither on the radius nor much on the picture's contents.
 #pragma once
@@ -18,7 +19,7 @@
 
 namespace velmora::render {
 
-// Room for the veil, kept so that frames of one size allocate once.
+// Memory for the glow layer, kept so that frames of one size allocate once.
 class GlowMemory {
   public:
     // At least `lanes` numbers of undefined value, or null when there is no memory. Ends what was there.
@@ -29,7 +30,7 @@ class GlowMemory {
     std::uint64_t m_size = 0;
 };
 
-// Rows of cells, `width` wide and with room at either end.
+// Rows of cells, `width` wide and with padding at either end.
 struct CellPlane {
     CellRow base = nullptr;
     std::int32_t width = 0;
@@ -52,25 +53,25 @@ struct CellPlane {
 class GlowStage {
   public:
     GlowStage() noexcept = default;
-    // A veil of one cell for 2^reduction × 2^reduction pixels; `rows` has two rows of room, wide enough for
-    // one cell for each pixel when the reduction is below 2, else for each fourth.
-    GlowStage(const CellPlane& veil, int reduction, const CellPlane& rows,
+    // A glow layer of one cell for 2^reduction × 2^reduction pixels; `rows` has two scratch rows, wide enough
+    // for one cell for each pixel when the reduction is below 2, else for each fourth.
+    GlowStage(const CellPlane& layer, int reduction, const CellPlane& rows,
               const GlowKernels& kernels) noexcept
-        : m_veil(veil), m_rows(rows), m_reduction(reduction), m_kernels(&kernels) {}
+        : m_layer(layer), m_rows(rows), m_reduction(reduction), m_kernels(&kernels) {}
 
     [[nodiscard]] bool IsActive() const noexcept { return m_kernels != nullptr; }
-    // Row `y` of the processed rectangle; `in` may be `out`. Uses room of the memory that the stage was
+    // Row `y` of the processed rectangle; `in` may be `out`. Uses scratch rows in the memory that the stage was
     // prepared with, so rows of one picture are worked on one at a time.
     void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
   private:
-    CellPlane m_veil;
+    CellPlane m_layer;
     CellPlane m_rows;
     int m_reduction = 0;
     const GlowKernels* m_kernels = nullptr;
 };
 
-// Reads the whole picture, `width` × `height` pixels, and makes its veil for an amount in 0..1. Without
+// Reads the whole picture, `width` × `height` pixels, and makes its glow layer for an amount in 0..1. Without
 // anything to do or without memory the stage is not active. It points into `memory` and serves until the
 // memory's next use.
 [[nodiscard]] GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width,

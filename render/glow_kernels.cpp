@@ -91,10 +91,13 @@ void Mix(CellRow out, ConstCellRow other, std::int32_t count, std::uint16_t ownS
     }
 }
 
+constexpr std::uint32_t Lifted(std::uint32_t v) noexcept {
+    return v + MulHigh(v * 2, 32767 - v);
+}
+
 void Lift(CellRow cells, std::int32_t count, std::uint16_t strength) noexcept {
     for (std::int32_t i = 0; i < count * kCellLanes; ++i) {
-        const std::uint32_t lifted = cells[i] + MulHigh(cells[i] * 2u, 32767u - cells[i]);
-        cells[i] = Cell(MulHigh(lifted, strength));
+        cells[i] = Cell(MulHigh(Lifted(Lifted(cells[i])), strength));
     }
 }
 
@@ -109,32 +112,34 @@ void Approach(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t cou
     }
 }
 
-std::uint8_t Screened(std::uint32_t channel, std::uint32_t veil) noexcept {
-    return static_cast<std::uint8_t>(channel + (((255 - channel) * veil + 0x4000) >> 15));
+// Adds at most the rest, as no layer is much above three quarters; where the layer is 0 the dither adds nothing.
+std::uint8_t Screened(std::uint32_t channel, std::uint32_t layer, std::uint16_t dither) noexcept {
+    const std::uint32_t added = ((255 - channel) * layer >> 8) + (dither >> kDitherShift);
+    return static_cast<std::uint8_t>(channel + (added >> 7));
 }
 
-Bgra ScreenPixel(Bgra pixel, std::uint32_t blue, std::uint32_t green, std::uint32_t red) noexcept {
-    const std::int32_t level = std::max({pixel.blue, pixel.green, pixel.red});
-    const std::uint32_t share = static_cast<std::uint32_t>(std::min(level, kBlackRamp) * kBlackRampStep);
-    return {Screened(pixel.blue, MulHigh(blue, share)), Screened(pixel.green, MulHigh(green, share)),
-            Screened(pixel.red, MulHigh(red, share)), pixel.alpha};
+std::uint16_t DitherAt(std::uint16_t first, std::int32_t x) noexcept {
+    return static_cast<std::uint16_t>(first + static_cast<std::uint32_t>(x) * kDitherStep);
 }
 
-void Screen(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
-    for (std::int32_t x = 0; x < width; ++x, veil += kCellLanes) {
-        out[x] = ScreenPixel(in[x], veil[0], veil[1], veil[2]);
+void Screen(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width,
+            std::uint16_t dither) noexcept {
+    for (std::int32_t x = 0; x < width; ++x, layer += kCellLanes) {
+        const std::uint16_t own = DitherAt(dither, x);
+        out[x] = {Screened(in[x].blue, layer[0], own), Screened(in[x].green, layer[1], own),
+                  Screened(in[x].red, layer[2], own), in[x].alpha};
     }
 }
 
-void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept {
-    constexpr std::int32_t kShares[4] = {24576, 8192, 8192, 24576};  // 3/8 and 1/8 of the way to a neighbour
+void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width,
+                    std::uint16_t dither) noexcept {
+    constexpr std::int16_t kShares[4] = {24576, 8192, 8192, 24576};  // 3/8 and 1/8 of the way to a neighbour
     for (std::int32_t x = 0; x < width; ++x) {
-        const ConstCellRow near = veil + x / 4 * kCellLanes;
+        const ConstCellRow near = layer + x / 4 * kCellLanes;
         const ConstCellRow far = x % 4 < 2 ? near - kCellLanes : near + kCellLanes;
-        const auto at = [&](int c) {
-            return static_cast<std::uint32_t>(Approached(near[c], far[c], kShares[x % 4]));
-        };
-        out[x] = ScreenPixel(in[x], at(0), at(1), at(2));
+        std::uint16_t cell[kCellLanes];
+        Approach(near, far, cell, 1, kShares[x % 4]);
+        Screen(in + x, out + x, cell, 1, DitherAt(dither, x));
     }
 }
 

@@ -1,8 +1,8 @@
 // The inner loops of the glow stage, in the forms that processors offer.
 //
 // They work on rows of cells. A cell is four 16-bit numbers: blue, green and red of one or more pixels, 0 for
-// black to kCellWhite, and a fourth that carries nothing. Rows have kCellPad cells of room at either end, and
-// a loop may leave anything in the room behind the last cell.
+// black to kCellWhite, and a fourth that carries nothing. Rows have kCellPad cells of padding at either end,
+// and a loop may leave anything in the padding behind the last cell.
 #pragma once
 
 #include <array>
@@ -28,16 +28,20 @@ struct GlowTaps {
     std::array<std::uint16_t, kMostPairs> pair{};
 };
 
-// Highlights come in smoothly where luma is above the floor and count in full from three quarters of white on:
-// by 3t² − 2t³ (a hair less, to stay below 1), t rising from 0 to 1 between. The excess is doubled and
-// lengthened by a share of 65536, so that it fills 16 bits there.
-inline constexpr std::int32_t kHighlightFloor = 3300;
-inline constexpr std::int32_t kHighlightStretch = 35850;
+// Highlights come in smoothly where luma is above the floor, 0.36 of white, and count in full from 0.9 of white
+// on: by 3t² − 2t³ (a hair less, to stay below 1), t rising from 0 to 1 between. The excess is doubled and
+// lengthened by a share of 65536, so that it fills 16 bits there. What is no brighter than the floor gives no
+// light: a picture of it stays as it is.
+inline constexpr std::int32_t kHighlightFloor = 11750;
+inline constexpr std::int32_t kHighlightStretch = 56302;
 inline constexpr std::int32_t kLumaBlue = 29, kLumaGreen = 150, kLumaRed = 77;  // of 256
 
-// Up to this level of the brightest channel the veil comes in evenly; black gets none of it.
-inline constexpr std::int32_t kBlackRamp = 24;
-inline constexpr std::int32_t kBlackRampStep = 65535 / kBlackRamp;
+// Screening rounds up by a share of 128 that differs from pixel to pixel, so that a faint halo fades by ever
+// fewer pixels instead of ending in rings. The share is the top of a 16-bit number, which grows by the golden
+// section of 65536 from one pixel to the next: any few neighbours have shares spread evenly. All channels of a
+// pixel have the same one, which leaves a grey halo grey.
+inline constexpr std::uint16_t kDitherStep = 40503;
+inline constexpr int kDitherShift = 9;
 
 struct GlowKernels {
     // Means of 4 × 4 pixels.
@@ -59,15 +63,18 @@ struct GlowKernels {
     // out = out × ownShare + other × otherShare, shares of 65536.
     void (*mix)(CellRow out, ConstCellRow other, std::int32_t count, std::uint16_t ownShare,
                 std::uint16_t otherShare) noexcept;
-    // Makes a blur v the veil that lies over the picture: v (2 − v) × strength, of 65536. Light adds up before
-    // the film's curve, which lifts the faint parts; this does the same to what surrounds a highlight.
+    // Makes a blur v the glow layer: 1 − (1 − v)⁴, times strength, of 65536. Light adds up before the film's
+    // curve, which lifts the faint parts; this does the same to what surrounds a highlight.
     void (*lift)(CellRow cells, std::int32_t count, std::uint16_t strength) noexcept;
     // near + (far − near) × share, a share of 65536 below a half.
     void (*approach)(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t count,
                      std::int16_t share) noexcept;
-    // Screens pixels with a veil of one cell for a pixel, or for four; then the veil's ends are continued.
-    void (*screen)(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept;
-    void (*screenFourfold)(const Bgra* in, Bgra* out, ConstCellRow veil, std::int32_t width) noexcept;
+    // Screens pixels with a glow layer of one cell for a pixel, or for four; then its ends are continued.
+    // `dither` is the first pixel's number.
+    void (*screen)(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width,
+                   std::uint16_t dither) noexcept;
+    void (*screenFourfold)(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width,
+                           std::uint16_t dither) noexcept;
 };
 
 [[nodiscard]] const GlowKernels& GlowKernelsOf(Form form) noexcept;

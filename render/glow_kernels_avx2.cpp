@@ -58,6 +58,11 @@ Lanes Approached(Lanes near, Lanes far, Lanes share) noexcept {
     return near + MulHighSigned(far - near, share);
 }
 
+// What screening adds, of `rest` × 256, in the low bytes.
+Lanes Added(Lanes rest, Lanes layer, Lanes dither) noexcept {
+    return ShiftRight<7>(MulHigh(rest, layer) + ShiftRight<kDitherShift>(dither));
+}
+
 // In all four lanes of each cell.
 Lanes Luma(Lanes a) noexcept {
     const __m256i weights = _mm256_set1_epi64x(kLumaBlue | kLumaGreen << 16 | std::int64_t{kLumaRed} << 32);
@@ -67,13 +72,13 @@ Lanes Luma(Lanes a) noexcept {
     return {_mm256_or_si256(luma, _mm256_slli_epi32(luma, 16))};
 }
 
-// The veil over eight pixels: over 0, 1, 4 and 5 and over 2, 3, 6 and 7, as bytes unpack in both halves.
+// The glow layer over eight pixels: over 0, 1, 4 and 5 and over 2, 3, 6 and 7, as bytes unpack in both halves.
 constexpr std::int32_t kScreenPixels = 8;
-struct Veil {
+struct GlowLayer {
     Lanes low, high;
 };
 
-Veil LoadVeil(ConstCellRow cells) noexcept {
+GlowLayer LoadLayer(ConstCellRow cells) noexcept {
     const __m256i first = Lanes::Load(cells).v, second = Lanes::Load(cells + Lanes::kSize).v;
     return {{_mm256_permute2x128_si256(first, second, 0x20)},
             {_mm256_permute2x128_si256(first, second, 0x31)}};
@@ -81,7 +86,7 @@ Veil LoadVeil(ConstCellRow cells) noexcept {
 
 // Over four pixels under one cell: 3/8 and 1/8 of the way to the cell before, as far to the one behind. Then
 // over the next four.
-Veil SpreadVeil(ConstCellRow cell) noexcept {
+GlowLayer SpreadLayer(ConstCellRow cell) noexcept {
     constexpr long long kFar = 0x6000600060006000, kNear = 0x2000200020002000;
     const Lanes lowShares = {_mm256_setr_epi64x(kFar, kNear, kFar, kNear)};
     const Lanes highShares = {_mm256_setr_epi64x(kNear, kFar, kNear, kFar)};
@@ -91,27 +96,21 @@ Veil SpreadVeil(ConstCellRow cell) noexcept {
             Approached(near, {_mm256_permute4x64_epi64(cells, _MM_SHUFFLE(3, 3, 2, 2))}, highShares)};
 }
 
-// The veil's fourth number is 0, so alpha stays as it is.
-void ScreenPixels(const Bgra* in, Bgra* out, const Veil& veil) noexcept {
+GlowLayer DitherOver(std::uint16_t first) noexcept {
+    constexpr long long kOfPixel = 0x0001000100010001;
+    const Lanes pixels = {_mm256_setr_epi64x(0, kOfPixel, 4 * kOfPixel, 5 * kOfPixel)};
+    const Lanes low = Lanes::All(first) + Lanes{_mm256_mullo_epi16(pixels.v, Lanes::All(kDitherStep).v)};
+    return {low, low + Lanes::All(2 * kDitherStep)};
+}
+
+// The layer's fourth number is 0, so alpha stays as it is.
+void ScreenPixels(const Bgra* in, Bgra* out, const GlowLayer& layer, const GlowLayer& dither) noexcept {
     const __m256i pixels = _mm256_loadu_si256(reinterpret_cast<const __m256i*>(in));
-    const __m256i brighter = _mm256_max_epu8(pixels, _mm256_srli_epi32(pixels, 8));
-    const __m256i brightest = _mm256_max_epu8(brighter, _mm256_srli_epi32(pixels, 16));
-    const __m256i level = _mm256_min_epu8(brightest, _mm256_set1_epi8(kBlackRamp));
-    // The first byte of each pixel, four times as a word; -1 gives 0.
-    const __m256i lowLevels =
-        _mm256_broadcastsi128_si256(_mm_setr_epi8(0, -1, 0, -1, 0, -1, 0, -1, 4, -1, 4, -1, 4, -1, 4, -1));
-    const __m256i highLevels = _mm256_add_epi8(lowLevels, _mm256_set1_epi16(8));
-    const __m256i step = _mm256_set1_epi16(static_cast<short>(kBlackRampStep));
-    const __m256i lowShare = _mm256_mullo_epi16(_mm256_shuffle_epi8(level, lowLevels), step);
-    const __m256i highShare = _mm256_mullo_epi16(_mm256_shuffle_epi8(level, highLevels), step);
     const __m256i rest = _mm256_xor_si256(pixels, _mm256_set1_epi8(-1));
-    const __m256i zero = _mm256_setzero_si256();
-    const __m256i low =
-        _mm256_mulhrs_epi16(_mm256_unpacklo_epi8(rest, zero), _mm256_mulhi_epu16(veil.low.v, lowShare));
-    const __m256i high =
-        _mm256_mulhrs_epi16(_mm256_unpackhi_epi8(rest, zero), _mm256_mulhi_epu16(veil.high.v, highShare));
-    const __m256i screened = _mm256_add_epi8(pixels, _mm256_packus_epi16(low, high));
-    _mm256_storeu_si256(reinterpret_cast<__m256i*>(out), screened);
+    const Lanes low = Added({_mm256_unpacklo_epi8(_mm256_setzero_si256(), rest)}, layer.low, dither.low);
+    const Lanes high = Added({_mm256_unpackhi_epi8(_mm256_setzero_si256(), rest)}, layer.high, dither.high);
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(out),
+                        _mm256_add_epi8(pixels, _mm256_packus_epi16(low.v, high.v)));
 }
 
 void AverageBlocks(const Bgra* const rows[4], CellRow cells, std::int32_t count) noexcept {

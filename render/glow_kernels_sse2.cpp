@@ -60,6 +60,11 @@ Lanes Approached(Lanes near, Lanes far, Lanes share) noexcept {
     return near + MulHighSigned(far - near, share);
 }
 
+// What screening adds, of `rest` × 256, in the low bytes.
+Lanes Added(Lanes rest, Lanes layer, Lanes dither) noexcept {
+    return ShiftRight<7>(MulHigh(rest, layer) + ShiftRight<kDitherShift>(dither));
+}
+
 // In all four lanes of each cell.
 Lanes Luma(Lanes a) noexcept {
     const __m128i weights =
@@ -70,18 +75,18 @@ Lanes Luma(Lanes a) noexcept {
     return {_mm_or_si128(luma, _mm_slli_epi32(luma, 16))};
 }
 
-// The veil over the first and the last two of four pixels.
+// The glow layer over the first and the last two of four pixels.
 constexpr std::int32_t kScreenPixels = 4;
-struct Veil {
+struct GlowLayer {
     Lanes low, high;
 };
 
-Veil LoadVeil(ConstCellRow cells) noexcept {
+GlowLayer LoadLayer(ConstCellRow cells) noexcept {
     return {Lanes::Load(cells), Lanes::Load(cells + Lanes::kSize)};
 }
 
 // Over four pixels under one cell: 3/8 and 1/8 of the way to the cell before, as far to the one behind.
-Veil SpreadVeil(ConstCellRow cell) noexcept {
+GlowLayer SpreadLayer(ConstCellRow cell) noexcept {
     constexpr short kFar = 24576, kNear = 8192;
     const Lanes lowShares = {_mm_setr_epi16(kFar, kFar, kFar, kFar, kNear, kNear, kNear, kNear)};
     const Lanes highShares = {_mm_setr_epi16(kNear, kNear, kNear, kNear, kFar, kFar, kFar, kFar)};
@@ -90,27 +95,19 @@ Veil SpreadVeil(ConstCellRow cell) noexcept {
             Approached(near, Lanes::Repeat(cell + kCellLanes), highShares)};
 }
 
-// (rest × veil + 0x4000) >> 15, of a rest below 256: rounding down on the way does not change the result.
-__m128i MulRound(__m128i rest, __m128i veil) noexcept {
-    const __m128i product = _mm_mulhi_epu16(_mm_slli_epi16(rest, 8), veil);
-    return _mm_srli_epi16(_mm_add_epi16(product, _mm_set1_epi16(64)), 7);
+GlowLayer DitherOver(std::uint16_t first) noexcept {
+    constexpr auto kNext = static_cast<short>(kDitherStep);
+    const Lanes low = Lanes::All(first) + Lanes{_mm_setr_epi16(0, 0, 0, 0, kNext, kNext, kNext, kNext)};
+    return {low, low + Lanes::All(2 * kDitherStep)};
 }
 
-// The veil's fourth number is 0, so alpha stays as it is.
-void ScreenPixels(const Bgra* in, Bgra* out, const Veil& veil) noexcept {
+// The layer's fourth number is 0, so alpha stays as it is.
+void ScreenPixels(const Bgra* in, Bgra* out, const GlowLayer& layer, const GlowLayer& dither) noexcept {
     const __m128i pixels = _mm_loadu_si128(reinterpret_cast<const __m128i*>(in));
-    const __m128i brighter = _mm_max_epu8(pixels, _mm_srli_epi32(pixels, 8));
-    const __m128i brightest = _mm_max_epu8(brighter, _mm_srli_epi32(pixels, 16));
-    const __m128i level =
-        _mm_and_si128(_mm_min_epu8(brightest, _mm_set1_epi8(kBlackRamp)), _mm_set1_epi32(0xFF));
-    const __m128i share = _mm_mullo_epi16(level, _mm_set1_epi16(static_cast<short>(kBlackRampStep)));
-    const __m128i shares = _mm_or_si128(share, _mm_slli_epi32(share, 16));
-    const __m128i lowVeil = _mm_mulhi_epu16(veil.low.v, _mm_unpacklo_epi32(shares, shares));
-    const __m128i highVeil = _mm_mulhi_epu16(veil.high.v, _mm_unpackhi_epi32(shares, shares));
     const __m128i rest = _mm_xor_si128(pixels, _mm_set1_epi8(-1));
-    const __m128i low = MulRound(_mm_unpacklo_epi8(rest, _mm_setzero_si128()), lowVeil);
-    const __m128i high = MulRound(_mm_unpackhi_epi8(rest, _mm_setzero_si128()), highVeil);
-    _mm_storeu_si128(reinterpret_cast<__m128i*>(out), _mm_add_epi8(pixels, _mm_packus_epi16(low, high)));
+    const Lanes low = Added({_mm_unpacklo_epi8(_mm_setzero_si128(), rest)}, layer.low, dither.low);
+    const Lanes high = Added({_mm_unpackhi_epi8(_mm_setzero_si128(), rest)}, layer.high, dither.high);
+    _mm_storeu_si128(reinterpret_cast<__m128i*>(out), _mm_add_epi8(pixels, _mm_packus_epi16(low.v, high.v)));
 }
 
 void AverageBlocks(const Bgra* const rows[4], CellRow cells, std::int32_t count) noexcept {

@@ -7,11 +7,11 @@
 namespace velmora::render {
 namespace {
 
-// The veil is the sum of three blurs: the first softens outlines, the second makes halos, the third is the
-// mist. Standard deviations are shares of the picture's height.
+// The glow layer is the sum of three blurs: the first softens outlines, the second makes halos, the third is
+// the mist. Standard deviations are shares of the picture's height.
 constexpr double kNarrowSigma = 0.004;
 constexpr double kMiddleSigma = 0.020;
-constexpr double kWideSigma = 0.075;
+constexpr double kWideSigma = 0.090;
 
 // What two halvings, and two doublings as well, add to a blur's variance, in squares of the coarser cells.
 constexpr double kResamplingVariance = 0.1875 + 0.1875 / 4;
@@ -40,7 +40,7 @@ GlowTaps MakeTaps(double variance, int passes) noexcept {
 
 }  // namespace
 
-VeilTaps MakeVeilTaps(double height, double cell) noexcept {
+GlowLayerTaps MakeGlowLayerTaps(double height, double cell) noexcept {
     const auto square = [](double x) { return x * x; };
     const double onScreen = 0.25 * (1.0 - 1.0 / square(cell));  // by averaging blocks and by interpolation
     const double narrow = std::max(square(kNarrowSigma * height / cell) - onScreen, 0.0);

@@ -5,13 +5,13 @@
 
 namespace velmora::render {
 
-// The filters of the veil's pyramid, in its levels 0, 2 and 4.
-struct VeilTaps {
+// The filters of the glow layer's pyramid, in its levels 0, 2 and 4.
+struct GlowLayerTaps {
     GlowTaps narrow, middle, wide;
 };
 
-// For a veil whose cells are `cell` pixels wide. What reducing, halving and doubling blur by themselves is left
-// out of the filters.
-[[nodiscard]] VeilTaps MakeVeilTaps(double height, double cell) noexcept;
+// For a glow layer whose cells are `cell` pixels wide. What reducing, halving and doubling blur by themselves
+// is left out of the filters.
+[[nodiscard]] GlowLayerTaps MakeGlowLayerTaps(double height, double cell) noexcept;
 
 }  // namespace velmora::render
