@@ -23,7 +23,7 @@ constexpr std::string_view kTable =
 
 std::vector<std::string_view> Split(std::string_view text, std::string_view separator) {
     std::vector<std::string_view> parts;
-    for (std::size_t end; (end = text.find(separator)) != text.npos;
+    for (std::size_t end; (end = text.find(separator)) != std::string_view::npos;
          text.remove_prefix(end + separator.size()))
         parts.push_back(text.substr(0, end));
     parts.push_back(text);
