@@ -180,13 +180,14 @@ constexpr std::array<std::int16_t, kScratchTextureRows> MakeTexture() {
     constexpr std::int32_t kWeights[6] = {110, 120, 130, 140, 140, 120};  // of 256
     std::array<std::int32_t, kScratchTextureRows> rough{};
     for (int bits = 0; bits < 6; ++bits) {
-        const auto lane = static_cast<Lane>(kTexture + 100 * bits);
+        const auto lane = static_cast<Lane>(kTexture + 100u * static_cast<std::uint32_t>(bits));
         for (std::int32_t cell = 0; cell <= kMask >> bits; ++cell) {
             const std::int32_t from = HashAt(0x5EEDu, lane, cell);
             const std::int32_t to = HashAt(0x5EEDu, lane, (cell + 1) & (kMask >> bits));
             for (std::int32_t row = 0; row < 1 << bits; ++row) {
                 const std::int32_t value = from + ((to - from) * Eased(row * 256 >> bits) >> 8) - 32768;
-                rough[static_cast<std::size_t>((cell << bits) + row)] += value * kWeights[bits] / 256;
+                const std::int32_t place = (cell << bits) + row;
+                rough[static_cast<std::size_t>(place)] += value * kWeights[bits] / 256;
             }
         }
     }

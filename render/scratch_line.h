@@ -1,9 +1,9 @@
 // A scratch as it lies in one frame: how strong it is, where it wavers and where it breaks off.
 //
 // The film runs on by one picture's height from frame to frame, and what was scratched into it runs with it.
-// What changes slowly along the film, over 10 to 200 frames, is strength and wear of a scratch: it fades, fails
-// and comes back over many frames. Waver and breaks are shorter than a frame and so are new in each one. In the
-// first frames of a life a scratch sets in with flecks, in the last ones it breaks up.
+// Breaks are shorter than a frame and so are new in each one; how strong and how worn a scratch is changes over
+// 10 to 200 frames, and its sway over 8 to 40. In the first frames of a life a scratch sets in with flecks, in
+// the last ones it breaks up.
 #pragma once
 
 #include <array>

@@ -59,7 +59,8 @@ constexpr ScratchShape MakeShape(const ScratchProfile& profile, const Section& s
     std::array<std::int32_t, kMostScratchPixels * kUnits + 1> sums{};  // of all units before
     for (std::int32_t unit = 0; unit < kMostScratchPixels * kUnits; ++unit) {
         const std::int32_t covered = unit < width ? SectionAt(section, unit, width) : 0;
-        sums[static_cast<std::size_t>(unit + 1)] = sums[static_cast<std::size_t>(unit)] + covered;
+        const auto index = static_cast<std::size_t>(unit);
+        sums[index + 1] = sums[index] + covered;
     }
     for (std::int32_t phase = 0; phase < kScratchPhases; ++phase) {
         for (std::int32_t pixel = 0; pixel <= profile.width; ++pixel) {
