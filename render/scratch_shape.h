@@ -2,6 +2,7 @@
 #pragma once
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
 
 #include "render/scratch_state.h"
@@ -10,6 +11,7 @@ namespace velmora::render {
 
 inline constexpr std::int32_t kScratchPhases = 32;  // steps of a pixel in which a scratch's left edge may lie
 inline constexpr std::int32_t kMostScratchPixels = 12;
+inline constexpr std::int32_t kScratchSections = 3;  // kinds of cross-section, for scratches of each width
 
 // For a left edge `phase` steps into a pixel: what share of that pixel and of those to its right the scratch
 // covers, 0..65280 (65536 would be all).
@@ -18,7 +20,12 @@ struct ScratchShape {
     std::array<std::array<std::uint16_t, kMostScratchPixels>, kScratchPhases> weights{};
 };
 
-// The shape of a profile; `index` in 0..kScratchProfiles − 1.
-[[nodiscard]] const ScratchShape& ScratchShapeOf(bool isWhite, std::int32_t index) noexcept;
+// Where a scratch is about to break off only its finest part is left.
+enum ScratchWear : std::size_t { kScratchWhole, kScratchWorn };
+using ScratchShapes = std::array<ScratchShape, 2>;
+
+// The shapes of a profile, 0..kScratchProfiles − 1, with a section of 0..kScratchSections − 1.
+[[nodiscard]] const ScratchShapes& ScratchShapesOf(bool isWhite, std::int32_t profile,
+                                                   std::int32_t section) noexcept;
 
 }  // namespace velmora::render

@@ -115,7 +115,7 @@ ScratchState ScratchStateAt(const ScratchReplay::Life& life, std::int32_t frame,
     Move(scratch, frame - life.firstFrame);
 
     const std::uint32_t mixed = MixBits(scratch.look ^ static_cast<std::uint32_t>(frame));
-    scratch.tremble = 256 - 38 + static_cast<std::int32_t>(mixed % 77u);
+    scratch.tremble = 256 - 15 + static_cast<std::int32_t>(mixed % 31u);
     return scratch;
 }
 

@@ -48,8 +48,8 @@ struct ScratchState {
     std::int64_t mostPosition = 0;
     std::int64_t position = 0;
     std::int32_t speed = 0;    // per frame
-    std::uint32_t look = 0;    // seeds waver, breathing and breaks of this life
-    std::int32_t tremble = 0;  // strength in this frame, 218..294 of 256
+    std::uint32_t look = 0;    // seeds strength, waver and breaks of this life
+    std::int32_t tremble = 0;  // of the strength in this frame, 241..271 of 256
 };
 
 // What the draws of all lives depend on.

@@ -1,9 +1,8 @@
 // Scratches: lines that run down the film, dark where its surface is grazed and bright where the emulsion is
 // gone. Their lives are settled by scratch_state.h; here they are drawn.
 //
-// A scratch runs the whole height of the picture, tilted and wavering a little. Its strength comes and goes
-// along the film and breaks off here and there; from frame to frame it trembles. A black one never makes a
-// channel brighter, a white one never darker; alpha is kept.
+// A scratch runs the whole height of the picture, tilted and wavering a little, and breaks off here and there.
+// A black one never makes a channel brighter, a white one never darker; alpha is kept.
 #pragma once
 
 #include <array>
@@ -12,26 +11,11 @@
 #include "render/cpu.h"
 #include "render/frame_context.h"
 #include "render/image.h"
-#include "render/scratch_shape.h"
+#include "render/scratch_line.h"
 #include "render/scratch_state.h"
 #include "render/stage_settings.h"
 
 namespace velmora::render {
-
-// A scratch as it lies in one frame: course and strength at knots that divide the height evenly.
-struct ScratchLine {
-    static constexpr std::int32_t kSegments = 64;
-
-    struct Knot {
-        std::int32_t offset = 0;    // of the left edge from `pixel`, 1/256 pixels
-        std::int32_t strength = 0;  // 0..65535
-    };
-
-    const ScratchShape* shape = nullptr;
-    bool isWhite = false;
-    std::int32_t pixel = 0;
-    std::array<Knot, kSegments + 1> knots;
-};
 
 // What the stage keeps from frame to frame, and the room that it works in.
 struct ScratchMemory {

@@ -4,6 +4,8 @@
 
 #include <algorithm>
 #include <bit>
+#include <map>
+#include <numeric>
 #include <random>
 
 #include "render/scratches.h"
@@ -228,9 +230,15 @@ TEST(Scratches, DeepenWithDepthAndWidenWithThickOnes) {
             EXPECT_GT(amount, last * 3 / 2);
             last = amount;
         }
-        const Mark thin = MarkOf(Draw(Grey(), Scratched(kinds, 16, 0.6f, 60.0f)));
-        const Mark thick = MarkOf(Draw(Grey(), Scratched(kinds | 4, 16, 0.6f, 60.0f)));
-        EXPECT_GT(thick.pixels, thin.pixels * 4 / 3);
+        std::int64_t thin = 0, thick = 0;
+        for (int seed = 60; seed < 70; ++seed) {
+            const auto of = [&](std::uint32_t those) {
+                return MarkOf(Draw(Grey(), Scratched(those, 16, 0.6f, static_cast<float>(seed)))).pixels;
+            };
+            thin += of(kinds);
+            thick += of(kinds | 4);
+        }
+        EXPECT_GT(thick, thin * 6 / 5);
     }
 }
 
@@ -242,22 +250,107 @@ TEST(Scratches, MoveWithThePicture) {
     }
 }
 
-// Each scratch is seen from top to bottom in most of its rows, and no row is cut off by a hard edge.
-TEST(Scratches, RunDownThePictureAsSoftLines) {
-    for (std::int32_t frame = 0; frame < 60; ++frame) {
-        const PlainPicture out =
-            Draw(Grey(1920, 540), Scratched(1, 1, 1.0f, 51.0f), {.seconds = frame / 30.0 + 0.01});
-        std::int32_t rowsMarked = 0, darkestBefore = 128;
-        for (std::int32_t y = 0; y < out.Height(); ++y) {
-            const auto darker = [](const Bgra& a, const Bgra& b) { return a.green < b.green; };
-            const Bgra* darkest = std::min_element(out.Row(y), out.Row(y) + 1920, darker);
-            rowsMarked += darkest->green < 120;
-            ASSERT_TRUE(y == 0 || std::abs(darkest->green - darkestBefore) <= 24)
-                << "frame " << frame << ", row " << y;
-            darkestBefore = darkest->green;
+// What all scratches of a few clips look like in frame after frame, at full depth.
+template <typename Check>
+void ForEachLine(std::int32_t frames, const Check& check) {
+    for (int clip = 0; clip < 6; ++clip) {
+        const StageSettings settings = Scratched(7, 16, 1.0f, 40.0f + static_cast<float>(clip));
+        PlainPicture picture(1920, 1080);
+        ScratchMemory memory;
+        for (std::int32_t frame = 0; frame < frames; ++frame) {
+            FrameContext context(picture.Description(), picture.Description());
+            context.SetTime((frame + 0.5) / 30.0);
+            const ScratchStage stage = PrepareScratches(settings, 0, context, memory, BestForm());
+            ASSERT_TRUE(stage.IsActive());
+            for (std::uint32_t i = 0; i < 16; ++i) check(memory.lines[i], frame, i);
         }
-        EXPECT_GT(rowsMarked, out.Height() / 3) << frame;
     }
+}
+
+// Equal lines stand like a fence; on worn film one or two of ten stand out of many faint ones.
+TEST(Scratches, AreMostlyFaintWithAFewThatStandOut) {
+    int faint = 0, strong = 0, all = 0;
+    ForEachLine(200, [&](const ScratchLine& line, std::int32_t, std::uint32_t) {
+        ++all;
+        faint += line.strength < 65536 * 35 / 100;
+        strong += line.strength > 65536 * 60 / 100;
+    });
+    EXPECT_GT(faint, all * 55 / 100);
+    EXPECT_GT(strong, all / 16);
+    EXPECT_LT(strong, all / 5);
+}
+
+// A fade of at most 3/4 in ten frames or more, eased, and a tremble of a sixteenth either way.
+TEST(Scratches, FadeSlowly) {
+    std::map<std::uint32_t, std::uint32_t> before;
+    int jumps = 0, changes = 0;
+    ForEachLine(200, [&](const ScratchLine& line, std::int32_t frame, std::uint32_t i) {
+        if (frame > 0) {
+            const double ratio = line.strength / static_cast<double>(before[i]);
+            jumps += ratio < 0.7 || ratio > 1.4;
+            changes += ratio < 0.98 || ratio > 1.02;
+        }
+        before[i] = line.strength;
+    });
+    EXPECT_LT(jumps, 6 * 16 * 200 / 40);  // a life of 52 frames on average, and most new ones differ
+    EXPECT_GT(changes, 6 * 16 * 200 / 4);
+}
+
+// The rows in which a scratch only gets weaker, or only stronger: a spindle's end would have dozens of them.
+TEST(Scratches, BreakOffRaggedly) {
+    std::int32_t breaks = 0;
+    ForEachLine(12, [&](const ScratchLine& line, std::int32_t frame, std::uint32_t i) {
+        if (line.strength < 20000 || line.pixel < 20 || line.pixel > 1880) return;
+        PlainPicture out = Grey(1920, 1080);
+        const ScratchStage stage(&line, 1, 1080, BestForm());
+        std::int32_t last = 0, falling = 0, rising = 0;
+        for (std::int32_t y = 0; y < 1080; ++y) {
+            stage.Row(out.Row(y), out.Row(y), 1920, y);
+            std::int32_t mark = 0;
+            for (std::int32_t x = line.pixel - 20; x < line.pixel + 40; ++x)
+                mark += x < 1920 ? std::abs(out.Row(y)[x].green - 128) : 0;
+            breaks += mark == 0 && last != 0;
+            falling = mark < last ? falling + 1 : 0;
+            rising = mark > last ? rising + 1 : 0;
+            last = mark;
+            ASSERT_LT(std::max(falling, rising), 45)
+                << "frame " << frame << ", scratch " << i << ", row " << y;
+        }
+    });
+    EXPECT_GT(breaks, 1000);
+}
+
+// As much of a scratch in whatever part of a pixel it lies: else one that drifts would shimmer.
+TEST(Scratches, CoverAsMuchAtEveryPhaseWithinTheProfile) {
+    for (int i = 0; i < 2 * kScratchProfiles * kScratchSections; ++i) {
+        const bool isWhite = i % 2 != 0;
+        const std::int32_t index = i / 2 % kScratchProfiles;
+        const ScratchProfile& profile = (isWhite ? kWhiteScratchProfiles : kBlackScratchProfiles)[index];
+        for (const ScratchShape& shape : ScratchShapesOf(isWhite, index, i / 2 / kScratchProfiles)) {
+            const auto sum = [](const auto& weights) {
+                return std::accumulate(weights.begin(), weights.end(), 0);
+            };
+            for (const auto& weights : shape.weights) {
+                EXPECT_NEAR(sum(weights), sum(shape.weights[0]), 16);
+                EXPECT_TRUE(std::all_of(weights.begin() + profile.width + 1, weights.end(),
+                                        [](std::uint16_t weight) { return weight == 0; }));
+            }
+            EXPECT_EQ(shape.weights[0][static_cast<std::size_t>(profile.width)], 0);
+        }
+    }
+}
+
+// A black scratch takes a smaller share of a shadow than of a middle grey, a white one of what a light lacks.
+TEST(Scratches, WeakenWhereThePictureIsLikeThem) {
+    const auto changeOf = [](std::uint32_t kinds, std::uint8_t grey) {
+        const PlainPicture in(640, 90, {grey, grey, grey, 255});
+        std::int64_t change = 0;
+        const PlainPicture out = Draw(in, Scratched(kinds, 16, 1.0f, 60.0f));
+        for (const Bgra& pixel : out.Pixels()) change += std::abs(pixel.green - grey);
+        return change;
+    };
+    EXPECT_LT(changeOf(1, 32) * 128, changeOf(1, 128) * 32 * 2 / 3);
+    EXPECT_LT(changeOf(2, 223) * 128, changeOf(2, 127) * 32 * 2 / 3);
 }
 
 }  // namespace
