@@ -25,7 +25,7 @@ class FrameProcessor final : public IFrameProcessor {
                                     std::uint8_t unused) override;
 
   private:
-    const render::YcbcrKernels& m_kernels = render::YcbcrKernelsOf(ReadRenderOptions().form);
+    const render::YcbcrKernels& m_kernels = render::YcbcrKernelsOf(ReadRenderOptions().level);
     render::PackedImage m_scratch;  // RGB
     ReferenceCount m_references;
 };

@@ -284,9 +284,9 @@ void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
 }
 
 GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width, std::int32_t height,
-                      GlowMemory& memory, Form form) noexcept {
+                      GlowMemory& memory, SimdLevel level) noexcept {
     if (!(amount > 0.0f) || width < 1 || height < 1) return {};
-    GlowLayerMaker maker(std::min<double>(amount, 1.0), input, width, height, GlowKernelsOf(form));
+    GlowLayerMaker maker(std::min<double>(amount, 1.0), input, width, height, GlowKernelsOf(level));
     if (!maker.Allocate(memory)) return {};
     return maker.Make();
 }

@@ -149,14 +149,14 @@ const GlowKernels kPlainGlowKernels = {AverageBlocks, KeepHighlights, Filter,   
                                        HalveAlong,    Between,        DoubleAlong, Mix,
                                        Lift,          Approach,       Screen,      ScreenFourfold};
 
-const GlowKernels& GlowKernelsOf(Form form) noexcept {
-    switch (form) {
-        case Form::kAvx512:
-        case Form::kAvx2:
+const GlowKernels& GlowKernelsOf(SimdLevel level) noexcept {
+    switch (level) {
+        case SimdLevel::kAvx512:
+        case SimdLevel::kAvx2:
             return kAvx2GlowKernels;
-        case Form::kSse2:
+        case SimdLevel::kSse2:
             return kSse2GlowKernels;
-        case Form::kPlain:
+        case SimdLevel::kPlain:
             break;
     }
     return kPlainGlowKernels;

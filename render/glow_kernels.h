@@ -9,7 +9,7 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "render/cpu.h"
+#include "render/simd/level.h"
 #include "render/image.h"
 
 namespace velmora::render {
@@ -77,7 +77,7 @@ struct GlowKernels {
                            std::uint16_t dither) noexcept;
 };
 
-[[nodiscard]] const GlowKernels& GlowKernelsOf(Form form) noexcept;
+[[nodiscard]] const GlowKernels& GlowKernelsOf(SimdLevel level) noexcept;
 
 // The forms; a processor without AVX2 must not call the last one's functions.
 extern const GlowKernels kPlainGlowKernels;

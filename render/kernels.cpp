@@ -73,14 +73,14 @@ void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable&
     }
 }
 
-const RowKernels& KernelsOf(Form form) noexcept {
-    switch (form) {
+const RowKernels& KernelsOf(SimdLevel level) noexcept {
+    switch (level) {
 #if defined(__i386__) || defined(__x86_64__)
-        case Form::kAvx512:
+        case SimdLevel::kAvx512:
             return kAvx512Kernels;
-        case Form::kAvx2:
+        case SimdLevel::kAvx2:
             return kAvx2Kernels;
-        case Form::kSse2:
+        case SimdLevel::kSse2:
             return kSse2Kernels;
 #endif
         default:

@@ -11,7 +11,7 @@
 #include <span>
 
 #include "render/colour.h"
-#include "render/cpu.h"
+#include "render/simd/level.h"
 #include "render/image.h"
 #include "render/tone_line.h"
 #include "render/wear_factors.h"
@@ -67,7 +67,7 @@ struct RowKernels {
 };
 
 // `form` must be one that the processor can run.
-[[nodiscard]] const RowKernels& KernelsOf(Form form) noexcept;
+[[nodiscard]] const RowKernels& KernelsOf(SimdLevel level) noexcept;
 
 // A tone's steps one after the other over a row, which the nearest cache holds.
 template <typename Tables, typename Mix>

@@ -34,7 +34,8 @@ struct StreamOrCopy {
 
 }  // namespace
 
-RowProgram::RowProgram(const FramePlan& plan, Form form) noexcept : m_plan(plan), m_kernels(KernelsOf(form)) {
+RowProgram::RowProgram(const FramePlan& plan, SimdLevel level) noexcept
+    : m_plan(plan), m_kernels(KernelsOf(level)) {
     PlanTables();
 }
 

@@ -12,7 +12,7 @@ namespace velmora::render {
 class RowProgram {
   public:
     // Keeps references into `plan`.
-    RowProgram(const FramePlan& plan, Form form) noexcept;
+    RowProgram(const FramePlan& plan, SimdLevel level) noexcept;
     RowProgram(const RowProgram&) = delete;
     RowProgram& operator=(const RowProgram&) = delete;
 

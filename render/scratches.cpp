@@ -100,23 +100,23 @@ void DrawLines(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::in
 }  // namespace
 
 ScratchStage::ScratchStage(const ScratchLine* lines, std::uint32_t count, std::int32_t height,
-                           Form form) noexcept
+                           SimdLevel level) noexcept
     : m_lines(lines),
       m_count(count),
       m_knotStep((std::uint64_t{ScratchLine::kSegments} << 16) / static_cast<std::uint64_t>(height)),
-      m_form(form) {}
+      m_level(level) {}
 
 void ScratchStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     if (in != out) std::memcpy(out, in, static_cast<std::size_t>(width) * sizeof(Bgra));
     const std::uint64_t along = m_knotStep * static_cast<std::uint64_t>(y);
     const RowPlace place = {y, static_cast<std::size_t>(along >> 16),
                             static_cast<std::int32_t>(along & 0xFFFF) >> 4};
-    const auto draw = m_form == Form::kPlain ? DrawLines<PlainSpan> : DrawLines<Sse2Span>;
+    const auto draw = m_level == SimdLevel::kPlain ? DrawLines<PlainSpan> : DrawLines<Sse2Span>;
     draw(m_lines, m_count, out, width, place);
 }
 
 ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffset,
-                              const FrameContext& context, ScratchMemory& memory, Form form) noexcept {
+                              const FrameContext& context, ScratchMemory& memory, SimdLevel level) noexcept {
     const std::int32_t depth = std::clamp(RoundHalfAway(settings.scratchDepth * 65535.0), 0, 65535);
     const std::uint32_t count = std::min(settings.scratchCount, kMostScratches);
     if (depth == 0 || count == 0) return {};
@@ -129,7 +129,7 @@ ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffse
         line.pixel = static_cast<std::int32_t>(scratch.position / 1000) + xOffset;
         LayScratch(scratch, {.frame = frame, .depth = depth, .isFirst = i == 0}, stray, line);
     }
-    return {memory.lines.data(), count, context.Height(), form};
+    return {memory.lines.data(), count, context.Height(), level};
 }
 
 }  // namespace velmora::render

@@ -8,7 +8,7 @@
 #include <array>
 #include <cstdint>
 
-#include "render/cpu.h"
+#include "render/simd/level.h"
 #include "render/frame_context.h"
 #include "render/image.h"
 #include "render/scratch_line.h"
@@ -26,7 +26,8 @@ struct ScratchMemory {
 class ScratchStage {
   public:
     ScratchStage() noexcept = default;
-    ScratchStage(const ScratchLine* lines, std::uint32_t count, std::int32_t height, Form form) noexcept;
+    ScratchStage(const ScratchLine* lines, std::uint32_t count, std::int32_t height,
+                 SimdLevel level) noexcept;
 
     [[nodiscard]] bool IsActive() const noexcept { return m_count != 0; }
     // Draws the scratches' part of row `y` of the processed rectangle; `in` may be `out`.
@@ -36,13 +37,13 @@ class ScratchStage {
     const ScratchLine* m_lines = nullptr;
     std::uint32_t m_count = 0;
     std::uint64_t m_knotStep = 0;  // knots per row, 1/65536
-    Form m_form = Form::kPlain;
+    SimdLevel m_level = SimdLevel::kPlain;
 };
 
 // The scratches of a frame whose picture was moved sideways by `xOffset`. The stage points into `memory` and
 // serves until the memory's next use.
 [[nodiscard]] ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffset,
                                             const FrameContext& context, ScratchMemory& memory,
-                                            Form form) noexcept;
+                                            SimdLevel level) noexcept;
 
 }  // namespace velmora::render

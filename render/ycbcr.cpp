@@ -113,15 +113,15 @@ void RgbRowToYcbcr(const std::uint8_t* rgb, std::uint8_t* destination, std::int3
 
 const YcbcrKernels kPlainYcbcrKernels = {ToBgra, FromBgra};
 
-const YcbcrKernels& YcbcrKernelsOf(Form form) noexcept {
-    switch (form) {
-        case Form::kAvx512:
+const YcbcrKernels& YcbcrKernelsOf(SimdLevel level) noexcept {
+    switch (level) {
+        case SimdLevel::kAvx512:
             return kAvx512YcbcrKernels;
-        case Form::kAvx2:
+        case SimdLevel::kAvx2:
             return kAvx2YcbcrKernels;
-        case Form::kSse2:
+        case SimdLevel::kSse2:
             return kSse2YcbcrKernels;
-        case Form::kPlain:
+        case SimdLevel::kPlain:
             break;
     }
     return kPlainYcbcrKernels;

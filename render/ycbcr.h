@@ -9,7 +9,7 @@
 #include <cstdint>
 #include <memory>
 
-#include "render/cpu.h"
+#include "render/simd/level.h"
 #include "render/image.h"
 
 namespace velmora::render {
@@ -51,7 +51,7 @@ struct YcbcrKernels {
     void (*toBgra)(const std::uint8_t* source, Bgra* out, std::int32_t width, std::uint8_t alpha) noexcept;
     void (*fromBgra)(const Bgra* in, std::uint8_t* destination, std::int32_t width) noexcept;
 };
-[[nodiscard]] const YcbcrKernels& YcbcrKernelsOf(Form form) noexcept;
+[[nodiscard]] const YcbcrKernels& YcbcrKernelsOf(SimdLevel level) noexcept;
 
 extern const YcbcrKernels kPlainYcbcrKernels;
 extern const YcbcrKernels kSse2YcbcrKernels;

@@ -20,12 +20,12 @@ namespace {
 constexpr std::int32_t kWidest = 140;
 constexpr std::size_t kGuard = 80;  // bytes before and behind a row
 
-std::vector<Form> FasterForms() {
-    std::vector<Form> forms;
-    for (const Form form : {Form::kSse2, Form::kAvx2, Form::kAvx512}) {
-        if (form <= BestForm()) forms.push_back(form);
+std::vector<SimdLevel> FasterLevels() {
+    std::vector<SimdLevel> levels;
+    for (const SimdLevel level : {SimdLevel::kSse2, SimdLevel::kAvx2, SimdLevel::kAvx512}) {
+        if (level <= BestSimdLevel()) levels.push_back(level);
     }
-    return forms;
+    return levels;
 }
 
 ChannelTables AnyTables(std::mt19937& numbers) {
@@ -41,12 +41,12 @@ ChannelTables AnyTables(std::mt19937& numbers) {
 using Run = std::function<void(const RowKernels&, const Bgra* in, Bgra* out, std::int32_t width)>;
 
 // Rows of all widths at all addresses, apart and, where it may be, in place; bytes around the row must stay.
-void ExpectEqualForms(const Run& run, bool mayBeInPlace) {
+void ExpectEqualLevels(const Run& run, bool mayBeInPlace) {
     std::mt19937 numbers(1);
     std::vector<std::uint8_t> before(2 * kGuard + kWidest * sizeof(Bgra) + 64), source(before);
     for (std::uint8_t& byte : source) byte = static_cast<std::uint8_t>(numbers());
     for (std::uint8_t& byte : before) byte = static_cast<std::uint8_t>(numbers());
-    for (const Form form : FasterForms()) {
+    for (const SimdLevel level : FasterLevels()) {
         for (std::int32_t width = 0; width <= kWidest; ++width) {
             for (const std::size_t offset : {0u, 1u, 4u, 7u, 16u, 20u, 32u, 60u}) {
                 const auto at = [offset](std::vector<std::uint8_t>& bytes) {
@@ -54,18 +54,18 @@ void ExpectEqualForms(const Run& run, bool mayBeInPlace) {
                 };
                 std::vector<std::uint8_t> expected = before, apart = before, inPlace = source, alone = source;
                 run(kPlainKernels, at(source), at(expected), width);
-                run(KernelsOf(form), at(source), at(apart), width);
-                ASSERT_EQ(apart, expected) << static_cast<int>(form) << ' ' << width << ' ' << offset;
+                run(KernelsOf(level), at(source), at(apart), width);
+                ASSERT_EQ(apart, expected) << static_cast<int>(level) << ' ' << width << ' ' << offset;
                 if (!mayBeInPlace) continue;
                 run(kPlainKernels, at(alone), at(alone), width);
-                run(KernelsOf(form), at(inPlace), at(inPlace), width);
-                ASSERT_EQ(inPlace, alone) << static_cast<int>(form) << ' ' << width << ' ' << offset;
+                run(KernelsOf(level), at(inPlace), at(inPlace), width);
+                ASSERT_EQ(inPlace, alone) << static_cast<int>(level) << ' ' << width << ' ' << offset;
             }
         }
     }
 }
 
-TEST(RowKernels, TonesAreEqualInAllForms) {
+TEST(RowKernels, TonesAreEqualOnAllLevels) {
     std::mt19937 numbers(4);
     const ChannelTables before = AnyTables(numbers), after = AnyTables(numbers);
     for (const Tone& tone : {Tone{&before, true, 40, &after}, Tone{nullptr, true, -127, &after},
@@ -73,13 +73,13 @@ TEST(RowKernels, TonesAreEqualInAllForms) {
                              Tone{nullptr, false, 0, &after}, Tone{nullptr, true, 5, nullptr},
                              Tone{nullptr, true, -126, nullptr}, Tone{nullptr, true, -1, nullptr},
                              Tone{nullptr, true, 0, nullptr}}) {
-        ExpectEqualForms([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
-                             std::int32_t width) { kernels.tone(in, out, width, tone); },
-                         true);
+        ExpectEqualLevels([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
+                              std::int32_t width) { kernels.tone(in, out, width, tone); },
+                          true);
     }
 }
 
-TEST(RowKernels, LinesAreEqualToTheirTableInAllForms) {
+TEST(RowKernels, LinesAreEqualToTheirTableOnAllLevels) {
     const ToneLine up = {200 << 8, 3000, 0, 8}, cut = {60000, 0, 9000, 6};
     std::mt19937 numbers(6);
     const ChannelTables after = AnyTables(numbers);
@@ -93,14 +93,14 @@ TEST(RowKernels, LinesAreEqualToTheirTableInAllForms) {
         before.Set(table, table, table);
         for (Tone tone : {Tone{&before, true, 40, &after}, Tone{&before, false, 0, nullptr}}) {
             tone.lines = lines;
-            ExpectEqualForms([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
-                                 std::int32_t width) { kernels.tone(in, out, width, tone); },
-                             true);
+            ExpectEqualLevels([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
+                                  std::int32_t width) { kernels.tone(in, out, width, tone); },
+                              true);
         }
     }
 }
 
-TEST(RowKernels, WearIsEqualInAllForms) {
+TEST(RowKernels, WearIsEqualOnAllLevels) {
     constexpr std::int32_t kHeight = 9;
     std::mt19937 numbers(3);
     std::vector<WearFactor> factors(kHeight * kWidestWear + 2 * WearStrips::kRoom);
@@ -111,18 +111,18 @@ TEST(RowKernels, WearIsEqualInAllForms) {
         for (const std::uint32_t channels : {kColourChannels, kBlueChannel}) {
             const WearStrips strips(WearRows(Random(7), kHeight, 5), factors.data() + WearStrips::kRoom,
                                     stripWidth);
-            ExpectEqualForms([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
-                                 std::int32_t width) { kernels.wear(in, out, width, strips, channels); },
-                             true);
+            ExpectEqualLevels([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
+                                  std::int32_t width) { kernels.wear(in, out, width, strips, channels); },
+                              true);
         }
     }
 }
 
-TEST(RowKernels, CopiesAreEqualInAllForms) {
-    ExpectEqualForms([](const RowKernels& kernels, const Bgra* in, Bgra* out,
-                        std::int32_t width) { kernels.copy(in, out, width); },
-                     true);
-    ExpectEqualForms(
+TEST(RowKernels, CopiesAreEqualOnAllLevels) {
+    ExpectEqualLevels([](const RowKernels& kernels, const Bgra* in, Bgra* out,
+                         std::int32_t width) { kernels.copy(in, out, width); },
+                      true);
+    ExpectEqualLevels(
         [](const RowKernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
             kernels.stream(in, out, width);
             kernels.endStream();
