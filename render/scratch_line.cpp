@@ -174,16 +174,18 @@ void LayLevels(const ScratchState& scratch, std::int32_t frame, ScratchLine& lin
 
 constexpr std::int32_t kMostTexture = 22 * 1024;
 
-// Octaves of 1 to 32 rows, softened by a row either side so that no fleck has a hard end.
-constexpr std::array<std::int16_t, kScratchTextureRows> MakeTexture() {
-    constexpr std::int32_t kMask = kScratchTextureRows - 1;
+constexpr std::int32_t kTextureMask = ScratchTexture::kRows - 1;
+using RoughRows = std::array<std::int32_t, ScratchTexture::kRows>;
+
+// Octaves of 1 to 32 rows.
+constexpr RoughRows MakeRoughRows() {
     constexpr std::int32_t kWeights[6] = {110, 120, 130, 140, 140, 120};  // of 256
-    std::array<std::int32_t, kScratchTextureRows> rough{};
+    RoughRows rough{};
     for (int bits = 0; bits < 6; ++bits) {
         const auto lane = static_cast<Lane>(kTexture + 100u * static_cast<std::uint32_t>(bits));
-        for (std::int32_t cell = 0; cell <= kMask >> bits; ++cell) {
+        for (std::int32_t cell = 0; cell <= kTextureMask >> bits; ++cell) {
             const std::int32_t from = HashAt(0x5EEDu, lane, cell);
-            const std::int32_t to = HashAt(0x5EEDu, lane, (cell + 1) & (kMask >> bits));
+            const std::int32_t to = HashAt(0x5EEDu, lane, (cell + 1) & (kTextureMask >> bits));
             for (std::int32_t row = 0; row < 1 << bits; ++row) {
                 const std::int32_t value = from + ((to - from) * Eased(row * 256 >> bits) >> 8) - 32768;
                 const std::int32_t place = (cell << bits) + row;
@@ -191,20 +193,36 @@ constexpr std::array<std::int16_t, kScratchTextureRows> MakeTexture() {
             }
         }
     }
-    std::array<std::int16_t, kScratchTextureRows> texture{};
-    for (std::int32_t row = 0; row <= kMask; ++row) {
-        const std::int32_t sum = rough[static_cast<std::size_t>((row - 1) & kMask)] +
-                                 2 * rough[static_cast<std::size_t>(row)] +
-                                 rough[static_cast<std::size_t>((row + 1) & kMask)];
-        texture[static_cast<std::size_t>(row)] =
-            static_cast<std::int16_t>(std::clamp(sum / 4, -kMostTexture, kMostTexture));
+    return rough;
+}
+
+constexpr RoughRows Softened(const RoughRows& rows) {
+    RoughRows soft{};
+    for (std::int32_t row = 0; row <= kTextureMask; ++row) {
+        const std::int32_t sum = rows[static_cast<std::size_t>((row - 1) & kTextureMask)] +
+                                 2 * rows[static_cast<std::size_t>(row)] +
+                                 rows[static_cast<std::size_t>((row + 1) & kTextureMask)];
+        soft[static_cast<std::size_t>(row)] = sum / 4;
+    }
+    return soft;
+}
+
+constexpr ScratchTexture MakeTexture(int softenings) {
+    RoughRows rows = MakeRoughRows();
+    for (int i = 0; i < softenings; ++i) rows = Softened(rows);
+    ScratchTexture texture;
+    for (std::size_t row = 0; row < rows.size(); ++row) {
+        texture.values[row] = static_cast<std::int16_t>(std::clamp(rows[row], -kMostTexture, kMostTexture));
     }
     return texture;
 }
 
-}  // namespace
+// A fleck is about as long as it is wide: a row's break across a wide scratch would look like a bar code.
+constinit const ScratchTexture kThinTexture = MakeTexture(1);
+constinit const ScratchTexture kThickTexture = MakeTexture(8);
+constexpr std::int32_t kThickFrom = 5;  // pixels
 
-constinit const std::array<std::int16_t, kScratchTextureRows> kScratchTexture = MakeTexture();
+}  // namespace
 
 ScratchStray::ScratchStray(std::int32_t width, std::int32_t height) noexcept
     : sway(std::int64_t{std::min(width, 16384)} * 256 * 26 / 10000),
@@ -222,6 +240,8 @@ void LayScratch(const ScratchState& scratch, const ScratchView& view, const Scra
     line.roughness = Between(kOne / 4, kOne * 7 / 8, HashAt(scratch.look, kRoughness));
     line.absentLevel = -(line.roughness * (kMostTexture >> 10) >> 5);
     line.texture = HashAt(scratch.look, kTexture, age);
+    line.rows = scratch.width < kThickFrom ? &kThinTexture : &kThickTexture;
+    line.shake = scratch.width < kThickFrom ? 60 : 190;
     LayCourse(scratch, age, stray, line);
     LayLevels(scratch, view.frame, line);
 }

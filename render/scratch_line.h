@@ -14,6 +14,16 @@
 
 namespace velmora::render {
 
+// A roughness that scratches share, at most 22528 either way and 0 on average, for any row from 0 on.
+struct ScratchTexture {
+    static constexpr std::int32_t kRows = 2048;
+    std::array<std::int16_t, kRows> values{};
+
+    [[nodiscard]] std::int32_t At(std::int32_t row) const noexcept {
+        return values[static_cast<std::size_t>(row & (kRows - 1))];
+    }
+};
+
 // Course and presence at knots that divide the height evenly; the texture roughens the presence row by row.
 struct ScratchLine {
     static constexpr std::int32_t kSegments = 64;
@@ -31,15 +41,10 @@ struct ScratchLine {
     std::int32_t roughness = 0;    // of the level, for a texture of 32768
     std::int32_t absentLevel = 0;  // up to it no row of the texture makes anything visible
     std::int32_t texture = 0;      // where in the texture the frame's first row lies
+    const ScratchTexture* rows = nullptr;
+    std::int32_t shake = 0;  // of the edge from row to row, 1/256 pixels for a texture of 32768
     std::array<Knot, kSegments + 1> knots;
 };
-
-// The roughness that all scratches share, at most 22528 either way and 0 on average, for any row from 0 on.
-inline constexpr std::int32_t kScratchTextureRows = 2048;
-extern const std::array<std::int16_t, kScratchTextureRows> kScratchTexture;
-[[nodiscard]] inline std::int32_t ScratchTextureAt(std::int32_t row) noexcept {
-    return kScratchTexture[static_cast<std::size_t>(row & (kScratchTextureRows - 1))];
-}
 
 // How far a scratch strays from its column, in 1/256 pixels: some thousandths of the picture's size.
 struct ScratchStray {

@@ -74,9 +74,16 @@ constexpr ScratchShape MakeShape(const ScratchProfile& profile, const Section& s
     return shape;
 }
 
+constexpr Section Narrowed(const Section& whole) {
+    const Hair &hair = whole.hairs[0], &other = whole.hairs[1];
+    return {{{hair.place, hair.half * 7 / 8, hair.strength},
+             {other.place, other.half * 3 / 4 + 1, other.strength / 2}},
+            whole.graze / 2};
+}
+
 constexpr Section Worn(const Section& whole) {
     const Hair& hair = whole.hairs[0];
-    return {{{hair.place, hair.half * 4 / 5, hair.strength}, {128, 1, 0}}, 0};
+    return {{{hair.place, hair.half * 2 / 3, hair.strength}, {128, 1, 0}}, 0};
 }
 
 using ShapeTable = std::array<std::array<ScratchShapes, kScratchSections>, kScratchProfiles>;
@@ -87,7 +94,8 @@ constexpr ShapeTable MakeShapes(const ScratchProfile (&profiles)[kScratchProfile
         for (int section = 0; section < kScratchSections; ++section) {
             const Section& whole = (i < kThinScratchProfiles ? kThinSections : kThickSections)[section];
             shapes[static_cast<std::size_t>(i)][static_cast<std::size_t>(section)] = {
-                MakeShape(profiles[i], whole), MakeShape(profiles[i], Worn(whole))};
+                MakeShape(profiles[i], whole), MakeShape(profiles[i], Narrowed(whole)),
+                MakeShape(profiles[i], Worn(whole))};
         }
     }
     return shapes;

@@ -20,9 +20,9 @@ struct ScratchShape {
     std::array<std::array<std::uint16_t, kMostScratchPixels>, kScratchPhases> weights{};
 };
 
-// Where a scratch is about to break off only its finest part is left.
-enum ScratchWear : std::size_t { kScratchWhole, kScratchWorn };
-using ScratchShapes = std::array<ScratchShape, 2>;
+// Where a scratch is about to break off it narrows, until only its finest part is left.
+enum ScratchWear : std::size_t { kScratchWhole, kScratchNarrow, kScratchWorn };
+using ScratchShapes = std::array<ScratchShape, 3>;
 
 // The shapes of a profile, 0..kScratchProfiles − 1, with a section of 0..kScratchSections − 1.
 [[nodiscard]] const ScratchShapes& ScratchShapesOf(bool isWhite, std::int32_t profile,

@@ -67,7 +67,9 @@ struct RowPlace {
     std::int32_t part;
 };
 
-constexpr std::int32_t kWorn = 36000;  // a scratch less present than this has lost its width
+// A scratch less present than this has lost some of its width, and all but a hair.
+constexpr std::int32_t kNarrowing = 52000, kWorn = 34000;
+constexpr std::int32_t kShakeRows = 977;  // takes the edge's shake from elsewhere in the texture
 
 // No branch but the first hangs on the texture's rows: they are too irregular to be foreseen.
 template <typename Span>
@@ -75,12 +77,14 @@ void DrawLine(const ScratchLine& line, Bgra* row, std::int32_t width, const RowP
     const ScratchLine::Knot &from = line.knots[place.knot], &to = line.knots[place.knot + 1];
     const std::int32_t level = from.level + ((to.level - from.level) * place.part >> 12);
     if (level <= line.absentLevel) return;
-    const std::int32_t ragged = ScratchTextureAt(line.texture + place.y) * line.roughness >> 15;
+    const std::int32_t ragged = line.rows->At(line.texture + place.y) * line.roughness >> 15;
     const std::int32_t present = std::clamp(level + ragged, 0, 65535);
     const std::uint32_t strength = static_cast<std::uint32_t>(present) * line.strength >> 16;
-    const std::int32_t edge = from.offset + ((to.offset - from.offset) * place.part >> 12);
+    const std::int32_t shaken = line.rows->At(line.texture + place.y + kShakeRows) * line.shake >> 15;
+    const std::int32_t edge = from.offset + ((to.offset - from.offset) * place.part >> 12) + shaken;
     const std::int32_t first = line.pixel + (edge >> 8);
-    const ScratchShape& shape = (*line.shapes)[present < kWorn ? kScratchWorn : kScratchWhole];
+    const ScratchShape& shape =
+        (*line.shapes)[std::size_t{present < kNarrowing} + std::size_t{present < kWorn}];
     const std::uint16_t* weights = shape.weights[static_cast<std::size_t>((edge & 255) >> 3)].data();
     if (first >= 0 && first <= width - line.pixels) {
         return Span::Draw(row + first, weights, line.pixels, strength, line.isWhite);

@@ -83,19 +83,19 @@ SPOTS = [
     (11, 13, 102, [flake(5.4, 6.4, 2.6, 2.2, DIRT, 0.9, 35, ragged=0.22, seed=22)]),
     # a bright speck
     (9, 11, 94, [speck(4.6, 5.2, 1.6, 1.2, CLEAR, 0.95, -30, 0.9, seed=5)]),
-    # a grain of dust, hardly more than a pixel
-    (8, 7, 103, [speck(3.9, 3.4, 0.95, 0.75, DIRT, 0.9, 10, 0.8, seed=6)]),
+    # a grain of dust
+    (8, 7, 103, [speck(3.9, 3.4, 1.25, 0.95, DIRT, 0.9, 10, 0.8, seed=6)]),
     # a faint speck out of focus
-    (5, 10, 110, [speck(2.5, 5.1, 1.05, 1.4, DIRT, 0.5, 0, 1.5, 0.12, seed=7)]),
+    (5, 10, 110, [speck(2.5, 5.1, 1.1, 1.6, DIRT, 0.6, 0, 1.4, 0.12, seed=7)]),
     # the largest flake, torn and thin
     (13, 14, 95, [flake(6.3, 7.1, 3.5, 2.9, DIRT, 0.78, -50, 1.1, seed=31)]),
     # a pin hole
-    (6, 9, 90, [speck(3.1, 4.4, 0.75, 0.7, CLEAR, 0.85, 0, 0.9, seed=9)]),
+    (6, 9, 90, [speck(3.1, 4.4, 1.0, 0.85, CLEAR, 0.9, 0, 0.9, seed=9)]),
     # two grains that touch, one much smaller
     (8, 12, 111, [speck(3.7, 5.6, 1.5, 1.2, DIRT, 0.85, 60, 0.9, seed=10),
                   speck(5.3, 7.1, 0.7, 0.6, DIRT, 0.6, 0, 0.9, seed=11)]),
     # a faint speck
-    (7, 8, 110, [speck(3.4, 3.9, 1.5, 1.1, DIRT, 0.42, -20, 1.2, seed=12)]),
+    (7, 8, 110, [speck(3.4, 3.9, 1.6, 1.3, DIRT, 0.5, -20, 1.2, seed=12)]),
     # a bright flake, half transparent
     (13, 11, 118, [flake(6.2, 5.3, 2.5, 1.9, CLEAR, 0.62, 15, 1.0, seed=47)]),
 ]

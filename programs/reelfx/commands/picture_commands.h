@@ -8,7 +8,7 @@
 #include "programs/reelfx/common/effect_choice.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/media_reader.h"
-#include "programs/reelfx/pictures/clip_pictures.h"
+#include "programs/reelfx/pipeline/clip_pictures.h"
 
 namespace velmora::hosts {
 

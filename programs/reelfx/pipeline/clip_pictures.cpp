@@ -1,4 +1,4 @@
-#include "programs/reelfx/pictures/clip_pictures.h"
+#include "programs/reelfx/pipeline/clip_pictures.h"
 
 #include <algorithm>
 #include <filesystem>
