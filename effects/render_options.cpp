@@ -14,6 +14,7 @@ struct NamedLevel {
 constexpr NamedLevel kLevels[] = {
     {"plain", render::SimdLevel::kPlain},
     {"sse2", render::SimdLevel::kSse2},
+    {"ssse3", render::SimdLevel::kSsse3},
     {"avx2", render::SimdLevel::kAvx2},
     {"avx512", render::SimdLevel::kAvx512},
 };

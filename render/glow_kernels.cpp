@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "render/kernels.h"
+
 namespace velmora::render {
 namespace {
 
@@ -145,21 +147,8 @@ void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t 
 
 }  // namespace
 
-const GlowKernels kPlainGlowKernels = {AverageBlocks, KeepHighlights, Filter,      HalveRows,
-                                       HalveAlong,    Between,        DoubleAlong, Mix,
-                                       Lift,          Approach,       Screen,      ScreenFourfold};
-
-const GlowKernels& GlowKernelsOf(SimdLevel level) noexcept {
-    switch (level) {
-        case SimdLevel::kAvx512:
-        case SimdLevel::kAvx2:
-            return kAvx2GlowKernels;
-        case SimdLevel::kSse2:
-            return kSse2GlowKernels;
-        case SimdLevel::kPlain:
-            break;
-    }
-    return kPlainGlowKernels;
-}
+const GlowKernels kPlainGlow = {AverageBlocks, KeepHighlights, Filter,      HalveRows,
+                                HalveAlong,    Between,        DoubleAlong, Mix,
+                                Lift,          Approach,       Screen,      ScreenFourfold};
 
 }  // namespace velmora::render

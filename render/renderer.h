@@ -9,10 +9,10 @@
 #include <cstdint>
 
 #include "render/colour.h"
-#include "render/simd/level.h"
 #include "render/frame_context.h"
 #include "render/glow.h"
 #include "render/jitter.h"
+#include "render/kernels.h"
 #include "render/render_state.h"
 #include "render/scratches.h"
 #include "render/spots.h"
@@ -45,9 +45,9 @@ struct FramePlan {
     SpotStage spots;
 };
 
-// All but glow, which starts from the picture itself. `form` is that of the scratches.
+// All but glow, which starts from the picture itself. `kernels` draw the scratches.
 [[nodiscard]] FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings,
-                                  RenderState& state, SimdLevel level = BestSimdLevel()) noexcept;
+                                  RenderState& state, const Kernels& kernels) noexcept;
 
 // Runs the stages on a frame whose two views are valid and whose random state has been begun. The result is
 // in the destination when a stage had something to do, else FrameContext::Finish copies the source through.

@@ -7,11 +7,14 @@ namespace velmora::render {
 enum class SimdLevel {
     kPlain,
     kSse2,
+    kSsse3,
     kAvx2,
     kAvx512,  // with byte permutations (VBMI)
 };
+inline constexpr SimdLevel kSimdLevels[] = {SimdLevel::kPlain, SimdLevel::kSse2, SimdLevel::kSsse3,
+                                            SimdLevel::kAvx2, SimdLevel::kAvx512};
 
-// The fastest level that this processor and operating system can run.
+// The fastest level that this build has and that this processor and operating system can run.
 [[nodiscard]] SimdLevel BestSimdLevel() noexcept;
 
 }  // namespace velmora::render

@@ -1,6 +1,6 @@
 // Frames through the boundary: effects and conversions with any geometry, values and times, several in a row on the
-// state that the library keeps. Refused, or worked on so that nothing else is touched and every path and SIMD level of the
-// kernels gives the same bytes.
+// state that the library keeps. Refused, or worked on so that nothing else is touched and every path and SIMD
+// level gives the same bytes.
 
 #include <algorithm>
 #include <array>
@@ -94,10 +94,8 @@ class Run {
         m_reference.options.road = render::Road::kByStages;
         m_reference.options.level = render::SimdLevel::kPlain;
         const std::int32_t choice = input.Byte();
-        constexpr render::SimdLevel kLevels[] = {render::SimdLevel::kPlain, render::SimdLevel::kSse2,
-                                                 render::SimdLevel::kAvx2, render::SimdLevel::kAvx512};
-        m_other.options.level = std::min(kLevels[choice % 4], render::BestSimdLevel());
-        if (choice / 4 % 2 != 0) m_other.options.streamedBytes = 0;
+        m_other.options.level = std::min(render::kSimdLevels[choice % 5], render::BestSimdLevel());
+        if (choice / 5 % 2 != 0) m_other.options.streamedBytes = 0;
         const std::uint32_t seed = input.Byte();
         for (render::RenderState* state : {ProcessSession().state, &m_reference.state, &m_other.state}) {
             *state = {};
@@ -186,8 +184,8 @@ class Run {
 
     // A processor takes the form that the environment names when it is made.
     IFrameProcessor* NewProcessor() {
-        static constexpr const char* kLevels[] = {"plain", "sse2", "avx2", "avx512"};
-        setenv("VELMORA_FORM", kLevels[m_input.Below(4)], 1);
+        static constexpr const char* kLevels[] = {"plain", "sse2", "ssse3", "avx2", "avx512"};
+        setenv("VELMORA_FORM", kLevels[m_input.Below(5)], 1);
         IFrameProcessor* const processor = m_library.CreateFrameProcessor();
         unsetenv("VELMORA_FORM");
         return processor;

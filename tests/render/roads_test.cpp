@@ -85,8 +85,7 @@ TEST(Roads, GiveTheSameBytes) {
         const std::int32_t width = std::min(source.Shape().width, expected.Shape().width);
         const std::int32_t height = std::min(source.Shape().height, expected.Shape().height);
         ASSERT_TRUE(expected.OnlyRegionDiffers(before, width, height));
-        for (const SimdLevel level :
-             {SimdLevel::kPlain, SimdLevel::kSse2, SimdLevel::kAvx2, SimdLevel::kAvx512}) {
+        for (const SimdLevel level : kSimdLevels) {
             if (level > BestSimdLevel()) continue;
             for (const std::int64_t streamedBytes : {std::int64_t{0}, RenderOptions{}.streamedBytes}) {
                 GuardedFrame destination = before;
@@ -187,7 +186,7 @@ TEST(DrawsPerFrame, TellsHowFarTheSequenceMoves) {
         RenderState state;
         state.random.Seed(seed);
         Random plain(seed);
-        (void)PlanFrame(context, settings, state);
+        (void)PlanFrame(context, settings, state, kPlainKernels);
         plain.Skip(DrawsPerFrame(settings, context.Width()));
         ASSERT_EQ(state.random.Numbers().State(), plain.State()) << seed;
     }

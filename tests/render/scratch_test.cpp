@@ -8,6 +8,7 @@
 #include <numeric>
 #include <random>
 
+#include "render/kernels.h"
 #include "render/scratches.h"
 #include "tests/render/plain_picture.h"
 
@@ -128,7 +129,8 @@ PlainPicture Draw(PlainPicture picture, const StageSettings& settings, const Dra
                   ScratchMemory& memory) {
     FrameContext context(picture.Description(), picture.Description());
     context.SetTime(drawing.seconds);
-    const ScratchStage stage = PrepareScratches(settings, drawing.xOffset, context, memory, drawing.level);
+    const ScratchStage stage =
+        PrepareScratches(settings, drawing.xOffset, context, memory, KernelsOf(drawing.level));
     if (!stage.IsActive()) return picture;
     for (std::int32_t y = 0; y < picture.Height(); ++y) {
         stage.Row(picture.Row(y), picture.Row(y), picture.Width(), y);
@@ -176,7 +178,7 @@ TEST(Scratches, DrawNothingWithoutDepthOrCount) {
         PlainPicture picture = Grey();
         FrameContext context(picture.Description(), picture.Description());
         ScratchMemory memory;
-        EXPECT_FALSE(PrepareScratches(settings, 0, context, memory, BestSimdLevel()).IsActive());
+        EXPECT_FALSE(PrepareScratches(settings, 0, context, memory, KernelsOf(BestSimdLevel())).IsActive());
     }
 }
 
@@ -260,7 +262,8 @@ void ForEachLine(std::int32_t frames, const Check& check) {
         for (std::int32_t frame = 0; frame < frames; ++frame) {
             FrameContext context(picture.Description(), picture.Description());
             context.SetTime((frame + 0.5) / 30.0);
-            const ScratchStage stage = PrepareScratches(settings, 0, context, memory, BestSimdLevel());
+            const ScratchStage stage =
+                PrepareScratches(settings, 0, context, memory, KernelsOf(BestSimdLevel()));
             ASSERT_TRUE(stage.IsActive());
             for (std::uint32_t i = 0; i < 16; ++i) check(memory.lines[i], frame, i);
         }
@@ -302,7 +305,7 @@ TEST(Scratches, BreakOffRaggedly) {
     ForEachLine(12, [&](const ScratchLine& line, std::int32_t frame, std::uint32_t i) {
         if (line.strength < 20000 || line.pixel < 20 || line.pixel > 1880) return;
         PlainPicture out = Grey(1920, 1080);
-        const ScratchStage stage(&line, 1, 1080, BestSimdLevel());
+        const ScratchStage stage(&line, 1, 1080, KernelsOf(BestSimdLevel()));
         std::int32_t last = 0, falling = 0, rising = 0;
         for (std::int32_t y = 0; y < 1080; ++y) {
             stage.Row(out.Row(y), out.Row(y), 1920, y);
