@@ -1,6 +1,6 @@
 // Frames through the boundary: effects and conversions with any geometry, values and times, several in a row on the
-// state that the library keeps. Refused, or worked on so that nothing else is touched and every path and SIMD
-// level gives the same bytes.
+// state that the library keeps. Refused, or worked on so that nothing else is touched and every SIMD level gives the same
+// bytes.
 
 #include <algorithm>
 #include <array>
@@ -82,8 +82,8 @@ double ReadTime(FuzzInput& input) {
     return input.Byte() / 30.0;
 }
 
-// The state that a road of its own renders on, beside the library's.
-struct OtherRoad {
+// A state on which frames are rendered at a level of their own, beside the library's.
+struct OtherState {
     render::RenderState state;
     render::RenderOptions options;
 };
@@ -91,7 +91,6 @@ struct OtherRoad {
 class Run {
   public:
     Run(FuzzInput& input, IEffectLibrary& library) : m_input(input), m_library(library) {
-        m_reference.options.road = render::Road::kByStages;
         m_reference.options.level = render::SimdLevel::kPlain;
         const std::int32_t choice = input.Byte();
         m_other.options.level = std::min(render::kSimdLevels[choice % 5], render::BestSimdLevel());
@@ -138,22 +137,22 @@ class Run {
         void* face = nullptr;
         Require(effect.QueryInterface(&kIidVideoHost, &face) == kStatusOk);
         effect.Release();
-        for (OtherRoad* road : {&m_reference, &m_other}) {
+        for (OtherState* other : {&m_reference, &m_other}) {
             if (!isWhole) {
                 // The number counts, though there is no frame.
-                RenderFrame(Session(*road), *static_cast<IVideoHost*>(face), source, destination, when);
+                RenderFrame(Session(*other), *static_cast<IVideoHost*>(face), source, destination, when);
                 continue;
             }
             FuzzedFrames::Copy copy = frames.TakeCopy();
-            Require(RenderFrame(Session(*road), *static_cast<IVideoHost*>(face), &copy.source,
+            Require(RenderFrame(Session(*other), *static_cast<IVideoHost*>(face), &copy.source,
                                 &copy.destination, when));
             Require(frames.AreAs(copy));
         }
     }
 
-    // All roads read the values that the library's list has just read, and leave in it what they found.
-    static RenderSession Session(OtherRoad& road) {
-        return {CurrentMasterSettings(), &road.state, road.options};
+    // All read the values that the library's list has just read, and leave in it what they found.
+    static RenderSession Session(OtherState& other) {
+        return {CurrentMasterSettings(), &other.state, other.options};
     }
 
     void Convert(bool isToBgra) {
@@ -223,7 +222,7 @@ class Run {
     IEffectLibrary& m_library;
     WordHost m_host;
     std::array<Owned<IVideoEffect>, 5> m_effects;
-    OtherRoad m_reference, m_other;
+    OtherState m_reference, m_other;
 };
 
 }  // namespace
