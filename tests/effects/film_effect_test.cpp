@@ -1,15 +1,12 @@
-// The effect objects between the host and the renderer: identity, counts, forwarding and the setting map.
+// The effect objects between the host and the renderer: identity, counts and forwarding.
 
 #include "effects/film_effect.h"
 
 #include <gtest/gtest.h>
 
-#include <bit>
 #include <limits>
-#include <thread>
 #include <vector>
 
-#include "tests/effects/expected_effects.h"
 #include "tests/effects/test_hosts.h"
 
 namespace velmora::tests {
@@ -44,9 +41,6 @@ class Effect {
 };
 
 constexpr ValueCell kUntouchedCell = {{.bits = 0xCCCCCCCCu}, 0xCCCCCCCCu, 0xCCCCCCCCu};
-
-// The kinds by which the renderer asks for its settings.
-constexpr std::uint32_t kMasterKinds[21] = {2, 2, 3, 2, 2, 2, 2, 2, 3, 2, 2, 2, 2, 1, 4, 2, 2, 2, 4, 4, 4};
 
 TEST(FilmEffect, AnswersToItsThreeIdentifiersFromBothFaces) {
     for (std::uint32_t i = 0; i < 5; ++i) {
@@ -110,24 +104,6 @@ TEST(FilmEffect, BothFacesShareOneCount) {
     EXPECT_EQ(face->Release(), 0u);
 }
 
-TEST(FilmEffect, CountsFromManyThreads) {
-    IVideoEffect* effect = CreateEffectByIndex(4);
-    const auto work = [effect] {
-        for (int i = 0; i < 20000; ++i) {
-            effect->AddRef();
-            effect->Release();
-        }
-    };
-    std::thread other(work);
-    work();
-    other.join();
-    EXPECT_EQ(effect->Release(), 0u);
-}
-
-TEST(FilmEffect, TenThousandRounds) {
-    for (std::uint32_t i = 0; i < 10000; ++i) ASSERT_EQ(CreateEffectByIndex(i % 5)->Release(), 0u);
-}
-
 // Hosts see nothing of the layout, but an effect is to store no more than its five members.
 TEST(FilmEffect, StoresItsFiveMembersOnly) {
     constexpr std::size_t kPointer = sizeof(void*);
@@ -164,54 +140,6 @@ TEST(FilmEffect, ForwardsTwoOperationsToTheHost) {
     EXPECT_FALSE(effect.Face()->HostOperation6(31, 32));
     effect.Face()->HostOperation7(41, 42);
     EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{21, 22}));
-}
-
-// Splits "own 3" into its two words and checks what the face answered.
-void ExpectAnswer(const std::string& expected, const RecordingHost& host, const ValueCell& cell,
-                  std::uint32_t kind) {
-    const std::size_t blank = expected.find(' ');
-    const std::string source = expected.substr(0, blank);
-    const std::string word = expected.substr(blank + 1);
-    if (source == "own" || source == "depth") {
-        const auto own = static_cast<std::uint32_t>(std::stoul(word));
-        ASSERT_EQ(host.calls, (std::vector<RecordingHost::Call>{{own, kind}}));
-        if (source == "own") {
-            EXPECT_EQ(cell.value.bits, RecordingHost::WordOf(own));
-        }
-        return;
-    }
-    EXPECT_TRUE(host.calls.empty());
-    if (source == "number") {
-        EXPECT_EQ(cell.value.bits, FloatBits(std::stof(word)));
-    }
-    if (source == "colour") {
-        EXPECT_EQ(cell.value.bits, std::stoul(word, nullptr, 16));
-    }
-    if (source == "item") {
-        EXPECT_EQ(cell.value.bits, std::stoul(word));
-    }
-    if (source == "flag") {
-        EXPECT_EQ(cell.value.bits, word == "on" ? 0xCCCCCC01u : 0xCCCCCC00u);
-    }
-}
-
-TEST(FilmEffect, AnswersEachOfTheRenderersSettings) {
-    for (std::uint32_t i = 0; i < 5; ++i) {
-        const ExpectedEffect& expected = ExpectedEffects()[i];
-        SCOPED_TRACE(expected.name);
-        Effect effect(i);
-        ASSERT_EQ(expected.answers.size(), 21u);
-        for (std::uint32_t index = 0; index < 21; ++index) {
-            SCOPED_TRACE("setting " + std::to_string(index) + ": " + expected.answers[index]);
-            RecordingHost host;
-            effect.Attach(&host);
-            ValueCell cell = kUntouchedCell;
-            EXPECT_TRUE(effect.Face()->GetParamValue(index, &cell, kMasterKinds[index]));
-            EXPECT_EQ(cell.kind, kMasterKinds[index]);
-            EXPECT_EQ(cell.second, kUntouchedCell.second);
-            ExpectAnswer(expected.answers[index], host, cell, kMasterKinds[index]);
-        }
-    }
 }
 
 TEST(FilmEffect, FailsPastTheLastSettingAndWithoutACell) {
