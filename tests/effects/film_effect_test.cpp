@@ -42,33 +42,24 @@ class Effect {
 
 constexpr ValueCell kUntouchedCell = {{.bits = 0xCCCCCCCCu}, 0xCCCCCCCCu, 0xCCCCCCCCu};
 
-TEST(FilmEffect, AnswersToItsThreeIdentifiersFromBothFaces) {
-    for (std::uint32_t i = 0; i < 5; ++i) {
-        Effect effect(i);
-        IUnknown* const faces[] = {static_cast<IUnknown*>(effect.operator->()), effect.Face()};
-        for (IUnknown* face : faces) {
-            struct {
-                const Guid* iid;
-                Status status;
-                void* pointer;
-            } const rows[] = {
-                {&kIidUnknown, kStatusOk, effect.operator->()},
-                {&kIidVideoEffect, kStatusOk, effect.operator->()},
-                {&kIidVideoHost, kStatusOk, effect.Face()},
-                {&kIidEffectLibrary, kStatusNoInterface, nullptr},
-                {&kIidPresetSaver, kStatusNoInterface, nullptr},
-            };
-            for (const auto& row : rows) {
-                void* out = &effect;
-                EXPECT_EQ(face->QueryInterface(row.iid, &out), row.status);
-                EXPECT_EQ(out, row.pointer);
-                if (row.status == kStatusOk) {
-                    EXPECT_EQ(face->Release(), 1u);
-                }
-            }
-            EXPECT_EQ(face->QueryInterface(&kIidUnknown, nullptr), kStatusFailure);
-        }
+// The effect's own answers are reelcheck's; the host face of the same object gives the same.
+TEST(FilmEffect, AnswersToItsThreeIdentifiersFromItsHostFaceToo) {
+    Effect effect(2);
+    struct {
+        const Guid* iid;
+        void* pointer;
+    } const rows[] = {{&kIidUnknown, effect.operator->()},
+                      {&kIidVideoEffect, effect.operator->()},
+                      {&kIidVideoHost, effect.Face()},
+                      {&kIidPresetSaver, nullptr}};
+    for (const auto& row : rows) {
+        void* out = &effect;
+        EXPECT_EQ(effect.Face()->QueryInterface(row.iid, &out),
+                  row.pointer != nullptr ? kStatusOk : kStatusNoInterface);
+        EXPECT_EQ(out, row.pointer);
+        if (row.pointer != nullptr) effect->Release();
     }
+    EXPECT_EQ(effect.Face()->QueryInterface(&kIidUnknown, nullptr), kStatusFailure);
 }
 
 TEST(FilmEffect, PassesUnknownIdentifiersToTheAttachedHost) {
