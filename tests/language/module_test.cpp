@@ -141,25 +141,6 @@ TEST_F(LanguageModule, HasEveryTextInEveryLanguage) {
     EXPECT_EQ(Text("sv", 8, "Cancel"), u"");
 }
 
-// The letter behind the one '&'; 0 when there is none or more than one.
-char16_t AltKey(const std::u16string& text) {
-    const std::size_t at = text.find(u'&');
-    if (at == text.npos || at + 1 == text.size() || text.find(u'&', at + 1) != text.npos) return 0;
-    const char16_t key = text[at + 1];
-    return key >= u'a' && key <= u'z' ? static_cast<char16_t>(key - u'a' + u'A') : key;
-}
-
-TEST_F(LanguageModule, GivesEachDialogDifferentAltKeys) {
-    ASSERT_TRUE(m_parser->Load(kLanguageFile));
-    for (const char* language : kLanguages) {
-        const char16_t checkBox = AltKey(Text(language, 5, "Up/Down Knobs Control"));
-        const char16_t help = AltKey(Text(language, 8, "Help"));
-        EXPECT_NE(checkBox, 0) << language;
-        EXPECT_NE(help, 0) << language;
-        EXPECT_NE(checkBox, help) << language;
-    }
-}
-
 template <typename T>
 std::intptr_t Word(T* pointer) {
     return reinterpret_cast<std::intptr_t>(pointer);

@@ -213,15 +213,25 @@ class Input(Commands):
 
 class Signals(Commands):
     def test_waiting_for_input_ends(self):
-        program = subprocess.Popen([REELFX, "render", "-", str(self.out / "new.mp4"), *DAMAGE], stdin=subprocess.PIPE,
-                                   stderr=subprocess.PIPE)
-        time.sleep(2)
-        program.send_signal(signal.SIGTERM)
-        self.assertEqual(program.wait(30), 130)
-        self.assertEqual(program.stderr.read().count(b"\n"), 1)
-        program.stdin.close()
-        program.stderr.close()
-        self.assertEqual(self.left_over(), [])
+        """What is finished stays and can be played, but does not replace an older file."""
+        for name, data, left in (("none.mp4", b"", []), ("new.mp4", y4m, ["new.mp4"]), ("older.mp4", y4m, ["new.mp4"])):
+            with self.subTest(name=name, frames=bool(data)):
+                program = subprocess.Popen([REELFX, "render", "-", str(self.out / name), *DAMAGE, "--overwrite"],
+                                           stdin=subprocess.PIPE, stderr=subprocess.PIPE)
+                program.stdin.write(data)
+                program.stdin.flush()
+                time.sleep(2)
+                program.send_signal(signal.SIGTERM if data else signal.SIGINT)
+                self.assertEqual(program.wait(30), 130)
+                text = program.stderr.read()
+                program.stdin.close()
+                program.stderr.close()
+                self.assertEqual((text.count(b"\n"), self.left_over()), (1, left), text)
+                self.check_older()
+                if name == "new.mp4":
+                    frames = len(frame_digests(self.out / name))
+                    self.assertGreater(frames, 0)
+                    self.assertIn(f"first {frames} frames".encode(), text)
 
     def references(self):
         """For each command: how long it takes, and what its files are when whole."""
