@@ -7,15 +7,16 @@
 namespace velmora {
 namespace {
 
-struct NamedForm {
+struct NamedLevel {
     std::string_view name;
-    render::Form form;
+    render::SimdLevel level;
 };
-constexpr NamedForm kForms[] = {
-    {"plain", render::Form::kPlain},
-    {"sse2", render::Form::kSse2},
-    {"avx2", render::Form::kAvx2},
-    {"avx512", render::Form::kAvx512},
+constexpr NamedLevel kLevels[] = {
+    {"plain", render::SimdLevel::kPlain},
+    {"sse2", render::SimdLevel::kSse2},
+    {"ssse3", render::SimdLevel::kSsse3},
+    {"avx2", render::SimdLevel::kAvx2},
+    {"avx512", render::SimdLevel::kAvx512},
 };
 
 std::string_view Variable(const char* name) noexcept {
@@ -28,8 +29,8 @@ std::string_view Variable(const char* name) noexcept {
 render::RenderOptions ReadRenderOptions() noexcept {
     render::RenderOptions options;
     const std::string_view wanted = Variable("VELMORA_FORM");
-    for (const NamedForm& named : kForms) {
-        if (named.name == wanted) options.form = std::min(options.form, named.form);
+    for (const NamedLevel& named : kLevels) {
+        if (named.name == wanted) options.level = std::min(options.level, named.level);
     }
 #if defined(VELMORA_PLAIN_ROAD)
     options.road = render::Road::kByStages;

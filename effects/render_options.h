@@ -1,7 +1,7 @@
 // How the pixels of a process are worked on: the best way, unless whoever runs it wants another one for tests or
 // to look for a fault. The bytes are the same.
 //
-//   VELMORA_FORM=plain, sse2, avx2 or avx512   no faster form of the pixel kernels than this
+//   VELMORA_FORM=plain, sse2, ssse3, avx2 or avx512   no faster SIMD level of the pixel kernels than this
 //   VELMORA_ROAD=stages                        stage by stage over whole frames, the reference
 //
 // A build with VELMORA_PLAIN_ROAD takes the reference always.
@@ -11,7 +11,7 @@
 
 namespace velmora {
 
-// Reads the process's environment anew. Other values than those above count as none; a form that the processor
+// Reads the process's environment anew. Other values than those above count as none; a level that the processor
 // lacks gives the best one that it has.
 [[nodiscard]] render::RenderOptions ReadRenderOptions() noexcept;
 

@@ -4,6 +4,7 @@
 #include "api/com_object.h"
 #include "api/host_api.h"
 #include "effects/render_options.h"
+#include "render/kernels.h"
 #include "render/ycbcr.h"
 
 namespace velmora {
@@ -25,7 +26,7 @@ class FrameProcessor final : public IFrameProcessor {
                                     std::uint8_t unused) override;
 
   private:
-    const render::YcbcrKernels& m_kernels = render::YcbcrKernelsOf(ReadRenderOptions().form);
+    const render::YcbcrKernels& m_kernels = *render::KernelsOf(ReadRenderOptions().level).ycbcr;
     render::PackedImage m_scratch;  // RGB
     ReferenceCount m_references;
 };

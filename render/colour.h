@@ -16,7 +16,6 @@
 #include <span>
 
 #include "render/byte_table.h"
-#include "render/cpu.h"
 #include "render/image.h"
 #include "render/render_state.h"
 #include "render/stage_settings.h"

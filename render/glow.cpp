@@ -29,7 +29,7 @@ constexpr std::int32_t Reduced(std::int32_t size, int reduction) noexcept {
 
 // Continues a row by copies of its end cells.
 void ContinueEnds(CellRow row, std::int32_t width) noexcept {
-    for (std::int32_t i = 1; i <= kCellPad; ++i) {
+    for (std::int32_t i = 1; i <= kContinued; ++i) {
         std::copy_n(row, kCellLanes, row - i * kCellLanes);
         CellRow last = row + (width - 1) * std::ptrdiff_t{kCellLanes};
         std::copy_n(last, kCellLanes, last + i * kCellLanes);
@@ -284,9 +284,9 @@ void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
 }
 
 GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width, std::int32_t height,
-                      GlowMemory& memory, Form form) noexcept {
+                      GlowMemory& memory, const GlowKernels& kernels) noexcept {
     if (!(amount > 0.0f) || width < 1 || height < 1) return {};
-    GlowLayerMaker maker(std::min<double>(amount, 1.0), input, width, height, GlowKernelsOf(form));
+    GlowLayerMaker maker(std::min<double>(amount, 1.0), input, width, height, kernels);
     if (!maker.Allocate(memory)) return {};
     return maker.Make();
 }

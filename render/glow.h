@@ -12,7 +12,6 @@
 #include <cstdint>
 #include <memory>
 
-#include "render/cpu.h"
 #include "render/glow_kernels.h"
 #include "render/image.h"
 #include "render/row_reader.h"
@@ -75,6 +74,7 @@ class GlowStage {
 // anything to do or without memory the stage is not active. It points into `memory` and serves until the
 // memory's next use.
 [[nodiscard]] GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width,
-                                    std::int32_t height, GlowMemory& memory, Form form) noexcept;
+                                    std::int32_t height, GlowMemory& memory,
+                                    const GlowKernels& kernels) noexcept;
 
 }  // namespace velmora::render

@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "render/kernels.h"
+
 namespace velmora::render {
 namespace {
 
@@ -145,21 +147,8 @@ void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t 
 
 }  // namespace
 
-const GlowKernels kPlainGlowKernels = {AverageBlocks, KeepHighlights, Filter,      HalveRows,
-                                       HalveAlong,    Between,        DoubleAlong, Mix,
-                                       Lift,          Approach,       Screen,      ScreenFourfold};
-
-const GlowKernels& GlowKernelsOf(Form form) noexcept {
-    switch (form) {
-        case Form::kAvx512:
-        case Form::kAvx2:
-            return kAvx2GlowKernels;
-        case Form::kSse2:
-            return kSse2GlowKernels;
-        case Form::kPlain:
-            break;
-    }
-    return kPlainGlowKernels;
-}
+const GlowKernels kPlainGlow = {AverageBlocks, KeepHighlights, Filter,      HalveRows,
+                                HalveAlong,    Between,        DoubleAlong, Mix,
+                                Lift,          Approach,       Screen,      ScreenFourfold};
 
 }  // namespace velmora::render

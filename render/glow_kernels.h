@@ -1,15 +1,15 @@
-// The inner loops of the glow stage, in the forms that processors offer.
+// The inner loops of the glow stage.
 //
 // They work on rows of cells. A cell is four 16-bit numbers: blue, green and red of one or more pixels, 0 for
-// black to kCellWhite, and a fourth that carries nothing. Rows have kCellPad cells of padding at either end,
-// and a loop may leave anything in the padding behind the last cell.
+// black to kCellWhite, and a fourth that carries nothing. Rows have kCellPad cells of padding at either end. A
+// loop may read all of it, uses none but the kContinued cells next to the row, where it says so, and may leave
+// anything in the padding behind the last cell that it writes.
 #pragma once
 
 #include <array>
 #include <cstddef>
 #include <cstdint>
 
-#include "render/cpu.h"
 #include "render/image.h"
 
 namespace velmora::render {
@@ -17,7 +17,8 @@ namespace velmora::render {
 using CellRow = std::uint16_t*;
 using ConstCellRow = const std::uint16_t*;
 inline constexpr std::int32_t kCellLanes = 4;
-inline constexpr std::int32_t kCellPad = 4;
+inline constexpr std::int32_t kCellPad = 8;
+inline constexpr std::int32_t kContinued = 4;
 inline constexpr std::int32_t kCellWhite = 255 * 128;  // 15 bits: sums of two still fit
 
 // A symmetric filter: the middle weight and those of the pairs around it, together 65536 at most.
@@ -76,12 +77,5 @@ struct GlowKernels {
     void (*screenFourfold)(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width,
                            std::uint16_t dither) noexcept;
 };
-
-[[nodiscard]] const GlowKernels& GlowKernelsOf(Form form) noexcept;
-
-// The forms; a processor without AVX2 must not call the last one's functions.
-extern const GlowKernels kPlainGlowKernels;
-extern const GlowKernels kSse2GlowKernels;
-extern const GlowKernels kAvx2GlowKernels;
 
 }  // namespace velmora::render

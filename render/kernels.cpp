@@ -3,6 +3,9 @@
 #include <algorithm>
 #include <cstring>
 
+#include "render/simd/levels.h"
+#include "render/simd/target.h"
+
 namespace velmora::render {
 namespace {
 
@@ -45,7 +48,8 @@ void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) no
 
 }  // namespace
 
-const RowKernels kPlainKernels = {ToneRow, WearRow, CopyRow, CopyRow, NothingToEnd};
+const Kernels kPlainKernels = {ToneRow, WearRow,      DrawScratchesPlain, CopyRow,
+                               CopyRow, NothingToEnd, &kPlainGlow,        &kPlainYcbcr};
 
 namespace {
 
@@ -73,19 +77,20 @@ void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable&
     }
 }
 
-const RowKernels& KernelsOf(Form form) noexcept {
-    switch (form) {
-#if defined(__i386__) || defined(__x86_64__)
-        case Form::kAvx512:
-            return kAvx512Kernels;
-        case Form::kAvx2:
-            return kAvx2Kernels;
-        case Form::kSse2:
-            return kSse2Kernels;
+const Kernels& KernelsOf([[maybe_unused]] SimdLevel level) noexcept {
+#if VM_HAS_AVX512
+    if (level >= SimdLevel::kAvx512) return kAvx512Kernels;
 #endif
-        default:
-            return kPlainKernels;
-    }
+#if VM_HAS_AVX2
+    if (level >= SimdLevel::kAvx2) return kAvx2Kernels;
+#endif
+#if VM_HAS_SSSE3
+    if (level >= SimdLevel::kSsse3) return kSsse3Kernels;
+#endif
+#if VM_HAS_SSE2
+    if (level >= SimdLevel::kSse2) return kSse2Kernels;
+#endif
+    return kPlainKernels;
 }
 
 }  // namespace velmora::render

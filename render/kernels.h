@@ -1,17 +1,16 @@
-// The row kernels that exist in several forms. All forms of a kernel give the same bytes; the stages' own
-// Row functions are the plain ones that they are tested against.
+// The pixel kernels: what works on whole rows and exists at several SIMD levels. All levels of a kernel give the same
+// bytes, those of the plain one.
 //
-// For all: `in` and `out` are rows of `width` >= 0 pixels without any alignment; `in` may be `out` but must
-// not overlap it otherwise. Alpha is copied.
+// For tone, wear, copies and scratches: `in` and `out` are rows of `width` >= 0 pixels without any alignment; `in` may
+// be `out` but must not overlap it otherwise. Alpha is copied.
 #pragma once
 
 #include <array>
 #include <cstdint>
-#include <limits>
 #include <span>
 
 #include "render/colour.h"
-#include "render/cpu.h"
+#include "render/simd/level.h"
 #include "render/image.h"
 #include "render/tone_line.h"
 #include "render/wear_factors.h"
@@ -23,12 +22,12 @@ struct ChannelTables {
     alignas(64) ByteTable blue;
     alignas(64) ByteTable green;
     alignas(64) ByteTable red;
-    // What the 32-byte form looks up: in each half of a table, all but the first 16 entries as their difference (the
+    // What byte shuffles look up: in each half of a table, all but the first 16 entries as their difference (the
     // bits that are not equal) from the one 16 before.
     alignas(16) ByteTable blueDifferences;
     alignas(16) ByteTable greenDifferences;
     alignas(16) ByteTable redDifferences;
-    // What the 16-byte form looks up: each entry at its channel's place in a pixel word.
+    // What is looked up without byte shuffles: each entry at its channel's place in a pixel word.
     std::array<std::uint32_t, 256> blueWord;
     std::array<std::uint32_t, 256> greenWord;
     std::array<std::uint32_t, 256> redWord;
@@ -51,23 +50,41 @@ struct Tone {
     [[nodiscard]] bool IsActive() const noexcept { return before != nullptr || mixes || after != nullptr; }
 };
 
-struct RowKernels {
-    // All steps of a tone.
+struct GlowKernels;
+struct YcbcrKernels;
+struct ScratchLine;
+struct ScratchRowPlace;
+
+struct Kernels {
+    // All steps of a tone, whose weight must lie in -127..127.
     void (*tone)(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
     // Lightens the channels of each pixel by its factor (render/wear_factors.h). `channels` is a pixel word with
     // 0xFF at each channel that is to change, 0 at alpha.
     void (*wear)(const Bgra* in, Bgra* out, std::int32_t width, WearStrips strips,
                  std::uint32_t channels) noexcept;
+    // Draws a row's part of some scratches.
+    void (*scratches)(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
+                      const ScratchRowPlace& place) noexcept;
     // Copies a row.
     void (*copy)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
-    // Copies a row to where it is not read again soon: past the caches, in a form that can. `in` must not be
+    // Copies a row to where it is not read again soon: past the caches, at a level that can. `in` must not be
     // `out`. After the last row of a frame `endStream` makes the rows seen by other threads.
     void (*stream)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
     void (*endStream)() noexcept;
+    const GlowKernels* glow;    // render/glow_kernels.h
+    const YcbcrKernels* ycbcr;  // render/ycbcr.h
 };
 
-// `form` must be one that the processor can run.
-[[nodiscard]] const RowKernels& KernelsOf(Form form) noexcept;
+// The kernels of a level. One that this build does not have gives those of the next lower one that it has; the
+// processor must be able to run them.
+[[nodiscard]] const Kernels& KernelsOf(SimdLevel level) noexcept;
+
+// The plain kernels. This one's tone takes any weight.
+extern const Kernels kPlainKernels;
+extern const GlowKernels kPlainGlow;
+extern const YcbcrKernels kPlainYcbcr;
+void DrawScratchesPlain(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
+                        const ScratchRowPlace& place) noexcept;
 
 // A tone's steps one after the other over a row, which the nearest cache holds.
 template <typename Tables, typename Mix>
@@ -83,31 +100,5 @@ void ToneInPasses(Tables&& tables, Mix&& mix, const Bgra* in, Bgra* out, std::in
     }
     if (tone.after != nullptr) tables(in, out, width, *tone.after);
 }
-
-// The forms, each in its own file.
-// Asks for pixels that a row's kernel comes to soon, where they lie in memory. The processor does so by itself as
-// long as a row is all that it reads; wear's factors, read here and there, keep it from that. Past a frame's end
-// nothing happens.
-inline void FetchAhead(const Bgra* pixels) noexcept {
-    constexpr std::uintptr_t kBytes = 5120;
-    constexpr int kToRead = 0, kIntoSecondCache = 2;
-    __builtin_prefetch(reinterpret_cast<const void*>(reinterpret_cast<std::uintptr_t>(pixels) + kBytes),
-                       kToRead, kIntoSecondCache);
-}
-
-// How many pixels before the first one at a multiple of `bytes`; as good as never when none lies at one.
-[[nodiscard]] inline std::int32_t PixelsToBoundary(const Bgra* pixels, std::uintptr_t bytes) noexcept {
-    const std::uintptr_t away = (bytes - reinterpret_cast<std::uintptr_t>(pixels) % bytes) % bytes;
-    constexpr std::int32_t kNever = std::numeric_limits<std::int32_t>::max();
-    return away % sizeof(Bgra) == 0 ? static_cast<std::int32_t>(away / sizeof(Bgra)) : kNever;
-}
-
-extern const RowKernels kPlainKernels;
-extern const RowKernels kSse2Kernels;
-extern const RowKernels kAvx2Kernels;
-extern const RowKernels kAvx512Kernels;
-// The tones of the last two, in files of their own.
-void ToneRowAvx2(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
-void ToneRowAvx512(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
 
 }  // namespace velmora::render

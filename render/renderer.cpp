@@ -41,7 +41,7 @@ bool IsStreamed(const FrameContext& context, const RenderOptions& options) noexc
 
 void RenderByRows(FrameContext& context, const FramePlan& plan, const RenderOptions& options,
                   RowMemory& memory) noexcept {
-    const RowProgram program(plan, options.form);
+    const RowProgram program(plan, KernelsOf(options.level));
     Bgra* const room = IsStreamed(context, options) ? memory.Reserve(context.Width()) : nullptr;
     if (room == nullptr && !plan.jitter.IsActive() && program.IsEmpty()) return;
     const ImageView& source = context.Source();
@@ -69,7 +69,7 @@ bool NeedsOwnSource(const FrameContext& context, const FramePlan& plan) noexcept
 }  // namespace
 
 FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings, RenderState& state,
-                    Form form) noexcept {
+                    const Kernels& kernels) noexcept {
     Random& random = state.random.Numbers();
     FramePlan plan;
     plan.jitter = PrepareJitter(settings, random);
@@ -78,21 +78,21 @@ FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings, 
     plan.wear = PrepareWear(settings, context.Width(), random);
     if (plan.wear.IsActive()) state.wear.Set(plan.wear.Picture(), plan.wear.Amount());
     plan.wearFactors = &state.wear;
-    plan.scratches = PrepareScratches(settings, plan.jitter.Dx(), context, state.scratches, form);
+    plan.scratches = PrepareScratches(settings, plan.jitter.Dx(), context, state.scratches, kernels);
     plan.spots = PrepareSpots(settings, context.Destination().Region(), random);
     return plan;
 }
 
 void RenderStages(FrameContext& context, const StageSettings& settings, RenderState& state,
                   const RenderOptions& options) noexcept {
-    const Form form = options.road == Road::kByStages ? Form::kPlain : options.form;
-    FramePlan plan = PlanFrame(context, settings, state, form);
+    const Kernels& kernels = options.road == Road::kByStages ? kPlainKernels : KernelsOf(options.level);
+    FramePlan plan = PlanFrame(context, settings, state, kernels);
     if (options.isDamageOnly) plan.jitter = {}, plan.colour = {}, plan.tint = {};
     // Without memory for the copy the picture stays where it is; the other stages can still work.
     if (NeedsOwnSource(context, plan) && !context.DetachSource()) plan.jitter = {};
     const ShakenRows shaken(context.Source(), plan.jitter);
     const float glow = options.isDamageOnly ? 0.0f : settings.glow;
-    plan.glow = PrepareGlow(glow, shaken, context.Width(), context.Height(), state.glow, form);
+    plan.glow = PrepareGlow(glow, shaken, context.Width(), context.Height(), state.glow, *kernels.glow);
     if (options.road == Road::kByStages) {
         RenderByStages(context, plan);
     } else {

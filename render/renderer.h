@@ -9,10 +9,10 @@
 #include <cstdint>
 
 #include "render/colour.h"
-#include "render/cpu.h"
 #include "render/frame_context.h"
 #include "render/glow.h"
 #include "render/jitter.h"
+#include "render/kernels.h"
 #include "render/render_state.h"
 #include "render/scratches.h"
 #include "render/spots.h"
@@ -26,7 +26,7 @@ enum class Road { kByRows, kByStages };
 
 struct RenderOptions {
     Road road = Road::kByRows;
-    Form form = BestForm();  // of the pixel kernels, by rows
+    SimdLevel level = BestSimdLevel();  // of the pixel kernels, by rows
     // From this size on a result, which nobody can find in a cache again, is written past the caches.
     std::int64_t streamedBytes = std::int64_t{6} << 20;
     // Wear, scratches and spots alone, as they lie on the frame when all stages run.
@@ -45,9 +45,9 @@ struct FramePlan {
     SpotStage spots;
 };
 
-// All but glow, which starts from the picture itself. `form` is that of the scratches.
+// All but glow, which starts from the picture itself. `kernels` draw the scratches.
 [[nodiscard]] FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings,
-                                  RenderState& state, Form form = BestForm()) noexcept;
+                                  RenderState& state, const Kernels& kernels) noexcept;
 
 // Runs the stages on a frame whose two views are valid and whose random state has been begun. The result is
 // in the destination when a stage had something to do, else FrameContext::Finish copies the source through.

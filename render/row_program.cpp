@@ -26,7 +26,7 @@ bool FitsKernel(std::int32_t weight) noexcept {
 
 // For rows that are the source's but for a border, which is filled in where it goes to.
 struct StreamOrCopy {
-    const RowKernels& kernels;
+    const Kernels& kernels;
     void operator()(const Bgra* in, Bgra* out, std::int32_t count) const noexcept {
         if (in != out) kernels.stream(in, out, count);
     }
@@ -34,7 +34,8 @@ struct StreamOrCopy {
 
 }  // namespace
 
-RowProgram::RowProgram(const FramePlan& plan, Form form) noexcept : m_plan(plan), m_kernels(KernelsOf(form)) {
+RowProgram::RowProgram(const FramePlan& plan, const Kernels& kernels) noexcept
+    : m_plan(plan), m_kernels(kernels) {
     PlanTables();
 }
 

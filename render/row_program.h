@@ -12,7 +12,7 @@ namespace velmora::render {
 class RowProgram {
   public:
     // Keeps references into `plan`.
-    RowProgram(const FramePlan& plan, Form form) noexcept;
+    RowProgram(const FramePlan& plan, const Kernels& kernels) noexcept;
     RowProgram(const RowProgram&) = delete;
     RowProgram& operator=(const RowProgram&) = delete;
 
@@ -34,7 +34,7 @@ class RowProgram {
     void Wear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
     const FramePlan& m_plan;
-    const RowKernels& m_kernels;
+    const Kernels& m_kernels;
     Tone m_tone;
     ChannelTables m_before;  // the mix
     ChannelTables m_after;   // the mix, or in its place

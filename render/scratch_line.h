@@ -7,6 +7,7 @@
 #pragma once
 
 #include <array>
+#include <cstddef>
 #include <cstdint>
 
 #include "render/scratch_shape.h"
@@ -44,6 +45,13 @@ struct ScratchLine {
     const ScratchTexture* rows = nullptr;
     std::int32_t shake = 0;  // of the edge from row to row, 1/256 pixels for a texture of 32768
     std::array<Knot, kSegments + 1> knots;
+};
+
+// A row of the picture between two knots: `part` of 4096 of the way from one to the next.
+struct ScratchRowPlace {
+    std::int32_t y;
+    std::size_t knot;
+    std::int32_t part;
 };
 
 // How far a scratch strays from its column, in 1/256 pixels: some thousandths of the picture's size.

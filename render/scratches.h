@@ -8,7 +8,6 @@
 #include <array>
 #include <cstdint>
 
-#include "render/cpu.h"
 #include "render/frame_context.h"
 #include "render/image.h"
 #include "render/scratch_line.h"
@@ -16,6 +15,8 @@
 #include "render/stage_settings.h"
 
 namespace velmora::render {
+
+struct Kernels;
 
 // What the stage keeps from frame to frame, and the room that it works in.
 struct ScratchMemory {
@@ -26,7 +27,8 @@ struct ScratchMemory {
 class ScratchStage {
   public:
     ScratchStage() noexcept = default;
-    ScratchStage(const ScratchLine* lines, std::uint32_t count, std::int32_t height, Form form) noexcept;
+    ScratchStage(const ScratchLine* lines, std::uint32_t count, std::int32_t height,
+                 const Kernels& kernels) noexcept;
 
     [[nodiscard]] bool IsActive() const noexcept { return m_count != 0; }
     // Draws the scratches' part of row `y` of the processed rectangle; `in` may be `out`.
@@ -36,13 +38,13 @@ class ScratchStage {
     const ScratchLine* m_lines = nullptr;
     std::uint32_t m_count = 0;
     std::uint64_t m_knotStep = 0;  // knots per row, 1/65536
-    Form m_form = Form::kPlain;
+    const Kernels* m_kernels = nullptr;
 };
 
 // The scratches of a frame whose picture was moved sideways by `xOffset`. The stage points into `memory` and
 // serves until the memory's next use.
 [[nodiscard]] ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffset,
                                             const FrameContext& context, ScratchMemory& memory,
-                                            Form form) noexcept;
+                                            const Kernels& kernels) noexcept;
 
 }  // namespace velmora::render

@@ -4,6 +4,8 @@
 #include <limits>
 #include <new>
 
+#include "render/kernels.h"
+
 namespace velmora::render {
 namespace {
 
@@ -111,21 +113,7 @@ void RgbRowToYcbcr(const std::uint8_t* rgb, std::uint8_t* destination, std::int3
     }
 }
 
-const YcbcrKernels kPlainYcbcrKernels = {ToBgra, FromBgra};
-
-const YcbcrKernels& YcbcrKernelsOf(Form form) noexcept {
-    switch (form) {
-        case Form::kAvx512:
-            return kAvx512YcbcrKernels;
-        case Form::kAvx2:
-            return kAvx2YcbcrKernels;
-        case Form::kSse2:
-            return kSse2YcbcrKernels;
-        case Form::kPlain:
-            break;
-    }
-    return kPlainYcbcrKernels;
-}
+const YcbcrKernels kPlainYcbcr = {ToBgra, FromBgra};
 
 void YcbcrRowToBgra(const YcbcrKernels& kernels, const std::uint8_t* source, std::int32_t sourceWidth,
                     Bgra* out, std::int32_t width, std::uint8_t alpha) noexcept {

@@ -9,7 +9,6 @@
 #include <cstdint>
 #include <memory>
 
-#include "render/cpu.h"
 #include "render/image.h"
 
 namespace velmora::render {
@@ -51,12 +50,6 @@ struct YcbcrKernels {
     void (*toBgra)(const std::uint8_t* source, Bgra* out, std::int32_t width, std::uint8_t alpha) noexcept;
     void (*fromBgra)(const Bgra* in, std::uint8_t* destination, std::int32_t width) noexcept;
 };
-[[nodiscard]] const YcbcrKernels& YcbcrKernelsOf(Form form) noexcept;
-
-extern const YcbcrKernels kPlainYcbcrKernels;
-extern const YcbcrKernels kSse2YcbcrKernels;
-extern const YcbcrKernels kAvx2YcbcrKernels;
-extern const YcbcrKernels kAvx512YcbcrKernels;
 
 // One row from 4:2:2 of `sourceWidth` pixels to its first `width` pixels, with the lone last pixel's rule.
 void YcbcrRowToBgra(const YcbcrKernels& kernels, const std::uint8_t* source, std::int32_t sourceWidth,

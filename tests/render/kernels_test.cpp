@@ -1,4 +1,5 @@
-// Every form of a row kernel gives the plain form's bytes.
+// Every kernel of every SIMD level gives the plain kernel's bytes: at all widths up to some vectors and at all
+// addresses, from random and from extreme numbers, with guard bytes around what may be written.
 
 #include "render/kernels.h"
 
@@ -11,8 +12,11 @@
 #include <random>
 #include <vector>
 
+#include "render/glow_kernels.h"
+#include "render/scratch_line.h"
 #include "render/shade.h"
 #include "render/wear_factors.h"
+#include "render/ycbcr.h"
 
 namespace velmora::render {
 namespace {
@@ -20,12 +24,62 @@ namespace {
 constexpr std::int32_t kWidest = 140;
 constexpr std::size_t kGuard = 80;  // bytes before and behind a row
 
-std::vector<Form> FasterForms() {
-    std::vector<Form> forms;
-    for (const Form form : {Form::kSse2, Form::kAvx2, Form::kAvx512}) {
-        if (form <= BestForm()) forms.push_back(form);
+using Bytes = std::vector<std::uint8_t>;
+
+std::vector<SimdLevel> FasterLevels() {
+    std::vector<SimdLevel> levels;
+    for (const SimdLevel level : kSimdLevels) {
+        if (level != SimdLevel::kPlain && level <= BestSimdLevel()) levels.push_back(level);
     }
-    return forms;
+    return levels;
+}
+
+// Random bytes, black, white, and black and white by turns.
+std::vector<Bytes> Inputs(std::size_t size) {
+    std::mt19937 numbers(1);
+    std::vector<Bytes> inputs(4, Bytes(size));
+    for (std::uint8_t& byte : inputs[0]) byte = static_cast<std::uint8_t>(numbers());
+    std::fill(inputs[2].begin(), inputs[2].end(), std::uint8_t{255});
+    for (std::size_t i = 0; i < size; ++i) inputs[3][i] = numbers() % 2 == 0 ? 0 : 255;
+    return inputs;
+}
+
+template <typename In, typename Out>
+using Run = std::function<void(const Kernels&, const In*, Out*, std::int32_t width)>;
+
+// From a row at an address into another one, which starts out as guard bytes. The input ends where its last pixel
+// does, so that the address sanitizer sees what reads beyond it.
+template <typename In, typename Out>
+void ExpectEqualRows(const Run<In, Out>& run, std::size_t inBytes, std::size_t outBytes) {
+    for (std::int32_t width = 0; width <= kWidest; ++width) {
+        const std::size_t count = static_cast<std::size_t>(width);
+        for (const std::size_t offset : {0u, 1u, 4u, 7u, 16u, 20u, 32u, 60u}) {
+            for (const Bytes& source : Inputs(offset + count * inBytes)) {
+                const auto result = [&](const Kernels& kernels) {
+                    Bytes row(2 * kGuard + 64 + count * outBytes, 0xA5);
+                    run(kernels, reinterpret_cast<const In*>(source.data() + offset),
+                        reinterpret_cast<Out*>(row.data() + kGuard + offset), width);
+                    return row;
+                };
+                const Bytes expected = result(kPlainKernels);
+                for (const SimdLevel level : FasterLevels()) {
+                    ASSERT_EQ(result(KernelsOf(level)), expected)
+                        << static_cast<int>(level) << ' ' << width << ' ' << offset;
+                }
+            }
+        }
+    }
+}
+
+void ExpectEqualPixels(const Run<Bgra, Bgra>& run) {
+    ExpectEqualRows<Bgra, Bgra>(run, sizeof(Bgra), sizeof(Bgra));
+    // In place as well.
+    ExpectEqualRows<Bgra, Bgra>(
+        [&run](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
+            std::copy(in, in + width, out);
+            run(kernels, out, out, width);
+        },
+        sizeof(Bgra), sizeof(Bgra));
 }
 
 ChannelTables AnyTables(std::mt19937& numbers) {
@@ -38,96 +92,225 @@ ChannelTables AnyTables(std::mt19937& numbers) {
     return result;
 }
 
-using Run = std::function<void(const RowKernels&, const Bgra* in, Bgra* out, std::int32_t width)>;
+TEST(Kernels, ToneIsThePlainOneOnEveryLevel) {
+    std::mt19937 numbers(4);
+    const ChannelTables before = AnyTables(numbers), after = AnyTables(numbers);
+    const ToneLine up = {200 << 8, 3000, 0, 8}, cut = {60000, 0, 9000, 6};
+    std::vector<Tone> tones = {{&before, true, 40, &after},   {nullptr, true, -127, &after},
+                               {&before, true, 127, nullptr}, {&before, false, 0, nullptr},
+                               {nullptr, false, 0, &after},   {nullptr, true, -1, nullptr},
+                               {nullptr, true, 0, nullptr}};
+    // Lines and the table that they make.
+    const std::vector<ToneLine> lines[] = {{up}, {cut}, {up, cut}};
+    ChannelTables tables[std::size(lines)];
+    for (std::size_t i = 0; i < std::size(lines); ++i) {
+        ByteTable table;
+        for (std::size_t entry = 0; entry < table.size(); ++entry) {
+            table[entry] = static_cast<std::uint8_t>(entry);
+            for (const ToneLine& line : lines[i]) table[entry] = EntryOf(line, table[entry]);
+        }
+        tables[i].Set(table, table, table);
+        tones.push_back({&tables[i], i != 0, 40, i != 0 ? &after : nullptr, lines[i]});
+        tones.push_back({&tables[i], false, 0, nullptr, lines[i]});
+    }
+    for (const Tone& tone : tones) {
+        ExpectEqualPixels([&](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
+            kernels.tone(in, out, width, tone);
+        });
+    }
+}
 
-// Rows of all widths at all addresses, apart and, where it may be, in place; bytes around the row must stay.
-void ExpectEqualForms(const Run& run, bool mayBeInPlace) {
-    std::mt19937 numbers(1);
-    std::vector<std::uint8_t> before(2 * kGuard + kWidest * sizeof(Bgra) + 64), source(before);
-    for (std::uint8_t& byte : source) byte = static_cast<std::uint8_t>(numbers());
-    for (std::uint8_t& byte : before) byte = static_cast<std::uint8_t>(numbers());
-    for (const Form form : FasterForms()) {
-        for (std::int32_t width = 0; width <= kWidest; ++width) {
-            for (const std::size_t offset : {0u, 1u, 4u, 7u, 16u, 20u, 32u, 60u}) {
-                const auto at = [offset](std::vector<std::uint8_t>& bytes) {
-                    return reinterpret_cast<Bgra*>(bytes.data() + kGuard + offset);
-                };
-                std::vector<std::uint8_t> expected = before, apart = before, inPlace = source, alone = source;
-                run(kPlainKernels, at(source), at(expected), width);
-                run(KernelsOf(form), at(source), at(apart), width);
-                ASSERT_EQ(apart, expected) << static_cast<int>(form) << ' ' << width << ' ' << offset;
-                if (!mayBeInPlace) continue;
-                run(kPlainKernels, at(alone), at(alone), width);
-                run(KernelsOf(form), at(inPlace), at(inPlace), width);
-                ASSERT_EQ(inPlace, alone) << static_cast<int>(form) << ' ' << width << ' ' << offset;
+TEST(Kernels, WearIsThePlainOneOnEveryLevel) {
+    constexpr std::int32_t kHeight = 9;
+    std::mt19937 numbers(3);
+    for (const std::int32_t stripWidth : {16, 25, 50, 64}) {
+        std::vector<WearFactor> factors(static_cast<std::size_t>(kHeight * stripWidth) +
+                                        2 * WearStrips::kRoom);
+        for (WearFactor& f : factors) {
+            f = {static_cast<std::uint16_t>(numbers()), static_cast<std::uint16_t>(numbers() % 256)};
+        }
+        for (const std::uint32_t channels : {kColourChannels, kBlueChannel}) {
+            const WearStrips strips(WearRows(Random(7), kHeight, 5), factors.data() + WearStrips::kRoom,
+                                    stripWidth);
+            ExpectEqualPixels([&](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
+                kernels.wear(in, out, width, strips, channels);
+            });
+        }
+    }
+}
+
+TEST(Kernels, CopiesArePlainOnesOnEveryLevel) {
+    ExpectEqualPixels([](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
+        kernels.copy(in, out, width);
+    });
+    ExpectEqualRows<Bgra, Bgra>(
+        [](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
+            kernels.stream(in, out, width);
+            kernels.endStream();
+        },
+        sizeof(Bgra), sizeof(Bgra));
+}
+
+TEST(Kernels, ConversionsArePlainOnesOnEveryLevel) {
+    ExpectEqualRows<std::uint8_t, Bgra>([](const Kernels& kernels, const std::uint8_t* in, Bgra* out,
+                                           std::int32_t width) { kernels.ycbcr->toBgra(in, out, width, 77); },
+                                        sizeof(Bgra), sizeof(Bgra));
+    ExpectEqualRows<Bgra, std::uint8_t>([](const Kernels& kernels, const Bgra* in, std::uint8_t* out,
+                                           std::int32_t width) { kernels.ycbcr->fromBgra(in, out, width); },
+                                        sizeof(Bgra), sizeof(Bgra));
+}
+
+TEST(Kernels, ScratchesArePlainOnesOnEveryLevel) {
+    ScratchTexture texture;
+    std::mt19937 numbers(9);
+    const auto below = [&numbers](std::int32_t end) {
+        return static_cast<std::int32_t>(numbers() % static_cast<std::uint32_t>(end));
+    };
+    for (std::int16_t& value : texture.values) value = static_cast<std::int16_t>(below(45057) - 22528);
+    for (int round = 0; round < 300; ++round) {
+        std::vector<ScratchLine> lines(4);
+        for (ScratchLine& line : lines) {
+            line.isWhite = below(2) == 0;
+            line.shapes = &ScratchShapesOf(line.isWhite, below(kScratchProfiles), below(kScratchSections));
+            line.pixels = line.shapes->front().pixels;
+            line.pixel = below(kWidest + 20) - 15;
+            line.strength = below(4) == 0 ? 65535 : static_cast<std::uint32_t>(below(65536));
+            line.roughness = below(65536);
+            line.texture = below(ScratchTexture::kRows);
+            line.rows = &texture;
+            line.shake = below(300);
+            for (ScratchLine::Knot& knot : line.knots) knot = {below(1200) - 600, below(100000)};
+        }
+        const ScratchRowPlace place = {below(1080), static_cast<std::size_t>(below(64)), below(4096)};
+        const std::int32_t width = 1 + below(kWidest);
+        for (const Bytes& source : Inputs(static_cast<std::size_t>(width) * sizeof(Bgra))) {
+            const auto drawn = [&](const Kernels& kernels) {
+                Bytes row = source;
+                kernels.scratches(lines.data(), 4, reinterpret_cast<Bgra*>(row.data()), width, place);
+                return row;
+            };
+            for (const SimdLevel level : FasterLevels()) {
+                ASSERT_EQ(drawn(KernelsOf(level)), drawn(kPlainKernels)) << static_cast<int>(level);
             }
         }
     }
 }
 
-TEST(RowKernels, TonesAreEqualInAllForms) {
-    std::mt19937 numbers(4);
-    const ChannelTables before = AnyTables(numbers), after = AnyTables(numbers);
-    for (const Tone& tone : {Tone{&before, true, 40, &after}, Tone{nullptr, true, -127, &after},
-                             Tone{&before, true, 127, nullptr}, Tone{&before, false, 0, nullptr},
-                             Tone{nullptr, false, 0, &after}, Tone{nullptr, true, 5, nullptr},
-                             Tone{nullptr, true, -126, nullptr}, Tone{nullptr, true, -1, nullptr},
-                             Tone{nullptr, true, 0, nullptr}}) {
-        ExpectEqualForms([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
-                             std::int32_t width) { kernels.tone(in, out, width, tone); },
-                         true);
-    }
-}
+// A row of cells with its padding, which may be read but not used; what lies behind it must stay as it is.
+class CellsOf {
+  public:
+    enum class Fill { kRandom, kBlack, kWhite, kEither };
 
-TEST(RowKernels, LinesAreEqualToTheirTableInAllForms) {
-    const ToneLine up = {200 << 8, 3000, 0, 8}, cut = {60000, 0, 9000, 6};
-    std::mt19937 numbers(6);
-    const ChannelTables after = AnyTables(numbers);
-    for (const std::vector<ToneLine>& lines : {std::vector{up}, std::vector{cut}, std::vector{up, cut}}) {
-        ByteTable table;
-        for (std::size_t i = 0; i < table.size(); ++i) {
-            table[i] = static_cast<std::uint8_t>(i);
-            for (const ToneLine& line : lines) table[i] = EntryOf(line, table[i]);
-        }
-        ChannelTables before;
-        before.Set(table, table, table);
-        for (Tone tone : {Tone{&before, true, 40, &after}, Tone{&before, false, 0, nullptr}}) {
-            tone.lines = lines;
-            ExpectEqualForms([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
-                                 std::int32_t width) { kernels.tone(in, out, width, tone); },
-                             true);
+    CellsOf(std::int32_t count, Fill fill, std::uint32_t seed) : m_count(count) {
+        std::mt19937 numbers(seed);
+        m_lanes.resize(static_cast<std::size_t>(count + 2 * kCellPad) * kCellLanes);
+        for (std::size_t i = 0; i < m_lanes.size(); ++i) {
+            const std::uint32_t any = static_cast<std::uint32_t>(numbers());
+            const std::uint32_t value = fill == Fill::kRandom  ? any % (kCellWhite + 1)
+                                        : fill == Fill::kBlack ? 0
+                                        : fill == Fill::kWhite ? kCellWhite
+                                                               : any % 2 * kCellWhite;
+            m_lanes[i] = i % kCellLanes == 3 ? std::uint16_t{0} : static_cast<std::uint16_t>(value);
         }
     }
-}
-
-TEST(RowKernels, WearIsEqualInAllForms) {
-    constexpr std::int32_t kHeight = 9;
-    std::mt19937 numbers(3);
-    std::vector<WearFactor> factors(kHeight * kWidestWear + 2 * WearStrips::kRoom);
-    for (WearFactor& f : factors) {
-        f = {static_cast<std::uint16_t>(numbers()), static_cast<std::uint16_t>(numbers() % 256)};
+    CellRow Row() { return m_lanes.data() + kCellPad * kCellLanes; }
+    // All but the padding behind the row.
+    std::vector<std::uint16_t> Written() const {
+        return {m_lanes.begin(), m_lanes.end() - kCellPad * kCellLanes};
     }
-    for (const std::int32_t stripWidth : {16, 25, 50, 64}) {
-        for (const std::uint32_t channels : {kColourChannels, kBlueChannel}) {
-            const WearStrips strips(WearRows(Random(7), kHeight, 5), factors.data() + WearStrips::kRoom,
-                                    stripWidth);
-            ExpectEqualForms([&](const RowKernels& kernels, const Bgra* in, Bgra* out,
-                                 std::int32_t width) { kernels.wear(in, out, width, strips, channels); },
-                             true);
+
+  private:
+    std::int32_t m_count;
+    std::vector<std::uint16_t> m_lanes;
+};
+
+// `run` may read `in`, rows of twice `count` cells, and writes `out`, which has as many.
+using RunCells =
+    std::function<void(const GlowKernels&, std::vector<CellsOf>& in, CellRow out, std::int32_t count)>;
+
+void ExpectEqualCells(const RunCells& run, std::int32_t cellsWritten) {
+    using Fill = CellsOf::Fill;
+    for (std::int32_t count = 1; count <= 21; ++count) {
+        for (const Fill fill : {Fill::kRandom, Fill::kBlack, Fill::kWhite, Fill::kEither}) {
+            const auto result = [&](const Kernels& kernels) {
+                std::vector<CellsOf> in;
+                for (std::uint32_t i = 0; i < 9; ++i) in.emplace_back(2 * count, fill, i);
+                CellsOf out(count * cellsWritten, fill, 99);
+                run(*kernels.glow, in, out.Row(), count);
+                return out.Written();
+            };
+            const auto expected = result(kPlainKernels);
+            for (const SimdLevel level : FasterLevels()) {
+                ASSERT_EQ(result(KernelsOf(level)), expected) << static_cast<int>(level) << ' ' << count;
+            }
         }
     }
 }
 
-TEST(RowKernels, CopiesAreEqualInAllForms) {
-    ExpectEqualForms([](const RowKernels& kernels, const Bgra* in, Bgra* out,
-                        std::int32_t width) { kernels.copy(in, out, width); },
-                     true);
-    ExpectEqualForms(
-        [](const RowKernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
-            kernels.stream(in, out, width);
-            kernels.endStream();
+TEST(Kernels, GlowsCellsArePlainOnesOnEveryLevel) {
+    using Rows = std::vector<CellsOf>;
+    ExpectEqualCells(
+        [](const GlowKernels& k, Rows&, CellRow out, std::int32_t n) { k.keepHighlights(out, n); }, 1);
+    for (const GlowTaps& taps :
+         {GlowTaps{2, 20000, {15000, 7768}}, GlowTaps{2, 65535, {}},
+          GlowTaps{4, 12000, {10000, 8000, 5000, 3768}}, GlowTaps{4, 0, {0, 0, 0, 32768}}}) {
+        ExpectEqualCells(
+            [&](const GlowKernels& k, Rows& in, CellRow out, std::int32_t n) {
+                const ConstCellRow before[] = {in[1].Row(), in[2].Row(), in[3].Row(), in[4].Row()};
+                const ConstCellRow after[] = {in[5].Row(), in[6].Row(), in[7].Row(), in[8].Row()};
+                k.filter(in[0].Row(), before, after, out, n, taps);
+            },
+            1);
+    }
+    ExpectEqualCells(
+        [](const GlowKernels& k, Rows& in, CellRow out, std::int32_t n) {
+            const ConstCellRow rows[] = {in[0].Row(), in[1].Row(), in[2].Row(), in[3].Row()};
+            k.halveRows(rows, out, n);
         },
-        false);
+        1);
+    ExpectEqualCells([](const GlowKernels& k, Rows& in, CellRow out,
+                        std::int32_t n) { k.halveAlong(in[0].Row(), out, n); },
+                     1);
+    ExpectEqualCells([](const GlowKernels& k, Rows& in, CellRow out,
+                        std::int32_t n) { k.between(in[0].Row(), in[1].Row(), out, n); },
+                     1);
+    ExpectEqualCells([](const GlowKernels& k, Rows& in, CellRow out,
+                        std::int32_t n) { k.doubleAlong(in[0].Row(), out, n); },
+                     2);
+    for (const std::uint16_t share : std::initializer_list<std::uint16_t>{0, 13107, 32767, 65535}) {
+        ExpectEqualCells(
+            [&](const GlowKernels& k, Rows& in, CellRow out, std::int32_t n) {
+                k.mix(out, in[0].Row(), n, share, static_cast<std::uint16_t>(65535 - share));
+                k.lift(out, n, share);
+            },
+            1);
+        ExpectEqualCells(
+            [&](const GlowKernels& k, Rows& in, CellRow out, std::int32_t n) {
+                k.approach(in[0].Row(), in[1].Row(), out, n, static_cast<std::int16_t>(share / 2));
+            },
+            1);
+    }
+}
+
+TEST(Kernels, GlowsPixelsArePlainOnesOnEveryLevel) {
+    for (const auto fill : {CellsOf::Fill::kRandom, CellsOf::Fill::kBlack, CellsOf::Fill::kWhite}) {
+        for (const std::uint16_t dither : std::initializer_list<std::uint16_t>{0, 40000, 65535}) {
+            ExpectEqualPixels([&](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
+                CellsOf layer(width, fill, dither), quarter((width + 3) / 4, fill, dither);
+                kernels.glow->screen(in, out, layer.Row(), width, dither);
+                kernels.glow->screenFourfold(out, out, quarter.Row(), width, dither);
+            });
+        }
+    }
+    ExpectEqualRows<Bgra, std::uint16_t>(
+        [](const Kernels& kernels, const Bgra* in, std::uint16_t* out, std::int32_t width) {
+            std::vector<std::uint16_t> cells(static_cast<std::size_t>(width / 16) * kCellLanes);
+            const std::int32_t quarter = width / 16 * 4;
+            const Bgra* const rows[] = {in, in + quarter, in + 2 * quarter, in + 3 * quarter};
+            kernels.glow->averageBlocks(rows, cells.data(), width / 16);
+            std::memcpy(out, cells.data(), cells.size() * sizeof(std::uint16_t));
+        },
+        sizeof(Bgra), sizeof(Bgra));
 }
 
 TEST(WearFactor, AddsWhatShadingDoes) {

@@ -69,8 +69,8 @@ void Render(GuardedFrame& source, GuardedFrame& destination, const StageSettings
     context.Finish();
 }
 
-constexpr RenderOptions kReference = {Road::kByStages, Form::kPlain};
-const RenderOptions kStreamed = {Road::kByRows, BestForm(), 0};
+constexpr RenderOptions kReference = {Road::kByStages, SimdLevel::kPlain};
+const RenderOptions kStreamed = {Road::kByRows, BestSimdLevel(), 0};
 
 TEST(Roads, GiveTheSameBytes) {
     for (std::uint32_t seed = 0; seed < 400; ++seed) {
@@ -85,12 +85,12 @@ TEST(Roads, GiveTheSameBytes) {
         const std::int32_t width = std::min(source.Shape().width, expected.Shape().width);
         const std::int32_t height = std::min(source.Shape().height, expected.Shape().height);
         ASSERT_TRUE(expected.OnlyRegionDiffers(before, width, height));
-        for (const Form form : {Form::kPlain, Form::kSse2, Form::kAvx2, Form::kAvx512}) {
-            if (form > BestForm()) continue;
+        for (const SimdLevel level : kSimdLevels) {
+            if (level > BestSimdLevel()) continue;
             for (const std::int64_t streamedBytes : {std::int64_t{0}, RenderOptions{}.streamedBytes}) {
                 GuardedFrame destination = before;
-                Render(source, destination, settings, {Road::kByRows, form, streamedBytes}, seconds);
-                ASSERT_EQ(destination.Bytes(), expected.Bytes()) << static_cast<int>(form);
+                Render(source, destination, settings, {Road::kByRows, level, streamedBytes}, seconds);
+                ASSERT_EQ(destination.Bytes(), expected.Bytes()) << static_cast<int>(level);
             }
         }
         ASSERT_EQ(source.Bytes(), untouched.Bytes());
@@ -186,7 +186,7 @@ TEST(DrawsPerFrame, TellsHowFarTheSequenceMoves) {
         RenderState state;
         state.random.Seed(seed);
         Random plain(seed);
-        (void)PlanFrame(context, settings, state);
+        (void)PlanFrame(context, settings, state, kPlainKernels);
         plain.Skip(DrawsPerFrame(settings, context.Width()));
         ASSERT_EQ(state.random.Numbers().State(), plain.State()) << seed;
     }

@@ -8,6 +8,7 @@
 #include <numeric>
 #include <random>
 
+#include "render/kernels.h"
 #include "render/scratches.h"
 #include "tests/render/plain_picture.h"
 
@@ -121,14 +122,15 @@ TEST(ScratchLives, FollowThePlainReplay) {
 struct Drawing {
     std::int32_t xOffset = 0;
     double seconds = 0.0;
-    Form form = BestForm();
+    SimdLevel level = BestSimdLevel();
 };
 
 PlainPicture Draw(PlainPicture picture, const StageSettings& settings, const Drawing& drawing,
                   ScratchMemory& memory) {
     FrameContext context(picture.Description(), picture.Description());
     context.SetTime(drawing.seconds);
-    const ScratchStage stage = PrepareScratches(settings, drawing.xOffset, context, memory, drawing.form);
+    const ScratchStage stage =
+        PrepareScratches(settings, drawing.xOffset, context, memory, KernelsOf(drawing.level));
     if (!stage.IsActive()) return picture;
     for (std::int32_t y = 0; y < picture.Height(); ++y) {
         stage.Row(picture.Row(y), picture.Row(y), picture.Width(), y);
@@ -176,7 +178,7 @@ TEST(Scratches, DrawNothingWithoutDepthOrCount) {
         PlainPicture picture = Grey();
         FrameContext context(picture.Description(), picture.Description());
         ScratchMemory memory;
-        EXPECT_FALSE(PrepareScratches(settings, 0, context, memory, BestForm()).IsActive());
+        EXPECT_FALSE(PrepareScratches(settings, 0, context, memory, KernelsOf(BestSimdLevel())).IsActive());
     }
 }
 
@@ -196,7 +198,7 @@ TEST(Scratches, BlackNeverLightensWhiteNeverDarkensAlphaStays) {
             PlainPicture::Random(whole(1, 60), whole(1, 30), static_cast<std::uint32_t>(round));
         Drawing drawing{.xOffset = whole(-10, 10), .seconds = whole(0, 400) / 10.0};
         const PlainPicture out = Draw(in, settings, drawing);
-        drawing.form = Form::kPlain;
+        drawing.level = SimdLevel::kPlain;
         ASSERT_TRUE(SamePixels(out, Draw(in, settings, drawing)));
         for (std::size_t i = 0; i < in.Pixels().size(); ++i) {
             const int sign = round % 2 == 0 ? -1 : 1;
@@ -260,7 +262,8 @@ void ForEachLine(std::int32_t frames, const Check& check) {
         for (std::int32_t frame = 0; frame < frames; ++frame) {
             FrameContext context(picture.Description(), picture.Description());
             context.SetTime((frame + 0.5) / 30.0);
-            const ScratchStage stage = PrepareScratches(settings, 0, context, memory, BestForm());
+            const ScratchStage stage =
+                PrepareScratches(settings, 0, context, memory, KernelsOf(BestSimdLevel()));
             ASSERT_TRUE(stage.IsActive());
             for (std::uint32_t i = 0; i < 16; ++i) check(memory.lines[i], frame, i);
         }
@@ -302,7 +305,7 @@ TEST(Scratches, BreakOffRaggedly) {
     ForEachLine(12, [&](const ScratchLine& line, std::int32_t frame, std::uint32_t i) {
         if (line.strength < 20000 || line.pixel < 20 || line.pixel > 1880) return;
         PlainPicture out = Grey(1920, 1080);
-        const ScratchStage stage(&line, 1, 1080, BestForm());
+        const ScratchStage stage(&line, 1, 1080, KernelsOf(BestSimdLevel()));
         std::int32_t last = 0, falling = 0, rising = 0;
         for (std::int32_t y = 0; y < 1080; ++y) {
             stage.Row(out.Row(y), out.Row(y), 1920, y);

@@ -1,0 +1,43 @@
+// The kernels with SSSE3.
+
+#include <algorithm>
+#include <array>
+#include <cstddef>
+#include <cstdint>
+#include <cstring>
+#include <limits>
+#include <span>
+
+#include "render/glow_kernels.h"
+#include "render/scratch_line.h"
+#include "render/simd/levels.h"
+#include "render/simd/target.h"
+#include "render/ycbcr.h"
+
+#if VM_HAS_SSSE3
+VM_BEGIN_TARGET("ssse3")
+
+namespace velmora::render {
+namespace {
+
+#include "render/simd/sse2.h"
+#include "render/simd/ssse3.h"
+
+#include "render/simd/rows.inc"
+#include "render/simd/wear.inc"
+#include "render/simd/tone_lines.inc"
+#include "render/simd/channels.inc"
+#include "render/simd/table_shuffles.inc"
+#include "render/simd/tone_channels.inc"
+#include "render/simd/glow.inc"
+#include "render/simd/ycbcr.inc"
+
+}  // namespace
+
+const Kernels kSsse3Kernels = {ToneRow, WearRow, DrawScratchesSse2, CopyRow, StreamRow, EndStream,
+                               &kGlow,  &kYcbcr};
+
+}  // namespace velmora::render
+
+VM_END_TARGET
+#endif

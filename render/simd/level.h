@@ -1,0 +1,20 @@
+// The SIMD levels at which the pixel kernels exist. The plain level is the authority; the others give its bytes.
+#pragma once
+
+namespace velmora::render {
+
+// A processor of a level also runs the levels before it.
+enum class SimdLevel {
+    kPlain,
+    kSse2,
+    kSsse3,
+    kAvx2,
+    kAvx512,  // with byte permutations (VBMI)
+};
+inline constexpr SimdLevel kSimdLevels[] = {SimdLevel::kPlain, SimdLevel::kSse2, SimdLevel::kSsse3,
+                                            SimdLevel::kAvx2, SimdLevel::kAvx512};
+
+// The fastest level that this build has and that this processor and operating system can run.
+[[nodiscard]] SimdLevel BestSimdLevel() noexcept;
+
+}  // namespace velmora::render
