@@ -1,11 +1,6 @@
 // Frames through the boundary: effects and conversions with any geometry, values and times, several in a row on the
-<<<<<<< HEAD
 // state that the library keeps. Refused, or worked on so that nothing else is touched and the pixels are those of the
 // reference in frames with nothing around them.
-=======
-// state that the library keeps. Refused, or worked on so that nothing else is touched and every path and SIMD
-// level gives the same bytes.
->>>>>>> simd
 
 #include <algorithm>
 #include <array>
@@ -137,13 +132,8 @@ struct Reference {
 class Run {
   public:
     Run(FuzzInput& input, IEffectLibrary& library) : m_input(input), m_library(library) {
-<<<<<<< HEAD
         m_stages.options.road = render::Road::kByStages;
-        m_stages.options.form = render::Form::kPlain;
-=======
-        m_reference.options.road = render::Road::kByStages;
-        m_reference.options.level = render::SimdLevel::kPlain;
->>>>>>> simd
+        m_stages.options.level = render::SimdLevel::kPlain;
         const std::int32_t choice = input.Byte();
         m_other.options.level = std::min(render::kSimdLevels[choice % 5], render::BestSimdLevel());
         if (choice / 5 % 2 != 0) m_other.options.streamedBytes = 0;
@@ -200,13 +190,12 @@ class Run {
     }
 
     void Convert(bool isToBgra) {
-<<<<<<< HEAD
-        static constexpr const char* kForms[] = {"plain", "sse2", "avx2", "avx512"};
-        const char* const form = kForms[m_input.Below(4)];
+        static constexpr const char* kLevels[] = {"plain", "sse2", "ssse3", "avx2", "avx512"};
+        const char* const level = kLevels[m_input.Below(5)];
         const std::uint8_t alpha = m_input.Byte();
         const auto convert = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
-            // A processor takes the form that the environment names when it is made.
-            setenv("VELMORA_FORM", runner == Runner::kLibrary ? form : kForms[0], 1);
+            // A processor takes the SIMD level that the environment names when it is made.
+            setenv("VELMORA_FORM", runner == Runner::kLibrary ? level : kLevels[0], 1);
             const Owned<IFrameProcessor> processor(m_library.CreateFrameProcessor());
             unsetenv("VELMORA_FORM");
             return isToBgra ? processor->ConvertYcbcrToBgra(&source, &destination, alpha)
@@ -214,68 +203,6 @@ class Run {
         };
         Try(m_input, isToBgra ? Packing::kYcbcr : Packing::kBgra, isToBgra ? Packing::kBgra : Packing::kYcbcr,
             convert);
-=======
-        Owned<IFrameProcessor> processor(NewProcessor());
-        const std::uint8_t alpha = m_input.Byte();
-        const PixelLayout& from = isToBgra ? kYcbcrLayout : kBgraLayout;
-        const PixelLayout& to = isToBgra ? kBgraLayout : kYcbcrLayout;
-        FuzzedFrames frames(m_input, from, to);
-        if (frames.AreValid()) frames.Close(isToBgra ? frames.Source().width : frames.Width());
-        const bool isDone =
-            isToBgra ? processor->ConvertYcbcrToBgra(&frames.Source(), &frames.Destination(), alpha)
-                     : processor->ConvertBgraToYcbcr(&frames.Source(), &frames.Destination(), alpha);
-        frames.Open();
-        Require(isDone == frames.AreValid());
-        if (!isDone) return;
-        FuzzedFrames::Copy copy = frames.TakeCopy();
-        for (std::int32_t y = 0; y < frames.Height(); ++y) {
-            const std::uint8_t* source = Row(copy.source, from, y);
-            std::uint8_t* destination = Row(copy.destination, to, y);
-            if (isToBgra) {
-                DecodeRow(source, copy.source.width, destination, frames.Width(), alpha);
-            } else {
-                EncodeRow(source, destination, frames.Width());
-            }
-        }
-        Require(frames.AreAs(copy));
-    }
-
-    // A processor takes the form that the environment names when it is made.
-    IFrameProcessor* NewProcessor() {
-        static constexpr const char* kLevels[] = {"plain", "sse2", "ssse3", "avx2", "avx512"};
-        setenv("VELMORA_FORM", kLevels[m_input.Below(5)], 1);
-        IFrameProcessor* const processor = m_library.CreateFrameProcessor();
-        unsetenv("VELMORA_FORM");
-        return processor;
-    }
-
-    static std::uint8_t* Row(const FrameRecord& frame, const PixelLayout& layout, std::int32_t y) {
-        const std::int64_t step = frame.rowStep < 0 ? -std::int64_t{frame.rowStep} : frame.rowStep;
-        std::int64_t offset = step * (frame.yOrigin + y) + layout.columnOffset(frame.xOrigin);
-        if (frame.rowStep < 0) offset -= step * (std::int64_t{frame.yOrigin} + frame.height - 1);
-        return static_cast<std::uint8_t*>(frame.pixels) + offset;
-    }
-
-    static void DecodeRow(const std::uint8_t* source, std::int32_t sourceWidth, std::uint8_t* bgra,
-                          std::int32_t width, std::uint8_t alpha) {
-        std::array<std::uint8_t, 3 * 256> rgb;
-        Require(sourceWidth <= 256);
-        render::YcbcrRowToRgb(source, rgb.data(), sourceWidth);
-        for (std::size_t x = 0; x < static_cast<std::size_t>(width); ++x) {
-            for (std::size_t channel = 0; channel < 3; ++channel)
-                bgra[4 * x + channel] = rgb[3 * x + 2 - channel];
-            bgra[4 * x + 3] = alpha;
-        }
-    }
-
-    static void EncodeRow(const std::uint8_t* bgra, std::uint8_t* destination, std::int32_t width) {
-        std::array<std::uint8_t, 3 * 256> rgb;
-        for (std::size_t x = 0; x < static_cast<std::size_t>(width); ++x) {
-            for (std::size_t channel = 0; channel < 3; ++channel)
-                rgb[3 * x + channel] = bgra[4 * x + 2 - channel];
-        }
-        render::RgbRowToYcbcr(rgb.data(), destination, width);
->>>>>>> simd
     }
 
     FuzzInput& m_input;

@@ -145,7 +145,7 @@ class Places(Commands):
                 if done.returncode == 0:
                     self.assertTrue(self.left_over())
                 else:
-                    self.check_failed(done, [1], "short")
+                    self.check_failed(done, [1], "not enough")
                     self.assertEqual(self.left_over(), [])
                 for name in self.left_over():
                     (self.out / name).unlink()
@@ -180,7 +180,7 @@ class Input(Commands):
         film = self.out / "film.mkv"
         ffmpeg("-i", clips.small, "-c", "copy", film)
         (self.out / "cut.mkv").write_bytes(film.read_bytes()[:film.stat().st_size * 4 // 10])
-        self.check_failed(reelfx("render", self.out / "cut.mkv", self.out / "x.mp4", *DAMAGE), [0], "too early")
+        self.check_failed(reelfx("render", self.out / "cut.mkv", self.out / "x.mp4", *DAMAGE), [0], "s early")
 
     def while_it_runs(self, args, action):
         """Runs a render and lets `action` happen when it has begun to write, while it stands still."""
@@ -207,7 +207,7 @@ class Input(Commands):
         last = sorted(pictures.iterdir())[150:]
         done = self.while_it_runs((pictures / "in-%03d.png", self.out / "part.mkv", *lossless),
                                   lambda: [path.unlink() for path in last])
-        self.check_failed(done, [3], "in-%03d.png", "holds the first 150 frames")
+        self.check_failed(done, [3], "in-%03d.png", "contains the first 150 frames")
         self.assertEqual(len(frame_digests(self.out / "part.mkv")), 150)
 
 

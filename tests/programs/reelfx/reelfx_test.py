@@ -89,7 +89,7 @@ class Listing(ReelfxTest):
                "format=yuv422p10le,setfield=tff,setparams=color_trc=smpte2084", "-flags", "+ildct", "-c:v", "ffv1",
                strange)
         notes = " ".join(json.loads(reelfx("info", strange, "--json").stdout)["notes"])
-        for word in ("10 bits", "matrix is not told; smpte170m", "high dynamic range"):
+        for word in ("10 bits", "no colour matrix tagged; assuming smpte170m", "high dynamic range"):
             self.assertIn(word, notes)
 
 
@@ -114,7 +114,7 @@ class Telling(ReelfxTest):
         self.assertEqual((done.returncode, done.stderr, self.left_over()), (0, b"", []))
         text = done.stdout.decode()
         for words in ("320x180", "frame 3 up to but not including 9 (6 frames)", "Film Look, preset Sepia", "Tint=60",
-                      "seed 5", "mp4, libx264 yuv420p, audio aac as it is"):
+                      "seed 5", "mp4, libx264 yuv420p, audio aac (copied)"):
             self.assertIn(words, text)
 
     def test_options_come_from_the_environment_too(self):
@@ -399,8 +399,8 @@ class Refusing(ReelfxTest):
             (2, ["yuv9", "pixel format"], (*render, *CAMERA, "--pix-fmt", "yuv9")),
             (2, ["--format"], ("render", small, self.out / "out.unknown", *CAMERA)),
             (2, ["--progress", "often"], (*render, *CAMERA, "--progress", "often")),
-            (2, ["libx264", "no transparency"], (*render, "-e", "Film Damage", "--matte")),
-            (2, ["yuv420p", "no transparency"], ("render", small, self.out / "out.mkv", "-e", "Film Damage", "--matte",
+            (2, ["libx264", "transparency"], (*render, "-e", "Film Damage", "--matte")),
+            (2, ["yuv420p", "transparency"], ("render", small, self.out / "out.mkv", "-e", "Film Damage", "--matte",
                                                  "--pix-fmt", "yuv420p")),
             (2, ["Blue Channel Only=off"], (*render, "-e", "Film Damage", "-p", "Water Damage", "--matte")),
             (2, ["damage", "Film Camera"], (*render, *CAMERA, "--matte")),
@@ -411,7 +411,7 @@ class Refusing(ReelfxTest):
             (3, ["missing.mp4"], ("render", clips.root / "missing.mp4", out, *CAMERA)),
             (3, ["text.mp4"], ("render", text, out, *CAMERA)),
             (3, ["truncated.mp4"], ("render", truncated, out, *CAMERA)),
-            (3, ["no picture"], ("render", silent, out, *CAMERA)),
+            (3, ["no video"], ("render", silent, out, *CAMERA)),
             (3, ["folder"], ("render", clips.root, out, *CAMERA)),
             (3, ["no frame", "41"], (*render, *CAMERA, "--frames", "99:")),
             (3, ["no frame 99"], ("frame", small, self.out / "out.png", *CAMERA, "--frame", "99")),
@@ -423,7 +423,7 @@ class Refusing(ReelfxTest):
             (2, ["--crop", "9x9+1"], ("strip", small, self.out / "out.png", *CAMERA, "--crop", "9x9+1")),
             (3, ["not a preset"], (*render, "--preset-file", text)),
             (4, ["No such file"], ("render", small, self.out / "no" / "out.mp4", *CAMERA)),
-            (4, ["exists already"], ("render", small, text, *CAMERA)),
+            (4, ["already exists"], ("render", small, text, *CAMERA)),
             (4, ["folder"], ("render", small, self.out, *CAMERA, "--format", "mp4")),
         ]
         for code, words, args in rows:
