@@ -24,10 +24,10 @@ function(velmora_add_test name)
   endif()
 endfunction()
 
-# velmora_test_levels(NAME) runs a test program once more on each SIMD level, as far as the processor has it.
+# velmora_test_levels(NAME ARGUMENT...) runs a test program once more on each SIMD level, as far as the processor has it.
 function(velmora_test_levels name)
   foreach(level plain sse2 ssse3 avx2 avx512)
-    add_test(NAME ${name}_${level} COMMAND ${name})
+    add_test(NAME ${name}_${level} COMMAND ${name} ${ARGN})
     set_tests_properties(${name}_${level} PROPERTIES TIMEOUT 600 ENVIRONMENT VELMORA_FORM=${level})
     if(WIN32)
       set_tests_properties(${name}_${level} PROPERTIES RESOURCE_LOCK screen)

@@ -3,9 +3,10 @@
 
     build_help.py PAGES TOPICS_H WORK OUTPUT
 
-PAGES is the folder of the pages (docs/help), TOPICS_H the list of numbered topics, WORK a folder that may be
-emptied, OUTPUT the file to write. The table of contents is the nested list on the start page, the index comes from
-the pages' keywords, so that pages, contents and index cannot drift apart. Needs chmcmd.
+PAGES is the folder of the pages (docs/help), of which the edition for users of the library is compiled. TOPICS_H is the
+list of numbered topics, WORK a folder that may be emptied, OUTPUT the file to write. The table of contents is the nested
+list on the start page and the index comes from the pages' keywords, so pages, contents and index always agree. Needs
+chmcmd.
 """
 
 import re
@@ -17,6 +18,7 @@ from html.parser import HTMLParser
 from pathlib import Path
 
 from chm_file import ChmFile
+from edition import write_edition
 
 START = "start.html"
 TITLE = "Velmora Reel Effects"
@@ -66,7 +68,7 @@ class PageReader(HTMLParser):
 
 def read_page(path):
     reader = PageReader()
-    reader.feed(path.read_text(encoding="ascii"))  # entities for the rest: no viewer can guess an encoding wrongly
+    reader.feed(path.read_text(encoding="ascii"))  # entities for the rest: no viewer has to guess an encoding
     reader.title = reader.title.strip()
     for entry in reader.contents:
         entry["name"] = " ".join(entry["name"].split())
@@ -108,7 +110,7 @@ def index_file(pages):
 
 
 def project_file(files, topics):
-    # The index stays in its text form: the compiler leaves unset bytes in the binary one.
+    # A text index: the compiler leaves uninitialised bytes in a binary one.
     return f"""[OPTIONS]
 Compatibility=1.1 or later
 Compiled file={COMPILED}
@@ -137,8 +139,9 @@ def run_tool(work, *command):
 
 
 def compile_project(work):
-    # The compiler writes the project's folder before each page of the map of topics, where no viewer finds it. Named
-    # in this way the folder reads the same wherever the build stands; then it is taken out, each text keeping its place.
+    # In the map of topics the compiler puts the project's folder before each page's name, and then no viewer finds the
+    # page. Under this name the folder has the same length wherever the build is; it is removed from the strings
+    # afterwards, which keep their positions.
     folder = "/proc/self/cwd/"
     run_tool(work, "chmcmd", "--no-html-scan", folder + "project.hhp")
     run_tool(work, "chmls", "extract", COMPILED, "/#STRINGS", "strings")
@@ -156,7 +159,7 @@ def main():
     pages_dir, header, work, output = map(Path, sys.argv[1:5])
     shutil.rmtree(work, ignore_errors=True)
     work.mkdir(parents=True)
-    shutil.copytree(pages_dir, work, dirs_exist_ok=True)
+    write_edition(pages_dir, work, ["library"])
 
     pages = {path.name: read_page(path) for path in sorted(work.glob("*.html"))}
     topics = read_topics(header)

@@ -1,8 +1,8 @@
-"""Repairs to a compiled help file: its strings, and the times that would make each build differ.
+"""Changes a finished compiled help file: its strings, and the time stamps that would make each build differ.
 
 The file begins with a header, then a directory of named entries in chunks of fixed size, then the content in two
-sections: 0 stored as it is, 1 compressed. Numbers are little-endian; those of a directory entry are 7 bits a byte,
-highest first.
+sections: 0 uncompressed, 1 compressed. Numbers are little-endian, except in directory entries, which hold 7 bits per
+byte, highest first.
 """
 
 import struct
@@ -50,7 +50,7 @@ class ChmFile:
         self._reference_step = 1 + (1 << density)
 
     def clear_times(self):
-        """Puts 0 in the two places that hold the time of the build."""
+        """Zeroes both time stamps of the build."""
         struct.pack_into("<I", self.data, HEADER_TIME, 0)
         system = self._find(b"/#SYSTEM")[2]
         at, end = self._content + system.offset + 4, self._content + system.offset + system.length
@@ -61,7 +61,7 @@ class ChmFile:
             at += 4 + size
 
     def replace(self, name, content):
-        """Gives an entry new content, stored at the file's end as it is; what it had stays behind unused."""
+        """Gives an entry new content, stored uncompressed at the end of the file. The old content stays, unused."""
         chunk, entries, entry = self._find(name)
         entry.section, entry.offset, entry.length = 0, len(self.data) - self._content, len(content)
         self._write_listing(chunk, entries)
@@ -92,7 +92,7 @@ class ChmFile:
         return entries
 
     def _write_listing(self, chunk, entries):
-        # From the chunk's end backwards stand the number of entries and the place of every so many-th of them.
+        # The chunk ends with the number of entries and, before it, the positions of every n-th entry, in reverse.
         listing, references = b"", struct.pack("<H", len(entries))
         for index, entry in enumerate(entries):
             if index and index % self._reference_step == 0:
@@ -100,7 +100,7 @@ class ChmFile:
             listing += entry.encoded()
         free = self._chunk_size - LISTING_HEAD - len(listing)
         if free < len(references):
-            raise ValueError("no room left in a chunk of the directory")
+            raise ValueError("a chunk of the directory is full")
         struct.pack_into("<I", self.data, chunk + 4, free)
         self.data[chunk + LISTING_HEAD:chunk + self._chunk_size] = \
             listing + bytes(free - len(references)) + references

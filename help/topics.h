@@ -1,7 +1,7 @@
-// The numbered topics of the user help: what a dialog passes to the help viewer to open its page.
-// A topic's page bears the constant's name: kFilmLook is docs/help/film-look.html. The build makes the map of the
-// compiled help from this list (one constant a line), so a number is written nowhere else. Numbers that a release
-// has shipped keep their meaning: hosts may hold them.
+// The numbered topics of the user help. A dialog passes the number to the help viewer, which opens the page.
+// The page is named after the constant: kFilmLook is docs/help/film-look.html. The build makes the map of the compiled
+// help from this list (one constant per line); the numbers are defined nowhere else. A number that has been released
+// keeps its meaning, because hosts may store it.
 #pragma once
 
 namespace velmora::help {
@@ -15,7 +15,7 @@ inline constexpr int kFilmDamage = 103;
 inline constexpr int kFilmExpress = 104;
 inline constexpr int kFilmPro = 105;
 
-// The controls, in the order in which the picture passes them.
+// The controls, in the order in which they are applied to the picture.
 inline constexpr int kJitter = 201;
 inline constexpr int kBorder = 202;
 inline constexpr int kDiffusion = 203;

@@ -1,14 +1,14 @@
-; The Windows installer. Made by packaging/pack-windows, which defines VERSION, STAGE (the folder of what is installed),
-; LISTS (the folder of the two generated lists), KILOBYTES (what the files take) and OUTPUT.
+; The Windows installer. Built by packaging/pack-windows, which defines VERSION, STAGE (the folder of files to install),
+; LISTS (the folder of the two generated lists), KILOBYTES (the size of the files) and OUTPUT.
 ;
 ;   setup.exe [/S] [/AllUsers | /CurrentUser] [/D=folder]
 ;
-; /S asks nothing. Without a choice a run with an administrator's rights installs for all users, any other for the
-; current one. /D= comes last and is not quoted, whatever its folder is called. Exit codes: 0 done, 1 the user cancelled,
-; 2 nothing was changed because a program is using the library, or a file could not be written.
+; /S shows no dialogs. Unless one of the two is given, a run with administrator rights installs for all users, any other
+; for the current user. /D= comes last and is never quoted. Exit codes: 0 done, 1 cancelled by the user, 2 nothing was
+; changed because a program is using the library, or a file could not be written.
 ;
-; The library needs no entry in the registry: an editor is told the folder. The one entry that is made is the uninstaller's,
-; whose "InstallLocation" names it.
+; The library needs no registry entries: users choose its folder in the editor. The only entry is the uninstaller's, whose
+; "InstallLocation" names the folder.
 
 Unicode true
 SetCompressor /SOLID lzma
@@ -18,14 +18,14 @@ ManifestDPIAware true
 !define FOLDER "Velmora\Reel Effects"
 !define FOLDER_LENGTH 21 ; with the separator before it
 !define UNINSTALL_KEY "Software\Microsoft\Windows\CurrentVersion\Uninstall\VelmoraReelEffects"
-!define IN_USE "A program is using ${PRODUCT}. Close the video editor that has it open, and start again."
+!define IN_USE "A program is using ${PRODUCT}. Close the video editor that uses it, and start again."
 
 !define MULTIUSER_EXECUTIONLEVEL Highest
 !define MULTIUSER_MINWIN 0x600
 !define MULTIUSER_MUI
 !define MULTIUSER_INSTALLMODE_COMMANDLINE
 !define MULTIUSER_INSTALLMODE_INSTDIR "${FOLDER}"
-; What is installed already is brought up to date where it lies.
+; An existing installation is updated in its own folder.
 !define MULTIUSER_INSTALLMODE_INSTDIR_REGISTRY_KEY "${UNINSTALL_KEY}"
 !define MULTIUSER_INSTALLMODE_INSTDIR_REGISTRY_VALUENAME "InstallLocation"
 !define MULTIUSER_INSTALLMODE_DEFAULT_REGISTRY_KEY "${UNINSTALL_KEY}"
@@ -60,10 +60,10 @@ VIAddVersionKey "LegalCopyright" "Copyright Velmora. MIT licence."
 !insertmacro MUI_UNPAGE_INSTFILES
 !insertmacro MUI_LANGUAGE "English"
 
-Var GivenFolder ; by /D=, or where the uninstaller lies
+Var GivenFolder ; from /D=, or the folder of the uninstaller
 Var EarlierFolder
 
-; A loaded library cannot be opened for writing. Nothing may have been changed before this is known.
+; A loaded library cannot be opened for writing. This is checked before anything is changed.
 !macro STOP_WHEN_IN_USE FOLDER
     ${If} ${FileExists} "${FOLDER}\VMReelEffects.dll"
         ClearErrors
@@ -78,7 +78,7 @@ Var EarlierFolder
 !macroend
 
 Function .onInit
-    ; The choice between all users and one puts its own folder in its place.
+    ; MULTIUSER_INIT replaces $INSTDIR with the default folder of its mode.
     StrCpy $GivenFolder $INSTDIR
     !insertmacro MULTIUSER_INIT
     ${If} $GivenFolder != ""
@@ -92,7 +92,7 @@ Section
     ${If} $EarlierFolder != ""
         !insertmacro STOP_WHEN_IN_USE "$EarlierFolder"
     ${EndIf}
-    ; An earlier version's files go first: some may have other names now, or the folder may be another.
+    ; Remove an earlier version first: its files may have other names, or be in another folder.
     ${If} $EarlierFolder != ""
     ${AndIf} ${FileExists} "$EarlierFolder\uninstall.exe"
         ExecWait '"$EarlierFolder\uninstall.exe" /S /$MultiUser.InstallMode _?=$EarlierFolder'
@@ -117,8 +117,8 @@ Section
     WriteRegDWORD SHCTX "${UNINSTALL_KEY}" "NoRepair" 1
 SectionEnd
 
-; There may be an installation for all users and one for each. The uninstaller removes the one that it lies in, whatever it
-; was told, and the entry that names its folder.
+; There may be an installation for all users and one for each user. The uninstaller always removes the one that it belongs
+; to, and the entry that names its folder.
 Function un.onInit
     StrCpy $GivenFolder $INSTDIR
     !insertmacro MULTIUSER_UNINIT
@@ -132,14 +132,14 @@ Function un.onInit
     StrCpy $INSTDIR $GivenFolder
 FunctionEnd
 
-; Presets that users saved beside the library, their settings, and anything else that was not installed stay.
+; Keeps the presets that users saved beside the library, their settings, and anything else that was not installed.
 Section Uninstall
     !insertmacro STOP_WHEN_IN_USE "$INSTDIR"
     !include "${LISTS}/uninstall.nsh"
     Delete "$INSTDIR\uninstall.exe"
     SetOutPath "$TEMP"
     RMDir "$INSTDIR"
-    ; The folder above too, where it is the suggested one.
+    ; Remove the folder above as well if it is the default one.
     StrCpy $0 $INSTDIR "" -${FOLDER_LENGTH}
     ${If} $0 == "\${FOLDER}"
         RMDir "$INSTDIR\.."

@@ -1,4 +1,4 @@
-// reelfx: the effects on the command line, for any footage that the media libraries read.
+// reelfx: the effects on the command line, for any footage that FFmpeg's libraries can read.
 
 #include <cstdio>
 #include <exception>
@@ -15,11 +15,11 @@ extern "C" {
 
 int main(int count, char** arguments) {
     using namespace velmora::hosts;
-    av_log_set_level(AV_LOG_QUIET);  // one clear line of our own instead
+    av_log_set_level(AV_LOG_QUIET);  // one clear line of ours instead
     WatchInterrupts();
     try {
         const ExitCode code = RunCommand(ReadCommandLine(count, arguments));
-        // Texts and digests may still be on their way.
+        // Texts and digests may still be buffered.
         if (std::fflush(stdout) != 0 || std::ferror(stdout) != 0) {
             throw Failure(kExitOutput, "standard output cannot be written");
         }
@@ -31,10 +31,10 @@ int main(int count, char** arguments) {
         std::fprintf(stderr, "reelfx: %s\n", error.what());
         return kExitUsage;
     } catch (const std::bad_alloc&) {
-        std::fprintf(stderr, "reelfx: memory is short\n");
+        std::fprintf(stderr, "reelfx: not enough memory\n");
         return kExitInternal;
     } catch (const std::system_error& error) {
-        std::fprintf(stderr, "reelfx: memory or threads are short: %s\n", error.what());
+        std::fprintf(stderr, "reelfx: not enough memory or threads: %s\n", error.what());
         return kExitInternal;
     } catch (const std::exception& error) {
         std::fprintf(stderr, "reelfx: %s\n", error.what());

@@ -136,27 +136,5 @@ TEST_F(LifetimeTest, NothingStaysOver200Rounds) {
     EXPECT_EQ(library.references, 1u);
 }
 
-TEST_F(LifetimeTest, NothingStaysOfTheWholeLibraryOver200Rounds) {
-    // Wine's own modules lose handles when they are unloaded; hosts have them loaded anyway.
-    const HMODULE kept = LoadLibraryW(L"comdlg32.dll");
-    ExpectNothingStays([] {
-        const HMODULE module = LoadLibraryA(VELMORA_TEST_DIST "/VMReelEffects.dll");
-        ASSERT_NE(module, nullptr);
-        const auto find = [module](const char* name) {
-            return reinterpret_cast<void*>(GetProcAddress(module, name));
-        };
-        IEffectLibrary* const library =
-            reinterpret_cast<GetEffectsLibraryFunction>(find("GetEffectsLibrary"))();
-        ASSERT_NE(library, nullptr);
-        EXPECT_EQ(library->GetShellServices()->ShowOptions(nullptr), 1);
-        EXPECT_EQ(library->Release(), 0u);
-        EXPECT_TRUE(reinterpret_cast<CanUnloadDLLNowFunction>(find("CanUnloadDLLNow"))());
-        FreeLibrary(module);
-    });
-    FreeLibrary(kept);
-    for (const wchar_t* name : {L"VMReelEffects.dll", L"VMLang.dll"})
-        EXPECT_EQ(GetModuleHandleW(name), nullptr);
-}
-
 }  // namespace
 }  // namespace velmora::support::test

@@ -103,21 +103,6 @@ TEST(BitButtonState, ChoosesTheImage) {
     }
 }
 
-TEST(BitButtonState, ClicksOnlyWhenReleasedInside) {
-    BitButtonState button(true);
-    Press(button);
-    MoveOut(button);
-    EXPECT_FALSE(button.OnButtonUp().click);
-    Press(button);
-    MoveOut(button);
-    MoveIn(button);
-    EXPECT_TRUE(button.OnButtonUp().click);
-
-    BitButtonState silent(false);
-    Press(silent);
-    EXPECT_FALSE(silent.OnButtonUp().click);
-}
-
 class Library final : public IUnknown {
   public:
     Status VM_CALL QueryInterface(const Guid*, void**) override { return kStatusNoInterface; }

@@ -4,7 +4,6 @@
 
 #include <gtest/gtest.h>
 
-#include <bit>
 #include <memory>
 #include <string>
 #include <string_view>
@@ -81,15 +80,6 @@ class ProcessWide : public testing::Test {
     }
 };
 
-TEST(EffectSession, ResetToNoneGivesTheSourceBack) {
-    for (const EffectTable* effect : kAllEffects) {
-        auto session = SessionWith(*effect, Neutral(*effect));
-        for (const int frame : {0, 1, 2, 700}) {
-            EXPECT_EQ(FrameOf(*session, SecondsOf(frame)), Picture(7)) << effect->name;
-        }
-    }
-}
-
 // "Film Damage": Wear 0, Pattern Blotchy, Black on.
 TEST(EffectSession, StartsWithTheDefaults) {
     auto session = EffectSession::Create(kFilmDamage);
@@ -106,15 +96,6 @@ TEST(EffectSession, ValuesAndPresetsPastTheEndChangeNothing) {
     session->ApplyPreset(8);
     EXPECT_EQ(session->Value(5).bits, 0u);
     EXPECT_EQ(FrameOf(*session, 1.0), Picture(7));
-}
-
-TEST(EffectSession, RefusesInvalidFrames) {
-    auto session = SessionWith(kFilmPro, 0);
-    Picture source(7), result;
-    FrameRecord narrow = result.Record();
-    narrow.rowStep = kWidth * 4 - 1;
-    EXPECT_FALSE(session->Render(source.Record(), narrow, 0.0));
-    EXPECT_EQ(result, Picture());
 }
 
 TEST(EffectSession, PinnedFramesDoNotDependOnTheirOrder) {
@@ -227,53 +208,6 @@ TEST_F(ProcessWide, EffectObjectsAndSessionsRenderTheSameBytes) {
             }
         }
         effect->Release();
-    }
-}
-
-TEST_F(ProcessWide, ResetToNoneOfEveryObjectGivesTheSourceBack) {
-    for (std::uint32_t index = 0; index < kAllEffects.size(); ++index) {
-        IVideoEffect* effect = CreateEffectByIndex(index);
-        EXPECT_EQ(RenderedBy(*effect, Neutral(*kAllEffects[index]), 1.0), Picture(7)) << effect->GetName();
-        effect->Release();
-    }
-}
-
-// Two effects that share the process read all their values anew for every frame.
-TEST_F(ProcessWide, EffectsThatAlternateKeepTheirOwnValues) {
-    IVideoEffect* camera = CreateEffectByIndex(0);
-    IVideoEffect* look = CreateEffectByIndex(1);
-    const std::uint32_t sepia = PresetNamed(kFilmLook, "Sepia");
-    auto session = SessionWith(kFilmLook, sepia);
-    const Picture expected = FrameOf(*session, 1.0);
-    for (int round = 0; round < 3; ++round) {
-        EXPECT_NE(RenderedBy(*camera, 0, 1.0), Picture(7));
-        EXPECT_EQ(RenderedBy(*look, sepia, 1.0), expected);
-    }
-    camera->Release();
-    look->Release();
-}
-
-// A host may send anything.
-TEST(EffectSession, WildValuesCountAsTheEndsOfTheirRange) {
-    struct {
-        std::uint32_t wild;
-        float same;
-    } const rows[] = {{0x7FC00000u, 0.0f},  // not a number
-                      {0xFF800000u, 0.0f},  // minus infinity
-                      {0x7F800000u, 1.0f},  // infinity
-                      {std::bit_cast<std::uint32_t>(1e9f), 1.0f},
-                      {std::bit_cast<std::uint32_t>(-0.5f), 0.0f}};
-    for (const EffectTable* effect : kAllEffects) {
-        for (const auto& row : rows) {
-            auto wild = SessionWith(*effect, 0);
-            auto tame = SessionWith(*effect, 0);
-            for (std::uint32_t i = 0; i < effect->params.size(); ++i) {
-                if (effect->params[i].kind != kKindSlider) continue;
-                wild->SetValue(i, {.bits = row.wild});
-                tame->SetValue(i, {.number = row.same});
-            }
-            EXPECT_EQ(FrameOf(*wild, 2.0), FrameOf(*tame, 2.0)) << effect->name << " " << row.same;
-        }
     }
 }
 

@@ -1,89 +1,130 @@
 // Frames through the boundary: effects and conversions with any geometry, values and times, several in a row on the
-// state that the library keeps. Refused, or worked on so that nothing else is touched and every SIMD level gives the same
-// bytes.
+// state that the library keeps. Refused, or worked on so that nothing else is touched and the pixels are those of the
+// reference in frames with nothing around them.
 
 #include <algorithm>
 #include <array>
 #include <cmath>
+#include <cstring>
+#include <functional>
 #include <limits>
-#include <memory>
-#include <optional>
+#include <vector>
 
 #include "effects/process_state.h"
 #include "effects/render_session.h"
-#include "render/ycbcr.h"
+#include "programs/reelcheck/library.h"
+#include "programs/reelcheck/playing_host.h"
 #include "tests/common/library_under_test.h"
 #include "tests/fuzz/fuzz_input.h"
-#include "tests/fuzz/fuzzed_frames.h"
 
 namespace velmora::fuzz {
 namespace {
 
-struct Releaser {
-    void operator()(IUnknown* object) const { object->Release(); }
-};
-template <typename Interface>
-using Owned = std::unique_ptr<Interface, Releaser>;
+using reelcheck::Frame;
+using reelcheck::Layout;
+using reelcheck::Owned;
+using reelcheck::Packing;
+using reelcheck::PlayingHost;
 
-// Answers with the words that it was given, or not at all.
-class WordHost final : public IVideoHost {
-  public:
-    std::array<std::optional<std::uint32_t>, 40> words;
+// What runs on a pair of frames: the library, or one of the two references. False: the frames are refused.
+enum class Runner { kLibrary, kReference, kOtherLevel };
+constexpr Runner kRunners[] = {Runner::kLibrary, Runner::kReference, Runner::kOtherLevel};
+using Operation = std::function<bool(Runner, const FrameRecord& source, const FrameRecord& destination)>;
 
-    Status VM_CALL QueryInterface(const Guid*, void** out) override {
-        *out = nullptr;
-        return kStatusNoInterface;
-    }
-    std::uint32_t VM_CALL AddRef() override { return 1; }
-    std::uint32_t VM_CALL Release() override { return 1; }
-    bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override {
-        if (index >= words.size() || !words[index]) return false;
-        cell->value.bits = *words[index];
-        cell->kind = kind;
-        return true;
-    }
-    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) override { return false; }
-    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) override { return 0; }
-    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return false; }
-    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
-};
-
-void ReadWords(FuzzInput& input, IVideoEffect& effect, WordHost& host) {
-    host.words = {};
-    const std::uint32_t preset = input.Byte();
-    PresetCell cell;
-    for (std::uint32_t i = 0; effect.GetPresetValue(preset % 32, i, &cell); ++i)
-        host.words[i] = cell.value.bits;
-    for (std::int32_t left = input.Below(40); left > 0; --left) {
-        std::optional<std::uint32_t>& word = host.words[static_cast<std::size_t>(input.Below(40))];
-        // Sliders and menus are asked for most, so words of theirs come oftenest.
-        const std::int32_t kind = input.Below(8);
-        ValueWord value = {};
-        if (kind < 4) value.number = static_cast<float>(input.Byte()) / 255.0f;
-        if (kind == 4) value.bits = input.Byte();
-        if (kind == 5 || kind == 6) value.bits = input.Word();
-        word = kind == 7 ? std::nullopt : std::optional(value.bits);
-    }
+// Mostly small: what matters at an edge matters there too, and takes less time.
+Layout ReadLayout(FuzzInput& input) {
+    const auto side = [&input](std::int32_t most) {
+        const std::int32_t number = input.Byte();
+        return 1 + number % (number < 192 ? 24 : most);
+    };
+    Layout layout{side(130), side(48)};
+    const std::int32_t origins = input.Byte(), padding = input.Byte();
+    layout.xOrigin = origins % 8;
+    layout.yOrigin = origins / 8 % 8;
+    layout.padding = padding / 2;
+    layout.bottomUp = padding % 2 != 0;
+    return layout;
 }
 
 double ReadTime(FuzzInput& input) {
-    static constexpr double kTimes[] = {0.0,
-                                        -1.0,
-                                        1e300,
-                                        -1e300,
-                                        std::numeric_limits<double>::infinity(),
-                                        -std::numeric_limits<double>::infinity(),
-                                        std::numeric_limits<double>::quiet_NaN(),
-                                        std::numeric_limits<double>::denorm_min()};
-    const std::int32_t kind = input.Below(64);
-    if (kind < 8) return kTimes[kind];
-    // Hours into a clip the scratches' lives up to there are told first: sound, but it takes the fuzzer's time.
-    if (kind < 16) return std::fmod(input.Double(), 4000.0);
-    return input.Byte() / 30.0;
+    if (input.Below(8) != 0) return input.Byte() / 30.0;
+    const double time = input.Double();
+    // Hours into a clip the scratches' lives up to there are found first: sound, but it takes the fuzzer's time.
+    return std::abs(time) < 1e9 ? std::fmod(time, 4000.0) : time;
 }
 
-// A state on which frames are rendered at a level of their own, beside the library's.
-struct OtherState {
+// The rule of the public header in 64 bits: is this a frame?
+bool IsFrame(const FrameRecord& frame, Packing packing) {
+    constexpr std::int64_t kMost = std::numeric_limits<std::int32_t>::max();
+    const std::int64_t width = std::int64_t{frame.xOrigin} + frame.width, step = frame.rowStep,
+                       pixels = packing == Packing::kBgra ? width : (width + 1) / 2;
+    return frame.width >= 1 && frame.height >= 1 && frame.xOrigin >= 0 && frame.yOrigin >= 0 &&
+           width <= kMost && std::int64_t{frame.yOrigin} + frame.height <= kMost && std::abs(step) <= kMost &&
+           pixels * 4 <= std::abs(step);
+}
+
+// Replaces one number of the record by any other, so that it is no frame.
+void Spoil(FuzzInput& input, Packing packing, FrameRecord& frame) {
+    std::int32_t* const numbers[] = {&frame.width, &frame.height, &frame.rowStep, &frame.xOrigin,
+                                     &frame.yOrigin};
+    *numbers[input.Below(5)] = static_cast<std::int32_t>(input.Word());
+    if (IsFrame(frame, packing)) frame.pixels = nullptr;
+}
+
+// Runs the operation on two frames apart, in the same memory or overlapping, and compares all bytes of the memory that
+// holds the destination with what the references make of the pixels alone.
+void Try(FuzzInput& input, Packing from, Packing to, const Operation& operation) {
+    enum Kind { kSame = 1, kSpoiltSource, kSpoiltDestination, kOverlapping };
+    const std::int32_t kind = input.Below(8);
+    const Layout sourceLayout = ReadLayout(input);
+    const Layout destinationLayout = kind == kSame ? sourceLayout : ReadLayout(input);
+    Frame source(sourceLayout, from), destination(destinationLayout, to);
+    FrameRecord in = source.Record(), out = destination.Record();
+    if (kind == kSpoiltSource) Spoil(input, from, in);
+    if (kind == kSpoiltDestination) Spoil(input, to, out);
+    if (kind == kSpoiltSource || kind == kSpoiltDestination) {
+        for (const Runner runner : kRunners) Require(!operation(runner, in, out));
+        return;
+    }
+    const std::int32_t offset = kind == kOverlapping ? static_cast<std::int32_t>(input.Word()) % 4096 : 0;
+    const bool isShared = kind == kSame || kind == kOverlapping;
+    const std::size_t sourceAt = static_cast<std::size_t>(std::max(-offset, 0));
+    const std::size_t destinationAt = static_cast<std::size_t>(std::max(offset, 0));
+    reelcheck::Dice dice(input.Byte(), "frames");
+    source.Paint(dice);
+    destination.Paint(dice);
+
+    const reelcheck::GuardedMemory home(
+        std::max(isShared ? sourceAt + source.Size() : 0, destinationAt + destination.Size()),
+        input.Below(2) == 0 ? reelcheck::Edge::kFront : reelcheck::Edge::kBack);
+    const auto moveHome = [&home](const Frame& frame, std::size_t at, FrameRecord& record) {
+        record.pixels = home.Data() + at + (static_cast<std::uint8_t*>(record.pixels) - frame.Bytes());
+    };
+    std::memcpy(home.Data() + destinationAt, destination.Bytes(), destination.Size());
+    moveHome(destination, destinationAt, out);
+    if (isShared) {
+        std::memcpy(home.Data() + sourceAt, source.Bytes(), source.Size());
+        std::memcpy(destination.Bytes(), home.Data() + destinationAt, destination.Size());
+        moveHome(source, sourceAt, in);
+    } else {
+        source.ForbidWriting();
+    }
+    std::vector<std::uint8_t> wanted(home.Data(), home.Data() + home.Size());
+    Require(operation(Runner::kLibrary, in, out));
+    for (const Runner runner : {Runner::kReference, Runner::kOtherLevel}) {
+        Frame plainSource({sourceLayout.width, sourceLayout.height}, from);
+        Frame plain({destinationLayout.width, destinationLayout.height}, to);
+        plainSource.CopyRegion(source);
+        plain.CopyRegion(destination);
+        Require(operation(runner, plainSource.Record(), plain.Record()));
+        destination.CopyRegion(plain);
+        std::memcpy(wanted.data() + destinationAt, destination.Bytes(), destination.Size());
+        Require(std::memcmp(wanted.data(), home.Data(), home.Size()) == 0);
+    }
+}
+
+// The state that a reference renders on, beside the library's.
+struct Reference {
     render::RenderState state;
     render::RenderOptions options;
 };
@@ -91,19 +132,17 @@ struct OtherState {
 class Run {
   public:
     Run(FuzzInput& input, IEffectLibrary& library) : m_input(input), m_library(library) {
-        m_reference.options.level = render::SimdLevel::kPlain;
+        m_plain.options.level = render::SimdLevel::kPlain;
         const std::int32_t choice = input.Byte();
         m_other.options.level = std::min(render::kSimdLevels[choice % 5], render::BestSimdLevel());
         if (choice / 5 % 2 != 0) m_other.options.streamedBytes = 0;
         const std::uint32_t seed = input.Byte();
-        for (render::RenderState* state : {ProcessSession().state, &m_reference.state, &m_other.state}) {
+        for (render::RenderState* state : {ProcessSession().state, &m_plain.state, &m_other.state}) {
             *state = {};
             state->random.Seed(seed);
         }
         // What a menu keeps when it is told nonsense must not come from the input before.
-        WordHost zeros;
-        zeros.words.fill(0u);
-        CurrentMasterSettings()->ReadFromHost(zeros);
+        CurrentMasterSettings()->ReadFromHost(m_host);
     }
 
     void Frame() {
@@ -116,113 +155,60 @@ class Run {
     }
 
   private:
+    void ReadValues(IVideoEffect& effect) {
+        m_host.values = {};
+        ChoosePreset(m_host, effect, m_input.Byte() % 32u);
+        for (std::int32_t left = m_input.Below(40); left > 0; --left) {
+            ValueWord& value = m_host.values[static_cast<std::size_t>(m_input.Below(40))];
+            const std::int32_t kind = m_input.Below(4);
+            if (kind < 2) value.number = static_cast<float>(m_input.Byte()) / 255.0f;
+            if (kind == 2) value.bits = m_input.Byte();
+            if (kind == 3) value.bits = m_input.Word();
+        }
+    }
+
     void Effect(std::size_t index) {
         if (m_effects[index] == nullptr) {
             m_effects[index].reset(m_library.CreateEffect(static_cast<std::uint32_t>(index)));
         }
         IVideoEffect& effect = *m_effects[index];
-        ReadWords(m_input, effect, m_host);
-        const TimingRecord timing = {0.0, 0.0, ReadTime(m_input)};
-        const std::int32_t missing = m_input.Below(64);
-        FuzzedFrames frames(m_input, kBgraLayout, kBgraLayout);
-        IVideoHost* const host = missing == 1 ? nullptr : &m_host;
-        const FrameRecord* const source = missing == 2 ? nullptr : &frames.Source();
-        const FrameRecord* const destination = missing == 3 ? nullptr : &frames.Destination();
-        const TimingRecord* const when = missing == 4 ? nullptr : &timing;
-        const bool isWhole = frames.AreValid() && missing != 2 && missing != 3 && missing != 4;
-        if (isWhole) frames.Close(frames.Width());
-        const bool isDone = effect.Process(host, source, nullptr, destination, when);
-        frames.Open();
-        Require(isDone == isWhole);
+        ReadValues(effect);
+        const double seconds = ReadTime(m_input);
         void* face = nullptr;
         Require(effect.QueryInterface(&kIidVideoHost, &face) == kStatusOk);
-        effect.Release();
-        for (OtherState* other : {&m_reference, &m_other}) {
-            if (!isWhole) {
-                // The number counts, though there is no frame.
-                RenderFrame(Session(*other), *static_cast<IVideoHost*>(face), source, destination, when);
-                continue;
-            }
-            FuzzedFrames::Copy copy = frames.TakeCopy();
-            Require(RenderFrame(Session(*other), *static_cast<IVideoHost*>(face), &copy.source,
-                                &copy.destination, when));
-            Require(frames.AreAs(copy));
-        }
-    }
-
-    // All read the values that the library's list has just read, and leave in it what they found.
-    static RenderSession Session(OtherState& other) {
-        return {CurrentMasterSettings(), &other.state, other.options};
+        const Owned<IVideoHost> owner(static_cast<IVideoHost*>(face));
+        const auto render = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
+            if (runner == Runner::kLibrary) return Process(effect, &m_host, source, destination, seconds);
+            // The references read the values that the library's list has just read, and leave in it what they found.
+            Reference& reference = runner == Runner::kReference ? m_plain : m_other;
+            const TimingRecord timing = {0.0, 0.0, seconds};
+            return RenderFrame({CurrentMasterSettings(), &reference.state, reference.options}, *owner,
+                               &source, &destination, &timing);
+        };
+        Try(m_input, Packing::kBgra, Packing::kBgra, render);
     }
 
     void Convert(bool isToBgra) {
-        Owned<IFrameProcessor> processor(NewProcessor());
-        const std::uint8_t alpha = m_input.Byte();
-        const PixelLayout& from = isToBgra ? kYcbcrLayout : kBgraLayout;
-        const PixelLayout& to = isToBgra ? kBgraLayout : kYcbcrLayout;
-        FuzzedFrames frames(m_input, from, to);
-        if (frames.AreValid()) frames.Close(isToBgra ? frames.Source().width : frames.Width());
-        const bool isDone =
-            isToBgra ? processor->ConvertYcbcrToBgra(&frames.Source(), &frames.Destination(), alpha)
-                     : processor->ConvertBgraToYcbcr(&frames.Source(), &frames.Destination(), alpha);
-        frames.Open();
-        Require(isDone == frames.AreValid());
-        if (!isDone) return;
-        FuzzedFrames::Copy copy = frames.TakeCopy();
-        for (std::int32_t y = 0; y < frames.Height(); ++y) {
-            const std::uint8_t* source = Row(copy.source, from, y);
-            std::uint8_t* destination = Row(copy.destination, to, y);
-            if (isToBgra) {
-                DecodeRow(source, copy.source.width, destination, frames.Width(), alpha);
-            } else {
-                EncodeRow(source, destination, frames.Width());
-            }
-        }
-        Require(frames.AreAs(copy));
-    }
-
-    // A processor takes the form that the environment names when it is made.
-    IFrameProcessor* NewProcessor() {
         static constexpr const char* kLevels[] = {"plain", "sse2", "ssse3", "avx2", "avx512"};
-        setenv("VELMORA_FORM", kLevels[m_input.Below(5)], 1);
-        IFrameProcessor* const processor = m_library.CreateFrameProcessor();
-        unsetenv("VELMORA_FORM");
-        return processor;
-    }
-
-    static std::uint8_t* Row(const FrameRecord& frame, const PixelLayout& layout, std::int32_t y) {
-        const std::int64_t step = frame.rowStep < 0 ? -std::int64_t{frame.rowStep} : frame.rowStep;
-        std::int64_t offset = step * (frame.yOrigin + y) + layout.columnOffset(frame.xOrigin);
-        if (frame.rowStep < 0) offset -= step * (std::int64_t{frame.yOrigin} + frame.height - 1);
-        return static_cast<std::uint8_t*>(frame.pixels) + offset;
-    }
-
-    static void DecodeRow(const std::uint8_t* source, std::int32_t sourceWidth, std::uint8_t* bgra,
-                          std::int32_t width, std::uint8_t alpha) {
-        std::array<std::uint8_t, 3 * 256> rgb;
-        Require(sourceWidth <= 256);
-        render::YcbcrRowToRgb(source, rgb.data(), sourceWidth);
-        for (std::size_t x = 0; x < static_cast<std::size_t>(width); ++x) {
-            for (std::size_t channel = 0; channel < 3; ++channel)
-                bgra[4 * x + channel] = rgb[3 * x + 2 - channel];
-            bgra[4 * x + 3] = alpha;
-        }
-    }
-
-    static void EncodeRow(const std::uint8_t* bgra, std::uint8_t* destination, std::int32_t width) {
-        std::array<std::uint8_t, 3 * 256> rgb;
-        for (std::size_t x = 0; x < static_cast<std::size_t>(width); ++x) {
-            for (std::size_t channel = 0; channel < 3; ++channel)
-                rgb[3 * x + channel] = bgra[4 * x + 2 - channel];
-        }
-        render::RgbRowToYcbcr(rgb.data(), destination, width);
+        const char* const level = kLevels[m_input.Below(5)];
+        const std::uint8_t alpha = m_input.Byte();
+        const auto convert = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
+            // A processor takes the SIMD level that the environment names when it is made.
+            setenv("VELMORA_FORM", runner == Runner::kLibrary ? level : kLevels[0], 1);
+            const Owned<IFrameProcessor> processor(m_library.CreateFrameProcessor());
+            unsetenv("VELMORA_FORM");
+            return isToBgra ? processor->ConvertYcbcrToBgra(&source, &destination, alpha)
+                            : processor->ConvertBgraToYcbcr(&source, &destination, alpha);
+        };
+        Try(m_input, isToBgra ? Packing::kYcbcr : Packing::kBgra, isToBgra ? Packing::kBgra : Packing::kYcbcr,
+            convert);
     }
 
     FuzzInput& m_input;
     IEffectLibrary& m_library;
-    WordHost m_host;
+    PlayingHost m_host;
     std::array<Owned<IVideoEffect>, 5> m_effects;
-    OtherState m_reference, m_other;
+    Reference m_plain, m_other;
 };
 
 }  // namespace

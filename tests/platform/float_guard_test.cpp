@@ -40,30 +40,5 @@ TEST(FloatGuard, WorksInItsOwnStateAndGivesTheCallersBack) {
     EXPECT_EQ(after.vector, hostile.vector);
 }
 
-bool IsDownward() {
-    std::uintptr_t flags;
-#if defined(__x86_64__)
-    __asm__ __volatile__("lea -128(%%rsp), %%rsp\n\tpushf\n\tpop %0\n\tlea 128(%%rsp), %%rsp\n\tcld"
-                         : "=r"(flags));
-#else
-    __asm__ __volatile__("pushf\n\tpop %0\n\tcld" : "=r"(flags));
-#endif
-    return (flags & 0x400) != 0;
-}
-
-TEST(FloatGuard, KeepsTheDirectionOfStringOperations) {
-    for (const bool downward : {false, true}) {
-        bool inside = true;
-        if (downward) __asm__ __volatile__("std");
-        {
-            const FloatGuard guard;
-            inside = IsDownward();
-        }
-        const bool after = IsDownward();
-        EXPECT_FALSE(inside);
-        EXPECT_EQ(after, downward);
-    }
-}
-
 }  // namespace
 }  // namespace velmora

@@ -55,7 +55,7 @@ inline bool WaitForEnd(HWND window) {
 
 // What a file dialog shows. The file-type list holds the label; its pattern decides which files are listed.
 struct SeenFileDialog {
-    std::wstring title, label, name;
+    std::wstring title, label;
     int labels = 0;
 };
 
@@ -67,7 +67,7 @@ inline HWND NameField(HWND dialog) {
 }
 
 inline SeenFileDialog See(HWND dialog) {
-    SeenFileDialog seen = {TextOf(dialog), TextOf(FileTypes(dialog)), TextOf(NameField(dialog)), 0};
+    SeenFileDialog seen = {TextOf(dialog), TextOf(FileTypes(dialog)), 0};
     seen.labels = static_cast<int>(SendMessageW(FileTypes(dialog), CB_GETCOUNT, 0, 0));
     return seen;
 }
@@ -96,13 +96,11 @@ struct SeenMessage {
     int buttons = 0;
     bool hasOk = false;
     bool hasExclamation = false;
-    bool isOwned = false;
 };
 
 inline SeenMessage SeeMessage(HWND box) {
     SeenMessage seen;
     seen.caption = TextOf(box);
-    seen.isOwned = GetWindow(box, GW_OWNER) != nullptr;
     HWND child = nullptr;
     while ((child = FindWindowExW(box, child, nullptr, nullptr)) != nullptr) {
         wchar_t name[64] = L"";

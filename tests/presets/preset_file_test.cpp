@@ -14,7 +14,6 @@
 #include <limits>
 #include <string>
 
-#include "effects/film_effect.h"
 #include "tests/presets/fake_library.h"
 #include "tests/presets/temporary_folder.h"
 
@@ -171,32 +170,6 @@ TEST(Presets, KeepEveryByteOfANameThatCanBeInOne) {
     EXPECT_EQ(std::memcmp(record.name, back.name, sizeof record.name), 0);
     EXPECT_STREQ(back.libraryName, record.libraryName);
     EXPECT_STREQ(back.effectName, record.effectName);
-}
-
-TEST(Presets, RoundTripEveryPresetOfEveryEffect) {
-    const TemporaryFolder folder;
-    int presets = 0;
-    for (std::uint32_t effectIndex = 0; effectIndex < effects::kAllEffects.size(); ++effectIndex) {
-        for (std::uint32_t preset = 0; preset < effects::kAllEffects[effectIndex]->presetNames.size();
-             ++preset) {
-            const PresetRecord record = tests::MakeRecord(effectIndex, preset);
-            ASSERT_TRUE(WritePreset(folder.File("a").c_str(), &record));
-            PresetRecord back = {};
-            ASSERT_TRUE(ReadPreset(folder.File("a").c_str(), &back));
-            ASSERT_EQ(back.count, record.count);
-            EXPECT_STREQ(back.name, record.name);
-            for (int i = 0; i < record.count; ++i) {
-                EXPECT_EQ(back.values[i].kind, record.values[i].kind);
-                if (record.values[i].kind == kKindGroup) continue;  // markers hold no value
-                const bool isFlag = record.values[i].kind == kKindCheckBox;
-                const std::uint32_t mask = isFlag ? 0xFFu : 0xFFFFFFFFu;
-                EXPECT_EQ(back.values[i].value.bits & mask, record.values[i].value.bits & mask)
-                    << record.name << " of effect " << effectIndex << ", parameter " << i;
-            }
-            ++presets;
-        }
-    }
-    EXPECT_GT(presets, 20);
 }
 
 TEST(Presets, KeepNumbersThatAreNotFinite) {

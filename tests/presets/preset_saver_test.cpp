@@ -99,26 +99,6 @@ class PresetSaverTest : public testing::Test {
     PresetRecord m_record = tests::MakeRecord(kIndexOfLook, 0);
 };
 
-TEST_F(PresetSaverTest, AnswersToItsIdentifiers) {
-    struct Case {
-        const Guid* iid;
-        Status expected;
-    };
-    const Case cases[] = {{&kIidUnknown, kStatusOk},
-                          {&kIidPresetSaver, kStatusOk},
-                          {&kIidVideoEffect, kStatusNoInterface},
-                          {nullptr, kStatusNoInterface}};
-    for (const Case& c : cases) {
-        void* face = this;
-        EXPECT_EQ(m_saver->QueryInterface(c.iid, &face), c.expected);
-        EXPECT_EQ(face, c.expected == kStatusOk ? m_saver : nullptr);
-        if (c.expected == kStatusOk) {
-            EXPECT_EQ(m_saver->Release(), 1u);
-        }
-    }
-    EXPECT_EQ(m_saver->QueryInterface(&kIidUnknown, nullptr), kStatusFailure);
-}
-
 TEST_F(PresetSaverTest, SavesAndLoadsBack) {
     UserChooses(Wide(m_folder.File("a.fxprelb")));
     EXPECT_EQ(Save(&m_library, &m_record), 0);

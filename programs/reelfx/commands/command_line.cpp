@@ -15,7 +15,7 @@ namespace {
 
 constexpr char kTimeText[] = "seconds or HH:MM:SS";
 
-// Runs `parse` over an option's text; nothing read is a usage error that says what is expected.
+// Parses the text of an option; a failure is a usage error that says what is expected.
 template <class Parse>
 auto Parsed(const char* option, const std::string& text, Parse parse, const char* expected) {
     const auto value = parse(text);
@@ -55,16 +55,17 @@ SectionOptions ReadSection(const TypedOptions& typed) {
     if (!typed.start.empty()) section.start = Parsed("--start", typed.start, ParseTime, kTimeText);
     if (!typed.duration.empty()) {
         section.duration = Parsed("--duration", typed.duration, ParseTime, kTimeText);
-        if (*section.duration <= 0.0) throw UsageError("--duration must be longer than nothing");
+        if (*section.duration <= 0.0) throw UsageError("--duration must be greater than 0");
     }
     if (!typed.frames.empty() && (section.start || section.duration)) {
-        throw UsageError("--frames does not go with --start and --duration");
+        throw UsageError("--frames cannot be combined with --start or --duration");
     }
     if (section.farm && (!typed.frames.empty() || section.start || section.duration)) {
-        throw UsageError("--farm does not go with --frames, --start and --duration");
+        throw UsageError("--farm cannot be combined with --frames, --start or --duration");
     }
     if (section.farm && !typed.randomState.empty()) {
-        throw UsageError("--farm does not go with --random-state: its sequence runs through the whole clip");
+        throw UsageError(
+            "--farm cannot be combined with --random-state, whose sequence runs through the whole clip");
     }
     return section;
 }
@@ -115,10 +116,10 @@ RenderOptions ReadRender(const TypedOptions& typed) {
         output.needsAlpha = typed.matte;
         options.output = output;
     } else if (!typed.digests) {
-        throw UsageError("render needs OUT, or --hash for digests alone");
+        throw UsageError("render needs OUT, or --hash to print digests only");
     }
     if (typed.digests && typed.outPath == "-")
-        throw UsageError("--hash and OUT - both write standard output");
+        throw UsageError("--hash and OUT - both write to standard output");
     options.threads = typed.threads;
     options.mayOverwrite = typed.overwrite;
     options.isMatte = typed.matte;
@@ -138,7 +139,7 @@ PictureOptions ReadPicture(const TypedOptions& typed) {
     return options;
 }
 
-// An effect of the environment is only a default, which --all does not need.
+// An effect from the environment is only a default, which --all ignores.
 bool NamesEffect(const EffectOptions& effect) {
     const char* const fallback = std::getenv("REELFX_EFFECT");
     return (!effect.effect.empty() && (fallback == nullptr || effect.effect != fallback)) || effect.preset ||
@@ -149,7 +150,8 @@ PictureOptions ReadSheet(const TypedOptions& typed) {
     PictureOptions options = ReadPicture(typed);
     if (options.allEffects && NamesEffect(options.effect)) {
         throw UsageError(
-            "--all takes all presets of all effects: leave out --effect, --preset, --preset-file and --set");
+            "--all renders all presets of all effects: leave out --effect, --preset, --preset-file and "
+            "--set");
     }
     return options;
 }

@@ -7,7 +7,8 @@ namespace {
 
 void AddInput(CLI::App& command, TypedOptions& typed) {
     command
-        .add_option("IN", typed.input.path, "Clip, still, image sequence (frames-%03d.png) or - (YUV4MPEG2)")
+        .add_option("IN", typed.input.path,
+                    "Clip, still picture, image sequence (frames-%03d.png) or - (YUV4MPEG2)")
         ->type_name("FILE")
         ->required();
     command.add_option("--size", typed.size, "IN is raw BGRA of this size")->type_name("WxH");
@@ -15,13 +16,17 @@ void AddInput(CLI::App& command, TypedOptions& typed) {
 }
 
 void AddEffect(CLI::App& command, TypedOptions& typed) {
-    command.add_option("--effect,-e", typed.effect.effect, "Effect, see reelfx list")
+    command.add_option("--effect,-e", typed.effect.effect, "Effect; reelfx list shows all")
         ->type_name("EFFECT")
         ->envname("REELFX_EFFECT");
     command.add_option("--preset,-p", typed.preset, "Preset of the effect")->type_name("PRESET");
-    command.add_option("--preset-file", typed.presetFile, "Preset file, as editors save it")
+    command
+        .add_option("--preset-file", typed.presetFile,
+                    "Preset file as saved by editors or reelfx preset save")
         ->type_name("FILE");
-    command.add_option("--set,-s", typed.effect.settings, "One parameter, after the preset; repeatable")
+    command
+        .add_option("--set,-s", typed.effect.settings,
+                    "Set one parameter, overriding the preset; may be repeated")
         ->type_name("NAME=VALUE")
         ->allow_extra_args(false);
 }
@@ -29,14 +34,14 @@ void AddEffect(CLI::App& command, TypedOptions& typed) {
 void AddRandom(CLI::App& command, TypedOptions& typed) {
     command
         .add_option("--seed", typed.seed,
-                    "Another seed gives other shake, flicker and damage; with 0 flicker and scratches are "
-                    "the library's")
+                    "Another seed gives other shake, flicker and damage; with 0, flicker and scratches are "
+                    "those of the Windows library")
         ->type_name("N")
         ->capture_default_str()
         ->envname("REELFX_SEED");
     command
         .add_option("--random-state", typed.randomState,
-                    "Play one random sequence from this state, as a host of the library does")
+                    "Use one continuous random sequence from this state, as the Windows library does")
         ->type_name("HEX");
 }
 
@@ -46,26 +51,26 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
     render.add_option("OUT", typed.outPath, "File, image pattern, or - (YUV4MPEG2)")->type_name("FILE");
     AddEffect(render, typed);
     AddRandom(render, typed);
-    render.add_option("--frames", typed.frames, "Frames A up to but not including B; either may be left out")
+    render
+        .add_option("--frames", typed.frames,
+                    "Frames from A up to but not including B; either may be omitted")
         ->type_name("A:B");
     render
-        .add_option(
-            "--farm", typed.farm,
-            "Part N of M parts of about the same length, without sound, for rendering one clip on many "
-            "machines; farm-join puts the parts together")
+        .add_option("--farm", typed.farm,
+                    "Render part N of M parts of about the same length, without sound, for rendering one "
+                    "clip on many "
+                    "machines; farm-join joins the parts")
         ->type_name("N/M");
-    render.add_option("--start", typed.start, "Begin at this time of the clip")->type_name("TIME");
-    render.add_option("--duration", typed.duration, "Length of the part")->type_name("TIME");
+    render.add_option("--start", typed.start, "Start at this time of the clip")->type_name("TIME");
+    render.add_option("--duration", typed.duration, "Render only this long")->type_name("TIME");
     render.add_option("--threads,-j", typed.threads, "Frames rendered at once; 0: all processors")
         ->type_name("N")
         ->check(CLI::Range(0, 256))
         ->envname("REELFX_THREADS");
-    render.add_option("--format", typed.format, "Container, where OUT's ending does not tell")
+    render.add_option("--format", typed.format, "Container, if the file name extension of OUT does not say")
         ->type_name("FORMAT");
-    render.add_option("--codec", typed.codec, "Codec of the picture")
-        ->type_name("CODEC")
-        ->envname("REELFX_CODEC");
-    render.add_option("--crf", typed.crf, "Quality in the codec's own scale")
+    render.add_option("--codec", typed.codec, "Video codec")->type_name("CODEC")->envname("REELFX_CODEC");
+    render.add_option("--crf", typed.crf, "Quality, on the codec's own scale")
         ->type_name("N")
         ->envname("REELFX_CRF");
     render.add_option("--pix-fmt", typed.pixelFormat, "Pixel format; default: the source's")
@@ -73,23 +78,23 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         ->envname("REELFX_PIX_FMT");
     render.add_flag(
         "--matte", typed.matte,
-        "Write the damage alone (wear, spots, scratches) on transparent, with straight alpha and without "
-        "sound, to lay over the picture in other programs");
+        "Write only the damage (wear, spots, scratches) on a transparent background, with straight alpha "
+        "and without sound, for compositing in other programs");
     render.add_flag("--raw-bgra", typed.output.isRawBgra, "OUT is raw BGRA frames");
-    render.add_flag("--hash", typed.digests, "Print the MD5 of each frame's BGRA; OUT may be left out");
-    render.add_flag("--no-sound", typed.noSound, "Leave sound and subtitles out");
+    render.add_flag("--hash", typed.digests, "Print the MD5 of each frame as BGRA; OUT may be omitted");
+    render.add_flag("--no-sound", typed.noSound, "Leave out sound and subtitles");
     render.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
     render
         .add_option(
             "--progress", typed.progress,
-            "On standard error: text for people, a line of JSON each time for programs; auto is text at a "
-            "terminal, else none")
+            "Progress on standard error: text for people, lines of JSON for programs; auto means text at a "
+            "terminal, otherwise none")
         ->type_name("auto|none|text|json")
         ->capture_default_str()
         ->envname("REELFX_PROGRESS");
-    render.add_flag("--quiet,-q", typed.quiet, "As --progress none");
+    render.add_flag("--quiet,-q", typed.quiet, "Same as --progress none");
     render.add_flag("--dry-run", typed.dryRun,
-                    "Check everything and tell what would be done, but write nothing");
+                    "Check everything and print what would be done, but write nothing");
 }
 
 // What differs in the help of the commands that write stills.
@@ -110,7 +115,7 @@ CLI::App& AddPicture(CLI::App& app, TypedOptions& typed, const char* name, const
                                    ->check(CLI::NonNegativeNumber);
     command
         .add_option("--start", typed.start,
-                    "Instead of --frame: the first frame from this time of the clip on")
+                    "Instead of --frame: the first frame at or after this time of the clip")
         ->type_name("TIME")
         ->excludes(frame);
     command.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
@@ -136,41 +141,42 @@ void AddPictures(CLI::App& app, TypedOptions& typed) {
     CLI::App& sheet = AddPicture(
         app, typed, "sheet",
         {.what = "Write one frame through all presets of an effect",
-         .out = "PNG or JPEG; with --all a folder, or a name with %s for the effect's: sheets/%s.jpg",
-         .frame = "Frame of the clip, counted from 0; default: the clip's middle, of a pipe the first"});
+         .out = "PNG or JPEG; with --all a folder, or a name with %s for the effect's name: sheets/%s.jpg",
+         .frame = "Frame of the clip, counted from 0; default: the middle one, or the first of a pipe"});
     AddWidth(sheet, typed);
-    AddColumns(sheet, typed, "Pictures in a row; default: 4");
-    sheet.add_flag("--all", typed.picture.allEffects, "A sheet of each effect, film-camera.png and so on");
+    AddColumns(sheet, typed, "Pictures per row; default: 4");
+    sheet.add_flag("--all", typed.picture.allEffects,
+                   "Write a sheet for each effect: film-camera.png and so on");
     CLI::App& strip = AddPicture(
         app, typed, "strip",
         {.what = "Write successive frames through an effect side by side at 100 %, to judge motion",
          .out = "PNG or JPEG",
-         .frame =
-             "First frame, counted from 0; default: so that the frames are the clip's middle, of a pipe its "
-             "first"});
-    strip.add_option("--frames", typed.stripFrames, "How many frames; fewer come where the clip ends")
+         .frame = "First frame, counted from 0; default: the frames in the middle of the clip, or the first "
+                  "ones of "
+                  "a pipe"});
+    strip.add_option("--frames", typed.stripFrames, "Number of frames; fewer if the clip ends earlier")
         ->type_name("N")
         ->capture_default_str()
         ->check(CLI::Range(1, 240));
     strip
-        .add_option(
-            "--crop", typed.crop,
-            "What each picture shows, in pixels from the left and the top; without +X+Y in the middle. "
-            "Default: the middle, 540 high and so wide that a row fills 1920 pixels")
+        .add_option("--crop", typed.crop,
+                    "The part that each picture shows, in pixels from the left and the top; without +X+Y, in "
+                    "the middle. "
+                    "Default: the middle, 540 pixels high and wide enough for a row of 1920 pixels")
         ->type_name("WxH+X+Y");
-    AddColumns(strip, typed, "Pictures in a row; default: all");
+    AddColumns(strip, typed, "Pictures per row; default: all");
 }
 
 void AddPreset(CLI::App& app, TypedOptions& typed) {
     CLI::App& preset = *app.add_subcommand("preset", "Show and save preset files");
     preset.require_subcommand(1);
-    CLI::App& show = *preset.add_subcommand("show", "Print what a preset file holds");
+    CLI::App& show = *preset.add_subcommand("show", "Print the contents of a preset file");
     show.add_option("FILE", typed.presetShow.file, "Preset file")->type_name("FILE")->required();
-    show.add_flag("--json", typed.presetShow.asJson, "As JSON");
+    show.add_flag("--json", typed.presetShow.asJson, "Print as JSON");
     CLI::App& save = *preset.add_subcommand("save", "Write settings as a preset file");
     save.add_option("FILE", typed.presetSave.file, "Preset file")->type_name("FILE")->required();
     AddEffect(save, typed);
-    save.add_option("--name", typed.presetSave.name, "The preset's name; default: the file's")
+    save.add_option("--name", typed.presetSave.name, "Name of the preset; default: the file name")
         ->type_name("TEXT");
     save.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing FILE");
 }
@@ -178,16 +184,16 @@ void AddPreset(CLI::App& app, TypedOptions& typed) {
 void AddList(CLI::App& app, TypedOptions& typed) {
     CLI::App& list = *app.add_subcommand("list", "List effects, parameters and presets");
     list.add_option("EFFECT", typed.listEffect, "Only this effect")->type_name("EFFECT");
-    list.add_flag("--json", typed.list.asJson, "As JSON");
-    CLI::App& presets = *app.add_subcommand("presets", "List an effect's presets with what each one sets");
+    list.add_flag("--json", typed.list.asJson, "Print as JSON");
+    CLI::App& presets = *app.add_subcommand("presets", "List the presets of an effect with their settings");
     presets.add_option("EFFECT", typed.presets.effect, "The effect")->type_name("EFFECT")->required();
-    presets.add_flag("--json", typed.presets.asJson, "As JSON");
+    presets.add_flag("--json", typed.presets.asJson, "Print as JSON");
 }
 
 void AddInfo(CLI::App& app, TypedOptions& typed) {
-    CLI::App& info = *app.add_subcommand("info", "Tell what a clip is and what rendering would do with it");
+    CLI::App& info = *app.add_subcommand("info", "Describe a clip and how it would be rendered");
     AddInput(info, typed);
-    info.add_flag("--json", typed.info.asJson, "As JSON");
+    info.add_flag("--json", typed.info.asJson, "Print as JSON");
 }
 
 std::string ExitCodesText() {

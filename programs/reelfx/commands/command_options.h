@@ -29,20 +29,21 @@ struct ExitMeaning {
 };
 inline constexpr std::array kExitMeanings = {
     ExitMeaning{kExitDone, "done", "done"},
-    ExitMeaning{kExitInternal, "internal failure",
-                "a fault of the program or of the machine, such as no memory"},
-    ExitMeaning{kExitUsage, "command line",
-                "the command line: an unknown effect, preset, parameter or option, a value out of range"},
-    ExitMeaning{kExitInput, "input", "the input cannot be read or holds no picture"},
-    ExitMeaning{kExitOutput, "output", "the output exists already, cannot be written, or the disk is full"},
-    ExitMeaning{kExitInterrupted, "interrupted", "interrupted by Ctrl-C or a polite stop"},
+    ExitMeaning{kExitInternal, "internal error",
+                "an error in the program or the machine, such as not enough memory"},
+    ExitMeaning{
+        kExitUsage, "command line",
+        "invalid command line: an unknown effect, preset, parameter or option, or a value out of range"},
+    ExitMeaning{kExitInput, "input", "the input cannot be read or contains no video"},
+    ExitMeaning{kExitOutput, "output", "the output already exists or cannot be written, or the disk is full"},
+    ExitMeaning{kExitInterrupted, "interrupted", "interrupted by SIGINT or SIGTERM"},
 };
 
 inline constexpr char kOnInterrupt[] =
-    "Ctrl-C keeps the frames finished so far as a playable file, unless OUT replaces an older one; a second "
-    "Ctrl-C keeps nothing.";
+    "Ctrl-C keeps the frames finished so far as a playable file, unless OUT replaces an older one. After a "
+    "second Ctrl-C nothing is kept.";
 
-// Options as they are typed, before they are read.
+// Options as typed, before they are parsed.
 struct TypedOptions {
     InputOptions input;
     EffectOptions effect;

@@ -59,8 +59,9 @@ void Print(const std::string& name, const MediaFacts& facts) {
     if (facts.pixelShape != "1:1") size += ", pixels " + facts.pixelShape;
     Line("size", size);
     Line("rate", RateText(facts.rate) + " fps");
-    Line("length", (facts.frames > 0 ? std::to_string(facts.frames) + " frames" : "frames not known") +
-                       (facts.seconds > 0.0 ? ", " + NumberText(facts.seconds) + " s" : ""));
+    Line("length",
+         (facts.frames > 0 ? std::to_string(facts.frames) + " frames" : "number of frames unknown") +
+             (facts.seconds > 0.0 ? ", " + NumberText(facts.seconds) + " s" : ""));
     Line("picture", facts.codec + " " + facts.pixelFormat + " in " + facts.container);
     Line("colour", "matrix " + facts.matrix + ", range " + facts.range + ", primaries " + facts.primaries +
                        ", transfer " + facts.transfer);
@@ -80,7 +81,7 @@ ExitCode RunInfo(const InfoOptions& options) {
     const MediaReader reader(options.input);
     const MediaFacts facts = FactsOf(reader);
     if (options.asJson) {
-        // Containers' texts may be of any encoding: what is no UTF-8 is replaced.
+        // Texts in containers can have any encoding: invalid UTF-8 is replaced.
         const Json json = JsonOf(reader.Name(), facts);
         std::printf("%s\n", json.dump(2, ' ', false, Json::error_handler_t::replace).c_str());
     } else {

@@ -47,7 +47,7 @@ class SheetPlaces {
         namespace fs = std::filesystem;
         if (out.find(kNameMark) == std::string::npos) {
             if (!IsFolder(out))
-                throw UsageError(out + ": --all takes a folder, or a name like sheets/%s.png");
+                throw UsageError(out + ": --all needs a folder, or a name like sheets/%s.png");
             m_pattern = (fs::path(out) / kNameMark).string() + ".png";
         }
         CheckStillName(m_pattern);
@@ -55,7 +55,8 @@ class SheetPlaces {
         const fs::path folder = fs::path(m_pattern).parent_path();
         if (folder.empty() || fs::is_directory(folder, error)) return;
         if (!fs::create_directory(folder, error))
-            throw Failure(kExitOutput, folder.string() + ": the folder cannot be made: " + error.message());
+            throw Failure(kExitOutput,
+                          folder.string() + ": the folder cannot be created: " + error.message());
         m_made = folder;
     }
     ~SheetPlaces() {

@@ -77,7 +77,7 @@ class RenderRun {
     }
 
     [[nodiscard]] unsigned ThreadCount() const {
-        // A running sequence of random numbers goes through the frames one after the other.
+        // A continuous random sequence needs the frames in order.
         if (m_choice.IsSequence()) return 1;
         return m_options.threads > 0 ? static_cast<unsigned>(m_options.threads)
                                      : std::max(1u, std::thread::hardware_concurrency());
@@ -112,34 +112,32 @@ class RenderRun {
         m_writer->WriteFrame(std::move(item.frame));
     }
 
-    // One line of what the clip lacks; what could be decoded was rendered.
+    // One line that says what is wrong with the clip.
     void TellOfDamage() const {
         const double missing = m_reader.MissingSeconds();
         std::string what;
         if (m_reader.DamagedPackets() > 0) {
             what = "damaged in " + std::to_string(m_reader.DamagedPackets()) + " places";
         }
-        if (missing > 0.0)
-            what += (what.empty() ? "ends " : ", ends ") + NumberText(missing) + " s too early";
+        if (missing > 0.0) what += (what.empty() ? "ends " : ", ends ") + NumberText(missing) + " s early";
         if (what.empty()) return;
-        std::fprintf(stderr, "reelfx: %s: %s; what could be decoded was rendered\n", m_reader.Name().c_str(),
-                     what.c_str());
+        std::fprintf(stderr, "reelfx: %s: %s; the part that could be decoded was rendered\n",
+                     m_reader.Name().c_str(), what.c_str());
     }
 
-    // A file that stood there before is worth more than a part of its successor.
+    // A complete older file is worth more than part of a new one.
     [[noreturn]] void FinishPart(const std::string& why, ExitCode code) {
         if (!m_writer || m_frames == 0 || m_place->ReplacesFile()) {
             throw Failure(code, why + "; nothing was written");
         }
         m_writer->Finish();
         m_place->Keep();
-        throw Failure(
-            code, why + "; " + m_place->Name() + " holds the first " + std::to_string(m_frames) + " frames");
+        throw Failure(code, why + "; " + m_place->Name() + " contains the first " + std::to_string(m_frames) +
+                                " frames");
     }
 
     [[noreturn]] void FailEmpty() const {
-        throw Failure(kExitInput, m_reader.Name() +
-                                      ": there is no frame in the part asked for; the clip has " +
+        throw Failure(kExitInput, m_reader.Name() + ": no frame in the requested part; the clip has " +
                                       std::to_string(m_reader.FrameCountGuess()) + " frames");
     }
 

@@ -36,7 +36,7 @@ std::string SettingsText(const EffectChoice& choice) {
 }
 
 std::string RandomText(const EffectOptions& options) {
-    if (options.randomState) return "one sequence from state " + HexText(*options.randomState);
+    if (options.randomState) return "continuous sequence from state " + HexText(*options.randomState);
     return "seed " + std::to_string(options.seed);
 }
 
@@ -52,7 +52,7 @@ std::string PlanText(const RenderOptions& options, const SectionOptions& section
     for (const std::string& note : NotesOn(facts)) text += Line("note", note);
     text += Line("part", SectionText(section, ClipSection::FrameCountGuess(reader, section)));
     text += Line("effect", effect);
-    if (options.isMatte) text += Line("matte", "the damage alone, with straight alpha");
+    if (options.isMatte) text += Line("matte", "only the damage, with straight alpha");
     text += Line("settings", SettingsText(choice));
     text += Line("random", RandomText(options.effect));
     text += Line("threads", std::to_string(threads));

@@ -41,7 +41,7 @@ Rectangle PartOf(const BgraPicture& picture, const std::optional<Crop>& crop, in
     if (part.left < 0 || part.top < 0 || part.left > picture.Width() - part.width ||
         part.top > picture.Height() - part.height) {
         throw UsageError("--crop " + (crop->corner ? TextOf(part) : TextOf(size)) +
-                         " reaches out of the picture of " +
+                         " extends beyond the picture of " +
                          TextOf(FrameSize{picture.Width(), picture.Height()}));
     }
     return part;

@@ -41,7 +41,7 @@ EffectChoice::EffectChoice(const EffectOptions& options) : m_options(options) {
     if (options.presetFile) record = LoadPresetFile(*options.presetFile);
     std::string effect = options.effect;
     if (effect.empty() && record) effect = PresetEffect(*record);
-    if (effect.empty()) throw UsageError("--effect is missing; reelfx list shows which there are");
+    if (effect.empty()) throw UsageError("--effect is missing; reelfx list shows the effects");
     m_index = FindEffect(CoreEffects(), effect);
     m_info = &CoreEffects()[m_index];
     if (options.preset) m_preset = FindPreset(*m_info, *options.preset);

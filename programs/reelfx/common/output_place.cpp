@@ -20,7 +20,7 @@ namespace {
 namespace fs = std::filesystem;
 
 std::string ExistsText(const std::string& name) {
-    return name + ": exists already; --overwrite replaces it";
+    return name + ": already exists; use --overwrite to replace it";
 }
 
 // The first file that a pattern names, for either usual start of counting; the path itself without one.
@@ -89,7 +89,8 @@ fs::path MakeHiddenFolder(const fs::path& beside, const std::string& name, int& 
 void CheckOutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage) {
     if (path == "-") {
         if (isatty(STDOUT_FILENO) == 0) return;
-        throw Failure(kExitOutput, "standard output is a terminal; pipe it into a program or name a file");
+        throw Failure(kExitOutput,
+                      "standard output is a terminal; pipe it into a program or give a file name");
     }
     std::error_code ignored;
     const fs::file_status status = fs::status(path, ignored);

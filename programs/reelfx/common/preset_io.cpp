@@ -35,7 +35,7 @@ std::vector<std::uint32_t> KindsOf(const EffectInfo& effect) {
 
 PresetRecord LoadPresetFile(const std::string& path) {
     std::error_code ignored;
-    if (!std::filesystem::exists(path, ignored)) throw Failure(kExitInput, path + ": there is no such file");
+    if (!std::filesystem::exists(path, ignored)) throw Failure(kExitInput, path + ": no such file");
     PresetRecord record{};
     if (!ReadPreset(path.c_str(), &record)) throw Failure(kExitInput, path + ": is not a preset file");
     return record;
@@ -52,7 +52,7 @@ std::vector<Setting> PresetSettings(const PresetRecord& record, const EffectInfo
                                     const std::string& path) {
     if (!IsCompatible(kLibraryName, effect.name.c_str(), KindsOf(effect), &record)) {
         throw Failure(kExitInput, path + ": is a preset of \"" + PresetEffect(record) + "\" in \"" +
-                                      FieldText(record.libraryName) + "\", it does not fit \"" + effect.name +
+                                      FieldText(record.libraryName) + "\" and does not fit \"" + effect.name +
                                       '"');
     }
     std::vector<Setting> settings;
@@ -64,7 +64,7 @@ std::vector<Setting> PresetSettings(const PresetRecord& record, const EffectInfo
 
 void SavePresetFile(const std::string& path, const std::string& name, const EffectInfo& effect,
                     const std::vector<ValueWord>& values, bool mayOverwrite) {
-    if (path == "-") throw UsageError("a preset is saved in a file, not on standard output");
+    if (path == "-") throw UsageError("a preset can only be saved to a file, not to standard output");
     OutputPlace place(path, mayOverwrite);
     PresetRecord record{};
     FillField(record.name, name);

@@ -62,7 +62,7 @@ constexpr AlphaRow kAlphaCodecs[] = {
 };
 
 constexpr char kAlphaHint[] =
-    " carries no transparency; ffv1, png, qtrle, prores_ks and, in WebM, libvpx-vp9 do";
+    " does not support transparency; ffv1, png, qtrle, prores_ks and, in WebM, libvpx-vp9 do";
 
 bool CarriesAlpha(AVPixelFormat format) {
     const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
@@ -93,7 +93,7 @@ AVPixelFormat AlphaPixelFormat(const AVCodec& codec, const AVOutputFormat& conta
 
 AVPixelFormat AskedPixelFormat(const std::string& name, const AVCodec& codec, const AVFrame& source) {
     const AVPixelFormat asked = av_get_pix_fmt(name.c_str());
-    if (asked == AV_PIX_FMT_NONE) throw Failure(kExitUsage, "there is no pixel format \"" + name + '"');
+    if (asked == AV_PIX_FMT_NONE) throw Failure(kExitUsage, "unknown pixel format \"" + name + '"');
     const std::vector<AVPixelFormat> formats = FormatsOf(codec);
     std::string names;
     for (const AVPixelFormat format : formats) {
@@ -101,8 +101,8 @@ AVPixelFormat AskedPixelFormat(const std::string& name, const AVCodec& codec, co
         if (Fits(codec, format, source)) names += std::string(" ") + av_get_pix_fmt_name(format);
     }
     if (formats.empty()) return asked;
-    throw Failure(kExitUsage, std::string("codec ") + codec.name + " does not take pixel format \"" + name +
-                                  "\" at this size; it takes" + names);
+    throw Failure(kExitUsage, std::string("codec ") + codec.name + " does not support pixel format \"" +
+                                  name + "\" at this size; it supports" + names);
 }
 
 }  // namespace
@@ -113,12 +113,13 @@ const AVOutputFormat& ChooseContainer(const OutputOptions& options) {
     if (!name && options.path == "-") name = "yuv4mpegpipe";
     const AVOutputFormat* format = name ? av_guess_format(name, nullptr, nullptr)
                                         : av_guess_format(nullptr, options.path.c_str(), nullptr);
-    if (!format && name) throw Failure(kExitUsage, std::string("there is no format \"") + name + '"');
+    if (!format && name) throw Failure(kExitUsage, std::string("unknown format \"") + name + '"');
     if (!format) {
-        throw Failure(kExitUsage, options.path + ": no format goes by that ending; name one with --format");
+        throw Failure(kExitUsage,
+                      options.path + ": unknown file name extension; choose the format with --format");
     }
     if (format->video_codec == AV_CODEC_ID_NONE) {
-        throw Failure(kExitUsage, options.path + ": the format " + format->name + " holds no picture");
+        throw Failure(kExitUsage, options.path + ": the format " + format->name + " cannot hold video");
     }
     return *format;
 }
@@ -132,11 +133,11 @@ const AVCodec& ChooseCodec(const OutputOptions& options, const AVOutputFormat& c
             if (descriptor) codec = avcodec_find_encoder(descriptor->id);
         }
         if (!codec || codec->type != AVMEDIA_TYPE_VIDEO) {
-            throw Failure(kExitUsage, "there is no video codec \"" + *options.codec + "\" to write with");
+            throw Failure(kExitUsage, "unknown video codec \"" + *options.codec + "\"");
         }
         if (avformat_query_codec(&container, codec->id, FF_COMPLIANCE_NORMAL) == 0) {
             throw Failure(kExitUsage,
-                          std::string("the format ") + container.name + " does not hold " + codec->name);
+                          std::string("the format ") + container.name + " cannot hold " + codec->name);
         }
         return *codec;
     }
@@ -148,7 +149,7 @@ const AVCodec& ChooseCodec(const OutputOptions& options, const AVOutputFormat& c
         av_guess_codec(&container, nullptr, options.path.c_str(), nullptr, AVMEDIA_TYPE_VIDEO);
     const AVCodec* codec = avcodec_find_encoder(id);
     if (!codec) {
-        throw Failure(kExitUsage, std::string("there is no codec here to write ") + container.name + " with");
+        throw Failure(kExitUsage, std::string("no codec available for the format ") + container.name);
     }
     return *codec;
 }
@@ -159,7 +160,8 @@ AVPixelFormat ChoosePixelFormat(const OutputOptions& options, const AVCodec& cod
     if (options.pixelFormat) {
         const AVPixelFormat asked = AskedPixelFormat(*options.pixelFormat, codec, source);
         if (options.needsAlpha && !CarriesAlpha(asked)) {
-            throw Failure(kExitUsage, "pixel format " + *options.pixelFormat + " carries no transparency");
+            throw Failure(kExitUsage,
+                          "pixel format " + *options.pixelFormat + " does not support transparency");
         }
         if (options.needsAlpha) CheckAlphaHolds(codec, container);
         return asked;
@@ -194,7 +196,7 @@ void SetQuality(const OutputOptions& options, const AVCodec& codec, AVCodecConte
     }
     const bool hasCrf = encoder.priv_data && av_opt_find(encoder.priv_data, "crf", nullptr, 0, 0);
     if (options.crf) {
-        if (!hasCrf) throw Failure(kExitUsage, std::string("codec ") + codec.name + " knows no --crf");
+        if (!hasCrf) throw Failure(kExitUsage, std::string("codec ") + codec.name + " has no --crf setting");
         if (av_opt_set(encoder.priv_data, "crf", NumberText(*options.crf).c_str(), 0) < 0) {
             throw Failure(kExitUsage, std::string("--crf ") + NumberText(*options.crf) +
                                           " is outside the range of codec " + codec.name);

@@ -102,18 +102,19 @@ std::vector<std::string> NotesOn(const MediaFacts& facts) {
     const auto note = [&](bool applies, const std::string& text) {
         if (applies) notes.push_back(text);
     };
-    note(facts.turn != 0, "the picture lies " + std::to_string(facts.turn) +
-                              " degrees off; effects work on it upright, and it stays turned as it is");
+    note(facts.turn != 0, "rotation tag " + std::to_string(facts.turn) +
+                              " degrees: effects are applied to the upright picture, the tag is kept");
     note(facts.bits > 8,
-         "samples of " + std::to_string(facts.bits) +
-             " bits: frames that an effect changes are rounded to 8 bits a channel, others stay");
-    note(facts.isUnevenRate, "frames come at uneven times, which are kept");
+         std::to_string(facts.bits) +
+             " bits per channel: frames changed by an effect are rounded to 8 bits, others are kept");
+    note(facts.isUnevenRate, "variable frame rate: the times of the frames are kept");
     note(facts.isInterlaced, "interlaced: both fields of a frame are rendered as one picture");
     note(facts.matrix == "unknown" && facts.assumedMatrix != "gbr",
-         "the colour matrix is not told; " + facts.assumedMatrix + " is taken, as players do at this size");
+         "no colour matrix tagged; assuming " + facts.assumedMatrix + ", as players do at this size");
     note(facts.transfer == "smpte2084" || facts.transfer == "arib-std-b67",
-         "high dynamic range (" + facts.transfer + "): effects treat the code values as they are");
-    note(facts.frames == 0, "the number of frames is not known before the end");
+         "high dynamic range (" + facts.transfer +
+             "): effects are applied to the code values without conversion");
+    note(facts.frames == 0, "the number of frames is unknown until the end");
     return notes;
 }
 

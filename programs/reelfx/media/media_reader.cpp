@@ -35,13 +35,14 @@ MediaReader::MediaReader(const InputOptions& options) : MediaReader(options, Clo
     if (!m_breakOff.empty()) FailReading(m_breakOff);
     // Decoders that have no memory may call all packets invalid.
     if (m_damaged > 0) ThrowIfNoMemory(AVERROR_EXTERNAL);
-    FailReading(m_damaged > 0 ? "no frame can be decoded" : "there is no frame in it");
+    FailReading(m_damaged > 0 ? "no frame can be decoded" : "contains no frame");
 }
 
 void MediaReader::Open(const InputOptions& options) {
     std::error_code ignored;
     if (std::filesystem::is_directory(options.path, ignored)) {
-        throw Failure(kExitInput, m_name + ": is a folder; give a file or a pattern like frames-%03d.png");
+        throw Failure(kExitInput,
+                      m_name + ": is a folder; use a file name or a pattern like frames-%03d.png");
     }
     AvOptions entries;
     if (options.rawSize) {
@@ -65,7 +66,7 @@ void MediaReader::Open(const InputOptions& options) {
     if (error < 0) FailReading("cannot be read: " + AvText(error), error);
     m_container.reset(container);
     error = avformat_find_stream_info(container, nullptr);
-    if (error < 0) FailReading("cannot be read: no stream is known", error);
+    if (error < 0) FailReading("cannot be read: no known stream", error);
 }
 
 // A signal ends the waiting for input too.
@@ -78,7 +79,7 @@ void MediaReader::FailReading(const std::string& text, int error) const {
 void MediaReader::OpenDecoder() {
     const AVCodec* codec = nullptr;
     const int index = av_find_best_stream(m_container.get(), AVMEDIA_TYPE_VIDEO, -1, -1, &codec, 0);
-    if (index < 0 || !codec) throw Failure(kExitInput, m_name + ": has no picture that can be decoded");
+    if (index < 0 || !codec) throw Failure(kExitInput, m_name + ": contains no video that can be decoded");
     m_stream = m_container->streams[index];
     m_decoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
     int error = avcodec_parameters_to_context(m_decoder.get(), m_stream->codecpar);
@@ -90,7 +91,8 @@ void MediaReader::OpenDecoder() {
 
 std::vector<std::int64_t> MediaReader::FrameTimes(const InputOptions& options) {
     MediaReader reader(options, Closed{});
-    if (options.path == "-") throw Failure(kExitInput, reader.m_name + ": has no length known beforehand");
+    if (options.path == "-")
+        throw Failure(kExitInput, reader.m_name + ": its length is not known in advance");
     reader.Open(options);
     reader.OpenDecoder();
     AVFormatContext& container = *reader.m_container;

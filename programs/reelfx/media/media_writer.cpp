@@ -202,7 +202,7 @@ std::string MediaWriter::Description() const {
         const AVCodecParameters& parameters = *other.stream->codecpar;
         const char* kind = av_get_media_type_string(parameters.codec_type);
         text += std::string(", ") + (kind ? kind : "stream") + " " + avcodec_get_name(parameters.codec_id) +
-                (other.transcoder ? " encoded anew" : " as it is");
+                (other.transcoder ? " (encoded)" : " (copied)");
     }
     return text;
 }
@@ -309,9 +309,10 @@ void MediaWriter::Finish() {
 }
 
 void MediaWriter::FailOnePicture() const {
-    throw Failure(kExitUsage, m_name +
-                                  ": holds one picture; give a pattern like frames-%04d.png, or choose "
-                                  "a frame with --frames");
+    throw Failure(kExitUsage,
+                  m_name +
+                      ": can hold only one picture; use a pattern like frames-%04d.png, or select "
+                      "one frame with --frames");
 }
 
 void MediaWriter::Fail(int error) const {

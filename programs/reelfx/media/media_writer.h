@@ -28,7 +28,7 @@ class MediaWriter {
     // Checks what Begin and the frames would, as far as it shows without writing: that the container takes the
     // streams, and that there is room for `frames` frames (0: not known). Nothing can be written afterwards.
     void Rehearse(std::int64_t frames);
-    // "out.mp4: mp4, libx264 yuv420p, audio aac as it is"
+    // "out.mp4: mp4, libx264 yuv420p, audio aac (copied)"
     [[nodiscard]] std::string Description() const;
     // Opens the output and writes what stands before the frames.
     void Begin();

@@ -25,14 +25,14 @@ int NearestRate(const AVCodec& codec, int wanted) {
 
 CodecPtr OpenDecoder(const AVStream& source) {
     const AVCodec* codec = avcodec_find_decoder(source.codecpar->codec_id);
-    if (!codec) throw Failure(kExitInput, "the sound cannot be decoded; --no-sound leaves it out");
+    if (!codec) throw Failure(kExitInput, "the sound cannot be decoded; use --no-sound to leave it out");
     CodecPtr decoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
     avcodec_parameters_to_context(decoder.get(), source.codecpar);
     decoder->pkt_timebase = source.time_base;
     const int error = avcodec_open2(decoder.get(), codec, nullptr);
     ThrowIfNoMemory(error);
     if (error < 0) {
-        throw Failure(kExitInput, "the sound cannot be decoded; --no-sound leaves it out");
+        throw Failure(kExitInput, "the sound cannot be decoded; use --no-sound to leave it out");
     }
     return decoder;
 }
@@ -42,7 +42,7 @@ CodecPtr OpenDecoder(const AVStream& source) {
 SoundTranscoder::SoundTranscoder(const AVStream& source, AVCodecID target, bool globalHeader)
     : m_sourceBase(source.time_base), m_decoder(OpenDecoder(source)) {
     const AVCodec* codec = avcodec_find_encoder(target);
-    if (!codec) throw Failure(kExitOutput, "the sound cannot be encoded; --no-sound leaves it out");
+    if (!codec) throw Failure(kExitOutput, "the sound cannot be encoded; use --no-sound to leave it out");
     m_encoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
     const int channels = std::min(m_decoder->ch_layout.nb_channels, 8);
     av_channel_layout_default(&m_encoder->ch_layout, channels);
@@ -55,7 +55,7 @@ SoundTranscoder::SoundTranscoder(const AVStream& source, AVCodecID target, bool 
     const int error = avcodec_open2(m_encoder.get(), codec, nullptr);
     ThrowIfNoMemory(error);
     if (error < 0) {
-        throw Failure(kExitOutput, "the sound cannot be encoded; --no-sound leaves it out");
+        throw Failure(kExitOutput, "the sound cannot be encoded; use --no-sound to leave it out");
     }
     m_resampler = Allocated<ResamplerPtr>(swr_alloc());
     m_fifo = av_audio_fifo_alloc(m_encoder->sample_fmt, channels, 4096);
@@ -104,7 +104,7 @@ void SoundTranscoder::Resample(AVFrame& frame) {
         error = swr_convert_frame(m_resampler.get(), converted.get(), &frame);
     }
     ThrowIfNoMemory(error);
-    if (error < 0) throw Failure(kExitInput, "the sound cannot be converted; --no-sound leaves it out");
+    if (error < 0) throw Failure(kExitInput, "the sound cannot be converted; use --no-sound to leave it out");
     void** const samples = reinterpret_cast<void**>(converted->extended_data);
     if (av_audio_fifo_write(m_fifo, samples, converted->nb_samples) < 0) throw std::bad_alloc();
 }

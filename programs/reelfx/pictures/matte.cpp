@@ -39,10 +39,11 @@ void CheckMatte(const EffectChoice& choice) {
         const ParamInfo& param = choice.Info().params[i];
         hasDamage = hasDamage || NamesAreEqual(param.name, "Wear");
         if (NamesAreEqual(param.name, "Blue Channel Only") && session->Value(i).flag != 0) {
-            throw UsageError("--matte cannot hold wear of one channel; add --set \"" + param.name + "=off\"");
+            throw UsageError("--matte cannot show wear in one channel only; add --set \"" + param.name +
+                             "=off\"");
         }
     }
-    if (!hasDamage) throw UsageError("--matte holds damage, and \"" + choice.Info().name + "\" makes none");
+    if (!hasDamage) throw UsageError("--matte needs damage, and \"" + choice.Info().name + "\" has none");
 }
 
 void FillMatteGround(BgraPicture& picture) {

@@ -82,8 +82,8 @@ void DrawPicture(cairo_t* context, const BgraPicture& picture, double x, double 
 BgraPicture DrawGrid(const std::vector<GridCell>& cells, const GridOptions& options) {
     const Measures measures(cells, options);
     if (measures.Width() > kMostPixels || measures.Height() > kMostPixels) {
-        throw UsageError("the pictures together would be " + std::to_string(measures.Width()) + "x" +
-                         std::to_string(measures.Height()) + " pixels, more than can be drawn");
+        throw UsageError("the combined picture would be " + std::to_string(measures.Width()) + "x" +
+                         std::to_string(measures.Height()) + " pixels, which is too large");
     }
     BgraPicture sheet(measures.Width(), measures.Height());
     const SurfacePtr surface(cairo_image_surface_create_for_data(

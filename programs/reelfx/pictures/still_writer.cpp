@@ -29,12 +29,12 @@ const StillFormat& FormatOf(const std::string& path) {
     for (const StillFormat& format : kFormats) {
         if (NamesAreEqual(ending, format.ending)) return format;
     }
-    throw UsageError(path + ": pictures are written as .png or .jpg");
+    throw UsageError(path + ": pictures must end in .png or .jpg");
 }
 
 PacketPtr Encode(const BgraPicture& picture, const StillFormat& format) {
     const AVCodec* codec = avcodec_find_encoder(format.codec);
-    if (!codec) throw Failure(kExitInternal, "this media library cannot write PNG or JPEG");
+    if (!codec) throw Failure(kExitInternal, "the installed FFmpeg cannot write PNG or JPEG");
     const CodecPtr encoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
     encoder->width = picture.Width();
     encoder->height = picture.Height();

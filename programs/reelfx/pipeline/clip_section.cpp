@@ -9,13 +9,13 @@
 namespace velmora::hosts {
 namespace {
 
-// Times that a user types are decimal fractions, those of frames are ticks.
+// Users type times as decimal fractions; frame times are ticks.
 constexpr double kTimeTolerance = 1e-6;
-// How far sound may lag behind the picture in a file.
+// How far sound may lag behind the picture in a file, in seconds.
 constexpr double kInterleaving = 1.0;
 
-// A jump lands so many frames early at least: some decoders, begun at a picture that is not quite a beginning,
-// lose a frame when the stream ends soon after it.
+// A jump lands at least this many frames early: some decoders lose a frame if they start at a picture that is not
+// a clean starting point and the stream ends soon after it.
 constexpr int kFramesAhead = 32;
 
 }  // namespace
@@ -23,10 +23,10 @@ constexpr int kFramesAhead = 32;
 SectionOptions ResolveFarm(const FarmPart& farm, std::vector<std::int64_t> frameTimes) {
     const auto frames = static_cast<std::int64_t>(frameTimes.size());
     if (frames < farm.parts) {
-        throw UsageError("--farm: a clip of " + std::to_string(frames) + " frames has no " +
+        throw UsageError("--farm: a clip of " + std::to_string(frames) + " frames cannot be split into " +
                          std::to_string(farm.parts) + " parts");
     }
-    // Without a product that could overflow: the first parts take one of the frames that are left over.
+    // Avoids a product that could overflow: each of the first parts takes one of the remaining frames.
     const std::int64_t each = frames / farm.parts, over = frames % farm.parts;
     SectionOptions section;
     section.firstFrame = each * (farm.part - 1) + std::min(over, farm.part - 1);

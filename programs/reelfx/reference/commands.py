@@ -1,4 +1,4 @@
-"""The commands, options and effects of reelfx as its reference needs them."""
+"""The commands, options and effects of reelfx, as the man page and the completions need them."""
 
 
 class Option:
@@ -22,7 +22,7 @@ class Option:
 
 
 class Command:
-    """One that does something: of "preset" only "preset show" and "preset save" are."""
+    """A command that can be run, such as "preset show", but not "preset" by itself."""
 
     def __init__(self, words, json):
         self.words = words
@@ -41,7 +41,7 @@ class Program:
         self.effects = effects
         self.options = [Option(option) for option in json["options"]]
         self.commands = []
-        self.groups = {}  # a word that needs another: its help and the words that may follow
+        self.groups = {}  # a word that needs a second word: its help and the possible second words
         self._add([], json)
 
     def _add(self, words, json):
@@ -54,7 +54,7 @@ class Program:
                 self.commands.append(Command(path, child))
 
     def first_words(self):
-        """Each first word with its help."""
+        """The first words of all commands, with their help."""
         words = {}
         for command in self.commands:
             first = command.words[0]
@@ -62,11 +62,11 @@ class Program:
         return words
 
     def options_taking(self, value):
-        """The names of all options that take such a value."""
+        """The names of all options that take this kind of value."""
         return sorted({n for c in self.commands for o in c.options if o.value == value for n in o.names})
 
     def valued_options(self):
-        """Of all options that take a value: the value by the option's names."""
+        """The kind of value by the names of the option, for all options that take one."""
         found = {}
         for command in self.commands:
             for option in command.options:
@@ -84,7 +84,7 @@ class Program:
 
 
 def settings_of(effect):
-    """What may be written behind --set, names ending in "=" where a free value follows."""
+    """What can follow --set; words that end in "=" need a value."""
     words = []
     for parameter in effect["parameters"]:
         name = parameter["name"] + "="
@@ -97,6 +97,6 @@ def settings_of(effect):
     return words
 
 
-# The codecs that people ask for by name; any other that the media library has may be given too.
+# Commonly used codecs; --codec takes any that FFmpeg has.
 CODECS = ("ffv1", "libaom-av1", "libsvtav1", "libvpx-vp9", "libx264", "libx265", "mjpeg", "mpeg4", "png", "prores_ks",
           "qtrle")

@@ -2,38 +2,38 @@
 
 import textwrap
 
-# Of the text's last change, as man pages carry it.
+# The date of the last change of the text.
 DATE = "2026-11-21"
 
 DESCRIPTION = """\
-reelfx renders footage through effects that give it the look of old film: shake, dust, scratches, spots, worn edges,
-flicker and faded colours. It reads whatever FFmpeg reads and keeps sound, size, frame rate, times and colours.
+reelfx makes video look like old film: shake, dust, scratches, worn emulsion, flicker, faded colours and glow. It reads
+everything that FFmpeg can read and keeps sound, size, frame rate, times and colours.
 
-The same settings, seed and frames give the same bytes on every machine, with any number of threads, and for a part of a
-clip the same as for the whole. Another seed gives other shake, flicker, wear, spots and scratches; with seed 0, flicker and
-scratches are those of the Windows library.
+The same settings, seed and frames give the same bytes on every machine and with any number of threads, whether a part of a
+clip or the whole clip is rendered. Another seed gives other shake, flicker, wear, spots and scratches. With seed 0, flicker
+and scratches are those of the Windows library.
 
-Names of effects, presets and parameters are taken in any case of the letters. A slider takes a number of its range, a
-colour #RRGGBB, a menu an item's text or its number from 0, a check box on or off. Settings are applied in this order: the
-built-in preset, the preset file, each --set.
+Upper and lower case are the same in names of effects, presets and parameters. A slider takes a number in its range, a colour
+#RRGGBB, a menu the text of an item or its number from 0, a check box on or off. Settings are applied in this order: built-in
+preset, preset file, each --set.
 
-With --progress json each line on standard error that begins with a brace is an object with the fields frame (frames done),
-frames (how many there are as far as is known), seconds and fps (since the start), and progress: continue, or end once all is
-done and written. A command that fails writes no end, but one line of text.
+With --progress json, each line on standard error that begins with a brace is an object with the fields frame (frames done),
+frames (their total number, if known), seconds and fps (since the start), and progress: continue, or end when everything has
+been written. A command that fails writes one line of text instead of end.
 
-With --hash each frame gives a line on standard output: the word frame, its number in the clip from 0, the word md5, and the
-MD5 of its rows of blue, green, red and alpha bytes, as FFmpeg's framemd5 gives it for the pixel format bgra.
+With --hash, a line is printed on standard output for each frame: the word frame, its number in the clip from 0, the word md5,
+and the MD5 of its rows of blue, green, red and alpha bytes. FFmpeg's framemd5 gives the same MD5 for the pixel format bgra.
 """
 
 EXAMPLES = (
-    ("A preset over a whole clip, with its sound:",
+    ("Render a whole clip with a preset, keeping its sound:",
      'reelfx render in.mp4 out.mp4 --effect "Film Pro" --preset "Super 8" --seed 7'),
-    ("Ten seconds with settings of one's own:",
+    ("Render ten seconds with your own settings:",
      'reelfx render in.mp4 out.mp4 -e "Film Camera" -s "X Jitter=4" -s Flicker=20 --start 1:30 --duration 10'),
-    ("All presets of an effect on one frame:", 'reelfx sheet in.mp4 sheet.png -e "Film Damage" -n 20'),
-    ("How scratches move, on paper:",
+    ("Show all presets of an effect on one frame:", 'reelfx sheet in.mp4 sheet.png -e "Film Damage" -n 20'),
+    ("Show how scratches move, in one picture:",
      'reelfx strip in.mp4 strip.png -e "Film Damage" -p Shredded --crop 150x500+600+0'),
-    ("Between two other programs:",
+    ("Use reelfx between two other programs:",
      'ffmpeg -i in.mov -f yuv4mpegpipe - | reelfx render - - -e "Film Look" -p Sepia | ffplay -'),
 )
 
@@ -48,7 +48,7 @@ def paragraphs(text):
 
 
 def wrapped(line):
-    """Text in short lines; requests stay whole."""
+    """Wraps text; requests are not wrapped."""
     return line if line.startswith(".") else textwrap.fill(line, 78, break_long_words=False, break_on_hyphens=False)
 
 
@@ -72,7 +72,7 @@ def sentence(text):
 
 def option_entry(option):
     more = [f"Default: {escaped(option.default)}."] if option.default else []
-    more += [rf"The environment variable \fB{option.environment}\fR gives the default."] if option.environment else []
+    more += [rf"The environment variable \fB{option.environment}\fR sets the default."] if option.environment else []
     return "\n".join([".TP", option_names(option), sentence(option.help), *more])
 
 
@@ -81,7 +81,7 @@ def same(one, other):
 
 
 def command_section(command, render):
-    """What `render` has told of already is only named."""
+    """Options that are documented for `render` are only named."""
     parts = [f'.SS "{synopsis(command)}"', sentence(command.help)]
     for positional in command.positionals:
         parts += [".TP", rf"\fI{positional.positional}\fR", sentence(positional.help)]
@@ -90,7 +90,7 @@ def command_section(command, render):
     names = [rf"\fB{escaped(option.long)}\fR" for option in known if option.short != "-h"]
     if names:
         listed = ", ".join(names[:-1]) + " and " + names[-1] if len(names) > 1 else names[0]
-        parts += [".PP", f"And as for \\fBrender\\fR: {listed}."]
+        parts += [".PP", f"Also, as for \\fBrender\\fR: {listed}."]
     return parts
 
 
@@ -111,11 +111,11 @@ def text(program):
     lines += [".SH DESCRIPTION", paragraphs(DESCRIPTION), ".SH COMMANDS"]
     for command in sorted(program.commands, key=lambda c: c is not render):
         lines += command_section(command, render)
-    lines += [".PP", r"Every command takes \fB\-h\fR, \fB\-\-help\fR and prints what it knows."]
+    lines += [".PP", r"Every command has \fB\-h\fR, \fB\-\-help\fR, which prints its options."]
     lines += [".SH EFFECTS", *(line for effect in program.effects for line in effect_entry(effect))]
     lines.append(".SH ENVIRONMENT")
     for name, option in program.environment():
-        lines += [".TP", rf"\fB{name}\fR", rf"As \fB{escaped(option.long)}\fR, where that is not given."]
+        lines += [".TP", rf"\fB{name}\fR", rf"Default of \fB{escaped(option.long)}\fR."]
     lines.append(".SH EXIT STATUS")
     for code in program.exits:
         lines += [".TP", rf"\fB{code['code']}\fR", sentence(code["detail"])]
@@ -125,7 +125,7 @@ def text(program):
     lines.pop()
     lines += [".SH SEE ALSO", r"\fBffmpeg\fR(1), \fBmelt\fR(1)"]
     text = "\n".join(lines)
-    kept = text.split(".nf\n")  # lines that are shown as they are end at ".fi"
+    kept = text.split(".nf\n")  # unfilled lines end at ".fi"
     filled = ["\n".join(wrapped(line) for line in part.split("\n")) for part in kept[:1]]
     for part in kept[1:]:
         shown, _, rest = part.partition("\n.fi")

@@ -145,7 +145,7 @@ class Places(Commands):
                 if done.returncode == 0:
                     self.assertTrue(self.left_over())
                 else:
-                    self.check_failed(done, [1], "short")
+                    self.check_failed(done, [1], "not enough")
                     self.assertEqual(self.left_over(), [])
                 for name in self.left_over():
                     (self.out / name).unlink()
@@ -180,7 +180,7 @@ class Input(Commands):
         film = self.out / "film.mkv"
         ffmpeg("-i", clips.small, "-c", "copy", film)
         (self.out / "cut.mkv").write_bytes(film.read_bytes()[:film.stat().st_size * 4 // 10])
-        self.check_failed(reelfx("render", self.out / "cut.mkv", self.out / "x.mp4", *DAMAGE), [0], "too early")
+        self.check_failed(reelfx("render", self.out / "cut.mkv", self.out / "x.mp4", *DAMAGE), [0], "s early")
 
     def while_it_runs(self, args, action):
         """Runs a render and lets `action` happen when it has begun to write, while it stands still."""
@@ -207,21 +207,31 @@ class Input(Commands):
         last = sorted(pictures.iterdir())[150:]
         done = self.while_it_runs((pictures / "in-%03d.png", self.out / "part.mkv", *lossless),
                                   lambda: [path.unlink() for path in last])
-        self.check_failed(done, [3], "in-%03d.png", "holds the first 150 frames")
+        self.check_failed(done, [3], "in-%03d.png", "contains the first 150 frames")
         self.assertEqual(len(frame_digests(self.out / "part.mkv")), 150)
 
 
 class Signals(Commands):
     def test_waiting_for_input_ends(self):
-        program = subprocess.Popen([REELFX, "render", "-", str(self.out / "new.mp4"), *DAMAGE], stdin=subprocess.PIPE,
-                                   stderr=subprocess.PIPE)
-        time.sleep(2)
-        program.send_signal(signal.SIGTERM)
-        self.assertEqual(program.wait(30), 130)
-        self.assertEqual(program.stderr.read().count(b"\n"), 1)
-        program.stdin.close()
-        program.stderr.close()
-        self.assertEqual(self.left_over(), [])
+        """What is finished stays and can be played, but does not replace an older file."""
+        for name, data, left in (("none.mp4", b"", []), ("new.mp4", y4m, ["new.mp4"]), ("older.mp4", y4m, ["new.mp4"])):
+            with self.subTest(name=name, frames=bool(data)):
+                program = subprocess.Popen([REELFX, "render", "-", str(self.out / name), *DAMAGE, "--overwrite"],
+                                           stdin=subprocess.PIPE, stderr=subprocess.PIPE)
+                program.stdin.write(data)
+                program.stdin.flush()
+                time.sleep(2)
+                program.send_signal(signal.SIGTERM if data else signal.SIGINT)
+                self.assertEqual(program.wait(30), 130)
+                text = program.stderr.read()
+                program.stdin.close()
+                program.stderr.close()
+                self.assertEqual((text.count(b"\n"), self.left_over()), (1, left), text)
+                self.check_older()
+                if name == "new.mp4":
+                    frames = len(frame_digests(self.out / name))
+                    self.assertGreater(frames, 0)
+                    self.assertIn(f"first {frames} frames".encode(), text)
 
     def references(self):
         """For each command: how long it takes, and what its files are when whole."""
