@@ -10,7 +10,6 @@ set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
 option(VELMORA_SANITIZE "Build with address and undefined-behaviour sanitizers" OFF)
 option(VELMORA_SANITIZE_THREADS "Build with the thread sanitizer" OFF)
 option(VELMORA_FUZZ "Build the fuzzing programs (clang only), all code with sanitizers" OFF)
-option(VELMORA_PLAIN_ROAD "Render stage by stage with the plain pixel forms only" OFF)
 set(VELMORA_DIST ${CMAKE_BINARY_DIR}/dist)
 
 add_library(velmora_options INTERFACE)
@@ -25,9 +24,6 @@ target_compile_options(velmora_options INTERFACE
 if(CMAKE_BUILD_TYPE STREQUAL "Release")
   target_compile_options(velmora_options INTERFACE
     -ffile-prefix-map=${CMAKE_SOURCE_DIR}=. -ffile-prefix-map=${CMAKE_BINARY_DIR}=build)
-endif()
-if(VELMORA_PLAIN_ROAD)
-  target_compile_definitions(velmora_options INTERFACE VELMORA_PLAIN_ROAD=1)
 endif()
 if(VELMORA_SANITIZE)
   target_compile_options(velmora_options INTERFACE

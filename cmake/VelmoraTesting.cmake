@@ -24,16 +24,13 @@ function(velmora_add_test name)
   endif()
 endfunction()
 
-# velmora_test_forms(NAME ARGUMENT...) runs a test program once more with each form of the pixel kernels, as far as the
-# processor has it, and along the reference road.
-function(velmora_test_forms name)
-  foreach(choice FORM=plain FORM=sse2 FORM=avx2 FORM=avx512 ROAD=stages)
-    string(REPLACE "=" "_" suffix ${choice})
-    string(TOLOWER ${suffix} suffix)
-    add_test(NAME ${name}_${suffix} COMMAND ${name} ${ARGN})
-    set_tests_properties(${name}_${suffix} PROPERTIES TIMEOUT 600 ENVIRONMENT VELMORA_${choice})
+# velmora_test_levels(NAME ARGUMENT...) runs a test program once more on each SIMD level, as far as the processor has it.
+function(velmora_test_levels name)
+  foreach(level plain sse2 ssse3 avx2 avx512)
+    add_test(NAME ${name}_${level} COMMAND ${name} ${ARGN})
+    set_tests_properties(${name}_${level} PROPERTIES TIMEOUT 600 ENVIRONMENT VELMORA_FORM=${level})
     if(WIN32)
-      set_tests_properties(${name}_${suffix} PROPERTIES RESOURCE_LOCK screen)
+      set_tests_properties(${name}_${level} PROPERTIES RESOURCE_LOCK screen)
     endif()
   endforeach()
 endfunction()

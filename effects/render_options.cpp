@@ -12,10 +12,8 @@ struct NamedLevel {
     render::SimdLevel level;
 };
 constexpr NamedLevel kLevels[] = {
-    {"plain", render::SimdLevel::kPlain},
-    {"sse2", render::SimdLevel::kSse2},
-    {"ssse3", render::SimdLevel::kSsse3},
-    {"avx2", render::SimdLevel::kAvx2},
+    {"plain", render::SimdLevel::kPlain},   {"sse2", render::SimdLevel::kSse2},
+    {"ssse3", render::SimdLevel::kSsse3},   {"avx2", render::SimdLevel::kAvx2},
     {"avx512", render::SimdLevel::kAvx512},
 };
 
@@ -32,11 +30,6 @@ render::RenderOptions ReadRenderOptions() noexcept {
     for (const NamedLevel& named : kLevels) {
         if (named.name == wanted) options.level = std::min(options.level, named.level);
     }
-#if defined(VELMORA_PLAIN_ROAD)
-    options.road = render::Road::kByStages;
-#else
-    if (Variable("VELMORA_ROAD") == "stages") options.road = render::Road::kByStages;
-#endif
     return options;
 }
 

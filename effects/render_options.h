@@ -2,9 +2,6 @@
 // to look for a fault. The bytes are the same.
 //
 //   VELMORA_FORM=plain, sse2, ssse3, avx2 or avx512   no faster SIMD level of the pixel kernels than this
-//   VELMORA_ROAD=stages                        stage by stage over whole frames, the reference
-//
-// A build with VELMORA_PLAIN_ROAD takes the reference always.
 #pragma once
 
 #include "render/renderer.h"

@@ -118,11 +118,4 @@ Bgra MixWithGrey(Bgra pixel, std::int32_t weight) noexcept {
     return {mix(pixel.blue), mix(pixel.green), mix(pixel.red), pixel.alpha};
 }
 
-void ColourStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t) const noexcept {
-    for (std::int32_t x = 0; x < width; ++x) {
-        const Bgra toned = {m_tone[in[x].blue], m_tone[in[x].green], m_tone[in[x].red], in[x].alpha};
-        out[x] = m_mixes ? MixWithGrey(toned, m_weight) : toned;
-    }
-}
-
 }  // namespace velmora::render

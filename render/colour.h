@@ -38,6 +38,8 @@ namespace velmora::render {
 
 class ColourStage {
   public:
+    static constexpr bool kIsDamage = false;
+    static std::uint32_t Draws(const StageSettings&, std::int32_t) noexcept { return 0; }
     [[nodiscard]] bool IsActive() const noexcept { return m_active; }
     // Pixels are mixed with their grey value: more than a table.
     [[nodiscard]] bool Mixes() const noexcept { return m_mixes; }
@@ -47,9 +49,6 @@ class ColourStage {
         return {m_lines.data(), m_isLines ? m_lineCount : 0};
     }
     [[nodiscard]] std::int16_t Weight() const noexcept { return m_weight; }
-
-    // The plain form. `in` may be `out`.
-    void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
   private:
     void AddLine(const ByteTable& table, double slope) noexcept;

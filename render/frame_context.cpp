@@ -34,15 +34,9 @@ const ImageView& FrameContext::ClaimDestination() noexcept {
     return m_destination;
 }
 
-const ImageView* FrameContext::CurrentInput(bool allowSource) noexcept {
-    if (m_outputWritten) return m_copies[1].Take(m_destination) ? &m_copies[1].view : nullptr;
-    if (allowSource) return &m_source;
-    return m_copies[0].Take(m_source) ? &m_copies[0].view : nullptr;
-}
-
 bool FrameContext::DetachSource() noexcept {
-    if (!m_copies[0].Take(m_source)) return false;
-    m_source = m_copies[0].view;
+    if (!m_copy.Take(m_source)) return false;
+    m_source = m_copy.view;
     return true;
 }
 

@@ -1,8 +1,6 @@
 // One frame on its way through the stages: the source, the destination and what is known of the frame.
 //
-// A stage reads the current input and writes the destination: the input is the source until a stage has
-// claimed the destination, and a copy of the destination from then on, so that no stage reads and writes one
-// buffer at once unless it works in place on purpose. Lives for one frame.
+// Lives for one frame.
 #pragma once
 
 #include <cstddef>
@@ -36,9 +34,6 @@ class FrameContext {
 
     // Marks the output as written and returns the destination.
     const ImageView& ClaimDestination() noexcept;
-    // The picture as the stages before left it, or null when a copy cannot be made. With `allowSource` the
-    // source itself may be returned, else always a private copy. Valid until the next call.
-    const ImageView* CurrentInput(bool allowSource) noexcept;
     // Replaces the source by a private copy; false when it cannot be made.
     [[nodiscard]] bool DetachSource() noexcept;
     // Copies the source through when no stage has written the destination.
@@ -61,7 +56,7 @@ class FrameContext {
     std::int32_t m_height = 0;
     ImageView m_source;
     ImageView m_destination;
-    Copy m_copies[2];
+    Copy m_copy;  // of the source
     bool m_outputWritten = false;
 };
 

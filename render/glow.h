@@ -15,6 +15,7 @@
 #include "render/glow_kernels.h"
 #include "render/image.h"
 #include "render/row_reader.h"
+#include "render/stage_settings.h"
 
 namespace velmora::render {
 
@@ -51,6 +52,8 @@ struct CellPlane {
 
 class GlowStage {
   public:
+    static constexpr bool kIsDamage = false;
+    static std::uint32_t Draws(const StageSettings&, std::int32_t) noexcept { return 0; }
     GlowStage() noexcept = default;
     // A glow layer of one cell for 2^reduction × 2^reduction pixels; `rows` has two scratch rows, wide enough
     // for one cell for each pixel when the reduction is below 2, else for each fourth.

@@ -4,23 +4,12 @@
 
 #include <cstdint>
 
-#include "render/frame_context.h"
 #include "render/image.h"
 #include "render/random.h"
 #include "render/row_reader.h"
 #include "render/stage_settings.h"
 
 namespace velmora::render {
-
-// Writes the word to every pixel of a rectangle of the buffer. The rectangle must lie within it.
-void FillRectangle(const ImageView& view, const Rectangle& rectangle, std::uint32_t colour) noexcept;
-
-// Copies a rectangle of `source` to (row, column) of `destination`, clipped to `sourceBounds` and
-// `destinationBounds`: what clipping cuts from the top or left of one side is cut from the other as well.
-// The two must not overlap in memory.
-void CopyRectangle(const ImageView& destination, std::int32_t row, std::int32_t column,
-                   const Rectangle& destinationBounds, const ImageView& source, Rectangle rectangle,
-                   const Rectangle& sourceBounds) noexcept;
 
 // A row of the shaken picture as pixels of the source and border: `count` pixels from `pixels` go to column
 // `start`, the border takes the columns beside them.
@@ -36,6 +25,10 @@ void FillPixels(Bgra* pixels, std::int32_t count, std::uint32_t colour) noexcept
 
 class JitterStage {
   public:
+    static constexpr bool kIsDamage = false;
+    static std::uint32_t Draws(const StageSettings& settings, std::int32_t) noexcept {
+        return settings.yJitter != 0 || settings.xJitter != 0 ? 2 : 0;
+    }
     JitterStage() noexcept = default;
     JitterStage(std::int32_t dy, std::int32_t dx, std::uint32_t border) noexcept
         : m_dy(dy), m_dx(dx), m_border(border) {}
@@ -43,10 +36,6 @@ class JitterStage {
     [[nodiscard]] bool IsActive() const noexcept { return m_dy != 0 || m_dx != 0; }
     [[nodiscard]] std::int32_t Dy() const noexcept { return m_dy; }  // positive: down
     [[nodiscard]] std::int32_t Dx() const noexcept { return m_dx; }  // positive: to the right
-
-    // The whole frame: paints the bands, then copies the picture, reading the current input and claiming
-    // the destination.
-    void Apply(FrameContext& context) const noexcept;
 
     // Row `y` of the shaken picture of `source`'s region.
     ShiftedRow Shifted(const ImageView& source, std::int32_t y) const noexcept;

@@ -5,31 +5,34 @@
 namespace velmora::render {
 namespace {
 
-// The chain behind jitter, in its order: what both roads run. `visit` takes a stage.
-template <typename Visit>
-void ForEachActiveStage(const FramePlan& plan, Visit&& visit) {
-    if (plan.glow.IsActive()) visit(plan.glow);
-    if (plan.colour.IsActive()) visit(plan.colour);
-    if (plan.tint.IsActive()) visit(plan.tint);
-    if (plan.wear.IsActive()) visit(plan.wear);
-    if (plan.scratches.IsActive()) visit(plan.scratches);
-    if (plan.spots.IsActive()) visit(plan.spots);
-}
+struct Planning {
+    const FrameContext& context;
+    const StageSettings& settings;
+    RenderState& state;
+    const Kernels& kernels;
+    const FramePlan& plan;  // as far as it is made
 
-// One stage over the whole picture: from the current input into the destination.
-template <typename Stage>
-void ApplyStage(const Stage& stage, FrameContext& context) noexcept {
-    const ImageView* input = context.CurrentInput(true);
-    if (input == nullptr) return;
-    const ImageView& output = context.ClaimDestination();
-    for (std::int32_t y = 0; y < context.Height(); ++y) {
-        stage.Row(input->Row(y), output.Row(y), context.Width(), y);
-    }
-}
+    [[nodiscard]] Random& Numbers() const noexcept { return state.random.Numbers(); }
+};
 
-void RenderByStages(FrameContext& context, const FramePlan& plan) noexcept {
-    if (plan.jitter.IsActive()) plan.jitter.Apply(context);
-    ForEachActiveStage(plan, [&context](const auto& stage) { ApplyStage(stage, context); });
+void Prepare(JitterStage& stage, const Planning& p) noexcept {
+    stage = PrepareJitter(p.settings, p.Numbers());
+}
+void Prepare(GlowStage&, const Planning&) noexcept {}  // starts from the picture itself
+void Prepare(ColourStage& stage, const Planning& p) noexcept {
+    stage = PrepareColour(p.settings, p.context.Time(), p.state.contrast);
+}
+void Prepare(TintStage& stage, const Planning& p) noexcept {
+    stage = PrepareTint(p.settings);
+}
+void Prepare(WearStage& stage, const Planning& p) noexcept {
+    stage = PrepareWear(p.settings, p.context.Width(), p.Numbers(), p.state.wear, p.kernels);
+}
+void Prepare(ScratchStage& stage, const Planning& p) noexcept {
+    stage = PrepareScratches(p.settings, p.plan.jitter.Dx(), p.context, p.state.scratches, p.kernels);
+}
+void Prepare(SpotStage& stage, const Planning& p) noexcept {
+    stage = PrepareSpots(p.settings, p.context.Destination().Region(), p.Numbers());
 }
 
 // In place, what was read is still in the caches when it is written.
@@ -40,21 +43,21 @@ bool IsStreamed(const FrameContext& context, const RenderOptions& options) noexc
 }
 
 void RenderByRows(FrameContext& context, const FramePlan& plan, const RenderOptions& options,
-                  RowMemory& memory) noexcept {
-    const RowProgram program(plan, KernelsOf(options.level));
-    Bgra* const room = IsStreamed(context, options) ? memory.Reserve(context.Width()) : nullptr;
-    if (room == nullptr && !plan.jitter.IsActive() && program.IsEmpty()) return;
+                  const Kernels& kernels, RowMemory& memory) noexcept {
+    const RowProgram program(plan, kernels);
+    Bgra* const own = IsStreamed(context, options) ? memory.Reserve(context.Width()) : nullptr;
+    if (own == nullptr && !plan.jitter.IsActive() && program.IsEmpty()) return;
     const ImageView& source = context.Source();
     const ImageView& destination = context.ClaimDestination();
     for (std::int32_t y = 0; y < context.Height(); ++y) {
         const ShiftedRow row = plan.jitter.Shifted(source, y);
-        if (room == nullptr) {
+        if (own == nullptr) {
             program.Run(row, destination.Row(y), context.Width(), y);
         } else {
-            program.Stream(row, room, destination.Row(y), context.Width(), y);
+            program.Stream(row, own, destination.Row(y), context.Width(), y);
         }
     }
-    if (room != nullptr) program.EndStream();
+    if (own != nullptr) program.EndStream();
 }
 
 // In place the rows can be worked on where they lie, unless the picture moves over itself.
@@ -70,41 +73,35 @@ bool NeedsOwnSource(const FrameContext& context, const FramePlan& plan) noexcept
 
 FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings, RenderState& state,
                     const Kernels& kernels) noexcept {
-    Random& random = state.random.Numbers();
     FramePlan plan;
-    plan.jitter = PrepareJitter(settings, random);
-    plan.colour = PrepareColour(settings, context.Time(), state.contrast);
-    plan.tint = PrepareTint(settings);
-    plan.wear = PrepareWear(settings, context.Width(), random);
-    if (plan.wear.IsActive()) state.wear.Set(plan.wear.Picture(), plan.wear.Amount());
-    plan.wearFactors = &state.wear;
-    plan.scratches = PrepareScratches(settings, plan.jitter.Dx(), context, state.scratches, kernels);
-    plan.spots = PrepareSpots(settings, context.Destination().Region(), random);
+    const Planning planning = {context, settings, state, kernels, plan};
+    ForEachStage(plan, [&planning](auto& stage) { Prepare(stage, planning); });
     return plan;
 }
 
 void RenderStages(FrameContext& context, const StageSettings& settings, RenderState& state,
                   const RenderOptions& options) noexcept {
-    const Kernels& kernels = options.road == Road::kByStages ? kPlainKernels : KernelsOf(options.level);
+    const Kernels& kernels = KernelsOf(options.level);
     FramePlan plan = PlanFrame(context, settings, state, kernels);
-    if (options.isDamageOnly) plan.jitter = {}, plan.colour = {}, plan.tint = {};
+    const auto isWanted = [&options](const auto& stage) { return stage.kIsDamage || !options.isDamageOnly; };
+    ForEachStage(plan, [&isWanted](auto& stage) {
+        if (!isWanted(stage)) stage = {};
+    });
     // Without memory for the copy the picture stays where it is; the other stages can still work.
     if (NeedsOwnSource(context, plan) && !context.DetachSource()) plan.jitter = {};
     const ShakenRows shaken(context.Source(), plan.jitter);
-    const float glow = options.isDamageOnly ? 0.0f : settings.glow;
-    plan.glow = PrepareGlow(glow, shaken, context.Width(), context.Height(), state.glow, *kernels.glow);
-    if (options.road == Road::kByStages) {
-        RenderByStages(context, plan);
-    } else {
-        RenderByRows(context, plan, options, state.row);
+    if (isWanted(plan.glow)) {
+        plan.glow =
+            PrepareGlow(settings.glow, shaken, context.Width(), context.Height(), state.glow, *kernels.glow);
     }
+    RenderByRows(context, plan, options, kernels, state.row);
 }
 
 std::uint32_t DrawsPerFrame(const StageSettings& settings, std::int32_t width) noexcept {
-    constexpr std::uint32_t kDrawsPerSpot = 6;
-    const std::uint32_t jitter = settings.yJitter != 0 || settings.xJitter != 0 ? 2 : 0;
-    const std::uint32_t wear = 1 + (settings.wear != 0.0f ? WearStripCount(settings, width) : 0);
-    return jitter + wear + kDrawsPerSpot * SpotCount(settings);
+    std::uint32_t draws = 0;
+    const FramePlan plan;
+    ForEachStage(plan, [&](const auto& stage) { draws += stage.Draws(settings, width); });
+    return draws;
 }
 
 }  // namespace velmora::render

@@ -34,15 +34,31 @@ struct StreamOrCopy {
 
 }  // namespace
 
-RowProgram::RowProgram(const FramePlan& plan, const Kernels& kernels) noexcept
-    : m_plan(plan), m_kernels(kernels) {
-    PlanTables();
+RowProgram::RowProgram(const FramePlan& plan, const Kernels& kernels) noexcept : m_kernels(kernels) {
+    PlanTone(plan.colour, plan.tint);
+    ForEachStage(plan, [this](const auto& stage) {
+        if (stage.IsActive()) Add(stage);
+    });
 }
 
-void RowProgram::PlanTables() noexcept {
+template <typename Stage>
+void RowProgram::AddStage(const Stage& stage, Reads reads) noexcept {
+    m_steps[m_count++] = {
+        reads, &stage,
+        [](const RowProgram&, const void* own, const Bgra* in, Bgra* out, std::int32_t width,
+           std::int32_t y) { static_cast<const Stage*>(own)->Row(in, out, width, y); }};
+}
+
+void RowProgram::AddTone() noexcept {
+    if (m_hasTone || !m_tone.IsActive()) return;
+    m_hasTone = true;
+    m_steps[m_count++] = {Reads::kPixels, nullptr,
+                          [](const RowProgram& program, const void*, const Bgra* in, Bgra* out,
+                             std::int32_t width, std::int32_t) { program.RunTone(in, out, width); }};
+}
+
+void RowProgram::PlanTone(const ColourStage& colour, const TintStage& tint) noexcept {
     const ByteTable identity = Identity();
-    const ColourStage& colour = m_plan.colour;
-    const TintStage& tint = m_plan.tint;
     const ByteTable& tone = colour.IsActive() ? colour.Tone() : identity;
     m_tone.mixes = colour.IsActive() && colour.Mixes();
     m_tone.weight = m_tone.mixes ? colour.Weight() : 0;
@@ -64,51 +80,43 @@ void RowProgram::PlanTables() noexcept {
     }
 }
 
-bool RowProgram::IsEmpty() const noexcept {
-    return !m_plan.glow.IsActive() && !m_tone.IsActive() && !m_plan.wear.IsActive() &&
-           !m_plan.scratches.IsActive() && !m_plan.spots.IsActive();
-}
-
-void RowProgram::Stream(const ShiftedRow& in, Bgra* room, Bgra* out, std::int32_t width,
+void RowProgram::Stream(const ShiftedRow& in, Bgra* scratch, Bgra* out, std::int32_t width,
                         std::int32_t y) const noexcept {
     if (IsEmpty()) return FetchThrough(in, out, width, StreamOrCopy{m_kernels});
-    Run(in, room, width, y);
-    m_kernels.stream(room, out, width);
+    Run(in, scratch, width, y);
+    m_kernels.stream(scratch, out, width);
 }
 
-// Glow needs the pixel at its place, and so does wear; the first step behind the source otherwise takes the row
-// from there.
+// The first step takes the row from the source, if it can.
 void RowProgram::Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
-    const auto toneRow = [this](const Bgra* from, Bgra* to, std::int32_t count) { RunTone(from, to, count); };
     const bool isWhole = in.count == width;
-    const Bgra* row = isWhole ? in.pixels : out;
-    const bool takesTone = m_tone.IsActive() && !m_plan.glow.IsActive();
-    const bool takesRow = m_plan.glow.IsActive() || m_plan.wear.IsActive();
-    if (takesTone) {
-        FetchThrough(in, out, width, toneRow);
-        row = out;
-    } else if (!isWhole || (!takesRow && row != out)) {
+    const Reads reads = IsEmpty() ? Reads::kInPlace : m_steps[0].reads;
+    const Bgra* row = out;
+    std::size_t next = 0;
+    if (reads == Reads::kPixels) {
+        const Step& first = m_steps[next++];
+        FetchThrough(in, out, width, [&](const Bgra* from, Bgra* to, std::int32_t count) {
+            first.run(*this, first.stage, from, to, count, y);
+        });
+    } else if (reads == Reads::kRow && isWhole) {
+        row = in.pixels;
+    } else if (!isWhole || in.pixels != out) {
         FetchThrough(in, out, width, m_kernels.copy);
+    }
+    for (; next < m_count; ++next) {
+        m_steps[next].run(*this, m_steps[next].stage, row, out, width, y);
         row = out;
     }
-    if (m_plan.glow.IsActive()) {
-        m_plan.glow.Row(row, out, width, y);
-        row = out;
-        if (m_tone.IsActive()) toneRow(out, out, width);
-    }
-    if (m_plan.wear.IsActive()) Wear(row, out, width, y);
-    if (m_plan.scratches.IsActive()) m_plan.scratches.Row(out, out, width, y);
-    if (m_plan.spots.IsActive()) m_plan.spots.Row(out, out, width, y);
 }
 
-template <typename Step>
+template <typename Work>
 void RowProgram::FetchThrough(const ShiftedRow& in, Bgra* out, std::int32_t width,
-                              Step&& step) const noexcept {
-    if (in.count != 0) step(in.pixels, out + in.start, in.count);
+                              Work&& work) const noexcept {
+    if (in.count != 0) work(in.pixels, out + in.start, in.count);
     const auto border = [&](std::int32_t start, std::int32_t count) {
         if (count == 0) return;
         FillPixels(out + start, count, in.border);
-        step(out + start, out + start, count);
+        work(out + start, out + start, count);
     };
     border(0, in.start);
     border(in.start + in.count, width - in.start - in.count);
@@ -116,18 +124,6 @@ void RowProgram::FetchThrough(const ShiftedRow& in, Bgra* out, std::int32_t widt
 
 void RowProgram::RunTone(const Bgra* in, Bgra* out, std::int32_t width) const noexcept {
     (FitsKernel(m_tone.weight) ? m_kernels : kPlainKernels).tone(in, out, width, m_tone);
-}
-
-void RowProgram::Wear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
-    const WearStage& wear = m_plan.wear;
-    const WearFactors& factors = *m_plan.wearFactors;
-    m_kernels.wear(in, out, width, factors.Over(wear.RowsOver(y)),
-                   wear.BlueOnly() ? kBlueChannel : kColourChannels);
-    if (!factors.HasOddBytes()) return;
-    // These the kernel has left as they are.
-    wear.ForEachByte(width, y, [&](std::int32_t x, std::uint8_t byte) {
-        if (factors.IsOdd(byte)) wear.ShadeUnder(byte, out[x]);
-    });
 }
 
 }  // namespace velmora::render

@@ -1,11 +1,13 @@
-// What happens to a row of a frame, made from the frame's plan: tables that follow each other are joined into
-// one, tables that change nothing are left out, and the kernels are those of one form.
+// What happens to a row of a frame, made from the frame's plan: the steps of the active stages in the chain's order.
+// Tables that follow each other are joined into one, and tables that change nothing are left out.
 #pragma once
 
+#include <array>
+#include <cstddef>
 #include <cstdint>
 
+#include "render/chain.h"
 #include "render/kernels.h"
-#include "render/renderer.h"
 
 namespace velmora::render {
 
@@ -17,25 +19,51 @@ class RowProgram {
     RowProgram& operator=(const RowProgram&) = delete;
 
     // True when a row leaves as it came in.
-    [[nodiscard]] bool IsEmpty() const noexcept;
+    [[nodiscard]] bool IsEmpty() const noexcept { return m_count == 0; }
     // Row `y`. The source pixels of the row may lie where they go to, but not overlap it otherwise.
     void Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
-    // The same into a row that is not read again soon, by way of `room` for a row where there is work to do.
-    void Stream(const ShiftedRow& in, Bgra* room, Bgra* out, std::int32_t width,
+    // The same into a row that is not read again soon, by way of `scratch`, a row's memory, where there is work to do.
+    void Stream(const ShiftedRow& in, Bgra* scratch, Bgra* out, std::int32_t width,
                 std::int32_t y) const noexcept;
     // After the last row that was streamed.
     void EndStream() const noexcept { m_kernels.endStream(); }
 
   private:
-    void PlanTables() noexcept;
-    template <typename Step>
-    void FetchThrough(const ShiftedRow& in, Bgra* out, std::int32_t width, Step&& step) const noexcept;
-    void RunTone(const Bgra* in, Bgra* out, std::int32_t width) const noexcept;
-    void Wear(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
+    // What a step needs of the row that it reads.
+    enum class Reads {
+        kPixels,   // any part of it, wherever it goes to
+        kRow,      // the whole row, with each pixel at its place
+        kInPlace,  // the whole row, where it goes to
+    };
+    struct Step {
+        Reads reads;
+        const void* stage;
+        void (*run)(const RowProgram& program, const void* stage, const Bgra* in, Bgra* out,
+                    std::int32_t width, std::int32_t y);
+    };
+    static constexpr std::size_t kMostSteps = 8;
 
-    const FramePlan& m_plan;
+    void Add(const JitterStage&) noexcept {}  // rows come in shifted
+    void Add(const GlowStage& stage) noexcept { AddStage(stage, Reads::kRow); }
+    void Add(const ColourStage&) noexcept { AddTone(); }
+    void Add(const TintStage&) noexcept { AddTone(); }
+    void Add(const WearStage& stage) noexcept { AddStage(stage, Reads::kRow); }
+    void Add(const ScratchStage& stage) noexcept { AddStage(stage, Reads::kInPlace); }
+    void Add(const SpotStage& stage) noexcept { AddStage(stage, Reads::kInPlace); }
+
+    template <typename Stage>
+    void AddStage(const Stage& stage, Reads reads) noexcept;
+    void AddTone() noexcept;
+    void PlanTone(const ColourStage& colour, const TintStage& tint) noexcept;
+    template <typename Work>
+    void FetchThrough(const ShiftedRow& in, Bgra* out, std::int32_t width, Work&& work) const noexcept;
+    void RunTone(const Bgra* in, Bgra* out, std::int32_t width) const noexcept;
+
     const Kernels& m_kernels;
-    Tone m_tone;
+    std::array<Step, kMostSteps> m_steps{};
+    std::size_t m_count = 0;
+    Tone m_tone;             // of colour and tint, which are neighbours
+    bool m_hasTone = false;  // among the steps
     ChannelTables m_before;  // the mix
     ChannelTables m_after;   // the mix, or in its place
 };

@@ -26,6 +26,9 @@ struct ScratchMemory {
 
 class ScratchStage {
   public:
+    static constexpr bool kIsDamage = true;
+    // They have a generator of their own.
+    static std::uint32_t Draws(const StageSettings&, std::int32_t) noexcept { return 0; }
     ScratchStage() noexcept = default;
     ScratchStage(const ScratchLine* lines, std::uint32_t count, std::int32_t height,
                  const Kernels& kernels) noexcept;

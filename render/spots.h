@@ -42,8 +42,16 @@ struct PlacedSpot {
 // The fraction by which spot byte `byte` shades a pixel.
 [[nodiscard]] float SpotFraction(std::uint8_t byte, std::uint8_t key, float strength) noexcept;
 
+// How many spots a setting (0..100) puts on a frame.
+[[nodiscard]] std::uint32_t SpotCount(const StageSettings& settings) noexcept;
+
 class SpotStage {
   public:
+    static constexpr bool kIsDamage = true;
+    static std::uint32_t Draws(const StageSettings& settings, std::int32_t) noexcept {
+        constexpr std::uint32_t kDrawsPerSpot = 6;
+        return kDrawsPerSpot * SpotCount(settings);
+    }
     static constexpr std::uint32_t kMostSpots = 25;
 
     [[nodiscard]] bool IsActive() const noexcept { return m_count != 0; }
@@ -59,9 +67,6 @@ class SpotStage {
     std::uint32_t m_count = 0;
     std::array<PlacedSpot, kMostSpots> m_spots{};
 };
-
-// How many spots a setting (0..100) puts on a frame.
-[[nodiscard]] std::uint32_t SpotCount(const StageSettings& settings) noexcept;
 
 // Places the frame's spots: six draws each. `region` is the destination's processed rectangle in its buffer.
 [[nodiscard]] SpotStage PrepareSpots(const StageSettings& settings, const Rectangle& region,

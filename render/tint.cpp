@@ -71,10 +71,4 @@ TintStage PrepareTint(const StageSettings& settings) noexcept {
     return stage;
 }
 
-void TintStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t) const noexcept {
-    for (std::int32_t x = 0; x < width; ++x) {
-        out[x] = {m_blue[in[x].blue], m_green[in[x].green], m_red[in[x].red], in[x].alpha};
-    }
-}
-
 }  // namespace velmora::render

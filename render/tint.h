@@ -21,13 +21,12 @@ namespace velmora::render {
 
 class TintStage {
   public:
+    static constexpr bool kIsDamage = false;
+    static std::uint32_t Draws(const StageSettings&, std::int32_t) noexcept { return 0; }
     [[nodiscard]] bool IsActive() const noexcept { return m_active; }
     [[nodiscard]] const ByteTable& Red() const noexcept { return m_red; }
     [[nodiscard]] const ByteTable& Green() const noexcept { return m_green; }
     [[nodiscard]] const ByteTable& Blue() const noexcept { return m_blue; }
-
-    // The plain form; alpha is kept. `in` may be `out`.
-    void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
   private:
     friend TintStage PrepareTint(const StageSettings&) noexcept;

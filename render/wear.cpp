@@ -1,6 +1,8 @@
 #include "render/wear.h"
 
+#include "render/kernels.h"
 #include "render/shade.h"
+#include "render/wear_factors.h"
 
 namespace velmora::render {
 
@@ -9,8 +11,9 @@ std::uint32_t WearStripCount(const StageSettings& settings, std::int32_t width) 
     return static_cast<std::uint32_t>((std::int64_t{width} + stripWidth - 1) / stripWidth);
 }
 
-WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random& random) noexcept {
-    // An orientation that no form of the stage uses: the draw is part of the random sequence.
+WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random& random, WearFactors& factors,
+                      const Kernels& kernels) noexcept {
+    // An orientation that nothing uses: the draw is part of the random sequence.
     random.Draw(0, 3);
     WearStage stage;
     stage.m_active = settings.wear != 0.0f;
@@ -20,6 +23,8 @@ WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random&
     stage.m_starts = random;
     random.Skip(WearStripCount(settings, width));
     stage.m_amount = settings.wear;
+    stage.m_factors = factors.Set(*stage.m_picture, stage.m_amount) ? &factors : nullptr;
+    stage.m_kernels = &kernels;
     return stage;
 }
 
@@ -29,10 +34,16 @@ void WearStage::ShadeUnder(std::uint8_t byte, Bgra& pixel) const noexcept {
 }
 
 void WearStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
+    if (m_factors != nullptr) {
+        m_kernels->wear(in, out, width, m_factors->Over(RowsOver(y)),
+                        BlueOnly() ? kBlueChannel : kColourChannels);
+        if (!m_factors->HasOddBytes()) return;
+    } else if (in != out) {
+        std::copy(in, in + width, out);
+    }
+    // The kernel has left pixels under odd bytes as they are.
     ForEachByte(width, y, [&](std::int32_t x, std::uint8_t byte) {
-        Bgra pixel = in[x];
-        ShadeUnder(byte, pixel);
-        out[x] = pixel;
+        if (m_factors == nullptr || m_factors->IsOdd(byte)) ShadeUnder(byte, out[x]);
     });
 }
 

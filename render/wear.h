@@ -40,11 +40,22 @@ class WearRows {
     std::int32_t m_down;
 };
 
+class WearFactors;
+struct Kernels;
+
+// The strips of a frame of this width, each of which takes one draw.
+[[nodiscard]] std::uint32_t WearStripCount(const StageSettings& settings, std::int32_t width) noexcept;
+
 class WearStage {
   public:
+    static constexpr bool kIsDamage = true;
+    // One always, then one for each strip unless the wear is 0.
+    static std::uint32_t Draws(const StageSettings& settings, std::int32_t width) noexcept {
+        return 1 + (settings.wear != 0.0f ? WearStripCount(settings, width) : 0);
+    }
     [[nodiscard]] bool IsActive() const noexcept { return m_active; }
 
-    // The plain form, row `y` of the processed rectangle. `in` may be `out`.
+    // Row `y` of the processed rectangle. `in` may be `out`.
     void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
     // One pixel under a byte of the wear picture.
@@ -63,25 +74,23 @@ class WearStage {
     [[nodiscard]] WearRows RowsOver(std::int32_t y) const noexcept {
         return {m_starts, m_picture->height, y};
     }
-    [[nodiscard]] const GreyPicture& Picture() const noexcept { return *m_picture; }
-    [[nodiscard]] float Amount() const noexcept { return m_amount; }
     [[nodiscard]] bool BlueOnly() const noexcept { return m_channels == kWearBlueOnly; }
 
   private:
-    friend WearStage PrepareWear(const StageSettings&, std::int32_t, Random&) noexcept;
+    friend WearStage PrepareWear(const StageSettings&, std::int32_t, Random&, WearFactors&,
+                                 const Kernels&) noexcept;
 
     bool m_active = false;
     std::int32_t m_channels = kWearAllChannels;
     const GreyPicture* m_picture = nullptr;
     Random m_starts;
     float m_amount = 0.0f;
+    const WearFactors* m_factors = nullptr;  // none for a picture that is too large for them
+    const Kernels* m_kernels = nullptr;
 };
 
-// The strips of a frame of this width, each of which takes one draw.
-[[nodiscard]] std::uint32_t WearStripCount(const StageSettings& settings, std::int32_t width) noexcept;
-
-// Makes the frame's draws: one always, then one for each strip unless the wear is 0.
-[[nodiscard]] WearStage PrepareWear(const StageSettings& settings, std::int32_t width,
-                                    Random& random) noexcept;
+// Makes the frame's draws. The stage points into `factors` and serves until they are set anew.
+[[nodiscard]] WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random& random,
+                                    WearFactors& factors, const Kernels& kernels) noexcept;
 
 }  // namespace velmora::render

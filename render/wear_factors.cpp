@@ -50,8 +50,10 @@ std::optional<WearFactor> WearFactorOf(float fraction) noexcept {
     return std::nullopt;
 }
 
-void WearFactors::Set(const GreyPicture& picture, float amount) noexcept {
-    if (m_picture == &picture && m_amount == amount) return;
+bool WearFactors::Set(const GreyPicture& picture, float amount) noexcept {
+    if (m_picture == &picture && m_amount == amount) return true;
+    m_picture = nullptr;
+    if (picture.width < WearStrips::kRoom || picture.height > kMostPixels / picture.width) return false;
     m_picture = &picture;
     m_amount = amount;
     std::array<bool, 256> isUsed{};
@@ -74,6 +76,7 @@ void WearFactors::Set(const GreyPicture& picture, float amount) noexcept {
         const std::uint8_t* row = picture.pixels + y * picture.rowStep;
         next = std::transform(row, row + picture.width, next, [&](std::uint8_t b) { return byByte[b]; });
     }
+    return true;
 }
 
 }  // namespace velmora::render

@@ -49,11 +49,12 @@ class WearStrips {
 // Kept from frame to frame, since the amount seldom changes.
 class WearFactors {
   public:
-    // No wear picture has more pixels.
+    // No wear picture that comes with the program has more pixels.
     static constexpr std::int32_t kMostPixels = 50 * 300;
 
-    // Serves `picture` at `amount` from now on.
-    void Set(const GreyPicture& picture, float amount) noexcept;
+    // Serves `picture` at `amount` from now on. False, and nothing served, when the picture has more than kMostPixels
+    // or fewer than WearStrips::kRoom columns.
+    [[nodiscard]] bool Set(const GreyPicture& picture, float amount) noexcept;
 
     [[nodiscard]] WearStrips Over(const WearRows& rows) const noexcept {
         return {rows, m_factors.data() + WearStrips::kRoom, m_picture->width};

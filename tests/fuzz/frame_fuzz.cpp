@@ -27,8 +27,8 @@ using reelcheck::Packing;
 using reelcheck::PlayingHost;
 
 // What runs on a pair of frames: the library, or one of the two references. False: the frames are refused.
-enum class Runner { kLibrary, kReference, kOtherForm };
-constexpr Runner kRunners[] = {Runner::kLibrary, Runner::kReference, Runner::kOtherForm};
+enum class Runner { kLibrary, kReference, kOtherLevel };
+constexpr Runner kRunners[] = {Runner::kLibrary, Runner::kReference, Runner::kOtherLevel};
 using Operation = std::function<bool(Runner, const FrameRecord& source, const FrameRecord& destination)>;
 
 // Mostly small: what matters at an edge matters there too, and takes less time.
@@ -75,7 +75,7 @@ void Spoil(FuzzInput& input, Packing packing, FrameRecord& frame) {
 // destination, `at` bytes in, with what they make of them. `before`: what it held.
 void Compare(const Frame& source, Frame& destination, std::size_t at, const reelcheck::GuardedMemory& home,
              const std::vector<std::uint8_t>& before, Packing from, Packing to, const Operation& operation) {
-    for (const Runner runner : {Runner::kReference, Runner::kOtherForm}) {
+    for (const Runner runner : {Runner::kReference, Runner::kOtherLevel}) {
         Frame plainSource({source.Shape().width, source.Shape().height}, from);
         Frame plain({destination.Shape().width, destination.Shape().height}, to);
         plainSource.CopyRegion(source);
@@ -139,13 +139,12 @@ struct Reference {
 class Run {
   public:
     Run(FuzzInput& input, IEffectLibrary& library) : m_input(input), m_library(library) {
-        m_stages.options.road = render::Road::kByStages;
-        m_stages.options.level = render::SimdLevel::kPlain;
+        m_plain.options.level = render::SimdLevel::kPlain;
         const std::int32_t choice = input.Byte();
         m_other.options.level = std::min(render::kSimdLevels[choice % 5], render::BestSimdLevel());
         if (choice / 5 % 2 != 0) m_other.options.streamedBytes = 0;
         const std::uint32_t seed = input.Byte();
-        for (render::RenderState* state : {ProcessSession().state, &m_stages.state, &m_other.state}) {
+        for (render::RenderState* state : {ProcessSession().state, &m_plain.state, &m_other.state}) {
             *state = {};
             state->random.Seed(seed);
         }
@@ -188,7 +187,7 @@ class Run {
         const auto render = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
             if (runner == Runner::kLibrary) return Process(effect, &m_host, source, destination, seconds);
             // The references read the values that the library's list has just read, and leave in it what they found.
-            Reference& reference = runner == Runner::kReference ? m_stages : m_other;
+            Reference& reference = runner == Runner::kReference ? m_plain : m_other;
             const TimingRecord timing = {0.0, 0.0, seconds};
             return RenderFrame({CurrentMasterSettings(), &reference.state, reference.options}, *owner,
                                &source, &destination, &timing);
@@ -216,7 +215,7 @@ class Run {
     IEffectLibrary& m_library;
     PlayingHost m_host;
     std::array<Owned<IVideoEffect>, 5> m_effects;
-    Reference m_stages, m_other;
+    Reference m_plain, m_other;
 };
 
 }  // namespace

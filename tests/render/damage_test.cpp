@@ -6,9 +6,11 @@
 #include <cstring>
 #include <vector>
 
+#include "render/kernels.h"
 #include "render/shade.h"
 #include "render/spots.h"
 #include "render/wear.h"
+#include "render/wear_factors.h"
 
 namespace velmora::render {
 namespace {
@@ -28,13 +30,14 @@ TEST(Shade, MatchesWholeNumbersOnExactFractions) {
 
 // A row of wear restated: strip by strip, each with its own start row, wrapping at the picture's end.
 TEST(Wear, TilesInStripsWithARandomStartEach) {
+    WearFactors factors;
     for (const std::int32_t pattern : {2000, 2004, 2006, 2099}) {
         for (const std::int32_t width : {1, 50, 120, 133}) {
             StageSettings settings;
             settings.wear = 0.7f;
             settings.wearPattern = pattern;
             Random random(5), plain(5);
-            const WearStage stage = PrepareWear(settings, width, random);
+            const WearStage stage = PrepareWear(settings, width, random, factors, kPlainKernels);
             const GreyPicture& picture = WearPicture(pattern == 2099 ? 2000 : pattern);
             plain.Next();  // an orientation that nothing uses
             std::vector<std::int64_t> starts;
@@ -69,24 +72,34 @@ TEST(Wear, TilesInStripsWithARandomStartEach) {
     }
 }
 
-TEST(Wear, PicturesAreNoWiderThanRowsMakeRoomFor) {
-    for (std::int32_t value = 2000; value <= 2006; ++value) EXPECT_LE(WearPicture(value).width, kWidestWear);
+TEST(WearFactors, TakeThePicturesThatThereAreAndRefuseTooLargeOnes) {
+    WearFactors factors;
+    for (std::int32_t value = 2000; value <= 2006; ++value) {
+        EXPECT_LE(WearPicture(value).width, kWidestWear);
+        EXPECT_TRUE(factors.Set(WearPicture(value), 0.5f)) << value;
+    }
+    const GreyPicture tooLarge = {WearFactors::kMostPixels + 1, 1, WearFactors::kMostPixels + 1, nullptr};
+    EXPECT_FALSE(factors.Set(tooLarge, 0.5f));
+    const GreyPicture tooNarrow = {WearStrips::kRoom - 1, 9, WearStrips::kRoom - 1, nullptr};
+    EXPECT_FALSE(factors.Set(tooNarrow, 0.5f));
 }
 
 TEST(Wear, ZeroDrawsOnceAndDoesNothing) {
+    WearFactors factors;
     Random random(5);
-    EXPECT_FALSE(PrepareWear({}, 500, random).IsActive());
+    EXPECT_FALSE(PrepareWear({}, 500, random, factors, kPlainKernels).IsActive());
     Random plain(5);
     plain.Next();
     EXPECT_EQ(random.State(), plain.State());
 }
 
 TEST(Wear, BlueOnlyLeavesTheOtherChannels) {
+    WearFactors factors;
     StageSettings settings;
     settings.wear = 1.0f;
     settings.wearChannels = kWearBlueOnly;
     Random random(1);
-    const WearStage stage = PrepareWear(settings, 200, random);
+    const WearStage stage = PrepareWear(settings, 200, random, factors, kPlainKernels);
     std::vector<Bgra> row(200, Bgra{10, 20, 30, 40});
     bool changed = false;
     for (std::int32_t y = 0; y < 100; ++y) {

@@ -31,50 +31,30 @@ TEST(Jitter, DrawsVerticallyFirstAndAlwaysTwice) {
 }
 
 // Every shift of small pictures against the sentence "the pixel at (y, x) is the input's at (y - dy, x - dx),
-// the border where there is none", over both roads.
+// the border where there is none".
 TEST(Jitter, ShiftsAndFillsWhateverTheSize) {
     constexpr std::uint32_t kBorder = 0x80112233u;
     for (const auto& [width, height] : {std::pair{7, 5}, {1, 1}, {3, 1}, {1, 4}}) {
         for (std::int32_t dy = -6; dy <= 6; ++dy) {
             for (std::int32_t dx = -8; dx <= 8; ++dx) {
-                if (dy == 0 && dx == 0) continue;
-                // A destination buffer that is larger than the processed part on every side.
                 GuardedFrame source{Geometry{width, height, 2, 1, 3, true}};
-                GuardedFrame destination{Geometry{width + 4, height + 3, 1, 2, 5}};
-                source.FillRandom(3), destination.FillRandom(4);
-                const GuardedFrame before = destination, untouched = source;
-                FrameContext context(source.Description(), destination.Description());
+                source.FillRandom(3);
+                const ImageView view = ViewOf(source.Description(), width, height);
                 const JitterStage stage(dy, dx, kBorder);
-                stage.Apply(context);
                 std::vector<Bgra> scratch(static_cast<std::size_t>(width));
                 for (std::int32_t y = 0; y < height; ++y) {
-                    const Bgra* row = stage.Row(context.Source(), scratch.data(), y);
+                    const Bgra* row = stage.Row(view, scratch.data(), y);
                     for (std::int32_t x = 0; x < width; ++x) {
                         const std::int32_t fromY = y - dy, fromX = x - dx;
                         const bool inside = fromY >= 0 && fromY < height && fromX >= 0 && fromX < width;
                         const std::uint32_t expected = inside ? source.WordAt(fromY, fromX) : kBorder;
-                        ASSERT_EQ(destination.WordAt(y, x), expected)
-                            << dy << ' ' << dx << ' ' << y << ' ' << x;
                         ASSERT_EQ(std::memcmp(row + x, &expected, 4), 0)
                             << dy << ' ' << dx << ' ' << y << ' ' << x;
                     }
                 }
-                ASSERT_TRUE(destination.OnlyRegionDiffers(before, width, height));
-                ASSERT_EQ(source.Bytes(), untouched.Bytes());
             }
         }
     }
-}
-
-TEST(CopyRectangle, CutsTheOtherSideByAsMuch) {
-    GuardedFrame source{Geometry{6, 6}}, destination{Geometry{6, 6}};
-    source.FillRandom(1);
-    const ImageView from = ViewOf(source.Description(), 6, 6), to = ViewOf(destination.Description(), 6, 6);
-    // The source rectangle starts outside its bounds by (1, 2): the target moves along.
-    CopyRectangle(to, 0, 0, to.Region(), from, {-1, 3, -2, 3}, from.Region());
-    EXPECT_EQ(destination.WordAt(1, 2), source.WordAt(0, 0));
-    EXPECT_EQ(destination.WordAt(3, 4), source.WordAt(2, 2));
-    EXPECT_EQ(destination.At(0, 0).red, GuardedFrame::kGuard);
 }
 
 }  // namespace

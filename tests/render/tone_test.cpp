@@ -181,9 +181,9 @@ Bgra Mixed(float saturation, Bgra pixel) {
     ContrastCache cache;
     StageSettings settings;
     settings.saturation = saturation;
-    Bgra out = {};
-    PrepareColour(settings, 0, cache).Row(&pixel, &out, 1, 0);
-    return out;
+    const ColourStage stage = PrepareColour(settings, 0, cache);
+    EXPECT_TRUE(stage.Mixes());
+    return MixWithGrey(pixel, stage.Weight());
 }
 
 TEST(Colour, MixesWithTheGreyValue) {
@@ -270,11 +270,8 @@ TEST(Tint, ChainsGammaTintGamma) {
     EXPECT_FALSE(PrepareTint(settings).IsActive());
     settings.tintRed = 0.75f;
     const TintStage stage = PrepareTint(settings);
-    Bgra pixel = {0, 0, 0, 7}, out = {};
-    stage.Row(&pixel, &out, 1, 0);
-    EXPECT_EQ(out.red, 64);
-    EXPECT_EQ(out.green, 0);
-    EXPECT_EQ(out.alpha, 7);
+    EXPECT_EQ(stage.Red()[0], 64);
+    EXPECT_EQ(stage.Green()[0], 0);
 
     settings.tintRed = 0.5f;
     settings.filmGamma = 0.5f;

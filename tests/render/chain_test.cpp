@@ -1,4 +1,5 @@
-// The two roads of a frame give the same bytes, whatever the settings and the frames.
+// A frame by rows, on every SIMD level, is what its stages give one after the other, whatever the settings and the
+// frames.
 
 #include <gtest/gtest.h>
 
@@ -7,6 +8,7 @@
 
 #include "render/renderer.h"
 #include "tests/common/guarded_frame.h"
+#include "tests/render/stage_renderer.h"
 
 namespace velmora::render {
 namespace {
@@ -58,21 +60,30 @@ Geometry AnyGeometry(Dice& dice) {
             dice.Whole(0, 3),       dice.Whole(0, 5),       dice.Half()};
 }
 
-void Render(GuardedFrame& source, GuardedFrame& destination, const StageSettings& settings,
-            const RenderOptions& options, double seconds) {
+// The plain reference, or by rows as the options say.
+struct How {
+    bool isReference = false;
+    RenderOptions options = {};
+};
+
+void Render(GuardedFrame& source, GuardedFrame& destination, const StageSettings& settings, const How& how,
+            double seconds) {
     RenderState state;
     state.random.Pin(3, 0);
     FrameContext context(source.Description(), destination.Description());
     context.SetTime(seconds);
     ASSERT_TRUE(context.IsValid(Slot::kSource) && context.IsValid(Slot::kDestination));
-    RenderStages(context, settings, state, options);
+    if (how.isReference) {
+        testing::RenderByStages(context, settings, state, how.options.isDamageOnly);
+    } else {
+        RenderStages(context, settings, state, how.options);
+    }
     context.Finish();
 }
 
-constexpr RenderOptions kReference = {Road::kByStages, SimdLevel::kPlain};
-const RenderOptions kStreamed = {Road::kByRows, BestSimdLevel(), 0};
+const How kReference = {true}, kByRows = {}, kStreamed = {false, {BestSimdLevel(), 0}};
 
-TEST(Roads, GiveTheSameBytes) {
+TEST(Chain, ByRowsGivesTheStagesBytes) {
     for (std::uint32_t seed = 0; seed < 400; ++seed) {
         SCOPED_TRACE(seed);
         Dice dice(seed);
@@ -81,7 +92,8 @@ TEST(Roads, GiveTheSameBytes) {
         source.FillRandom(seed), expected.FillRandom(seed + 1);
         const GuardedFrame before = expected, untouched = source;
         const double seconds = dice.Whole(0, 3000) / 30.0;
-        Render(source, expected, settings, kReference, seconds);
+        const bool isDamageOnly = seed % 8 == 0;
+        Render(source, expected, settings, {true, {.isDamageOnly = isDamageOnly}}, seconds);
         const std::int32_t width = std::min(source.Shape().width, expected.Shape().width);
         const std::int32_t height = std::min(source.Shape().height, expected.Shape().height);
         ASSERT_TRUE(expected.OnlyRegionDiffers(before, width, height));
@@ -89,7 +101,7 @@ TEST(Roads, GiveTheSameBytes) {
             if (level > BestSimdLevel()) continue;
             for (const std::int64_t streamedBytes : {std::int64_t{0}, RenderOptions{}.streamedBytes}) {
                 GuardedFrame destination = before;
-                Render(source, destination, settings, {Road::kByRows, level, streamedBytes}, seconds);
+                Render(source, destination, settings, {false, {level, streamedBytes, isDamageOnly}}, seconds);
                 ASSERT_EQ(destination.Bytes(), expected.Bytes()) << static_cast<int>(level);
             }
         }
@@ -98,14 +110,14 @@ TEST(Roads, GiveTheSameBytes) {
 }
 
 // Few amounts give bytes without a factor.
-TEST(Roads, GiveTheSameBytesUnderOddWear) {
+TEST(Chain, ByRowsGivesTheStagesBytesUnderOddWear) {
     int found = 0;
     for (int step = 1; step <= 2000; ++step) {
         StageSettings settings;
         settings.wearPattern = 2002;  // the one with the most different bytes
         settings.wear = static_cast<float>(step) / 2000.0f;
         WearFactors factors;
-        factors.Set(WearPicture(settings.wearPattern), settings.wear);
+        ASSERT_TRUE(factors.Set(WearPicture(settings.wearPattern), settings.wear));
         if (!factors.HasOddBytes()) continue;
         ++found;
         for (const std::int32_t channels : {kWearAllChannels, kWearBlueOnly}) {
@@ -113,14 +125,14 @@ TEST(Roads, GiveTheSameBytesUnderOddWear) {
             GuardedFrame source{Geometry{130, 40}}, expected{Geometry{130, 40}}, result = expected;
             source.FillRandom(1);
             Render(source, expected, settings, kReference, 0.0);
-            Render(source, result, settings, {}, 0.0);
+            Render(source, result, settings, kByRows, 0.0);
             ASSERT_EQ(result.Bytes(), expected.Bytes()) << step;
         }
     }
     EXPECT_GT(found, 5);
 }
 
-TEST(Roads, InPlaceIsAsIfTheSourceHadBeenCopiedFirst) {
+TEST(Chain, InPlaceIsAsIfTheSourceHadBeenCopiedFirst) {
     for (std::uint32_t seed = 0; seed < 200; ++seed) {
         SCOPED_TRACE(seed);
         Dice dice(seed);
@@ -130,15 +142,15 @@ TEST(Roads, InPlaceIsAsIfTheSourceHadBeenCopiedFirst) {
         source.FillRandom(seed);
         expected = source;
         Render(source, expected, settings, kReference, 1.0);
-        for (const RenderOptions& options : {kReference, RenderOptions{}, kStreamed}) {
+        for (const How& how : {kReference, kByRows, kStreamed}) {
             GuardedFrame both = source;
-            Render(both, both, settings, options, 1.0);
+            Render(both, both, settings, how, 1.0);
             ASSERT_EQ(both.Bytes(), expected.Bytes());
         }
     }
 }
 
-TEST(Roads, OverlappingFramesAreAsIfTheSourceHadBeenCopiedFirst) {
+TEST(Chain, OverlappingFramesAreAsIfTheSourceHadBeenCopiedFirst) {
     for (std::int32_t shift = -3; shift <= 3; ++shift) {
         for (const bool jitter : {false, true}) {
             StageSettings settings;
@@ -166,11 +178,11 @@ TEST(Roads, OverlappingFramesAreAsIfTheSourceHadBeenCopiedFirst) {
     }
 }
 
-TEST(Roads, NeutralSettingsCopyTheSource) {
-    for (const RenderOptions& options : {kReference, RenderOptions{}, kStreamed}) {
+TEST(Chain, NeutralSettingsCopyTheSource) {
+    for (const How& how : {kReference, kByRows, kStreamed}) {
         GuardedFrame source{Geometry{13, 9, 1, 2, 3, true}}, destination{Geometry{11, 12}};
         source.FillRandom(1), destination.FillRandom(2);
-        Render(source, destination, {}, options, 2.0);
+        Render(source, destination, {}, how, 2.0);
         for (int y = 0; y < 9; ++y) {
             for (int x = 0; x < 11; ++x) ASSERT_EQ(destination.WordAt(y, x), source.WordAt(y, x));
         }
