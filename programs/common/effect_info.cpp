@@ -7,7 +7,7 @@
 namespace velmora::hosts {
 namespace {
 
-// Texts that fill their field carry no terminating zero.
+// Texts that fill their field have no terminating zero.
 std::string FieldText(const char* field, std::size_t width) {
     return std::string(field, std::find(field, field + width, '\0'));
 }

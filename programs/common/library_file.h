@@ -1,4 +1,4 @@
-// Where the library lies that a Windows host is to load. Windows only.
+// Finds the library that a Windows host loads. Windows only.
 #pragma once
 
 #include <string>

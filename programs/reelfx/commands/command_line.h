@@ -28,10 +28,10 @@ struct SheetCommand {
 using Command = std::variant<TextCommand, ListOptions, RenderOptions, FrameCommand, SheetCommand,
                              StripOptions, PresetShowOptions, PresetSaveOptions, PresetsOptions, InfoOptions>;
 
-// What the arguments ask for; opens and writes nothing. Throws UsageError.
+// Parses the arguments; opens and writes nothing. Throws UsageError.
 Command ReadCommandLine(int count, const char* const* arguments);
 
-// Does it. Throws Failure or UsageError; the caller prints their line.
+// Runs the command. Throws Failure or UsageError; the caller prints their text.
 ExitCode RunCommand(const Command& command);
 
 }  // namespace velmora::hosts

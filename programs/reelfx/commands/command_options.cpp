@@ -97,7 +97,7 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
                     "Check everything and print what would be done, but write nothing");
 }
 
-// What differs in the help of the commands that write stills.
+// The help texts that differ between the commands that write stills.
 struct PictureTexts {
     const char* what;
     const char* out;
