@@ -7,7 +7,13 @@
 
 #include <cstdint>
 
+#if !defined(__i386__) && !defined(__x86_64__)
+#include <cfenv>
+#endif
+
 namespace velmora {
+
+#if defined(__i386__) || defined(__x86_64__)
 
 class FloatGuard {
   public:
@@ -51,5 +57,25 @@ class FloatGuard {
     X87Environment m_x87;
     std::uint32_t m_vectorControl;
 };
+
+#else
+
+// Elsewhere the C library knows the state; on WebAssembly there is none to change. Saving it clears the exception
+// flags and masks the exceptions, as above.
+class FloatGuard {
+  public:
+    FloatGuard() noexcept {
+        std::feholdexcept(&m_environment);
+        std::fesetround(FE_TONEAREST);
+    }
+    ~FloatGuard() { std::fesetenv(&m_environment); }
+    FloatGuard(const FloatGuard&) = delete;
+    FloatGuard& operator=(const FloatGuard&) = delete;
+
+  private:
+    std::fenv_t m_environment;
+};
+
+#endif
 
 }  // namespace velmora
