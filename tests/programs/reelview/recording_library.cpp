@@ -38,7 +38,8 @@ void Record(IVideoEffect& effect, IVideoHost& host) {
         std::fprintf(file, "%08X\n", static_cast<unsigned>(cell.value.bits));
     }
     std::fclose(file);
-    MoveFileExW(unfinished.c_str(), name, MOVEFILE_REPLACE_EXISTING);
+    // The test may be reading the one before.
+    for (int i = 0; i < 500 && !MoveFileExW(unfinished.c_str(), name, MOVEFILE_REPLACE_EXISTING); ++i) Sleep(2);
 }
 
 class RecordingEffect final : public IVideoEffect {
