@@ -92,7 +92,38 @@ Font MessageFont(int dpi) {
     return Font(CreateFontIndirectW(&metrics.lfMessageFont));
 }
 
+// The list box that drops down has its button and edge drawn again: not every system has dark ones.
+LRESULT CALLBACK DarkMenuProcedure(HWND menu, UINT message, WPARAM wParam, LPARAM lParam, UINT_PTR id,
+                                   DWORD_PTR data) {
+    const LRESULT result = DefSubclassProc(menu, message, wParam, lParam);
+    const Theme& theme = *reinterpret_cast<const Theme*>(data);
+    if (message == WM_PAINT && theme.IsDark()) theme.PaintMenuBox(menu);
+    if (message == WM_NCDESTROY) RemoveWindowSubclass(menu, DarkMenuProcedure, id);
+    return result;
+}
+
 }  // namespace
+
+void Theme::PaintMenuBox(HWND menu) const {
+    COMBOBOXINFO info = {};
+    info.cbSize = sizeof info;
+    if (!GetComboBoxInfo(menu, &info)) return;
+    RECT area = {};
+    GetClientRect(menu, &area);
+    const support::win32::WindowDc dc(menu);
+    const Brush edge(CreateSolidBrush(m_palette.edge));
+    RECT button = {info.rcButton.left, 1, area.right - 1, area.bottom - 1};
+    FillRect(dc.Dc(), &button, FieldBrush());
+    FrameRect(dc.Dc(), &area, edge.get());
+    InflateRect(&area, -1, -1);
+    FrameRect(dc.Dc(), &area, FieldBrush());
+    const int x = (button.left + button.right) / 2, y = (button.top + button.bottom) / 2, half = Px(4);
+    const POINT arrow[] = {{x - half, y - half / 2}, {x + half, y - half / 2}, {x, y + half / 2 + 1}};
+    const Brush text(CreateSolidBrush(m_palette.text));
+    const support::win32::Selection fill(dc.Dc(), text.get());
+    const support::win32::Selection line(dc.Dc(), GetStockObject(NULL_PEN));
+    Polygon(dc.Dc(), arrow, 3);
+}
 
 Scheme SystemScheme() {
     HIGHCONTRASTW contrast = {};
@@ -124,6 +155,7 @@ void Theme::Dress(HWND control) const {
         SetWindowTheme(control, nullptr, nullptr);
     } else if (lstrcmpiW(name, L"ComboBox") == 0) {
         SetWindowTheme(control, L"DarkMode_CFD", nullptr);
+        SetWindowSubclass(control, DarkMenuProcedure, 1, reinterpret_cast<DWORD_PTR>(this));
     } else {
         SetWindowTheme(control, L"DarkMode_Explorer", nullptr);
     }
@@ -175,9 +207,10 @@ std::optional<LRESULT> Theme::DrawPart(const NMCUSTOMDRAW& part) const {
     }
     if (lstrcmpiW(name, TRACKBAR_CLASSW) != 0) return std::nullopt;
     if (part.dwDrawStage == CDDS_PREPAINT) return CDRF_NOTIFYITEMDRAW;
+    const bool isPart = part.dwItemSpec == TBCD_CHANNEL || part.dwItemSpec == TBCD_THUMB;
+    if (part.dwDrawStage != CDDS_ITEMPREPAINT || !isPart) return CDRF_DODEFAULT;
     const bool isOff = IsWindowEnabled(part.hdr.hwndFrom) == FALSE;
     RECT area = part.rc;
-    if (part.dwItemSpec == TBCD_TICS) return CDRF_SKIPDEFAULT;
     if (part.dwItemSpec == TBCD_CHANNEL) {
         SendMessageW(part.hdr.hwndFrom, TBM_GETCHANNELRECT, 0, reinterpret_cast<LPARAM>(&area));
     }

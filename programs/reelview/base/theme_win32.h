@@ -48,6 +48,8 @@ class Theme {
     // Draws what the system would leave light in a dark window: check boxes and the bar of a slider. Nothing: the
     // system draws.
     [[nodiscard]] std::optional<LRESULT> DrawPart(const NMCUSTOMDRAW& part) const;
+    // The edge and the button of a combo box, in a dark window.
+    void PaintMenuBox(HWND menu) const;
     // What is left of the menu bar beside its menus, on a dark window.
     void PaintMenuRest(HWND window) const;
     // The answer to WM_CTLCOLOR...; `isField` for edits and lists.

@@ -13,7 +13,7 @@ constexpr std::int32_t kMargin = 6;
 constexpr std::int32_t kFurthest = 2000;
 constexpr std::int32_t kBoxWidth = 48;
 constexpr std::int32_t kCaptionHeight = 9, kFieldWidth = 38, kFieldHeight = 11;
-constexpr std::int32_t kCaptionOverhang = 8;  // on both sides: captions may be wider than knobs
+constexpr std::int32_t kCaptionOverhang = 7;  // on both sides: captions may be wider than knobs
 constexpr std::int32_t kKnobTop = 11, kKnobSide = 48, kFieldTop = 61;
 constexpr std::int32_t kSwatchInset = 6;
 constexpr std::int32_t kMenuWidth = 95, kMenuHeight = 13;

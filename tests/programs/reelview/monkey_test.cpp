@@ -2,6 +2,7 @@
 // MONKEY_SEED which course.
 
 #include <windows.h>
+#include <psapi.h>
 #include <shlobj.h>
 
 #include <gtest/gtest.h>
@@ -128,7 +129,8 @@ class Monkey {
 };
 
 struct Held {
-    DWORD handles, gdi, user;
+    DWORD handles, gdi, user;  // 0 where the system does not count them
+    SIZE_T bytes;
 };
 
 Held HeldBy(HANDLE process) {
@@ -136,6 +138,9 @@ Held HeldBy(HANDLE process) {
     GetProcessHandleCount(process, &held.handles);
     held.gdi = GetGuiResources(process, GR_GDIOBJECTS);
     held.user = GetGuiResources(process, GR_USEROBJECTS);
+    PROCESS_MEMORY_COUNTERS memory = {};
+    GetProcessMemoryInfo(process, &memory, sizeof memory);
+    held.bytes = memory.PagefileUsage;
     return held;
 }
 
@@ -160,7 +165,8 @@ TEST(Monkey, FindsNothing) {
     const Held after = HeldBy(program.Process());
     std::cout << acts << " acts; handles " << before.handles << " to " << after.handles << ", GDI "
               << before.gdi << " to " << after.gdi << ", USER " << before.user << " to " << after.user
-              << '\n';
+              << ", KiB " << before.bytes / 1024 << " to " << after.bytes / 1024 << '\n';
+    EXPECT_LE(after.bytes, before.bytes + (SIZE_T{64} << 20));
     EXPECT_LE(after.handles, before.handles + 40);
     EXPECT_LE(after.gdi, before.gdi + 60);
     EXPECT_LE(after.user, before.user + 60);

@@ -68,8 +68,7 @@ bool Becomes(std::uint32_t parameter, const std::function<bool(ValueWord)>& isRi
             ValueWord word{};
             word.bits = recorded->values[parameter];
             return isRight(word);
-        },
-        8.0);
+        });
 }
 
 bool BecomesNumber(std::uint32_t parameter, double value) {
