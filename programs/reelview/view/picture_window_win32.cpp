@@ -74,54 +74,59 @@ void PictureWindow::PaintLabel(HDC dc, const std::wstring& text, int x, int y, b
     DrawTextW(dc, text.c_str(), -1, &box, DT_CENTER | DT_VCENTER | DT_SINGLELINE | DT_NOPREFIX);
 }
 
+void PictureWindow::PaintInvitation(HDC dc, const RECT& area) const {
+    const bool isContrast = m_theme.CurrentScheme() == Scheme::kHighContrast;
+    SetTextColor(dc, isContrast ? m_theme.Colours().text : RGB(0xE8, 0xE8, 0xE8));
+    SetBkMode(dc, TRANSPARENT);
+    RECT box = area, lines = area;
+    DrawTextW(dc, m_labels.invitation.c_str(), -1, &lines,
+              DT_CALCRECT | DT_CENTER | DT_WORDBREAK | DT_NOPREFIX);
+    OffsetRect(&box, 0, (area.bottom - lines.bottom) / 2);
+    DrawTextW(dc, m_labels.invitation.c_str(), -1, &box, DT_CENTER | DT_WORDBREAK | DT_NOPREFIX);
+}
+
+void PictureWindow::PaintClipped(HDC dc, const Picture& picture, const Box& place, const RECT& clip) const {
+    const int saved = SaveDC(dc);
+    IntersectClipRect(dc, clip.left, clip.top, clip.right, clip.bottom);
+    PaintPicture(dc, picture, place);
+    RestoreDC(dc, saved);
+}
+
+void PictureWindow::PaintDivider(HDC dc, const ViewPlaces& places, const RECT& area) const {
+    const int half = std::max(m_theme.Px(1), 1), grip = m_theme.Px(4);
+    const RECT line = {places.divider - half, std::max(places.before.top, 0), places.divider + half,
+                       std::min<LONG>(places.before.bottom, area.bottom)};
+    const LONG middle = (line.top + line.bottom) / 2;
+    const RECT handle = {places.divider - grip, middle - 4 * grip, places.divider + grip, middle + 4 * grip};
+    const Brush brush(CreateSolidBrush(m_theme.Colours().accent));
+    FillRect(dc, &line, brush.get());
+    FillRect(dc, &handle, brush.get());
+}
+
 void PictureWindow::Paint(HDC dc, const RECT& area) const {
     const Brush stage(CreateSolidBrush(m_theme.Colours().stage));
     FillRect(dc, &area, stage.get());
     const support::win32::Selection font(dc, m_theme.TextFont());
     if (!m_before) {
-        const bool isContrast = m_theme.CurrentScheme() == Scheme::kHighContrast;
-        SetTextColor(dc, isContrast ? m_theme.Colours().text : RGB(0xE8, 0xE8, 0xE8));
-        SetBkMode(dc, TRANSPARENT);
-        RECT box = area, lines = area;
-        DrawTextW(dc, m_labels.invitation.c_str(), -1, &lines,
-                  DT_CALCRECT | DT_CENTER | DT_WORDBREAK | DT_NOPREFIX);
-        OffsetRect(&box, 0, (area.bottom - lines.bottom) / 2);
-        DrawTextW(dc, m_labels.invitation.c_str(), -1, &box, DT_CENTER | DT_WORDBREAK | DT_NOPREFIX);
+        PaintInvitation(dc, area);
         return;
     }
     const ViewPlaces places = Places();
     const Picture& after = m_after ? *m_after : *m_before;
-    const int inset = m_theme.Px(8);
-    if (m_state.compare == Compare::kAfter) {
-        PaintPicture(dc, after, places.after);
-    } else if (m_state.compare == Compare::kSideBySide) {
+    if (m_state.compare == Compare::kSideBySide) {
         // Each keeps to its half of the window when it is larger.
         const int middle = area.right / 2, gap = m_theme.Px(4);
-        const int saved = SaveDC(dc);
-        IntersectClipRect(dc, 0, 0, middle - gap, area.bottom);
-        PaintPicture(dc, *m_before, places.before);
-        RestoreDC(dc, saved);
-        const int again = SaveDC(dc);
-        IntersectClipRect(dc, middle + gap, 0, area.right, area.bottom);
-        PaintPicture(dc, after, places.after);
-        RestoreDC(dc, again);
+        PaintClipped(dc, *m_before, places.before, {0, 0, middle - gap, area.bottom});
+        PaintClipped(dc, after, places.after, {middle + gap, 0, area.right, area.bottom});
     } else {
         PaintPicture(dc, after, places.after);
-        const int saved = SaveDC(dc);
-        IntersectClipRect(dc, places.before.left, 0, places.divider, area.bottom);
-        PaintPicture(dc, *m_before, places.before);
-        RestoreDC(dc, saved);
-        const int half = std::max(m_theme.Px(1), 1);
-        RECT line = {places.divider - half, std::max(places.before.top, 0), places.divider + half,
-                     std::min<LONG>(places.before.bottom, area.bottom)};
-        const Brush brush(CreateSolidBrush(m_theme.Colours().accent));
-        FillRect(dc, &line, brush.get());
-        const int middle = (line.top + line.bottom) / 2, grip = m_theme.Px(4);
-        RECT handle = {places.divider - grip, middle - 4 * grip, places.divider + grip, middle + 4 * grip};
-        FillRect(dc, &handle, brush.get());
+    }
+    if (m_state.compare == Compare::kDivider) {
+        PaintClipped(dc, *m_before, places.before, {places.before.left, 0, places.divider, area.bottom});
+        PaintDivider(dc, places, area);
     }
     if (m_state.compare == Compare::kAfter) return;
-    const int top = std::max(places.before.top, 0) + inset;
+    const int inset = m_theme.Px(8), top = std::max(places.before.top, 0) + inset;
     PaintLabel(dc, m_labels.before, std::max(places.before.left, 0) + inset, top, false);
     PaintLabel(dc, m_labels.after, std::min<int>(places.after.right, area.right) - inset, top, true);
 }

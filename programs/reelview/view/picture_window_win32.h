@@ -39,6 +39,9 @@ class PictureWindow {
     [[nodiscard]] ViewPlaces Places() const;
     void Paint(HDC dc, const RECT& area) const;
     void PaintPicture(HDC dc, const Picture& picture, const Box& place) const;
+    void PaintClipped(HDC dc, const Picture& picture, const Box& place, const RECT& clip) const;
+    void PaintInvitation(HDC dc, const RECT& area) const;
+    void PaintDivider(HDC dc, const ViewPlaces& places, const RECT& area) const;
     void PaintLabel(HDC dc, const std::wstring& text, int x, int y, bool isRight) const;
     [[nodiscard]] bool IsOnDivider(int x) const;
     void OnButtonDown(int x, int y);

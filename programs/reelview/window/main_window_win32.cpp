@@ -267,31 +267,66 @@ void MainWindow::Close() {
     DestroyWindow(m_window);
 }
 
-LRESULT MainWindow::OnMessage(UINT message, WPARAM wParam, LPARAM lParam) {
+void MainWindow::OnDpiChanged(int dpi, const RECT& place) {
+    m_theme.Set(m_theme.CurrentScheme(), dpi);
+    SetWindowPos(m_window, nullptr, place.left, place.top, place.right - place.left, place.bottom - place.top,
+                 SWP_NOZORDER | SWP_NOACTIVATE);
+    Restyle();
+}
+
+void MainWindow::OnLookChanged(UINT message) {
+    // Controls that are dressed anew send this too.
+    const bool isOwn = message == WM_THEMECHANGED && SystemScheme() == m_theme.CurrentScheme();
+    if (m_status == nullptr || isOwn) return;
+    m_theme.Set(SystemScheme(), m_theme.Dpi());
+    Restyle();
+}
+
+// What has to do with how the window looks.
+std::optional<LRESULT> MainWindow::OnLookMessage(UINT message, WPARAM wParam, LPARAM lParam) {
     switch (message) {
-        case WM_SIZE:
-            LayOut();
+        case WM_DPICHANGED:
+            OnDpiChanged(HIWORD(wParam), *reinterpret_cast<const RECT*>(lParam));
             return 0;
-        case WM_GETMINMAXINFO:
-            reinterpret_cast<MINMAXINFO*>(lParam)->ptMinTrackSize = {m_theme.Px(640), m_theme.Px(420)};
-            return 0;
-        case WM_DPICHANGED: {
-            const auto& box = *reinterpret_cast<const RECT*>(lParam);
-            m_theme.Set(m_theme.CurrentScheme(), HIWORD(wParam));
-            SetWindowPos(m_window, nullptr, box.left, box.top, box.right - box.left, box.bottom - box.top,
-                         SWP_NOZORDER | SWP_NOACTIVATE);
-            Restyle();
-            return 0;
-        }
         case WM_SETTINGCHANGE:
         case WM_SYSCOLORCHANGE:
         case WM_THEMECHANGED:
-            if (m_status == nullptr ||
-                (message == WM_THEMECHANGED && SystemScheme() == m_theme.CurrentScheme()))
-                return 0;
-            m_theme.Set(SystemScheme(), m_theme.Dpi());
-            Restyle();
+            OnLookChanged(message);
             return 0;
+        case WM_NCPAINT:
+        case WM_NCACTIVATE: {
+            const LRESULT result = DefWindowProcW(m_window, message, wParam, lParam);
+            m_theme.PaintMenuRest(m_window);
+            return result;
+        }
+        case WM_MEASUREITEM:
+            if (m_menu && m_menu->Measure(*reinterpret_cast<MEASUREITEMSTRUCT*>(lParam))) return TRUE;
+            return std::nullopt;
+        case WM_DRAWITEM: {
+            const auto& item = *reinterpret_cast<const DRAWITEMSTRUCT*>(lParam);
+            if ((m_menu && m_menu->Draw(item)) || (m_bar && m_bar->Draw(item))) return TRUE;
+            return std::nullopt;
+        }
+        case WM_CTLCOLORSTATIC:
+        case WM_CTLCOLORBTN:
+            return reinterpret_cast<LRESULT>(m_theme.ControlColours(reinterpret_cast<HDC>(wParam), false));
+        case WM_CTLCOLOREDIT:
+        case WM_CTLCOLORLISTBOX:
+            return reinterpret_cast<LRESULT>(m_theme.ControlColours(reinterpret_cast<HDC>(wParam), true));
+        case WM_ERASEBKGND: {
+            RECT area = {};
+            GetClientRect(m_window, &area);
+            FillRect(reinterpret_cast<HDC>(wParam), &area, m_theme.WindowBrush());
+            return 1;
+        }
+        default:
+            return std::nullopt;
+    }
+}
+
+// What the user does.
+std::optional<LRESULT> MainWindow::OnInputMessage(UINT message, WPARAM wParam, LPARAM lParam) {
+    switch (message) {
         case WM_COMMAND:
             OnCommand(LOWORD(wParam), HIWORD(wParam));
             return 0;
@@ -305,44 +340,31 @@ LRESULT MainWindow::OnMessage(UINT message, WPARAM wParam, LPARAM lParam) {
             return 0;
         case WM_KEYDOWN:
             if (OnKey(wParam)) return 0;
-            break;
+            return std::nullopt;
         case WM_DROPFILES:
             OnDrop(reinterpret_cast<HDROP>(wParam));
             return 0;
         case WM_INITMENUPOPUP:
             ShowMarks();
             return 0;
-        case WM_NCPAINT:
-        case WM_NCACTIVATE: {
-            const LRESULT result = DefWindowProcW(m_window, message, wParam, lParam);
-            m_theme.PaintMenuRest(m_window);
-            return result;
-        }
-        case WM_MEASUREITEM:
-            if (m_menu && m_menu->Measure(*reinterpret_cast<MEASUREITEMSTRUCT*>(lParam))) return TRUE;
-            break;
-        case WM_DRAWITEM: {
-            const auto& item = *reinterpret_cast<const DRAWITEMSTRUCT*>(lParam);
-            if ((m_menu && m_menu->Draw(item)) || (m_bar && m_bar->Draw(item))) return TRUE;
-            break;
-        }
         case WM_MENUCHAR:
-            if (m_theme.IsDark())
-                return m_menu->OnLetter(static_cast<wchar_t>(LOWORD(wParam)),
-                                        reinterpret_cast<HMENU>(lParam));
-            break;
-        case WM_CTLCOLORSTATIC:
-        case WM_CTLCOLORBTN:
-            return reinterpret_cast<LRESULT>(m_theme.ControlColours(reinterpret_cast<HDC>(wParam), false));
-        case WM_CTLCOLOREDIT:
-        case WM_CTLCOLORLISTBOX:
-            return reinterpret_cast<LRESULT>(m_theme.ControlColours(reinterpret_cast<HDC>(wParam), true));
-        case WM_ERASEBKGND: {
-            RECT area = {};
-            GetClientRect(m_window, &area);
-            FillRect(reinterpret_cast<HDC>(wParam), &area, m_theme.WindowBrush());
-            return 1;
-        }
+            if (!m_theme.IsDark()) return std::nullopt;
+            return m_menu->OnLetter(static_cast<wchar_t>(LOWORD(wParam)), reinterpret_cast<HMENU>(lParam));
+        default:
+            return std::nullopt;
+    }
+}
+
+LRESULT MainWindow::OnMessage(UINT message, WPARAM wParam, LPARAM lParam) {
+    if (const auto result = OnLookMessage(message, wParam, lParam)) return *result;
+    if (const auto result = OnInputMessage(message, wParam, lParam)) return *result;
+    switch (message) {
+        case WM_SIZE:
+            LayOut();
+            return 0;
+        case WM_GETMINMAXINFO:
+            reinterpret_cast<MINMAXINFO*>(lParam)->ptMinTrackSize = {m_theme.Px(640), m_theme.Px(420)};
+            return 0;
         case WM_TIMER:
             OnTimer(wParam);
             return 0;
@@ -359,9 +381,8 @@ LRESULT MainWindow::OnMessage(UINT message, WPARAM wParam, LPARAM lParam) {
             PostQuitMessage(0);
             return 0;
         default:
-            break;
+            return DefWindowProcW(m_window, message, wParam, lParam);
     }
-    return DefWindowProcW(m_window, message, wParam, lParam);
 }
 
 double MainWindow::Now() {

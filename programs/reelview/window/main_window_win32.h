@@ -62,6 +62,10 @@ class MainWindow final : public PanelOwner {
     LRESULT OnNotify(const NMHDR& notification, LPARAM lParam);
     bool OnKey(WPARAM key);
     void OnDrop(HDROP drop);
+    void OnDpiChanged(int dpi, const RECT& place);
+    void OnLookChanged(UINT message);
+    std::optional<LRESULT> OnLookMessage(UINT message, WPARAM wParam, LPARAM lParam);
+    std::optional<LRESULT> OnInputMessage(UINT message, WPARAM wParam, LPARAM lParam);
     void OnTimer(WPARAM id);
     bool Translate(MSG& message);
     void Close();
