@@ -18,8 +18,10 @@ struct ParamInfo {
     float minimum = 0.0f;            // slider: shown range
     float maximum = 0.0f;
     ValueWord defaultValue = {};
-    std::vector<std::string> items;  // menu
-    bool isGroupEnd = false;         // group marker
+    std::vector<std::string> items;                    // menu
+    bool isGroupEnd = false;                           // group marker
+    std::int32_t x = 0, y = 0, width = 0, height = 0;  // layout, in the host's dialog units
+    bool isVisible = true;
 
     [[nodiscard]] bool HoldsValue() const { return kind != kKindGroup && kind != kKindNone; }
 };
