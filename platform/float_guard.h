@@ -9,6 +9,7 @@
 
 namespace velmora {
 
+#if defined(__i386__) || defined(__x86_64__)
 class FloatGuard {
   public:
     FloatGuard() noexcept : m_processorFlags(ProcessorFlags()) {
@@ -51,5 +52,15 @@ class FloatGuard {
     X87Environment m_x87;
     std::uint32_t m_vectorControl;
 };
+#else
+// WebAssembly has one floating-point state, which nobody can change.
+class FloatGuard {
+  public:
+    FloatGuard() noexcept {}
+    ~FloatGuard() {}
+    FloatGuard(const FloatGuard&) = delete;
+    FloatGuard& operator=(const FloatGuard&) = delete;
+};
+#endif
 
 }  // namespace velmora
