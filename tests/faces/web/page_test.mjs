@@ -292,8 +292,9 @@ pageTest('the texts of all languages fit', {locale: 'de-DE', viewport: {width: 3
             .filter((element) => !(element.getAttribute('aria-label') || element.textContent.trim() ||
                 element.labels?.length)).map((element) => element.outerHTML));
         assert.deepEqual(unnamed, [], code);
-        const wide = await page.evaluate(() => document.documentElement.scrollWidth > innerWidth ||
-            [...document.querySelectorAll('nav button, .keep button, .seed, .row, .tools')].some((one) => one.scrollWidth > one.clientWidth));
-        assert.equal(wide, false, `${code}: a text is cut`);
+        const cut = await page.evaluate(() => [
+            ...document.querySelectorAll('html, nav button, .keep button, .seed, .row, .name, .tools'),
+        ].filter((one) => one.scrollWidth > one.clientWidth).map((one) => one.textContent.trim().slice(0, 40)));
+        assert.deepEqual(cut, [], code);
     }
 });
