@@ -188,7 +188,7 @@ class Page {
             this.player.setSource(source);
             this.stage.setSize(source.width, source.height);
             document.body.dataset.source = source.kind;
-            document.body.style.setProperty('--ratio', Math.min(Math.max(source.width / source.height, 0.7), 2));
+            this.setRatio(source.width / source.height);
             this.keeper.setSource(source);
             await this.player.settled();
             this.wantThumbnails();
@@ -196,6 +196,14 @@ class Page {
         } catch {
             say(failure);
         }
+    }
+
+    // Of the picture on narrow screens and of the thumbnails, whose names want some width.
+    setRatio(ratio) {
+        const {style} = document.body;
+        style.setProperty('--ratio', Math.min(Math.max(ratio, 0.7), 2.4));
+        style.setProperty('--thumbnail-ratio', Math.min(Math.max(ratio, 1.3), 2));
+        this.strip.reveal('instant');
     }
 
     openSample() {
@@ -223,7 +231,8 @@ class Page {
         try {
             await this.renderer.thumbnails(await source.picture(), this.strip.wanted(), source.seconds);
         } catch {
-            // The source has been closed in between; the next one asks again.
+            // A source that has been closed in between has none; the next one asks again.
+            if (source === this.player.source) say('This picture cannot be shown.');
         }
         this.isAskingThumbnails = false;
     }
@@ -291,7 +300,6 @@ async function start() {
         window.reel = page;  // for whoever looks into the page, and for its tests
         page.showLook();
         await page.openSample();
-        page.strip.reveal();
         document.body.classList.add('ready');
     } catch {
         setLanguage(preferredLanguage());

@@ -68,7 +68,8 @@ class Thumbnails {
 
     // Replaces what is still to be drawn: [{id, look}].
     draw(picture, jobs, seconds) {
-        const height = Math.max(1, Math.round(thumbnailWidth * picture.height / picture.width));
+        const [wide, high] = [picture.displayWidth ?? picture.width, picture.displayHeight ?? picture.height];
+        const height = Math.max(1, Math.round(thumbnailWidth * high / wide));
         this.#picture.set(reader.read(picture, thumbnailWidth, height));
         this.#canvas.width = thumbnailWidth;
         this.#canvas.height = height;

@@ -50,12 +50,13 @@ export class Strip {
         (stop ?? this.#cells.find((cell) => cell.effect === effect)).button.tabIndex = 0;
     }
 
-    reveal() {
+    // `behavior` as scrollTo has it.
+    reveal(behavior = 'smooth') {
         const {effect} = this.#looks.look;
         const preset = Math.max(0, this.#looks.preset);
         const {button} = this.#cells.find((cell) => cell.effect === effect && cell.preset === preset);
         const left = button.offsetLeft - (this.#place.clientWidth - button.offsetWidth) / 2;
-        this.#place.scrollTo({left, behavior: 'smooth'});
+        this.#place.scrollTo({left, behavior});
     }
 
     #addGroup(effect, number) {

@@ -21,7 +21,7 @@ const probe = (file) => JSON.parse(run('ffprobe', '-v', 'error', '-of', 'json', 
 before(async () => {
     const scene = ['-f', 'lavfi', '-i', 'testsrc2=size=322x178:rate=30'];
     ffmpeg(...scene, '-frames:v', '1', picture);
-    const even = ['-f', 'lavfi', '-i', 'testsrc2=size=320x180:rate=25:duration=1.2', '-f', 'lavfi', '-i',
+    const even = ['-f', 'lavfi', '-i', 'testsrc2=size=320x200:rate=25:duration=1.2', '-f', 'lavfi', '-i',
         'sine=frequency=440:duration=1.2'];
     const colours = ['-vf', 'scale=out_color_matrix=bt709:out_range=tv', '-colorspace', 'bt709', '-color_primaries', 'bt709',
         '-color_trc', 'bt709', '-color_range', 'tv'];
@@ -179,9 +179,10 @@ pageTest('a clip by drop, and the clip that is saved', {}, async (page) => {
         }, [bytes, basename(file)]);
         await page.waitForFunction((name) => reel.player.source.name === name, basename(file));
         await page.waitForFunction(() => reel.player.source.seconds > 0.2);
+        await page.waitForFunction(() => document.querySelector('[aria-selected=true] canvas').height === 200);
         const film = await saved(page, () => page.click('#keepClip'));
         const [video, sound] = ['video', 'audio'].map((type) => probe(film).streams.find((s) => s.codec_type === type));
-        assert.deepEqual([video.width, video.height, Number(video.nb_read_frames)], [320, 180, 30]);
+        assert.deepEqual([video.width, video.height, Number(video.nb_read_frames)], [320, 200, 30]);
         assert.equal(sound.codec_name, codec, 'the sound is copied');
         assert.ok(Math.abs(Number(sound.nb_read_frames) - Number(probe(file).streams[1].nb_read_frames)) <= 1);
         // Against what reelfx makes of the same clip: the same film but for the encoder's losses.
