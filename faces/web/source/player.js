@@ -1,7 +1,10 @@
 // Brings the source's pictures to the renderer, one at a time and always the newest, and the look with them.
 
-const slowFrames = 10;  // so many slow frames in a row make the picture small
-const slowTime = 38;    // milliseconds
+// So many frames in a row that take too long make the picture half its size while it plays; so many that would not take
+// too long at full size, four times the pixels, make it full again. Times in milliseconds.
+const framesInRow = 12;
+const slowTime = 38;
+const fastTime = 7;
 
 export class Player {
     #renderer;
@@ -11,7 +14,7 @@ export class Player {
     #wantsDraw = false;
     #wantsPicture = false;
     #scale = 1;
-    #slow = 0;
+    #inRow = 0;
     #shown = [];
     #idle = [];
     onShown = () => {};
@@ -98,9 +101,12 @@ export class Player {
     }
 
     #watchTime(time) {
-        this.#slow = this.#source.isPlaying && time > slowTime ? this.#slow + 1 : 0;
-        if (this.#slow < slowFrames || this.#scale < 1) return;
-        this.#scale = 0.5;
+        const isHalf = this.isHalfSize;
+        const isOtherSizeBetter = this.#source.isPlaying && (isHalf ? time < fastTime : time > slowTime);
+        this.#inRow = isOtherSizeBetter ? this.#inRow + 1 : 0;
+        if (this.#inRow < framesInRow) return;
+        this.#inRow = 0;
+        this.#scale = isHalf ? 1 : 0.5;
         this.draw(true);
     }
 }
