@@ -301,7 +301,8 @@ async function start() {
         page.showLook();
         await page.openSample();
         document.body.classList.add('ready');
-    } catch {
+    } catch (error) {
+        console.error(error);
         setLanguage(preferredLanguage());
         say('This browser is too old for this page.');
     }

@@ -12,6 +12,7 @@ import {clipSeconds, unknownFacts} from './clip_time.js';
 
 const stillSeconds = 10;
 const stillRate = 30;
+const mostPixels = 64e6;  // of a picture; the effects hold it twice
 
 class Source {
     onFrame = () => {};
@@ -189,11 +190,17 @@ async function openClip(file) {
 export async function openFile(file) {
     if (file.size === 0) throw new Error('no picture');
     if (file.type.startsWith('video/') || file.type.startsWith('audio/')) return openClip(file);
+    let bitmap;
     try {
-        return new Still(await createImageBitmap(file), file.name);
+        bitmap = await createImageBitmap(file);
     } catch {
         return openClip(file);
     }
+    if (bitmap.width * bitmap.height > mostPixels) {
+        bitmap.close();
+        throw new Error('the picture is too large');
+    }
+    return new Still(bitmap, file.name);
 }
 
 export async function openCamera() {

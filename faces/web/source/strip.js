@@ -65,6 +65,7 @@ export class Strip {
         group.setAttribute('aria-label', effect.name);
         const title = document.createElement('span');
         title.className = 'title';
+        title.setAttribute('aria-hidden', 'true');
         title.textContent = effect.name;
         group.append(title);
         effect.presets.forEach((preset, i) => group.append(this.#addCell(number, i, preset.name)));

@@ -260,15 +260,16 @@ pageTest('broken and hostile files', {}, async (page) => {
         'empty.mp4': '', 'noise.png': 'not a picture', 'noise.mp4': 'not a clip',
         'cut.mp4': run('head', '-c', '3000', clip),
         'page.html': '<script>alert(1)</script>',
-        'sound.wav': 'RIFF',
+        'sound.wav': 'RIFF', 'huge.png': null,
         'broken.fxprela': '<Preset', 'huge.fxprela': 'x'.repeat(3 << 20),
         'other.fxprelb': '<Preset Name="a" LibraryName="Another" EffectName="Film Look"><parameter type="3" value="1"/></Preset>',
         'script.fxprelb': '<!DOCTYPE a [<!ENTITY e SYSTEM "file:///etc/passwd">]><Preset LibraryName="&e;"/>',
     };
+    ffmpeg('-f', 'lavfi', '-i', 'color=size=9000x9000', '-frames:v', '1', join(folder, 'huge.png'));
     const source = await page.evaluateHandle(() => reel.player.source);
     for (const [name, content] of Object.entries(files)) {
         const place = join(folder, name);
-        writeFileSync(place, content);
+        if (content !== null) writeFileSync(place, content);
         await page.setInputFiles('#file', place);
         const said = await message(page);
         assert.match(said, /\.$/, name);
