@@ -7,7 +7,6 @@
 
 namespace {
 
-using velmora::ValueWord;
 using velmora::effects::EffectTable;
 using velmora::effects::ParamRow;
 

@@ -5,8 +5,15 @@
 
 #include "effects/effect_session.h"
 
-using velmora::ValueWord;
 using velmora::effects::EffectSession;
+
+namespace {
+
+velmora::FrameRecord RecordOf(std::uint8_t* pixels, std::int32_t width, std::int32_t height) {
+    return {pixels, width, height, width * 4, 0, 0, 0};
+}
+
+}  // namespace
 
 EffectSession* NewSession(std::uint32_t effect) {
     if (effect >= velmora::effects::kAllEffects.size()) return nullptr;
@@ -29,7 +36,7 @@ std::uint8_t* NewPixels(std::uint32_t bytes) {
     return new (std::nothrow) std::uint8_t[bytes];
 }
 
-void FreePixels(std::uint8_t* pixels) {
+void FreePixels(const std::uint8_t* pixels) {
     delete[] pixels;
 }
 
@@ -44,8 +51,7 @@ void SwapRedAndBlue(std::uint8_t* pixels, std::uint32_t count) {
 
 bool RenderFrame(EffectSession* session, std::uint8_t* source, std::uint8_t* target, std::int32_t width,
                  std::int32_t height, double seconds) {
-    const velmora::FrameRecord from = {source, width, height, width * 4, 0, 0, 0};
-    const velmora::FrameRecord to = {target, width, height, width * 4, 0, 0, 0};
+    const velmora::FrameRecord from = RecordOf(source, width, height), to = RecordOf(target, width, height);
     if (!session->Render(from, to, seconds)) return false;
     SwapRedAndBlue(target, static_cast<std::uint32_t>(width) * static_cast<std::uint32_t>(height));
     return true;

@@ -27,12 +27,13 @@ VM_PAGE void SetSeed(velmora::effects::EffectSession* session, std::uint32_t see
 
 // Memory for pixels; null when it is short. FreePixels takes null too.
 VM_PAGE std::uint8_t* NewPixels(std::uint32_t bytes);
-VM_PAGE void FreePixels(std::uint8_t* pixels);
+VM_PAGE void FreePixels(const std::uint8_t* pixels);
 // Swaps the red and the blue byte of so many pixels: a canvas has red first, the effects blue.
 VM_PAGE void SwapRedAndBlue(std::uint8_t* pixels, std::uint32_t count);
 // Red, green, blue, alpha to the planes that encoders take: Y, then Cb and Cr of half the width and height, rounded up.
 // BT.709 with 16..235 and 16..240.
-VM_PAGE void ToPlanes(const std::uint8_t* pixels, std::uint8_t* planes, std::int32_t width, std::int32_t height);
+VM_PAGE void ToPlanes(const std::uint8_t* pixels, std::uint8_t* planes, std::int32_t width,
+                      std::int32_t height);
 // Renders the frame at a clip time from `source`, blue first, to `target`, red first; they must not overlap. The frame
 // number is seconds * 30, truncated. False, with nothing written, when the size is not renderable.
 VM_PAGE bool RenderFrame(velmora::effects::EffectSession* session, std::uint8_t* source, std::uint8_t* target,
