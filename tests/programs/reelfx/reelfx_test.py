@@ -10,7 +10,7 @@ import unittest
 from pathlib import Path
 
 sys.path.insert(0, str(Path(__file__).resolve().parents[2] / "common"))
-from clip import CLIP, Clips, ffmpeg, frame_digests, frame_times, luma_psnr, probe, reelfx, run  # noqa: E402
+from clip import CLIP, Clips, REELFX, ffmpeg, frame_digests, frame_times, luma_psnr, probe, reelfx, run  # noqa: E402
 
 CAMERA = ("--effect", "Film Camera")
 TRAIN = (*CAMERA, "--preset", "Train Ride")
