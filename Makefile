@@ -1,10 +1,11 @@
 # The everyday commands. Each first sets up what it needs; see CONTRIBUTING.md.
 
-.PHONY: help setup build test check-deep package demo demo-ffmpeg install-user uninstall-user format tidy clean
+.PHONY: help setup build test check-deep package demo demo-ffmpeg web install-user uninstall-user format tidy clean
 
 help:
 	@echo 'make demo            build everything, render footage through the library and the native core'
 	@echo 'make demo-ffmpeg     render footage through the frei0r plug-in in FFmpeg'
+	@echo 'make web             build the page for the browser, build/web/reel.html'
 	@echo 'make package         make the installer, the zip, the Debian package and the tarball in build/packages'
 	@echo 'make install-user    install reelfx and the frei0r plug-ins in your home folder'
 	@echo 'make uninstall-user  remove them'
@@ -34,11 +35,15 @@ demo: setup
 demo-ffmpeg: setup
 	scripts/demo-ffmpeg
 
+web: setup
+	scripts/build-web
+
 package: setup
 	scripts/package
 
 install-user: setup
 	scripts/build native
+	scripts/build-web
 	scripts/install-user
 
 uninstall-user:

@@ -3,7 +3,9 @@
 set(CMAKE_CXX_STANDARD 20)
 set(CMAKE_CXX_STANDARD_REQUIRED ON)
 set(CMAKE_CXX_EXTENSIONS OFF)
-set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+if(NOT EMSCRIPTEN)  # a module of its own is not moved
+  set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+endif()
 set(CMAKE_CXX_VISIBILITY_PRESET hidden)
 set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
 
@@ -47,6 +49,6 @@ if(WIN32)
   # Runtime libraries are linked statically: the product needs only Windows' own modules.
   target_link_options(velmora_options INTERFACE -static -static-libgcc -static-libstdc++)
   target_link_options(velmora_options INTERFACE $<$<CONFIG:Release>:-s> -Wl,--no-insert-timestamp)
-else()
+elseif(NOT EMSCRIPTEN)
   target_link_options(velmora_options INTERFACE -Wl,-z,relro -Wl,-z,now)
 endif()

@@ -217,6 +217,8 @@ void AddCommands(CLI::App& app, TypedOptions& typed) {
     AddPictures(app, typed);
     AddPreset(app, typed);
     AddInfo(app, typed);
+    app.add_subcommand("studio", "Open the effects as a page in the browser")
+        ->add_flag("--path", typed.studio.isPathOnly, "Print where the page lies instead");
 }
 
 }  // namespace velmora::hosts

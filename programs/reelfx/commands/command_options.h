@@ -12,6 +12,7 @@
 #include "programs/reelfx/commands/presets_command.h"
 #include "programs/reelfx/commands/render_command.h"
 #include "programs/reelfx/commands/strip_command.h"
+#include "programs/reelfx/commands/studio_command.h"
 
 namespace CLI {
 class App;
@@ -56,6 +57,7 @@ struct TypedOptions {
     std::string listEffect;
     PresetsOptions presets;
     InfoOptions info;
+    StudioOptions studio;
     PictureOptions picture;
     int stripFrames = 12;
     std::string crop;

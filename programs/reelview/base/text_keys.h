@@ -1,4 +1,4 @@
-// All texts that the program shows. Each is its own key in category 9 of the language file, and what is shown where the
+// All texts that the program shows. Each is its own key in category 11 of the language file, and what is shown where the
 // language file has none. Ampersands mark the letters of menus. One constant a line: a test reads this file.
 #pragma once
 
@@ -6,7 +6,7 @@
 
 namespace velmora::reelview::text {
 
-inline constexpr std::int32_t kCategory = 9;
+inline constexpr std::int32_t kCategory = 11;
 
 // Menus
 inline constexpr char kFile[] = "&File";
