@@ -1,19 +1,20 @@
-# The commands of daily work. Each sets up first what it needs; see CONTRIBUTING.md.
+# The everyday commands. Each first sets up what it needs; see CONTRIBUTING.md.
 
-.PHONY: help setup build test check-deep package demo demo-ffmpeg install-user uninstall-user format tidy clean
+.PHONY: help setup build test check-deep package demo demo-ffmpeg web install-user uninstall-user format tidy clean
 
 help:
-	@echo 'make demo            build everything and see footage through the library and the native core'
-	@echo 'make demo-ffmpeg     see footage through the frei0r plug-in in FFmpeg'
+	@echo 'make demo            build everything, render footage through the library and the native core'
+	@echo 'make demo-ffmpeg     render footage through the frei0r plug-in in FFmpeg'
+	@echo 'make web             build the page for the browser, build/web/reel.html'
 	@echo 'make package         make the installer, the zip, the Debian package and the tarball in build/packages'
-	@echo 'make install-user    put reelfx and the frei0r plug-ins where programs look in your home'
-	@echo 'make uninstall-user  take them away again'
+	@echo 'make install-user    install reelfx and the frei0r plug-ins in your home folder'
+	@echo 'make uninstall-user  remove them'
 	@echo 'make test            build everything and run all tests'
-	@echo 'make check-deep      hours of it: careless hosts, fuzzing, sanitizers, faults, a soak, faults in the code'
-	@echo 'make setup           install packages and 32-bit Wine; the other commands do it by themselves'
+	@echo 'make check-deep      run the checks that take hours: careless hosts, fuzzing, sanitizers, failures, endurance, mutation'
+	@echo 'make setup           install packages and 32-bit Wine; the other commands do this automatically'
 	@echo 'make build           build the Windows library and the native programs into build/*/dist'
-	@echo 'make format          bring the sources into their form'
-	@echo 'make tidy            look for doubtful code'
+	@echo 'make format          format the sources'
+	@echo 'make tidy            run clang-tidy and cppcheck'
 	@echo 'make clean           delete the builds'
 
 setup:
@@ -34,11 +35,15 @@ demo: setup
 demo-ffmpeg: setup
 	scripts/demo-ffmpeg
 
+web: setup
+	scripts/build-web
+
 package: setup
 	scripts/package
 
 install-user: setup
 	scripts/build native
+	scripts/build-web
 	scripts/install-user
 
 uninstall-user:

@@ -1,10 +1,10 @@
 #!/bin/bash
-# The effect's share of an encoding: "Film Pro" with everything on a 1080p clip, written as H.264 with the encoder's
-# default preset. Prints a Markdown table.
+# The effect's share of the time of an encoding: "Film Pro" with everything, on a 1080p clip, written as H.264 with
+# the encoder's default preset. Prints a Markdown table.
 #
 #   bench/encode_share.sh [SECONDS]  default: a clip of 8 seconds
 #
-# The share is the frames' rendering time, as frames_bench has it, of the whole run's time by the clock.
+# The share is the rendering time of the frames, as measured by frames_bench, divided by the elapsed time of the run.
 set -euo pipefail
 source "$(dirname "$0")/../scripts/common.sh"
 
@@ -19,12 +19,12 @@ fi
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
-# A moving picture with grain, as films are.
+# A moving picture with grain, like film.
 ffmpeg -v error -nostdin -f lavfi -i "testsrc2=s=1920x1080:r=30:d=$seconds" -vf noise=alls=6:allf=t,format=yuv420p \
     -c:v libx264 -preset ultrafast -crf 12 "$work/clip.mp4"
 frames=$((seconds * 30))
 
-# Seconds by the clock and of processor time: the fastest of three runs.
+# Elapsed time and processor time in seconds: the fastest of three runs.
 TIMEFORMAT='%R %U %S'
 for _ in 1 2 3; do
     { time "$reelfx" render -q -y -e "Film Pro" --set "Y Jitter=6" --set "X Jitter=6" --set "Flicker=34" \

@@ -1,5 +1,5 @@
-// What a frame costs, as a ratio to a memcpy of one frame that is timed beside it in the same loop. Buffers
-// rotate through more memory than the caches hold, so that every frame comes from memory and goes to memory.
+// The cost of a frame, as a ratio to a memcpy of one frame that is timed in the same loop. Buffers rotate
+// through more memory than the caches hold, so that every frame is read from memory and written to memory.
 //
 // The result is printed as Markdown; Google Benchmark's own options select and repeat.
 
@@ -21,7 +21,7 @@ void Report(benchmark::State& state, const PairedTimes& times) {
     state.counters["work_ms"] = 1000 * times.Work();
 }
 
-// Takes the times of rounds and reports them: `round(times)` adds a pair.
+// Runs rounds and reports their times: `round(times)` adds a pair.
 template <typename Round>
 void RunRounds(benchmark::State& state, Round&& round) {
     PairedTimes times;
@@ -62,7 +62,7 @@ void RunJumps(benchmark::State& state, const BenchCase& test) {
     RunRounds(state, [&](PairedTimes& times) { RunJump(pool, times, render); });
 }
 
-// The frame processor's conversion to 32 bits or back; the 4:2:2 frame lies in the first half of its buffer.
+// The frame processor's conversion to 32 bits or back; the 4:2:2 frame is in the first half of its buffer.
 void RunConversion(benchmark::State& state, bool toBgra) {
     FramePool pool(kFullHd);
     FrameProcessor processor;
@@ -75,7 +75,7 @@ void RunConversion(benchmark::State& state, bool toBgra) {
     });
 }
 
-// The library keeps what is registered until the program ends.
+// Registered benchmarks must stay alive until the program ends.
 template <typename Run>
 void Register(const std::string& name, Run&& run) {
     benchmark::RegisterBenchmark(name.c_str(), run)

@@ -1,11 +1,12 @@
 #!/bin/bash
-# Other programs at the same work on frames of the same size, in one run with ours; prints a Markdown table.
+# Times other programs doing comparable work on frames of the same size, in one run with ours; prints a Markdown
+# table.
 #
 #   bench/peers.sh [FRAMES]          default 120 frames each
 #   VELMORA_BENCH=path/frames_bench  default: build/native/bench/frames_bench
 #
-# A peer's time is the processor time of a run with its filter less that of the same run without. Its source is one
-# picture that lies in the caches, which no frame of ours does. Installs the peers where they are missing.
+# A peer's time is the processor time of a run with its filter minus that of the same run without it. Its source is
+# one picture that stays in the caches, which our frames do not. Installs missing peers.
 set -euo pipefail
 source "$(dirname "$0")/../scripts/common.sh"
 
@@ -21,7 +22,7 @@ dpkg -s "${packages[@]}" > /dev/null 2>&1 ||
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 
-# Seconds of processor time that a command takes: the least of three runs.
+# Processor time of a command in seconds: the minimum of three runs.
 seconds() {
     local TIMEFORMAT='%U %S' i
     for i in 1 2 3; do
@@ -38,7 +39,7 @@ run_ffmpeg() {
 run_melt() {
     local filters=() name
     for name in "$@"; do filters+=(-filter "$name"); done
-    # A consumer that asks for the pictures, which its null one does not.
+    # A consumer that requests the pictures; MLT's null consumer does not.
     seconds melt -silent -profile atsc_1080p_30 "color:gray" "out=$((frames - 1))" "${filters[@]}" -consumer \
         avformat:/dev/null f=rawvideo vcodec=rawvideo pix_fmt=yuyv422 an=1 real_time=0 terminate_on_pause=1
 }
@@ -47,7 +48,7 @@ run_gstreamer() {
         "video/x-raw,format=BGRx,width=${size%x*},height=${size#*x}" ! "$@" ! fakesink
 }
 
-# "case|peer|milliseconds a frame" for a run and the one without the filter.
+# Prints "case|peer|milliseconds per frame" from a run and the same run without the filter.
 peer() {
     awk -v with="$3" -v without="$4" -v frames="$frames" -v case="$1" -v name="$2" \
         'BEGIN { printf "%s|%s|%.3f\n", case, name, 1000 * (with - without) / frames }' < /dev/null >> "$work/peers"

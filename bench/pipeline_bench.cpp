@@ -1,5 +1,5 @@
-// What a second worker brings to reelfx: "Film Pro" on frames that lie in memory, through reelfx' own pipeline, so
-// that neither decoding nor encoding takes part. Prints a Markdown table.
+// The gain of a second worker in reelfx: "Film Pro" on frames in memory, through the pipeline of reelfx but
+// without decoding and encoding. Prints a Markdown table.
 
 #include <algorithm>
 #include <chrono>
@@ -17,7 +17,7 @@ namespace {
 constexpr int kFrames = 150;
 constexpr int kRounds = 9;
 
-// Frames a second, from the first frame's start to the last one's end.
+// Frames per second, from the start of the first frame to the end of the last.
 double FramesPerSecond(FramePool& pool, const BenchCase& test, std::size_t workerCount) {
     std::vector<hosts::FramePipeline::Worker> workers;
     for (std::size_t i = 0; i < workerCount; ++i) {
@@ -44,7 +44,7 @@ double FramesPerSecond(FramePool& pool, const BenchCase& test, std::size_t worke
     return kFrames / std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
 
-// The upper quartile: what a run reaches when nothing else wants the machine.
+// The upper quartile: the rate of a run on an idle machine.
 double Typical(std::vector<double> values) {
     std::sort(values.begin(), values.end());
     return values[values.size() * 3 / 4];

@@ -1,4 +1,4 @@
-// A case's effect with its settings.
+// A session of a case's effect with its settings.
 #pragma once
 
 #include <memory>
@@ -8,7 +8,7 @@
 
 namespace velmora::bench {
 
-// Throws std::bad_alloc when memory is short.
+// Throws std::bad_alloc.
 [[nodiscard]] std::unique_ptr<effects::EffectSession> SessionOf(const BenchCase& test);
 
 }  // namespace velmora::bench

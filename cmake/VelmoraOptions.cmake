@@ -1,9 +1,11 @@
-# Options that every target of the project shares, on one interface target.
+# Options shared by every target of the project, on one interface target.
 
 set(CMAKE_CXX_STANDARD 20)
 set(CMAKE_CXX_STANDARD_REQUIRED ON)
 set(CMAKE_CXX_EXTENSIONS OFF)
-set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+if(NOT EMSCRIPTEN)  # a module of its own is not moved
+  set(CMAKE_POSITION_INDEPENDENT_CODE ON)
+endif()
 set(CMAKE_CXX_VISIBILITY_PRESET hidden)
 set(CMAKE_VISIBILITY_INLINES_HIDDEN ON)
 
@@ -16,11 +18,11 @@ add_library(velmora_options INTERFACE)
 target_include_directories(velmora_options INTERFACE ${CMAKE_SOURCE_DIR})
 target_compile_options(velmora_options INTERFACE
   -Wall -Wextra -Wconversion -Wshadow -Wnon-virtual-dtor -Wold-style-cast -Werror
-  # GCC 12 sees an overlap in `"text" + string` where there is none.
+  # GCC 12 wrongly reports an overlap in `"text" + string`.
   $<$<CXX_COMPILER_ID:GNU>:-Wno-restrict>
-  # Bytes must not depend on the build: no contraction into fused operations, no relaxed maths.
+  # Results must not depend on the build: no fused multiply-add, no relaxed maths.
   -ffp-contract=off -fno-fast-math)
-# Nor must what is shipped depend on the folder or the time of its build.
+# Shipped files must not depend on the folder or the time of the build.
 if(CMAKE_BUILD_TYPE STREQUAL "Release")
   target_compile_options(velmora_options INTERFACE
     -ffile-prefix-map=${CMAKE_SOURCE_DIR}=. -ffile-prefix-map=${CMAKE_BINARY_DIR}=build)
@@ -28,7 +30,7 @@ endif()
 if(VELMORA_SANITIZE)
   target_compile_options(velmora_options INTERFACE
     -fsanitize=address,undefined -fno-sanitize-recover=all -fno-omit-frame-pointer
-    # Beside the checks GCC 12 takes registers of its own vector intrinsics for uninitialised variables.
+    # With sanitizers, GCC 12 reports variables in its own vector intrinsics as uninitialised.
     -Wno-uninitialized)
   target_link_options(velmora_options INTERFACE -fsanitize=address,undefined)
 endif()
@@ -44,9 +46,9 @@ endif()
 if(WIN32)
   target_compile_definitions(velmora_options INTERFACE
     UNICODE _UNICODE NOMINMAX WIN32_LEAN_AND_MEAN STRICT _WIN32_WINNT=0x0601)
-  # Runtime libraries are linked in: the product depends on Windows' own modules only.
+  # Runtime libraries are linked statically: the product needs only Windows' own modules.
   target_link_options(velmora_options INTERFACE -static -static-libgcc -static-libstdc++)
   target_link_options(velmora_options INTERFACE $<$<CONFIG:Release>:-s> -Wl,--no-insert-timestamp)
-else()
+elseif(NOT EMSCRIPTEN)
   target_link_options(velmora_options INTERFACE -Wl,-z,relro -Wl,-z,now)
 endif()

@@ -1,5 +1,5 @@
 # velmora_embed_pictures(TARGET) compiles the grey pictures of render/pictures into TARGET. They are checked
-# while they are embedded: a wrong size, format or key fails the build and names the file.
+# meanwhile: a wrong size, format or key fails the build with the name of the file.
 
 find_package(Python3 REQUIRED COMPONENTS Interpreter)
 

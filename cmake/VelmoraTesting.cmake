@@ -1,13 +1,13 @@
-# velmora_add_test(NAME SOURCES... LIBS ...) builds one GoogleTest program and registers it with CTest
-# under its name. A program is one CTest entry: starting a program under Wine costs seconds.
+# velmora_add_test(NAME SOURCES... LIBS ...) builds one GoogleTest program and registers it with CTest under its name.
+# A program is one CTest entry, because programs take seconds to start under Wine.
 
 include(CTest)
 
 if(BUILD_TESTING)
-  # GoogleTest comes as source from the system's package, so that both builds use the same one.
+  # GoogleTest's sources come from the system's package, so that both builds use the same version.
   set(INSTALL_GTEST OFF)
   add_subdirectory(/usr/src/googletest ${CMAKE_BINARY_DIR}/googletest EXCLUDE_FROM_ALL)
-  # Its warnings are not ours to mend.
+  # We do not fix its warnings.
   foreach(library gtest gtest_main gmock gmock_main)
     target_compile_options(${library} PRIVATE -w)
   endforeach()
@@ -35,8 +35,8 @@ function(velmora_test_levels name)
   endforeach()
 endfunction()
 
-# velmora_check_module(TARGET EXPORT...) checks that a Windows module exports exactly the given names and needs nothing
-# but Windows' own modules.
+# velmora_check_module(TARGET EXPORT...) checks that a Windows module exports exactly the given names and imports only
+# Windows' own modules.
 function(velmora_check_module target)
   if(WIN32 AND BUILD_TESTING)
     add_test(NAME ${target}_imports

@@ -1,7 +1,7 @@
 # velmora_tinyxml: TinyXML 2.6.2 with Debian's patches (std::string in its interface) for both builds. Native code
 # links Debian's library; Debian has none for Windows, so there it is compiled from the sources that
-# scripts/fetch-tinyxml unpacked in the cache folder. The fuzzing programs are compiled from them too: a fuzzer sees only
-# the branches of what it was compiled with.
+# scripts/fetch-tinyxml unpacked in the cache folder. The fuzzing programs also compile them: a fuzzer sees only the
+# branches of code that was compiled with it.
 
 if(NOT WIN32 AND NOT VELMORA_FUZZ)
   add_library(velmora_tinyxml INTERFACE)
@@ -16,7 +16,7 @@ else()
   if(NOT EXISTS ${folder}/tinyxml.cpp)
     message(FATAL_ERROR "The sources of TinyXML are not in ${folder}: run scripts/setup")
   endif()
-  # Its parser loses what it is parsing when memory ends in the middle: each such node gets an owner for that time.
+  # Its parser leaks the node that it is parsing when memory runs out, so each such node gets an owner meanwhile.
   file(READ ${folder}/tinyxmlparser.cpp parser)
   foreach(call "node->Parse( p, &data" "node->Parse( p, data" "attrib->Parse( p, data" "textNode->Parse( p, data"
       "textNode->Parse( pWithWhiteSpace, data")
@@ -36,7 +36,7 @@ else()
     ${folder}/tinyxml.cpp ${folder}/tinyxmlerror.cpp ${made})
   unset(made)
   target_include_directories(velmora_tinyxml SYSTEM PUBLIC ${folder})
-  # Its warnings are not ours to mend.
+  # We do not fix its warnings.
   target_compile_options(velmora_tinyxml PRIVATE -w)
   if(VELMORA_FUZZ)
     target_compile_options(velmora_tinyxml PRIVATE -fsanitize=fuzzer-no-link,address,undefined -fno-sanitize-recover=all)

@@ -1,5 +1,5 @@
-# velmora_version_resource(TARGET DESCRIPTION FILENAME) gives a Windows program or module its version resource: what
-# Explorer's "Details" page and installers show. Does nothing in the native builds.
+# velmora_version_resource(TARGET DESCRIPTION FILENAME) gives a Windows program or module its version resource, which
+# Explorer's "Details" page and installers show. Does nothing in native builds.
 
 if(WIN32)
   enable_language(RC)

@@ -34,7 +34,7 @@ SPOTS = [
     (13, 11, 118),
 ]
 
-# The four header words; paint programs put comments between them.
+# The four words of the header; paint programs may put comments between them.
 GAP = rb"(?:\s|#[^\n]*\n)+"
 HEADER = re.compile(rb"(\S\S)" + GAP + rb"(\d+)" + GAP + rb"(\d+)" + GAP + rb"(\d+)\s")
 

@@ -10,7 +10,7 @@ set(CMAKE_FIND_ROOT_PATH_MODE_PROGRAM NEVER)
 set(CMAKE_FIND_ROOT_PATH_MODE_LIBRARY ONLY)
 set(CMAKE_FIND_ROOT_PATH_MODE_INCLUDE ONLY)
 
-# SSE2 arithmetic as on x86-64 (x87 would round twice). Hosts of other compilers call with a stack
-# aligned to 4 bytes only, hence the realignment.
+# SSE2 arithmetic as on x86-64 (x87 would round twice). Hosts built by other compilers align the stack to 4 bytes
+# only, hence the realignment.
 set(CMAKE_CXX_FLAGS_INIT "-msse2 -mfpmath=sse -mstackrealign")
 set(CMAKE_CROSSCOMPILING_EMULATOR ${CMAKE_CURRENT_LIST_DIR}/../scripts/wine32)

@@ -39,6 +39,8 @@ inline constexpr int kOptions = 300;
 inline constexpr int kPresets = 310;
 inline constexpr int kSavingAndLoading = 311;
 
+inline constexpr int kReelView = 320;
+
 inline constexpr int kTrouble = 400;
 
 }  // namespace velmora::help

@@ -78,7 +78,8 @@ bool PackedImage::Reserve(std::int32_t width, std::int32_t height, std::int32_t 
         std::uint64_t(static_cast<std::uint32_t>(width)) * static_cast<std::uint32_t>(channels);
     constexpr std::uint64_t kMost = std::numeric_limits<std::ptrdiff_t>::max();
     if (rowStep > kMost / static_cast<std::uint32_t>(height)) return false;
-    m_pixels.reset(new (std::nothrow) std::uint8_t[rowStep * static_cast<std::uint32_t>(height)]);
+    m_pixels.reset(new (std::nothrow)
+                       std::uint8_t[static_cast<std::size_t>(rowStep) * static_cast<std::uint32_t>(height)]);
     if (m_pixels == nullptr) return false;
     m_rowStep = static_cast<std::size_t>(rowStep);
     m_width = width;

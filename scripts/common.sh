@@ -1,8 +1,8 @@
-# What the scripts share: where things are kept, and how they speak. Sourced, never run.
+# Shared by the scripts: folders and messages. Sourced, never run.
 
 velmoraRoot=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
 
-# Everything that is made once for a machine, not for a build, is kept here and may be deleted at any time.
+# Everything that is made once per machine and not once per build is in this folder, which may be deleted at any time.
 velmoraCache=${VELMORA_CACHE:-${XDG_CACHE_HOME:-$HOME/.cache}/velmora-reel-effects}
 wineTree=$velmoraCache/wine32-tree
 tinyxmlSource=$velmoraCache/tinyxml
@@ -10,22 +10,22 @@ tinyxmlSource=$velmoraCache/tinyxml
 say() { printf '%s: %s\n' "${0##*/}" "$*" >&2; }
 die() { say "$*"; exit 1; }
 
-# The package names of a list: comments and empty lines dropped.
+# The package names in a list, without comments and empty lines.
 package_list() { sed -e 's/#.*//' -e '/^[[:space:]]*$/d' "$1"; }
 
 as_root() {
     if [ "$(id -u)" = 0 ]; then "$@"; else sudo "$@"; fi
 }
 
-# The Debian release that the Windows side is taken from, whatever the machine's own is.
+# The Debian release from which the Windows tools are taken, whatever release the machine has.
 suite=bookworm
 
-# The address of that release's archive, as the machine's own package sources have it.
+# The address of that release's archive, from the machine's own package sources.
 main_archive() {
     local archive
     archive=$(known_archive)
     if [ -z "$archive" ]; then
-        # A new machine knows no release until its lists have been read once.
+        # On a new machine no release is known until the lists have been read once.
         as_root apt-get -q update > /dev/null || true
         archive=$(known_archive)
     fi

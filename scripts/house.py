@@ -1,4 +1,4 @@
-"""The floors of the house: which folder may include which, and what stands in the #include lines."""
+"""The floors of the house: which folders may include which, and what the #include lines say."""
 
 import re
 from dataclasses import dataclass
@@ -7,9 +7,9 @@ from pathlib import Path
 
 ROOT = Path(__file__).resolve().parent.parent
 
-# From the ground up, each folder with what it holds. A folder includes from itself and from the floors below, never
-# from another of its own floor. It stands for its subfolders too, unless they are listed; `*` is each folder there,
-# for itself.
+# From the ground up, each folder with its contents. A folder includes from itself and from the floors below, never
+# from another folder of its own floor. An entry includes subfolders that are not listed; `*` stands for every folder
+# there, each a part of its own.
 FLOORS = [
     [("render", "pixels: the stages of a frame"),
      ("platform", "the system, the processor"),
@@ -22,21 +22,21 @@ FLOORS = [
      ("desktop", "dialogs, options, registry")],
     [("library", "what makes the DLL"),
      ("resources", "bitmaps of the dialogs")],
-    [("faces/*", "the effects in programs of others")],
+    [("faces/*", "the effects in other programs")],
     [("programs/common", "what the programs share")],
     [("programs/reelfx/common", "choices, output, progress")],
     [("programs/reelfx/media", "readers, writers, sound")],
     [("programs/reelfx/pictures", "sheets, grids, mattes")],
     [("programs/reelfx/pipeline", "workers")],
-    [("programs/reelfx/commands", "one file a command")],
+    [("programs/reelfx/commands", "one file per command")],
     [("programs/reelfx/reference", "man page, completion"),
      ("programs/reelfx", "the command line program"),
      ("programs/reelhost", "plays clips through the DLL"),
-     ("programs/reelcheck", "tries the library's promises"),
-     ("programs/*", "a program of ours")],
+     ("programs/reelcheck", "checks the library's contract"),
+     ("programs/*", "one of our programs")],
     [("bench", "measurements")],
 ]
-# Sources that are no part of the house: they may include what they like, and nobody in it includes them.
+# Sources outside the house: they may include anything, and nothing in the house includes them.
 OUTSIDE = ["tests", "docs", "cmake", "build"]
 
 SOURCES = {".c", ".cc", ".cpp", ".h", ".hpp", ".inc", ".in", ".rc"}
@@ -75,7 +75,7 @@ def sources(root):
 
 
 def target_of(root, file, written):
-    """The path that an include line means; None for what is not of the house (the system's, a library's, generated)."""
+    """The path that an include line means; None for headers outside the house (system, libraries, generated)."""
     if place(folder_of(written)) or written.split("/")[0] in OUTSIDE or (root / written).is_file():
         return written
     beside = root / folder_of(file) / written
@@ -93,7 +93,7 @@ def includes(root=ROOT):
 
 
 def faults(root=ROOT):
-    """What is wrong with the house, a line each: FILE:LINE: what."""
+    """What is wrong with the house, one line per fault: FILE:LINE: what."""
     found, seen = [], {}
     for inside in sources(root):
         if place(folder_of(inside)) is None:

@@ -1,4 +1,4 @@
-// What the editors' files have in common: values and lists as texts.
+// Values and lists as texts, for all kinds of editor files.
 #pragma once
 
 #include <string>
@@ -8,17 +8,17 @@
 
 namespace velmora::hosts::frei0r {
 
-// "Preset", "Start Frame", "X Jitter": as a control is labelled.
+// The label of a control: "Preset", "Start Frame", "X Jitter".
 std::string LabelOf(const PluginParam& param);
 
-// What a list offers, the value that is passed on being the text itself: presets after "none", menu items, usual
-// frame rates after "none". Empty for parameters that are no lists.
+// The entries of a list; the value passed on is the text itself: "none" and the presets, menu items, "none"
+// and common frame rates. Empty for parameters that are not lists.
 std::vector<std::string> ChoicesOf(const PluginDescription& plugin, const PluginParam& param);
 
 // "0.5", "1", "#000000", "Blotchy", "none".
 std::string DefaultOf(const PluginDescription& plugin, const PluginParam& param);
 
-// The effect's row of an own parameter.
+// The row of the effect's table for one of its own parameters.
 inline const effects::ParamRow& RowOf(const PluginDescription& plugin, const PluginParam& param) {
     return plugin.effect.params[param.own];
 }
@@ -26,7 +26,7 @@ inline const effects::ParamRow& RowOf(const PluginDescription& plugin, const Plu
 // "a;b;c"
 std::string Joined(const std::vector<std::string>& texts, const char* separator);
 
-// In double quotes, as JavaScript and YAML read it. Texts of the tables need no other escapes.
+// Quoted for JavaScript and YAML. The texts of the tables need no other escapes.
 std::string Quoted(const std::string& text);
 
 }  // namespace velmora::hosts::frei0r

@@ -8,7 +8,7 @@ namespace {
 
 constexpr double kLibraryFrameRate = 30.0;
 constexpr double kFastestUsualRate = 120.0;
-constexpr double kLargestFrame = 1e15;  // llround's result and the sum with a start frame stay exact
+constexpr double kLargestFrame = 1e15;  // keeps the result of llround and the sum with a start frame exact
 
 bool TakeSuffix(std::string_view& text, std::string_view suffix) {
     if (!text.ends_with(suffix)) return false;

@@ -1,6 +1,6 @@
-// In which unit a host gives times. Frei0r's header says seconds, FFmpeg gives milliseconds. The values do not
-// tell: 40 is the second frame of a clip of 25 frames a second in milliseconds and its thousandth in seconds. So the
-// module that calls the plug-in is asked for its name.
+// The unit of a host's times. Frei0r's header says seconds, but FFmpeg passes milliseconds. The values alone
+// are ambiguous: at 25 frames per second, 40 is the second frame in milliseconds and the thousandth in
+// seconds. So the name of the calling module decides.
 #pragma once
 
 #include <cstdint>
@@ -11,8 +11,8 @@ namespace velmora::hosts::frei0r {
 
 enum class TimeUnit : std::uint8_t { kUnknown, kSeconds, kMilliseconds };
 
-// By a module's file name, with or without folder: milliseconds for libavfilter and for FFmpeg's own programs,
-// which may have it linked in; seconds for MLT's and GStreamer's frei0r modules.
+// The unit by a module's file name, with or without folder: milliseconds for libavfilter and for FFmpeg's
+// programs, which may contain it; seconds for the frei0r modules of MLT and GStreamer.
 [[nodiscard]] TimeUnit UnitOfModule(std::string_view fileName);
 
 // The path of the module that holds a code address; empty when the system does not know.

@@ -14,7 +14,7 @@ namespace velmora::hosts::frei0r {
 namespace {
 
 std::uint32_t ColourByte(float channel) {
-    if (!(channel > 0.0f)) return 0;  // also what is not a number
+    if (!(channel > 0.0f)) return 0;  // also for NaN
     return static_cast<std::uint32_t>(std::lround(std::min(channel, 1.0f) * 255.0f));
 }
 

@@ -1,8 +1,8 @@
-// One plug-in instance: the values that the host has set and a session of the effect. A host may enter an
-// instance from several threads at once; each call has it to itself.
+// One plug-in instance: the values that the host has set, and a session of the effect. A host may call an
+// instance from several threads at once; the calls are serialised.
 //
-// A preset gives all values that the host has not set. Some hosts always set every parameter, mostly to the
-// default that they were told: of such a host a value at its default leaves the preset's value standing.
+// A preset supplies all values that the host has not set. Some hosts set every parameter, mostly to its
+// default; so a value that is at its default does not override the preset.
 #pragma once
 
 #include <frei0r.h>
@@ -28,8 +28,8 @@ class Instance {
     Instance(const PluginDescription& plugin, std::uint32_t width, std::uint32_t height, TimeUnit hostUnit);
 
     // As f0r_set_param_value and f0r_get_param_value. An index past the last parameter does nothing. A text
-    // that is no preset, item or number leaves no setting behind; of a wrong preset one line tells on standard
-    // error.
+    // that is not a preset, item or number has no effect; for an unknown preset, one line is written to
+    // standard error.
     void Set(int index, const void* value);
     void Get(int index, void* value);
 
@@ -53,12 +53,13 @@ class Instance {
     const std::uint32_t m_width, m_height;
     std::mutex m_mutex;  // guards all below
     std::unique_ptr<effects::EffectSession> m_session;
-    std::vector<std::string> m_texts;  // by parameter of the plug-in; empty but for strings
+    std::vector<std::string> m_texts;  // by parameter of the plug-in; only strings are used
     std::vector<OwnValue> m_own;       // by parameter of the effect
     FrameClock m_clock;
     std::optional<std::uint32_t> m_preset;
     std::uint32_t m_seed = 0;
-    std::unique_ptr<std::uint32_t[]> m_source;  // the input as the effect wants it, from the first frame on
+    std::unique_ptr<std::uint32_t[]>
+        m_source;  // the input in the effect's pixel order; allocated by the first frame
 };
 
 }  // namespace velmora::hosts::frei0r

@@ -31,7 +31,7 @@ std::string Attribute(const char* name, const std::string& value) {
     return std::string(" ") + name + "=\"" + Escaped(value) + '"';
 }
 
-// Kdenlive shows a value times a factor and knows no shift: what runs from -100 to 100 is shown from 0 to 100.
+// Kdenlive shows a value times a factor, without an offset: a range from -100 to 100 is shown as 0 to 100.
 std::string SliderRange(const effects::ParamRow& row) {
     const std::string top = NumberText(row.maximum);
     return Attribute("min", "0") + Attribute("max", top) + Attribute("factor", top) +
@@ -43,7 +43,7 @@ std::string TypeAttributes(const PluginDescription& plugin, const PluginParam& p
         return Attribute("type", "list") + Attribute("paramlist", Joined(choices, ";"));
     }
     if (param.role != ParamRole::kOwn) {
-        // The largest whole number that Kdenlive's spin boxes keep.
+        // The largest whole number that Kdenlive's spin boxes can hold.
         return Attribute("type", "constant") + Attribute("min", "0") + Attribute("max", "2147483647") +
                Attribute("decimals", "0");
     }

@@ -1,4 +1,5 @@
-// Frei0r's cheapest colour model in hosts is red, green, blue, alpha; the effects work on blue, green, red, alpha.
+// The frei0r colour model that costs hosts least is red, green, blue, alpha; the effects use blue, green,
+// red, alpha.
 #pragma once
 
 #include <cstddef>
@@ -6,7 +7,8 @@
 
 namespace velmora::hosts::frei0r {
 
-// Exchanges bytes 0 and 2 of each pixel. `in` and `out` may be the same. Written for the compiler's vectors.
+// Swaps bytes 0 and 2 of each pixel. `in` and `out` may be the same. Written so that the compiler vectorises
+// it.
 inline void SwapRedAndBlue(const std::uint32_t* in, std::uint32_t* out, std::size_t count) noexcept {
     for (std::size_t i = 0; i < count; ++i) {
         const std::uint32_t pixel = in[i];

@@ -1,9 +1,9 @@
-// The functions of a frei0r plug-in. Compiled once for each effect: VELMORA_FREI0R_EFFECT names its table. What
-// they share are constant descriptions; all that changes is in the instances.
+// The functions of a frei0r plug-in. Compiled once for each effect, whose table is VELMORA_FREI0R_EFFECT.
+// Only constant descriptions are shared; everything that changes is in the instances.
 
 #include <cinttypes>
 
-// The header declares plain C functions and leaves their linkage and visibility to us.
+// The header declares C functions without linkage and visibility.
 #pragma GCC visibility push(default)
 extern "C" {
 #include <frei0r.h>
@@ -29,7 +29,7 @@ const PluginDescription& Plugin() {
     return plugin;
 }
 
-// No exception goes to a host. What may throw is the memory for a few names.
+// No exception may reach a host. Only allocating a few names can throw.
 template <class Action>
 void Guarded(Action action) noexcept {
     try {
@@ -42,7 +42,7 @@ void Guarded(Action action) noexcept {
 
 extern "C" {
 
-// FFmpeg takes a negative result as failure, GStreamer a zero.
+// To FFmpeg a negative result means failure, to GStreamer zero.
 int f0r_init() {
     return 1;
 }

@@ -48,7 +48,7 @@ bool HoldsValue(const effects::ParamRow& param) {
     return param.kind != kKindGroup && param.kind != kKindNone;
 }
 
-// A colour and the amount of it may share a name in the effect's own dialog.
+// In the effect's own panel, a colour and its amount may have the same name.
 std::string OwnName(const effects::EffectTable& effect, const effects::ParamRow& param) {
     const auto sharesName = [&](const effects::ParamRow& other) {
         return &other != &param && HoldsValue(other) && IsSameName(other.name, param.name);
@@ -83,14 +83,16 @@ PluginDescription DescribePlugin(const effects::EffectTable& effect) {
     PluginDescription plugin{.effect = effect,
                              .name = std::string("Velmora ") + effect.name,
                              .fileName = FileName(effect.name),
-                             .explanation = "The look of old film, the same in every host",
+                             .explanation = "The look of old film, with the same result in every host",
                              .params = {}};
     plugin.params = {
         {"preset", F0R_PARAM_STRING, "None or one of " + QuotedList(effect.presetNames), ParamRole::kPreset},
-        {"seed", F0R_PARAM_STRING, "0 to 4294967295; another seed gives other shake, flicker and damage",
+        {"seed", F0R_PARAM_STRING, "0 to 4294967295. Another seed gives other shake, flicker and damage",
          ParamRole::kSeed},
-        {"start frame", F0R_PARAM_STRING, "The clip's frame at the host's time 0", ParamRole::kStartFrame},
-        {"frame rate", F0R_PARAM_STRING, "Frames per second, as 25 or 30000/1001", ParamRole::kFrameRate},
+        {"start frame", F0R_PARAM_STRING, "Number of the clip's frame at the host's time 0",
+         ParamRole::kStartFrame},
+        {"frame rate", F0R_PARAM_STRING, "Frames per second, such as 25 or 30000/1001",
+         ParamRole::kFrameRate},
     };
     for (std::uint32_t i = 0; i < effect.params.size(); ++i) {
         const effects::ParamRow& param = effect.params[i];

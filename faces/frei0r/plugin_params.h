@@ -1,4 +1,4 @@
-// What a frei0r plug-in shows of an effect, taken from the effect's table. Hosts address parameters by index
+// The parameters of a frei0r plug-in, taken from the effect's table. Hosts address parameters by index
 // (FFmpeg's "a|b|c", MLT's "0=...") and by name, so the order is part of the contract: append only.
 //
 //   index  name           type    value
@@ -11,7 +11,7 @@
 //                         colour  colour
 //                         string  menu: an item's text or its number from 0
 //
-// The first four stand in front because FFmpeg can leave parameters out only at the end.
+// The first four come first because FFmpeg can omit parameters only at the end.
 #pragma once
 
 #include <cstddef>
@@ -28,33 +28,34 @@ namespace velmora::hosts::frei0r {
 enum class ParamRole : std::uint8_t { kPreset, kSeed, kStartFrame, kFrameRate, kOwn };
 
 struct PluginParam {
-    // Unique also in lower case with hyphens for spaces, as hosts turn names into property names.
+    // Unique even in lower case with hyphens for spaces, because hosts turn names into property names that
+    // way.
     std::string name;
     int type;  // F0R_PARAM_...
     std::string explanation;
     ParamRole role;
-    std::uint32_t own = 0;  // the effect's parameter, where the role is kOwn
+    std::uint32_t own = 0;  // the effect's parameter, if the role is kOwn
 };
 
 struct PluginDescription {
     const effects::EffectTable& effect;
     std::string name;         // "Velmora Film Camera"
-    std::string fileName;     // "velmora_film_camera", without the ending
+    std::string fileName;     // "velmora_film_camera", without the extension
     std::string explanation;  // one sentence
     std::vector<PluginParam> params;
 };
 
 PluginDescription DescribePlugin(const effects::EffectTable& effect);
 
-// Names and item texts as users type them: only letters and digits count and their case does not, so that
-// "60s-memories" is "60's Memories" and no quoting is needed on command lines.
+// Compares names and item texts as users type them: only letters and digits count, in upper or lower case, so
+// that "60s-memories" is "60's Memories" and command lines need no quoting.
 [[nodiscard]] bool IsSameName(std::string_view a, std::string_view b);
 
 // The preset of that name; nothing when there is none.
 [[nodiscard]] std::optional<std::uint32_t> FindPreset(const effects::EffectTable& effect,
                                                       std::string_view name);
 
-// The menu item of that text or of that number, counted from 0.
+// The menu item with that text, or with that number counted from 0.
 [[nodiscard]] std::optional<std::uint32_t> FindItem(const effects::ParamRow& menu, std::string_view text);
 
 }  // namespace velmora::hosts::frei0r

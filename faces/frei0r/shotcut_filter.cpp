@@ -7,13 +7,13 @@
 namespace velmora::hosts::frei0r {
 namespace {
 
-// A row of the panel: how its control is declared, and how it is set from the filter.
+// A row of the panel: the declaration of its control, and the code that sets it from the filter.
 struct Control {
     std::string declaration;
     std::string refresh;
 };
 
-// Shotcut has a row of its own for the presets that a user saves.
+// Shotcut has its own row "Preset" for presets that users save.
 std::string RowLabel(const PluginParam& param) {
     return param.role == ParamRole::kPreset ? "Built-in preset" : LabelOf(param);
 }

@@ -1,4 +1,4 @@
-// write_editor_files FOLDER: writes the editors' files of all plug-ins, laid out as the editors have them:
+// write_editor_files FOLDER: writes the editors' files for all plug-ins, in the editors' own layout:
 //   kdenlive/effects/PLUGIN.xml, shotcut/filters/PLUGIN/{meta,ui}.qml, mlt/frei0r/filter_frei0r.PLUGIN.yml
 
 #include <exception>

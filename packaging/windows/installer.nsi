@@ -7,8 +7,8 @@
 ; for the current user. /D= comes last and is never quoted. Exit codes: 0 done, 1 cancelled by the user, 2 nothing was
 ; changed because a program is using the library, or a file could not be written.
 ;
-; The library needs no registry entries: users choose its folder in the editor. The only entry is the uninstaller's, whose
-; "InstallLocation" names the folder.
+; The library needs no registry entries: users choose its folder in the editor. The only entries are the uninstaller's, whose
+; "InstallLocation" names the folder, and reelview's under "Open with".
 
 Unicode true
 SetCompressor /SOLID lzma
@@ -77,6 +77,11 @@ Var EarlierFolder
     ${EndIf}
 !macroend
 
+!define OPEN_WITH_KEY "Software\Classes\Applications\reelview.exe"
+!macro OFFER_FOR EXTENSION
+    WriteRegStr SHCTX "${OPEN_WITH_KEY}\SupportedTypes" "${EXTENSION}" ""
+!macroend
+
 Function .onInit
     ; MULTIUSER_INIT replaces $INSTDIR with the default folder of its mode.
     StrCpy $GivenFolder $INSTDIR
@@ -103,6 +108,20 @@ Section
     !include "${LISTS}/install.nsh"
     SetOutPath "$INSTDIR"
     WriteUninstaller "$INSTDIR\uninstall.exe"
+
+    CreateShortcut "$SMPROGRAMS\Velmora Reel View.lnk" "$INSTDIR\reelview.exe"
+    ; Offered under "Open with"; nothing opens with it until the user says so.
+    WriteRegStr SHCTX "${OPEN_WITH_KEY}\shell\open\command" "" '"$INSTDIR\reelview.exe" "%1"'
+    WriteRegStr SHCTX "${OPEN_WITH_KEY}" "FriendlyAppName" "Velmora Reel View"
+    !insertmacro OFFER_FOR .avi
+    !insertmacro OFFER_FOR .bmp
+    !insertmacro OFFER_FOR .jpg
+    !insertmacro OFFER_FOR .mov
+    !insertmacro OFFER_FOR .mp4
+    !insertmacro OFFER_FOR .png
+    !insertmacro OFFER_FOR .tif
+    !insertmacro OFFER_FOR .wmv
+    !insertmacro OFFER_FOR .y4m
 
     WriteRegStr SHCTX "${UNINSTALL_KEY}" "DisplayName" "${PRODUCT}"
     WriteRegStr SHCTX "${UNINSTALL_KEY}" "DisplayVersion" "${VERSION}"
@@ -146,6 +165,9 @@ Section Uninstall
     ${EndIf}
     ReadRegStr $0 SHCTX "${UNINSTALL_KEY}" "InstallLocation"
     ${If} $0 == $INSTDIR
+        Delete "$SMPROGRAMS\Velmora Reel View.lnk"
+        DeleteRegKey SHCTX "${OPEN_WITH_KEY}"
+        DeleteRegKey /ifempty SHCTX "Software\Classes\Applications"
         DeleteRegKey SHCTX "${UNINSTALL_KEY}"
     ${EndIf}
 SectionEnd

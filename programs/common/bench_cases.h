@@ -6,8 +6,8 @@
 
 namespace velmora::bench {
 
-// One value that a case gives a parameter, in stored form: sliders normalised, flags 0 or 1, items and
-// colours as they are.
+// The value of one parameter in a case, in stored form: sliders normalised, flags 0 or 1, items and colours
+// as they are.
 struct CaseValue {
     std::uint32_t parameter;
     double value;
@@ -15,7 +15,7 @@ struct CaseValue {
 
 struct BenchCase {
     const char* name;
-    std::uint32_t effect;               // as the library offers them
+    std::uint32_t effect;               // index in the library's order
     std::span<const CaseValue> values;  // other parameters: "Reset To None"
     double goalNative;                  // x memcpy of a frame
     double goalDll;

@@ -1,5 +1,5 @@
-// The digest by which frames are compared across programs: MD5 over the picture's rows without padding, the
-// same as `ffmpeg -f framemd5` prints for raw BGRA frames.
+// The digest for comparing frames between programs: MD5 of the picture's rows without padding, as `ffmpeg -f
+// framemd5` prints it for raw BGRA frames.
 #pragma once
 
 #include <cstddef>
@@ -16,7 +16,7 @@ std::string FrameDigest(const std::uint8_t* pixels, std::int32_t width, std::int
 // The line that both programs print for a frame, without the line's end: "frame 12 md5 9e10...".
 std::string DigestLine(std::int64_t frame, const std::string& digest);
 
-// Shared by the two builds' forms of FrameDigest.
+// Shared by the two implementations of FrameDigest.
 std::string HexOf(const std::uint8_t* bytes, std::size_t count);
 
 }  // namespace velmora::hosts

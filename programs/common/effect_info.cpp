@@ -7,7 +7,7 @@
 namespace velmora::hosts {
 namespace {
 
-// Texts that fill their field carry no terminating zero.
+// Texts that fill their field have no terminating zero.
 std::string FieldText(const char* field, std::size_t width) {
     return std::string(field, std::find(field, field + width, '\0'));
 }
@@ -23,6 +23,11 @@ ParamInfo ReadDescriptor(const ParamDescriptor& descriptor) {
     info.name = FieldText(descriptor.name, kParamNameWidth);
     info.kind = descriptor.kind;
     info.defaultValue = descriptor.defaultValue;
+    info.x = descriptor.x;
+    info.y = descriptor.y;
+    info.width = descriptor.width;
+    info.height = descriptor.height;
+    info.isVisible = descriptor.visible != 0;
     if (info.kind == kKindSlider) {
         info.minimum = descriptor.minimum.number;
         info.maximum = descriptor.slider.maximum.number;

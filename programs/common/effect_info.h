@@ -1,5 +1,5 @@
-// What a host knows of an effect: its parameters and presets by name, taken from the descriptors that the
-// effect fills in, so that the DLL and the linked core are seen alike.
+// What a host knows about an effect: its parameters and presets by name, read from the descriptors that the
+// effect fills in, so that the DLL and the linked core look the same.
 #pragma once
 
 #include <cstdint>
@@ -18,8 +18,10 @@ struct ParamInfo {
     float minimum = 0.0f;            // slider: shown range
     float maximum = 0.0f;
     ValueWord defaultValue = {};
-    std::vector<std::string> items;  // menu
-    bool isGroupEnd = false;         // group marker
+    std::vector<std::string> items;                    // menu
+    bool isGroupEnd = false;                           // group marker
+    std::int32_t x = 0, y = 0, width = 0, height = 0;  // layout, in the host's dialog units
+    bool isVisible = true;
 
     [[nodiscard]] bool HoldsValue() const { return kind != kKindGroup && kind != kKindNone; }
 };
@@ -35,7 +37,8 @@ ParamInfo ReadDescriptor(const ParamDescriptor& descriptor);
 // Names are compared without regard to the case of ASCII letters.
 bool NamesAreEqual(std::string_view a, std::string_view b);
 
-// The index of the effect or preset of that name. Throws UsageError that says which ones exist.
+// The index of the effect or preset with that name. If there is none, throws a UsageError that lists those
+// that exist.
 std::size_t FindEffect(std::span<const EffectInfo> effects, std::string_view name);
 std::uint32_t FindPreset(const EffectInfo& effect, std::string_view name);
 

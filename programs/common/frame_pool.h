@@ -1,4 +1,4 @@
-// Frames to measure with, and the measure: what work on a frame costs beside a memcpy of one.
+// Frames for measurements, and the measurement: the cost of work on a frame compared with a memcpy of one.
 #pragma once
 
 #include <cstddef>
@@ -16,8 +16,9 @@ struct PictureSize {
 inline constexpr PictureSize kFullHd = {1920, 1080};
 inline constexpr PictureSize kUltraHd = {3840, 2160};
 
-// Pairs of frames that together are larger than any cache: each use of the next pair comes from memory and goes to
-// memory. The sources hold gradients, texture and highlights, so that no stage meets only one kind of pixel.
+// Pairs of frames that together are larger than any cache, so that each pair is read from memory and written
+// to memory. The sources hold gradients, texture and highlights, so that no stage meets only one kind of
+// pixel.
 class FramePool {
   public:
     explicit FramePool(PictureSize size);
@@ -25,7 +26,7 @@ class FramePool {
     void Next() { m_at = (m_at + 1) % m_sources.size(); }
     [[nodiscard]] std::uint8_t* Source() { return m_sources[m_at].data(); }
     [[nodiscard]] std::uint8_t* Destination() { return m_destinations[m_at].data(); }
-    // Those of any number, for threads that take a pair each.
+    // The pair of a given number, for threads that use one pair each.
     [[nodiscard]] std::uint8_t* SourceAt(std::size_t pair) {
         return m_sources[pair % m_sources.size()].data();
     }
@@ -45,15 +46,15 @@ class FramePool {
     std::size_t m_at = 0;
 };
 
-// What this thread has had of a processor; on Windows, whose count of that is coarse, the time of day. Programs that
-// want the machine meanwhile then slow a work down, but are not counted with it.
+// The processor time of this thread, so that other programs are not counted; on Windows, where that is too
+// coarse, the elapsed time.
 [[nodiscard]] double SecondsOfThisThread();
 
-// Times of a work and of the copies in turn with it, in seconds.
+// Times of the work and of the copies alternating with it, in seconds.
 struct PairedTimes {
     std::vector<double> works, copies;
 
-    // The lower quartiles: what a run costs when nothing else wants the machine.
+    // The lower quartiles: the cost of a run on an idle machine.
     [[nodiscard]] double Work() const { return Typical(works); }
     [[nodiscard]] double Copy() const { return Typical(copies); }
     [[nodiscard]] double Ratio() const { return Work() / Copy(); }
@@ -76,9 +77,9 @@ void RunPair(FramePool& pool, PairedTimes& times, Work&& work) {
     times.works.push_back(timed(work));
 }
 
-// What a frame far behind the one before costs, beside a copy: `render(seconds)` renders the present pair of frames,
-// near the clip's start, which is not measured, then at 10 h. Each round goes elsewhere, so that nothing kept from the
-// round before serves.
+// The cost of a frame after a long jump, compared with a copy: `render(seconds)` renders the current pair of
+// frames near the start of the clip, which is not measured, and then at 10 h. Each round jumps to a different
+// time, so that nothing kept from an earlier round helps.
 template <typename Render>
 void RunJump(FramePool& pool, PairedTimes& times, Render&& render) {
     const double round = static_cast<double>(times.works.size());

@@ -15,6 +15,10 @@ std::wstring BesideThisProgram() {
 
 }  // namespace
 
+std::wstring LibraryFile(const std::wstring& path) {
+    return path.empty() ? BesideThisProgram() : path;
+}
+
 std::wstring LibraryFile(const std::string& path) {
     if (path.empty()) return BesideThisProgram();
     std::wstring wide(path.size(), L'\0');

@@ -101,7 +101,7 @@ std::string Expected(const ParamInfo& param) {
 Setting ParseSetting(const EffectInfo& effect, std::string_view text) {
     const std::size_t equals = text.find('=');
     if (equals == std::string_view::npos || equals == 0) {
-        throw UsageError("a setting is written NAME=VALUE, not \"" + std::string(text) + '"');
+        throw UsageError("settings have the form NAME=VALUE, not \"" + std::string(text) + '"');
     }
     const std::string_view name = text.substr(0, equals);
     const std::string_view valueText = text.substr(equals + 1);

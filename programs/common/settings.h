@@ -5,7 +5,7 @@
 //   menu       an item's text or its number from 0     "Pattern=Grainy", "Pattern=2"
 //   check box  on, off, yes, no, true, false, 1, 0     "Thick=on"
 //
-// Where two parameters share a name (a colour and a slider), the one whose kind the value fits is meant.
+// If two parameters have the same name (a colour and a slider), the kind of the value decides.
 #pragma once
 
 #include <cstdint>
@@ -22,7 +22,8 @@ struct Setting {
     ValueWord value;  // stored form: normalised number, colour word, item index or flag
 };
 
-// Throws UsageError: no such parameter (says which there are), or a value out of range or of another kind.
+// Throws UsageError if there is no such parameter (and lists those that exist), or if the value is out of
+// range or of another kind.
 Setting ParseSetting(const EffectInfo& effect, std::string_view text);
 
 // A stored value as a user would write it.

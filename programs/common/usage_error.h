@@ -1,5 +1,5 @@
-// A wish of the user that cannot be fulfilled as it was put: one line that names what is wrong and, where it
-// helps, what would be right. Caught by the programs' main functions, which print it.
+// An error in what the user asked for: one line that says what is wrong and, where it helps, what would be
+// right. The programs' main functions catch and print it.
 #pragma once
 
 #include <stdexcept>

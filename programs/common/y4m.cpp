@@ -17,7 +17,7 @@ std::int32_t Fixed(double x) {
     return static_cast<std::int32_t>(std::lround(x * kOne));
 }
 
-// What red, green and blue weigh in luma.
+// The weights of red, green and blue in luma.
 struct Weights {
     double red, blue;
     [[nodiscard]] constexpr double Green() const { return 1.0 - red - blue; }
@@ -167,7 +167,7 @@ Y4mFormat ParseY4mHeader(std::string_view line) {
         if (field == "XCOLORRANGE=FULL") format.isFullRange = true;
     }
     const auto size = ParseSize(sizeText[0] + "x" + sizeText[1]);
-    if (!size) throw UsageError("the YUV4MPEG2 header gives no valid size");
+    if (!size) throw UsageError("the YUV4MPEG2 header has no valid size");
     format.size = *size;
     const bool isHighDefinition = size->width >= 1280 || size->height > 576;
     format.matrix = isHighDefinition ? Y4mMatrix::kBt709 : Y4mMatrix::kBt601;

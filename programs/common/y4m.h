@@ -1,8 +1,8 @@
 // YUV4MPEG2 streams, 8 bits: the header line, and frames converted from and to BGRA for hosts without a media
-// library. Colours are in limited range, or in full range where the header says so. The format carries no matrix:
-// players assume BT.709 for high definition and BT.601 below, and so does this unless it is told. Chroma is
-// repeated over the pixels it belongs to and averaged over them on the way back, so that an untouched frame
-// returns as it came but for rounding.
+// library. Colours are in limited range, or in full range where the header says so. The format has no tag for
+// the matrix: like players, this code assumes BT.709 for high definition and BT.601 below, unless told
+// otherwise. Chroma is repeated over its pixels and averaged over them on the way back, so that an unchanged
+// frame comes back as it was except for rounding.
 #pragma once
 
 #include <cstddef>

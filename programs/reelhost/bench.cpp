@@ -7,7 +7,7 @@
 #include "programs/common/bench_cases.h"
 #include "programs/common/frame_pool.h"
 #include "programs/common/effect_info.h"
-#include "programs/reelhost/effect_run.h"
+#include "programs/common/effect_run.h"
 
 namespace velmora::hosts {
 namespace {

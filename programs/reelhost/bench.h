@@ -1,7 +1,7 @@
 // What a frame costs through the DLL, beside a memcpy of one.
 #pragma once
 
-#include "programs/reelhost/effect_library.h"
+#include "programs/common/effect_library.h"
 
 namespace velmora::hosts {
 

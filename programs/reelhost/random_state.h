@@ -7,8 +7,8 @@
 
 #include <cstdint>
 
-#include "programs/reelhost/effect_library.h"
-#include "programs/reelhost/effect_run.h"
+#include "programs/common/effect_library.h"
+#include "programs/common/effect_run.h"
 
 namespace velmora::hosts {
 

@@ -8,7 +8,7 @@
 
 #include "programs/common/frame_pool.h"
 #include "text/number_text.h"
-#include "programs/reelhost/effect_run.h"
+#include "programs/common/effect_run.h"
 
 #include <psapi.h>
 

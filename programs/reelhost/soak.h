@@ -3,7 +3,7 @@
 
 #include <cstdint>
 
-#include "programs/reelhost/effect_library.h"
+#include "programs/common/effect_library.h"
 
 namespace velmora::hosts {
 

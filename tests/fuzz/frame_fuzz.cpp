@@ -71,8 +71,25 @@ void Spoil(FuzzInput& input, Packing packing, FrameRecord& frame) {
     if (IsFrame(frame, packing)) frame.pixels = nullptr;
 }
 
-// Runs the operation on two frames apart, in the same memory or overlapping, and compares all bytes of the memory that
-// holds the destination with what the references make of the pixels alone.
+// Runs the references on the pixels alone, as they were before, and compares all bytes of the memory that holds the
+// destination, `at` bytes in, with what they make of them. `before`: what it held.
+void Compare(const Frame& source, Frame& destination, std::size_t at, const reelcheck::GuardedMemory& home,
+             const std::vector<std::uint8_t>& before, Packing from, Packing to, const Operation& operation) {
+    for (const Runner runner : {Runner::kReference, Runner::kOtherLevel}) {
+        Frame plainSource({source.Shape().width, source.Shape().height}, from);
+        Frame plain({destination.Shape().width, destination.Shape().height}, to);
+        plainSource.CopyRegion(source);
+        std::memcpy(destination.Bytes(), before.data() + at, destination.Size());
+        plain.CopyRegion(destination);
+        Require(operation(runner, plainSource.Record(), plain.Record()));
+        destination.CopyRegion(plain);
+        std::vector<std::uint8_t> made = before;
+        std::memcpy(made.data() + at, destination.Bytes(), destination.Size());
+        Require(std::memcmp(made.data(), home.Data(), home.Size()) == 0);
+    }
+}
+
+// Runs the operation on two frames apart, in the same memory or overlapping.
 void Try(FuzzInput& input, Packing from, Packing to, const Operation& operation) {
     enum Kind { kSame = 1, kSpoiltSource, kSpoiltDestination, kOverlapping };
     const std::int32_t kind = input.Below(8);
@@ -104,23 +121,13 @@ void Try(FuzzInput& input, Packing from, Packing to, const Operation& operation)
     moveHome(destination, destinationAt, out);
     if (isShared) {
         std::memcpy(home.Data() + sourceAt, source.Bytes(), source.Size());
-        std::memcpy(destination.Bytes(), home.Data() + destinationAt, destination.Size());
         moveHome(source, sourceAt, in);
     } else {
         source.ForbidWriting();
     }
-    std::vector<std::uint8_t> wanted(home.Data(), home.Data() + home.Size());
+    const std::vector<std::uint8_t> before(home.Data(), home.Data() + home.Size());
     Require(operation(Runner::kLibrary, in, out));
-    for (const Runner runner : {Runner::kReference, Runner::kOtherLevel}) {
-        Frame plainSource({sourceLayout.width, sourceLayout.height}, from);
-        Frame plain({destinationLayout.width, destinationLayout.height}, to);
-        plainSource.CopyRegion(source);
-        plain.CopyRegion(destination);
-        Require(operation(runner, plainSource.Record(), plain.Record()));
-        destination.CopyRegion(plain);
-        std::memcpy(wanted.data() + destinationAt, destination.Bytes(), destination.Size());
-        Require(std::memcmp(wanted.data(), home.Data(), home.Size()) == 0);
-    }
+    Compare(source, destination, destinationAt, home, before, from, to, operation);
 }
 
 // The state that a reference renders on, beside the library's.

@@ -18,6 +18,7 @@ PLUGINS = [f"velmora_film_{name}" for name in ("camera", "damage", "express", "l
 DEB_FILES = ["usr/bin/reelfx", *(f"usr/lib/velmora-reel-effects/{name}" for name in ("farm-slurm", "farm-join")),
              "usr/share/man/man1/reelfx.1.gz", "usr/share/bash-completion/completions/reelfx",
              "usr/share/zsh/vendor-completions/_reelfx", "usr/share/fish/vendor_completions.d/reelfx.fish",
+             "usr/share/velmora-reel-effects/reel.html",
              *(f"usr/lib/frei0r-1/{name}.so" for name in PLUGINS),
              *(f"usr/share/mlt-7/frei0r/filter_frei0r.{name}.yml" for name in PLUGINS),
              *(f"usr/share/kdenlive/effects/{name}.xml" for name in PLUGINS),
@@ -50,6 +51,8 @@ def check_tarball(path, work, expected):
     listing = str(home / ".local/share/velmora-reel-effects/installed-files")
     assert set(re.findall(r"^  (.*)$", said, re.M)) == installed - {listing}, said
     assert digests(home / ".local/bin/reelfx") == expected
+    page = run(home / ".local/bin/reelfx", "studio", "--path").strip()
+    assert page == str(home / ".local/share/velmora-reel-effects/reel.html"), page
     # FFmpeg finds the plug-in by itself: its frames are those of reelfx.
     run("ffmpeg", "-nostdin", "-v", "error", "-i", CLIP, "-vf", "frei0r=velmora_film_pro:super8|7", "-frames:v", "2",
         "-f", "null", "-", env=environment)

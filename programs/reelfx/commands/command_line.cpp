@@ -190,6 +190,7 @@ Command ReadCommandLine(int count, const char* const* arguments) {
         return typed.list;
     }
     if (app.got_subcommand("presets")) return typed.presets;
+    if (app.got_subcommand("studio")) return typed.studio;
     if (app.got_subcommand("info")) return InfoOptions{ReadInput(typed), typed.info.asJson};
     if (app.got_subcommand("frame")) return FrameCommand{ReadPicture(typed)};
     if (app.got_subcommand("sheet")) return SheetCommand{ReadSheet(typed)};
@@ -215,6 +216,9 @@ ExitCode Run(const PresetsOptions& options) {
 }
 ExitCode Run(const InfoOptions& options) {
     return RunInfo(options);
+}
+ExitCode Run(const StudioOptions& options) {
+    return RunStudio(options);
 }
 ExitCode Run(const RenderOptions& options) {
     return RunRender(options);

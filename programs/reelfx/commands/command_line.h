@@ -12,6 +12,7 @@
 #include "programs/reelfx/commands/presets_command.h"
 #include "programs/reelfx/commands/render_command.h"
 #include "programs/reelfx/commands/strip_command.h"
+#include "programs/reelfx/commands/studio_command.h"
 
 namespace velmora::hosts {
 
@@ -25,13 +26,14 @@ struct FrameCommand {
 struct SheetCommand {
     PictureOptions options;
 };
-using Command = std::variant<TextCommand, ListOptions, RenderOptions, FrameCommand, SheetCommand,
-                             StripOptions, PresetShowOptions, PresetSaveOptions, PresetsOptions, InfoOptions>;
+using Command =
+    std::variant<TextCommand, ListOptions, RenderOptions, FrameCommand, SheetCommand, StripOptions,
+                 PresetShowOptions, PresetSaveOptions, PresetsOptions, InfoOptions, StudioOptions>;
 
-// What the arguments ask for; opens and writes nothing. Throws UsageError.
+// Parses the arguments; opens and writes nothing. Throws UsageError.
 Command ReadCommandLine(int count, const char* const* arguments);
 
-// Does it. Throws Failure or UsageError; the caller prints their line.
+// Runs the command. Throws Failure or UsageError; the caller prints their text.
 ExitCode RunCommand(const Command& command);
 
 }  // namespace velmora::hosts

@@ -97,7 +97,7 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
                     "Check everything and print what would be done, but write nothing");
 }
 
-// What differs in the help of the commands that write stills.
+// The help texts that differ between the commands that write stills.
 struct PictureTexts {
     const char* what;
     const char* out;
@@ -217,6 +217,8 @@ void AddCommands(CLI::App& app, TypedOptions& typed) {
     AddPictures(app, typed);
     AddPreset(app, typed);
     AddInfo(app, typed);
+    app.add_subcommand("studio", "Open the effects as a page in the browser")
+        ->add_flag("--path", typed.studio.isPathOnly, "Print where the page lies instead");
 }
 
 }  // namespace velmora::hosts

@@ -1,5 +1,4 @@
-// The table of commands and options: what the parser, --help, the man page and the shells' completion all
-// know of reelfx.
+// The table of commands and options, used by the parser, --help, the man page and the shell completions.
 #pragma once
 
 #include <array>
@@ -13,6 +12,7 @@
 #include "programs/reelfx/commands/presets_command.h"
 #include "programs/reelfx/commands/render_command.h"
 #include "programs/reelfx/commands/strip_command.h"
+#include "programs/reelfx/commands/studio_command.h"
 
 namespace CLI {
 class App;
@@ -57,6 +57,7 @@ struct TypedOptions {
     std::string listEffect;
     PresetsOptions presets;
     InfoOptions info;
+    StudioOptions studio;
     PictureOptions picture;
     int stripFrames = 12;
     std::string crop;
@@ -64,8 +65,8 @@ struct TypedOptions {
     PresetSaveOptions presetSave;
 };
 
-// Gives `app` the commands, whose options fill `typed`. An option's type name tells what completes it: EFFECT,
-// PRESET, NAME=VALUE, FILE, CODEC, or the choices themselves, "one|other".
+// Adds the commands to `app`; their options fill `typed`. An option's type name says how the shell completes
+// it: EFFECT, PRESET, NAME=VALUE, FILE, CODEC, or the choices themselves, "one|other".
 void AddCommands(CLI::App& app, TypedOptions& typed);
 
 }  // namespace velmora::hosts

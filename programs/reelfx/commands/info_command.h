@@ -1,4 +1,4 @@
-// `reelfx info`: what a clip is, and what rendering would do with it.
+// `reelfx info`: describes a clip and how it would be rendered.
 #pragma once
 
 #include "programs/reelfx/common/failure.h"

@@ -17,7 +17,7 @@ namespace {
 
 constexpr std::int32_t kSheetCellWidth = 480;
 constexpr int kSheetColumns = 4;
-constexpr char kNameMark[] = "%s";  // of the effect, in the names of several sheets
+constexpr char kNameMark[] = "%s";  // stands for the effect's name when several sheets are written
 
 BgraPicture DrawSheet(const EffectChoice& choice, ClipPicture& source, const PictureOptions& options) {
     std::vector<GridCell> cells;
@@ -40,7 +40,7 @@ std::string FileNameOf(std::string effect) {
     return effect;
 }
 
-// Where sheets that share OUT go: their folder, made where there is none, and gone again if nothing comes of it.
+// The folder of several sheets. It is created if needed, and removed again if no sheet is written.
 class SheetPlaces {
   public:
     explicit SheetPlaces(const std::string& out) : m_pattern(out) {
@@ -75,7 +75,7 @@ class SheetPlaces {
     }
 
   private:
-    // What has an ending is meant as a file, unless it is there and a folder.
+    // A name with an extension is a file, unless a folder of that name exists.
     static bool IsFolder(const std::string& path) {
         namespace fs = std::filesystem;
         std::error_code ignored;
@@ -87,7 +87,7 @@ class SheetPlaces {
     std::filesystem::path m_made;
 };
 
-// All are drawn before the first is written, so that what fails leaves no part of the five.
+// All are drawn before the first is written, so that a failure does not leave some of the five.
 ExitCode RunAllSheets(const PictureOptions& options) {
     const SheetPlaces places(options.out);
     for (const EffectInfo& info : CoreEffects()) CheckOutputPlace(places.Of(info.name), options.mayOverwrite);

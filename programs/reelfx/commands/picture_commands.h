@@ -20,8 +20,8 @@ struct PictureOptions {
     std::int32_t width = 0;  // of each picture; 0: the command's own
     int columns = 0;         // pictures in a row; 0: the command's own
     bool mayOverwrite = false;
-    // A sheet of each effect: `out` is a folder, which is made where there is none, or a name with "%s" for the
-    // effect's, "film-pro". Of `effect` only the randomness counts.
+    // Write a sheet for each effect: `out` is a folder, which is created if needed, or a name with "%s" for
+    // the effect's name, such as "film-pro". Of `effect`, only the randomness is used.
     bool allEffects = false;
 };
 

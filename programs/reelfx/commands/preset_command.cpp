@@ -30,7 +30,7 @@ ExitCode RunPresetShow(const PresetShowOptions& options) {
     const EffectInfo& effect = choice.Info();
     const std::vector<Setting> settings = PresetSettings(record, effect, options.file);
     if (options.asJson) {
-        // Names in preset files are 8-bit text of any code page: what is no UTF-8 is replaced.
+        // Names in preset files are 8-bit text in any code page: invalid UTF-8 is replaced.
         const Json json = JsonOf(record, effect, settings);
         std::printf("%s\n", json.dump(2, ' ', false, Json::error_handler_t::replace).c_str());
         return kExitDone;

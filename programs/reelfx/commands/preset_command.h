@@ -1,4 +1,4 @@
-// `reelfx preset show` and `reelfx preset save`: preset files that an editor's users exchange.
+// `reelfx preset show` and `reelfx preset save`: preset files, which editors can also read and write.
 #pragma once
 
 #include <string>
@@ -15,7 +15,7 @@ struct PresetShowOptions {
 
 struct PresetSaveOptions {
     std::string file;
-    std::string name;  // empty: the file's name without its ending
+    std::string name;  // empty: the file name without its extension
     EffectOptions effect;
     bool mayOverwrite = false;
 };

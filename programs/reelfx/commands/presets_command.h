@@ -1,4 +1,4 @@
-// `reelfx presets`: the built-in presets of an effect with what each one sets.
+// `reelfx presets`: the built-in presets of an effect with their settings.
 #pragma once
 
 #include <string>

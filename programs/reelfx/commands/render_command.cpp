@@ -37,7 +37,7 @@ class RenderRun {
         if (firstImage > 1) m_writer->NumberImagesFrom(firstImage);
     }
 
-    // Everything but the frames.
+    // Does everything except the frames.
     ExitCode Rehearse() {
         const std::int64_t frames = ClipSection::FrameCountGuess(m_reader, m_section);
         if (frames == 0 && m_reader.FrameCountGuess() > 0) FailEmpty();

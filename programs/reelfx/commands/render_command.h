@@ -17,12 +17,12 @@ struct RenderOptions {
     EffectOptions effect;
     SectionOptions section;
     std::optional<OutputOptions> output;  // none: digests only
-    int threads = 0;                      // 0: as many as the machine has
+    int threads = 0;                      // 0: one per processor
     bool mayOverwrite = false;
     bool withSound = true;
     bool withDigests = false;  // a line for each frame on standard output
-    bool isMatte = false;      // the damage alone, without the picture
-    bool isDryRun = false;     // checks and tells, but writes nothing
+    bool isMatte = false;      // only the damage, without the picture
+    bool isDryRun = false;     // checks and reports, but writes nothing
     ProgressKind progress = ProgressKind::kAuto;
 };
 

@@ -1,4 +1,4 @@
-// What `reelfx render --dry-run` tells: everything that a run would do.
+// What `reelfx render --dry-run` prints: everything that a run would do.
 #pragma once
 
 #include <string>
@@ -9,7 +9,8 @@
 
 namespace velmora::hosts {
 
-// `section` is where the frames come from, a farm's part resolved. Lines of text, each with its end. `writer` null: digests only.
+// Returns lines of text with line ends. `section` has the farm part resolved. A null `writer` means digests
+// only.
 std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectChoice& choice,
                      const MediaReader& reader, const MediaWriter* writer, unsigned threads);
 

@@ -26,7 +26,7 @@ std::string TextOf(const Rectangle& part) {
            std::to_string(part.top);
 }
 
-// As much as a screen of 1920 pixels shows of all frames in one row, and half the height of such a film.
+// A row of all frames fills a screen 1920 pixels wide, at half the height of 1080-line video.
 FrameSize DefaultSize(const BgraPicture& picture, int columns) {
     constexpr std::int32_t kScreen = 1920, kGap = 4, kLeast = 48, kHeight = 540;
     const std::int32_t width = std::max(kLeast, (kScreen - kGap) / columns - kGap);

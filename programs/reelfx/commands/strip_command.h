@@ -1,4 +1,4 @@
-// `reelfx strip`: successive frames side by side at 100 %, for judging motion where nothing can be played.
+// `reelfx strip`: successive frames side by side at 100 %, for judging motion where no video can be played.
 #pragma once
 
 #include <cstdint>
@@ -16,16 +16,16 @@ namespace velmora::hosts {
 struct Crop {
     FrameSize size;
     std::optional<std::pair<std::int32_t, std::int32_t>>
-        corner;  // left, top; nothing: in the picture's middle
+        corner;  // left, top; nothing: in the middle of the picture
 };
 
 // "160x540+880+270", or "160x540".
 std::optional<Crop> ParseCrop(const std::string& text);
 
 struct StripOptions {
-    PictureOptions picture;  // its width does not count; without a place, the frames of the clip's middle
-    int frames = 12;         // fewer come where the clip ends
-    // Nothing: the middle of the picture, so wide that a row of the frames is about as wide as a screen.
+    PictureOptions picture;  // its width is not used; without a place, the frames in the middle of the clip
+    int frames = 12;         // fewer if the clip ends earlier
+    // Nothing: the middle of the picture, wide enough for a row of frames to fill a screen.
     std::optional<Crop> crop;
 };
 

@@ -1,4 +1,4 @@
-// Which effect with which settings a command applies, and sessions of the core that render it.
+// The effect and settings that a command applies, and the sessions that render it.
 #pragma once
 
 #include <cstdint>
@@ -15,13 +15,13 @@
 namespace velmora::hosts {
 
 struct EffectOptions {
-    std::string effect = {};  // may be empty where a preset file tells it
+    std::string effect = {};  // may be empty if a preset file names it
     std::optional<std::string> preset = {};
     std::optional<std::string> presetFile = {};  // applied after the preset
     std::vector<std::string> settings = {};      // "NAME=VALUE", applied last
     std::uint32_t seed = 0;
-    // A running sequence of random numbers from this state, as a host that plays a clip through the library
-    // gets it, instead of numbers that follow from seed and frame.
+    // Use one continuous random sequence from this state, as a host that plays a clip through the library
+    // does, instead of numbers that depend on seed and frame.
     std::optional<std::uint32_t> randomState = {};
 };
 
@@ -37,7 +37,7 @@ class EffectChoice {
     [[nodiscard]] const EffectInfo& Info() const { return *m_info; }
     // Frames must come in order and to one session only.
     [[nodiscard]] bool IsSequence() const { return m_options.randomState.has_value(); }
-    // Each thread needs one of its own. `preset` replaces the chosen one and all settings.
+    // Each thread needs its own. `preset` replaces the chosen preset and all settings.
     [[nodiscard]] std::unique_ptr<effects::EffectSession> NewSession(
         std::optional<std::uint32_t> preset = std::nullopt) const;
 
@@ -46,7 +46,7 @@ class EffectChoice {
     std::size_t m_index;
     const EffectInfo* m_info;
     std::optional<std::uint32_t> m_preset;
-    std::vector<Setting> m_settings;  // of the preset file, then those given one by one
+    std::vector<Setting> m_settings;  // those of the preset file, then those given with --set
 };
 
 }  // namespace velmora::hosts

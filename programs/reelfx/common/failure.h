@@ -8,11 +8,11 @@ namespace velmora::hosts {
 
 enum ExitCode : int {
     kExitDone = 0,
-    kExitInternal = 1,  // a fault of the program or of the machine, such as no memory
-    kExitUsage = 2,     // the command line: unknown effect, preset, parameter or option, value out of range
-    kExitInput = 3,     // the input cannot be read or holds no picture
-    kExitOutput = 4,    // the output exists already, cannot be written, or the disk is full
-    kExitInterrupted = 130,  // Ctrl-C
+    kExitInternal = 1,  // an error in the program or the machine, such as not enough memory
+    kExitUsage = 2,   // invalid command line: unknown effect, preset, parameter or option, value out of range
+    kExitInput = 3,   // the input cannot be read or contains no video
+    kExitOutput = 4,  // the output already exists or cannot be written, or the disk is full
+    kExitInterrupted = 130,  // SIGINT or SIGTERM
 };
 
 class Failure : public std::runtime_error {

@@ -10,7 +10,8 @@ std::atomic<int> g_interrupts = 0;
 static_assert(std::atomic<int>::is_always_lock_free, "touched by a signal handler");
 
 extern "C" void CountInterrupt(int number) {
-    // Where nothing looks at the count any more, a pipe that nobody reads, only the system can help.
+    // If nothing checks the count any more, for example while writing to a pipe that nobody reads, only the
+    // default action ends the program.
     if (g_interrupts.fetch_add(1, std::memory_order_relaxed) >= 1) std::signal(number, SIG_DFL);
 }
 
@@ -19,7 +20,7 @@ extern "C" void CountInterrupt(int number) {
 void WatchInterrupts() {
     std::signal(SIGINT, CountInterrupt);
     std::signal(SIGTERM, CountInterrupt);
-    // A reader that went away and a file size limit are errors of writing like a full disk.
+    // A closed pipe and a file size limit are write errors, like a full disk.
     std::signal(SIGPIPE, SIG_IGN);
     std::signal(SIGXFSZ, SIG_IGN);
 }

@@ -23,7 +23,7 @@ std::string ExistsText(const std::string& name) {
     return name + ": already exists; use --overwrite to replace it";
 }
 
-// The first file that a pattern names, for either usual start of counting; the path itself without one.
+// True if the first file of a pattern exists, counting from either usual start, or the path itself.
 bool SomethingStandsAt(const std::string& path, std::int64_t firstImage) {
     std::error_code ignored;
     char name[4096];
@@ -37,8 +37,8 @@ bool SomethingStandsAt(const std::string& path, std::int64_t firstImage) {
 constexpr char kHiddenFolder[] = ".reelfx-XXXXXX";
 constexpr std::size_t kPrefixLength = sizeof kHiddenFolder - 1 - 6;
 
-// A handle that holds the lock of a folder of this user, until it is closed or the process ends; -1 with `isTaken`
-// when another has the lock.
+// Locks a folder of this user and returns a handle that holds the lock until it is closed or the process
+// ends; -1 with `isTaken` if another process has the lock.
 int LockFolder(const fs::path& folder, bool& isTaken) {
     isTaken = false;
     const int handle = open(folder.c_str(), O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC);
@@ -51,7 +51,7 @@ int LockFolder(const fs::path& folder, bool& isTaken) {
     return -1;
 }
 
-// What commands left behind that were killed: hidden folders that nobody holds.
+// Removes what killed commands left behind: hidden folders that nobody has locked.
 void RemoveLeftOvers(const fs::path& beside) {
     std::error_code ignored;
     for (fs::directory_iterator entry(beside, ignored), end; !ignored && entry != end;
@@ -69,7 +69,8 @@ void RemoveLeftOvers(const fs::path& beside) {
     }
 }
 
-// Makes and locks a folder. Another command may take it for a left-over before it is locked: then another is made.
+// Makes and locks a folder. Another command may remove it as a leftover before it is locked; then it makes
+// another one.
 fs::path MakeHiddenFolder(const fs::path& beside, const std::string& name, int& lock) {
     for (;;) {
         std::string path = (beside / kHiddenFolder).string();
@@ -109,9 +110,9 @@ OutputPlace::OutputPlace(const std::string& path, bool mayOverwrite, std::int64_
     const fs::file_status status = fs::status(m_path, ignored);
     if (path == "-" || (fs::exists(status) && !fs::is_regular_file(status))) return;
     m_replaces = SomethingStandsAt(path, firstImage);
-    // Absolute: a relative name with a colon would be taken for an address.
+    // Absolute, because a relative name with a colon could be taken for an address.
     m_path = fs::absolute(m_path);
-    // A name that is a link stays one: what it points to is replaced.
+    // A symbolic link is kept; its target is replaced.
     if (const fs::path target = fs::canonical(m_path, ignored); !target.empty()) m_path = target;
     RemoveLeftOvers(m_path.parent_path());
     m_folder = MakeHiddenFolder(m_path.parent_path(), m_name, m_lock);
@@ -133,7 +134,7 @@ void OutputPlace::Keep() {
     try {
         for (const fs::directory_entry& file : fs::directory_iterator(m_folder)) {
             const fs::path target = m_folder.parent_path() / file.path().filename();
-            // Somebody else may have written there while this command ran.
+            // Another program may have written there meanwhile.
             if (!m_mayOverwrite && fs::exists(target))
                 throw Failure(kExitOutput, ExistsText(target.string()));
             fs::rename(file.path(), target);

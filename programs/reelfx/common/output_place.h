@@ -1,6 +1,6 @@
-// Where a result is written. Files come into being in a hidden folder beside their final place and move there
-// when they are whole: a command that fails leaves nothing behind, and what was there before stays. The folder of a
-// command that was killed (".reelfx-" and six letters) goes with the next one that writes beside it.
+// Where a result is written. Files are written in a hidden folder beside their destination and moved when
+// they are complete: a command that fails leaves nothing behind, and an older file stays. The folder of a
+// killed command (".reelfx-" and six letters) is removed by the next command that writes beside it.
 #pragma once
 
 #include <cstdint>
@@ -9,16 +9,16 @@
 
 namespace velmora::hosts {
 
-// Throws what the constructor of OutputPlace would, as far as it shows without writing.
+// Throws what the constructor of OutputPlace would throw, as far as can be known without writing.
 void CheckOutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage = 1);
 
 class OutputPlace {
   public:
     // `path` is a file's name, a pattern of image files ("frames-%04d.png"), or "-" for standard output.
-    // `firstImage` is the number of a pattern's first image. Throws Failure: the file exists and may not be overwritten (kExitOutput), its folder cannot be written
-    // to, or standard output is a terminal.
+    // `firstImage` is the number of a pattern's first image. Throws Failure (kExitOutput) if the file exists
+    // and may not be overwritten, its folder cannot be written to, or standard output is a terminal.
     OutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage = 1);
-    ~OutputPlace();  // discards what was not kept
+    ~OutputPlace();  // discards what Keep has not moved
     OutputPlace(const OutputPlace&) = delete;
     OutputPlace& operator=(const OutputPlace&) = delete;
 
@@ -26,17 +26,17 @@ class OutputPlace {
     [[nodiscard]] std::string Address() const;
     // True for "-" and for devices and pipes in the file system, which are written to directly.
     [[nodiscard]] bool IsDirect() const { return m_folder.empty(); }
-    // A file stood at the place when the command began.
+    // True if there was a file at the destination when the command began.
     [[nodiscard]] bool ReplacesFile() const { return m_replaces; }
-    // As the user named it, for messages.
+    // The user's name for it, for messages.
     [[nodiscard]] const std::string& Name() const { return m_name; }
 
-    // Moves everything written to its place.
+    // Moves everything written to its destination.
     void Keep();
 
   private:
     std::filesystem::path m_path;
-    std::filesystem::path m_folder;  // hidden, beside the final place; empty when written directly
+    std::filesystem::path m_folder;  // hidden, beside the destination; empty when written directly
     int m_lock = -1;                 // on the folder, so that others see that it is in use; -1: none
     std::string m_name;
     bool m_mayOverwrite;

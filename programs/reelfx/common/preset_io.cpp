@@ -12,14 +12,14 @@
 namespace velmora::hosts {
 namespace {
 
-// As the library object tells its hosts.
+// The name that the library object reports to hosts.
 constexpr char kLibraryName[] = "Velmora Reel Effects";
 
 std::string FieldText(const char (&field)[kPresetNameWidth]) {
     return std::string(field, std::find(field, field + kPresetNameWidth, '\0'));
 }
 
-// Cut to the field, with its terminating zero.
+// Truncated to the field, including the terminating zero.
 void FillField(char (&field)[kPresetNameWidth], const std::string& text) {
     const std::size_t length = std::min<std::size_t>(text.size(), kPresetNameWidth - 1);
     std::fill(std::copy_n(text.data(), length, field), field + kPresetNameWidth, '\0');

@@ -10,10 +10,10 @@
 
 namespace velmora::hosts {
 
-// Throws Failure (kExitInput) when the file cannot be read or is no preset.
+// Throws Failure (kExitInput) when the file cannot be read or is not a preset.
 PresetRecord LoadPresetFile(const std::string& path);
 
-// The record's texts and values; names are cut nowhere else but at their field's end.
+// The record's texts and values; names end at a zero or at the end of their field.
 std::string PresetName(const PresetRecord& record);
 std::string PresetEffect(const PresetRecord& record);
 

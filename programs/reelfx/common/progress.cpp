@@ -28,7 +28,7 @@ std::string ProgressText(std::int64_t done, std::int64_t total, double seconds) 
     char text[64];
     std::snprintf(text, sizeof text, "  %.1f fps", rate);
     if (total <= 0) return "frame " + std::to_string(done) + text;
-    // The container's count is a guess: a clip may turn out longer.
+    // The container's count is only an estimate: the clip may be longer.
     const std::int64_t end = std::max(total, done);
     std::string line = "frame " + std::to_string(done) + "/" + std::to_string(end) + "  " +
                        std::to_string(done * 100 / end) + "%" + text;
@@ -71,7 +71,7 @@ void Progress::End() {
 void Progress::Write(bool isEnd) const {
     const double seconds = std::chrono::duration<double>(Clock::now() - m_begin).count();
     if (m_kind == ProgressKind::kText) {
-        // The rest of a longer line before is wiped.
+        // Blanks erase the rest of a longer previous line.
         std::fprintf(stderr, "\r%s\x1b[K", ProgressText(m_done, m_total, seconds).c_str());
     } else if (m_kind == ProgressKind::kJson) {
         std::fprintf(stderr, "%s\n", ProgressJson(m_done, m_total, seconds, isEnd).c_str());

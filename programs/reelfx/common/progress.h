@@ -1,5 +1,5 @@
-// How far a command is, on standard error: for a person a line that stands still, with frame, share, frames
-// per second and time left; for programs a line of JSON each time.
+// Progress of a command on standard error: for people one line that is updated, with frame, percentage,
+// frames per second and time left; for programs a line of JSON for each update.
 #pragma once
 
 #include <chrono>
@@ -9,7 +9,7 @@
 namespace velmora::hosts {
 
 enum class ProgressKind {
-    kAuto,  // text at a terminal, else none
+    kAuto,  // text at a terminal, otherwise none
     kNone,
     kText,
     kJson,
@@ -17,14 +17,14 @@ enum class ProgressKind {
 
 class Progress {
   public:
-    // `total` 0: not known.
+    // `total` is 0 if unknown.
     Progress(std::int64_t total, ProgressKind kind);
-    ~Progress();  // ends a person's line
+    ~Progress();  // ends the line of text
     Progress(const Progress&) = delete;
     Progress& operator=(const Progress&) = delete;
 
     void Update(std::int64_t done);
-    // All is done and written. Programs are told so; without it the command has failed.
+    // Everything has been written. Reports this to programs; without this call the command has failed.
     void End();
 
   private:
@@ -39,11 +39,11 @@ class Progress {
     std::int64_t m_done = 0;
 };
 
-// "frame 12/41  29%  8.3 fps  0:03 left"; without the share and the time where `total` is 0.
+// "frame 12/41 29% 8.3 fps 0:03 left"; without percentage and time left if `total` is 0.
 std::string ProgressText(std::int64_t done, std::int64_t total, double seconds);
 
-// {"frame":12,"frames":41,"seconds":1.446,"fps":8.3,"progress":"continue"}; without "frames" where `total` is
-// 0, and "end" for "continue" when all is done.
+// {"frame":12,"frames":41,"seconds":1.446,"fps":8.3,"progress":"continue"}; without "frames" if `total` is 0,
+// and with "end" instead of "continue" when everything is done.
 std::string ProgressJson(std::int64_t done, std::int64_t total, double seconds, bool isEnd);
 
 }  // namespace velmora::hosts

@@ -1,4 +1,4 @@
-// A picture in memory as the effects take it: rows of blue, green, red and alpha bytes from the top.
+// A picture in memory in the layout of the effects: rows of blue, green, red and alpha bytes from the top.
 #pragma once
 
 #include <cstddef>
@@ -28,7 +28,7 @@ class BgraPicture {
     [[nodiscard]] std::uint8_t* Row(std::int32_t y) { return m_bytes.data() + y * m_stride; }
     [[nodiscard]] const std::uint8_t* Row(std::int32_t y) const { return m_bytes.data() + y * m_stride; }
 
-    // The record through which effects see it; valid until the picture changes its size.
+    // The record for calling effects; valid until the picture is resized.
     FrameRecord Record() {
         return {m_bytes.data(), m_width, m_height, static_cast<std::int32_t>(m_stride), 0, 0, 0};
     }

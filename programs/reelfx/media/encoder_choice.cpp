@@ -14,7 +14,7 @@ extern "C" {
 namespace velmora::hosts {
 namespace {
 
-// Nothing visible is lost at these; the scales differ from codec to codec.
+// No visible loss at these values; each codec has its own scale.
 struct QualityRow {
     const char* codec;
     const char* crf;
@@ -26,10 +26,11 @@ constexpr QualityRow kQualities[] = {
 // For codecs with a quantiser instead: 1 is best, 31 worst.
 constexpr int kQuantiser = 2;
 
-// A constant number: some codecs cut a picture by it, and a file should not depend on the machine's processors.
+// A constant: some codecs divide the picture by the number of threads, and a file should not depend on the
+// machine.
 constexpr int kEncoderThreads = 4;
 
-// These refuse sizes that their chroma does not divide.
+// These reject sizes that are not multiples of their chroma subsampling.
 bool NeedsWholeChroma(const AVCodec& codec) {
     return codec.id == AV_CODEC_ID_H264 || codec.id == AV_CODEC_ID_HEVC || codec.id == AV_CODEC_ID_AV1;
 }
@@ -44,7 +45,7 @@ bool Fits(const AVCodec& codec, AVPixelFormat format, const AVFrame& source) {
 
 std::vector<AVPixelFormat> FormatsOf(const AVCodec& codec) {
     std::vector<AVPixelFormat> formats;
-    if (codec.id == AV_CODEC_ID_WRAPPED_AVFRAME) {  // YUV4MPEG2: what its header can name at 8 bits
+    if (codec.id == AV_CODEC_ID_WRAPPED_AVFRAME) {  // YUV4MPEG2: the 8-bit formats that its header can name
         return {AV_PIX_FMT_YUV420P, AV_PIX_FMT_YUV422P, AV_PIX_FMT_YUV444P, AV_PIX_FMT_YUV411P,
                 AV_PIX_FMT_GRAY8};
     }
@@ -52,7 +53,7 @@ std::vector<AVPixelFormat> FormatsOf(const AVCodec& codec) {
     return formats;
 }
 
-// What carries transparency in a container whose usual codec does not.
+// Codecs with transparency, for containers whose usual codec has none.
 struct AlphaRow {
     const char* container;
     const char* codec;
@@ -70,7 +71,7 @@ bool CarriesAlpha(AVPixelFormat format) {
     return descriptor && (descriptor->flags & kWanted) != 0 && (descriptor->flags & kUnwanted) == 0;
 }
 
-// VP8 and VP9 have it in a second stream, which few containers hold.
+// VP8 and VP9 store it in a second stream, which few containers support.
 void CheckAlphaHolds(const AVCodec& codec, const AVOutputFormat& container) {
     if (codec.id != AV_CODEC_ID_VP8 && codec.id != AV_CODEC_ID_VP9) return;
     const std::string name = container.name;
@@ -180,7 +181,7 @@ AVPixelFormat ChoosePixelFormat(const OutputOptions& options, const AVCodec& cod
         return false;
     };
     if (has(wanted)) return wanted;
-    // Pictures of other origin become what every player shows, unless the file is one of still pictures.
+    // Other sources get the format that every player supports, unless the output is still pictures.
     const bool isFilm = (container.flags & AVFMT_NOTIMESTAMPS) == 0;
     if (IsRgb(wanted) && isFilm && has(AV_PIX_FMT_YUV420P)) return AV_PIX_FMT_YUV420P;
     fitting.push_back(AV_PIX_FMT_NONE);

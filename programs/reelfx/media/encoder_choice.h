@@ -1,5 +1,5 @@
-// Which container, codec and pixel format an output gets: what the user asks for, else what suits the file's
-// name and stays closest to the source.
+// Chooses the container, codec and pixel format of an output: what the user asks for, otherwise what suits
+// the file name and is closest to the source.
 #pragma once
 
 #include <optional>
@@ -11,24 +11,24 @@ namespace velmora::hosts {
 
 struct OutputOptions {
     std::string path;                   // "-": standard output
-    std::optional<std::string> format;  // container, by the media library's name
+    std::optional<std::string> format;  // container, by FFmpeg's name
     std::optional<std::string> codec;   // "libx264", "ffv1", ...
     std::optional<double> crf;          // constant quality, in the codec's own scale
     std::optional<std::string> pixelFormat;
-    bool isRawBgra = false;   // frames of raw BGRA and nothing else
-    bool needsAlpha = false;  // the pixel format must carry transparency
+    bool isRawBgra = false;   // only frames of raw BGRA
+    bool needsAlpha = false;  // the pixel format must support transparency
 };
 
-// Each throws Failure (kExitUsage) with one line when there is no such thing.
+// Each throws Failure (kExitUsage) with one line when there is no match.
 const AVOutputFormat& ChooseContainer(const OutputOptions& options);
 const AVCodec& ChooseCodec(const OutputOptions& options, const AVOutputFormat& container);
 AVPixelFormat ChoosePixelFormat(const OutputOptions& options, const AVCodec& codec,
                                 const AVOutputFormat& container, const AVFrame& source);
 
-// Quality, threads and the codec's own options; before it is opened.
+// Sets quality, threads and the codec's own options, before it is opened.
 void SetQuality(const OutputOptions& options, const AVCodec& codec, AVCodecContext& encoder);
 
-// Codecs that count frames at a constant rate instead of carrying times.
+// True for codecs that count frames at a constant rate instead of storing times.
 bool NeedsConstantRate(const AVCodec& codec);
 
 }  // namespace velmora::hosts

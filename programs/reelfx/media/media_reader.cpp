@@ -11,7 +11,7 @@
 namespace velmora::hosts {
 namespace {
 
-// A file's name may look like an address ("take:2.mov"); existing files are taken as files.
+// A file name may look like an address ("take:2.mov"); existing files count as files.
 std::string AddressOf(const std::string& path) {
     std::error_code ignored;
     return std::filesystem::exists(path, ignored) ? "file:" + path : path;
@@ -33,7 +33,7 @@ MediaReader::MediaReader(const InputOptions& options) : MediaReader(options, Clo
     while (!m_firstFrame && !m_ended) ReadMore();
     if (m_firstFrame) return;
     if (!m_breakOff.empty()) FailReading(m_breakOff);
-    // Decoders that have no memory may call all packets invalid.
+    // A decoder without memory may report every packet as invalid.
     if (m_damaged > 0) ThrowIfNoMemory(AVERROR_EXTERNAL);
     FailReading(m_damaged > 0 ? "no frame can be decoded" : "contains no frame");
 }
@@ -69,7 +69,7 @@ void MediaReader::Open(const InputOptions& options) {
     if (error < 0) FailReading("cannot be read: no known stream", error);
 }
 
-// A signal ends the waiting for input too.
+// A signal also ends the wait for input.
 void MediaReader::FailReading(const std::string& text, int error) const {
     ThrowIfNoMemory(error);
     if (Interrupts() > 0) throw Failure(kExitInterrupted, "interrupted; nothing was written");
@@ -84,7 +84,7 @@ void MediaReader::OpenDecoder() {
     m_decoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
     int error = avcodec_parameters_to_context(m_decoder.get(), m_stream->codecpar);
     m_decoder->pkt_timebase = m_stream->time_base;
-    m_decoder->thread_count = 0;  // as many as the machine has; the decoded frames do not depend on it
+    m_decoder->thread_count = 0;  // one per processor; the decoded frames do not depend on it
     if (error >= 0) error = avcodec_open2(m_decoder.get(), codec, nullptr);
     if (error < 0) FailReading("cannot be decoded: " + AvText(error), error);
 }
@@ -97,8 +97,7 @@ std::vector<std::int64_t> MediaReader::FrameTimes(const InputOptions& options) {
     reader.OpenDecoder();
     AVFormatContext& container = *reader.m_container;
     const std::string format = container.iformat->name;
-    if (format == "image2" ||
-        format == "rawvideo") {  // a tick for each, and too large to be read for nothing
+    if (format == "image2" || format == "rawvideo") {  // one tick per frame, and too large to read twice
         std::vector<std::int64_t> ticks(static_cast<std::size_t>(reader.FrameCountGuess()));
         std::iota(ticks.begin(), ticks.end(), std::int64_t{0});
         return ticks;
@@ -153,7 +152,7 @@ std::string MediaReader::BreakOffAt(int error) const {
     AVIOContext* const file = m_container->pb;
     if (!file) return {};
     if (file->error < 0) return "breaks off: " + AvText(file->error);
-    // This format has nothing behind its frames.
+    // This format has nothing after its frames.
     const bool isY4m = std::strcmp(m_container->iformat->name, "yuv4mpegpipe") == 0;
     if (m_isLastPartial || (isY4m && m_packetsEnd > 0 && avio_tell(file) > m_packetsEnd))
         return "ends inside a frame";
@@ -168,7 +167,7 @@ std::string MediaReader::BreakOffAt(int error) const {
 }
 
 double MediaReader::MissingSeconds() const {
-    constexpr double kTolerance = 0.5;  // headers round, and streams end unevenly
+    constexpr double kTolerance = 0.5;  // headers round, and streams do not end together
     const AVFormatContext& container = *m_container;
     const bool isTold =
         container.duration > 0 && container.duration_estimation_method == AVFMT_DURATION_FROM_STREAM;
@@ -201,7 +200,7 @@ void MediaReader::TakeFrames() {
         }
         std::int64_t pts = frame->best_effort_timestamp;
         if (pts == AV_NOPTS_VALUE || (m_lastPts != AV_NOPTS_VALUE && pts <= m_lastPts)) {
-            // No time, or time that stands still: one frame on by the rate.
+            // The time is missing or does not advance: go one frame on by the rate.
             const AVRational duration = av_inv_q(FrameRateGuess());
             const std::int64_t step = av_rescale_q(1, duration, m_stream->time_base);
             pts = m_lastPts == AV_NOPTS_VALUE ? 0 : m_lastPts + std::max<std::int64_t>(step, 1);
@@ -218,7 +217,7 @@ void MediaReader::SeekBefore(double seconds) {
 }
 
 MediaReader::Landing MediaReader::SeekToFrame(std::int64_t pts) {
-    // Streams without an index are searched by other times than those of presentation.
+    // Streams without an index are not searched by presentation time.
     for (const double early : {0.0, 1.0, 5.0}) {
         const auto ticks = static_cast<std::int64_t>(early / av_q2d(m_stream->time_base));
         if (!Jump(std::max(pts - ticks, m_firstFrame->pts))) return Landing::kStayed;
@@ -261,8 +260,8 @@ const AVFrame* MediaReader::Peek() {
 double MediaReader::SecondsOf(std::int64_t pts) const {
     const AVRational base = m_stream->time_base;
     const double seconds = static_cast<double>(pts - m_firstFrame->pts) * base.num / base.den;
-    // Some containers count whole milliseconds. A time that is a frame's but for that rounding is the frame's:
-    // else neighbouring frames would share a frame number, and with it their damage.
+    // Some containers count whole milliseconds. Undo that rounding where it explains the difference:
+    // otherwise neighbouring frames would share a frame number, and with it their damage.
     const AVRational rate = FrameRateGuess();
     const double whole = std::round(seconds * rate.num / rate.den) * rate.den / rate.num;
     const double rounding = 0.51 * base.num / base.den;

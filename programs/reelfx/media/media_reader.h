@@ -35,27 +35,28 @@ class MediaReader {
     // no frame.
     explicit MediaReader(const InputOptions& options);
 
-    // The times of the input's frames in order, in the picture's time base, as its packets carry them. Only
-    // their count means something where two have the same time or one has none. Reads through the input, but for
-    // image sequences, without decoding it. Throws Failure (kExitInput), also for an input that can be read only once.
+    // The times of the input's frames in order, in the picture's time base, as its packets give them. If two
+    // have the same time or one has none, only their count is meaningful. Reads the whole input without
+    // decoding it, except for image sequences. Throws Failure (kExitInput), also for an input that can be
+    // read only once.
     static std::vector<std::int64_t> FrameTimes(const InputOptions& options);
 
     Item Next();
 
-    // Goes on reading somewhere before `seconds` if the input can jump; else from where it is. The caller
-    // skips what comes too early.
+    // Continues reading somewhere before `seconds` if the input can jump, otherwise from the current
+    // position. The caller skips frames that are too early.
     void SeekBefore(double seconds);
     enum class Landing {
         kStayed,     // the input cannot jump
         kBefore,     // at the frame or one before it
-        kElsewhere,  // the input jumps badly
+        kElsewhere,  // the jump went elsewhere
     };
-    // Jumps to the frame of the time `pts`, in the picture's time base, or not far before it.
+    // Jumps to the frame at time `pts`, in the picture's time base, or to a little before it.
     Landing SeekToFrame(std::int64_t pts);
-    // Back to the first frame, by opening the input anew. Throws Failure (kExitInput).
+    // Goes back to the first frame by reopening the input. Throws Failure (kExitInput).
     void Rewind();
 
-    // The picture is not decoded any more; packets of other streams still come.
+    // Stops decoding the picture; packets of other streams still come.
     void StopPicture() { m_pictureStopped = true; }
 
     [[nodiscard]] AVFormatContext& Container() const { return *m_container; }
@@ -63,17 +64,19 @@ class MediaReader {
     // Size, pixel format and colours are those of the first frame.
     [[nodiscard]] const AVFrame& FirstFrame() const { return *m_firstFrame; }
     [[nodiscard]] double SecondsOf(std::int64_t pts) const;
-    // Time of a packet of any stream, for cutting; nothing when it carries none.
+    // The time of a packet of any stream, for cutting; nothing if it has none.
     [[nodiscard]] std::optional<double> SecondsOf(const AVPacket& packet) const;
     [[nodiscard]] AVRational FrameRateGuess() const;
-    // Frames in the clip as far as the container tells; 0 when it does not.
+    // The number of frames according to the container; 0 if unknown.
     [[nodiscard]] std::int64_t FrameCountGuess() const;
     [[nodiscard]] const std::string& Name() const { return m_name; }
-    // Packets that could not be decoded and were left out.
+    // The number of packets that could not be decoded and were skipped.
     [[nodiscard]] std::int64_t DamagedPackets() const { return m_damaged; }
-    // Seconds that the container promises but does not hold; 0 as far as it is known to be whole.
+    // Seconds that are missing compared with the length in the container's header; 0 if nothing is known to
+    // be missing.
     [[nodiscard]] double MissingSeconds() const;
-    // Why reading ended before the clip did: the file is cut off or went away. Empty when it is whole as far as known.
+    // Why reading stopped early: the file is cut off or was removed. Empty if the clip is complete as far as
+    // known.
     [[nodiscard]] const std::string& BreakOff() const { return m_breakOff; }
 
   private:
@@ -86,12 +89,12 @@ class MediaReader {
 
     void Open(const InputOptions& options);
     bool Jump(std::int64_t pts);
-    // The next frame, which stays the next one; null at the end.
+    // Looks at the next frame without consuming it; null at the end.
     const AVFrame* Peek();
     [[noreturn]] void FailReading(const std::string& text, int error = 0) const;
     [[nodiscard]] std::string BreakOffAt(int error) const;
     void OpenDecoder();
-    void ReadMore();  // moves at least one packet on
+    void ReadMore();  // advances by at least one packet
     void Decode(const AVPacket* packet);
     void TakeFrames();
 
@@ -106,8 +109,8 @@ class MediaReader {
     FramePtr m_firstFrame;
     std::int64_t m_lastPts = AV_NOPTS_VALUE;
     std::int64_t m_damaged = 0;
-    std::int64_t m_packetsEnd = 0;  // in the file: behind the last packet
-    double m_secondsEnd = 0.0;      // by the container's clock: of the last packet
+    std::int64_t m_packetsEnd = 0;  // position in the file after the last packet
+    double m_secondsEnd = 0.0;      // end of the last packet, in the container's time
     bool m_isLastPartial = false;
     bool m_pictureStopped = false;
     bool m_ended = false;

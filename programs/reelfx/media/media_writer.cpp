@@ -12,8 +12,7 @@ extern "C" {
 namespace velmora::hosts {
 namespace {
 
-// Image files are opened and closed one by one inside the container's code, which overlooks an error of the
-// closing (a full disk).
+// The container code opens and closes image files one by one and ignores errors when closing (a full disk).
 int CloseAndRemember(AVFormatContext* container, AVIOContext* file) {
     const int error = avio_close(file);
     int& remembered = *static_cast<int*>(container->opaque);
@@ -56,7 +55,7 @@ MediaWriter::MediaWriter(const OutputOptions& options, const std::string& addres
     av_dict_copy(&m_container->metadata, source.Container().metadata, 0);
     AddPicture(options);
     if (withSound && format.audio_codec != AV_CODEC_ID_NONE) AddOtherStreams();
-    // A still picture's name is no pattern: there is room for one frame.
+    // The name of a still picture is not a pattern: it holds one frame.
     char name[4096];
     m_holdsOnePicture = std::strcmp(format.name, "image2") == 0 &&
                         av_get_frame_filename(name, sizeof name, address.c_str(), 1) < 0;
@@ -105,7 +104,7 @@ void MediaWriter::SetUpEncoder(const OutputOptions& options, const AVCodec& code
             codec.supported_framerates[av_find_nearest_q_idx(encoder.framerate, codec.supported_framerates)];
     }
     if (codec.id == AV_CODEC_ID_MPEG4) {
-        // The codec counts in at most 65535 parts of a second.
+        // The codec divides a second into at most 65535 parts.
         av_reduce(&encoder.framerate.num, &encoder.framerate.den, encoder.framerate.num,
                   encoder.framerate.den, 65535);
     }
@@ -118,7 +117,7 @@ void MediaWriter::SetUpEncoder(const OutputOptions& options, const AVCodec& code
         encoder.field_order = first.top_field_first != 0 ? AV_FIELD_TT : AV_FIELD_BB;
     }
     if ((m_container->oformat->flags & AVFMT_GLOBALHEADER) != 0) encoder.flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
-    // Full-range YCbCr in still pictures and YUV4MPEG2's rarer formats.
+    // For full-range YCbCr in still pictures and for YUV4MPEG2's rarer formats.
     encoder.strict_std_compliance = FF_COMPLIANCE_UNOFFICIAL;
     SetQuality(options, codec, encoder);
 }
@@ -133,7 +132,7 @@ void MediaWriter::DescribeColours(AVCodecContext& encoder) const {
         encoder.colorspace = AVCOL_SPC_RGB;
         encoder.color_range = AVCOL_RANGE_JPEG;
     } else if (fromRgb) {
-        // Nothing to keep: say what is done, so that no player has to guess.
+        // There are no tags to keep: write the values in use, so that no player has to guess.
         encoder.colorspace = EffectiveMatrix(AVCOL_SPC_UNSPECIFIED, first.width, first.height);
         encoder.color_range = AVCOL_RANGE_MPEG;
     } else {
@@ -240,7 +239,7 @@ void MediaWriter::WriteFrame(FramePtr frame) {
     if (m_holdsOnePicture && m_lastPts != AV_NOPTS_VALUE) FailOnePicture();
     const AVRational base = m_source.Picture().time_base;
     frame->pts = av_rescale_q(frame->pts - m_origin, base, m_encoder->time_base);
-    // A source of uneven times may put two frames on one tick of a coarser base.
+    // With a variable frame rate, two frames may fall on the same tick of a coarser time base.
     if (m_lastPts != AV_NOPTS_VALUE && frame->pts <= m_lastPts) frame->pts = m_lastPts + 1;
     m_lastPts = frame->pts;
     m_durations[frame->pts] = av_rescale_q(frame->pkt_duration, base, m_encoder->time_base);

@@ -1,6 +1,6 @@
-// Writes a clip: pictures through an encoder, the source's other streams as they are where the container takes
-// them, else sound through another codec. Rate, times, shape of pixels, colours, rotation, names and dates are
-// the source's.
+// Writes a clip: encodes the picture and copies the source's other streams if the container supports them;
+// otherwise sound is encoded with another codec. Rate, times, pixel shape, colours, rotation, names and dates
+// are those of the source.
 #pragma once
 
 #include <map>
@@ -16,21 +16,21 @@ namespace velmora::hosts {
 
 class MediaWriter {
   public:
-    // `address` is what to open (OutputPlace). Throws Failure: kExitUsage for options that do not fit, else
+    // `address` is what to open (OutputPlace). Throws Failure: kExitUsage for unsuitable options, otherwise
     // kExitOutput. `source` must outlive the writer.
     MediaWriter(const OutputOptions& options, const std::string& address, const MediaReader& source,
                 bool withSound);
     MediaWriter(const MediaWriter&) = delete;
     MediaWriter& operator=(const MediaWriter&) = delete;
 
-    // The number of the first file where the output is a pattern of images; 1 if not called.
+    // The number of the first file if the output is an image pattern; 1 if not called.
     void NumberImagesFrom(std::int64_t number) { m_options.Set("start_number", std::to_string(number)); }
-    // Checks what Begin and the frames would, as far as it shows without writing: that the container takes the
-    // streams, and that there is room for `frames` frames (0: not known). Nothing can be written afterwards.
+    // Checks, without writing, what can be checked: that the container supports the streams and can hold
+    // `frames` frames (0: unknown). Nothing can be written afterwards.
     void Rehearse(std::int64_t frames);
     // "out.mp4: mp4, libx264 yuv420p, audio aac (copied)"
     [[nodiscard]] std::string Description() const;
-    // Opens the output and writes what stands before the frames.
+    // Opens the output and writes its header.
     void Begin();
 
     // The source's time that becomes 0 in the output, in the time base of its picture. Before the first
@@ -40,12 +40,12 @@ class MediaWriter {
     // A frame with planes of its own for the pixels of `source`'s result. Safe to call from many threads.
     [[nodiscard]] FramePtr NewResult(const AVFrame& source) const;
 
-    // True when the encoder takes the source's own samples.
+    // True when the encoder accepts the source's own samples.
     [[nodiscard]] bool TakesAsItIs(const AVFrame& source) const;
 
     void WriteFrame(FramePtr frame);           // times as in the source's picture
     void WritePacket(const AVPacket& packet);  // of another stream of the source
-    // Completes the file. Without it the file is broken.
+    // Completes the file. Without this call the file is damaged.
     void Finish();
 
   private:
@@ -62,7 +62,7 @@ class MediaWriter {
     void DescribeColours(AVCodecContext& encoder) const;
     void AddOtherStreams();
     void AddOtherStream(const AVStream& source);
-    void Encode(const AVFrame* frame);  // null: no more
+    void Encode(const AVFrame* frame);  // null: flush
     void Mux(AVPacket& packet, const AVStream& stream, AVRational timeBase);
     [[noreturn]] void Fail(int error) const;
     [[noreturn]] void FailOnePicture() const;
@@ -77,7 +77,7 @@ class MediaWriter {
     AvOptions m_options;                  // of the container
     std::int64_t m_origin;
     bool m_holdsOnePicture = false;
-    // By time, of the frames inside the encoder, which hands on times only.
+    // By time, for the frames inside the encoder, which passes on only their times.
     std::map<std::int64_t, std::int64_t> m_durations;
     std::int64_t m_lastPts = AV_NOPTS_VALUE;
 };

@@ -1,5 +1,6 @@
-// Cameras that are held upright or upside down store lying pictures and say how players have to turn them.
-// Effects work on the picture as it is seen: scratches run from top to bottom for the viewer.
+// Cameras held in another position store the picture as it comes from the sensor, with a tag that says how
+// players must rotate it. Effects are applied to the picture as it is seen: scratches run from top to bottom
+// for the viewer.
 #pragma once
 
 #include "programs/reelfx/media/av_handles.h"
@@ -7,10 +8,10 @@
 
 namespace velmora::hosts {
 
-// By how many quarters of a turn, clockwise, players show the stream's picture turned: 0 to 3.
+// The number of clockwise quarter turns, 0 to 3, by which players rotate the stream's picture.
 int QuarterTurnsOf(const AVStream& stream);
 
-// `to` becomes `from` turned clockwise.
+// Rotates `from` clockwise into `to`.
 void TurnPicture(const BgraPicture& from, int quarterTurns, BgraPicture& to);
 
 }  // namespace velmora::hosts

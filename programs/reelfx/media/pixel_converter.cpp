@@ -10,7 +10,7 @@ extern "C" {
 namespace velmora::hosts {
 namespace {
 
-// Every digit the converter has: no dithering, no shortcuts by lines or halves of the chroma.
+// The converter's full precision: no dithering, and no shortcuts in chroma.
 constexpr int kFlags =
     SWS_BICUBIC | SWS_FULL_CHR_H_INT | SWS_FULL_CHR_H_INP | SWS_ACCURATE_RND | SWS_BITEXACT;
 
@@ -18,7 +18,7 @@ bool IsFullRange(AVPixelFormat format, AVColorRange range) {
     return IsRgb(format) || range == AVCOL_RANGE_JPEG;
 }
 
-// 1/256 of a luma sample, as the converter counts; it guesses where the stream does not tell.
+// In the converter's unit, 1/256 of a luma sample; it guesses if the stream has no tag.
 void SetChromaPosition(SwsContext* context, const char* horizontal, const char* vertical,
                        AVPixelFormat format, AVChromaLocation location) {
     const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);

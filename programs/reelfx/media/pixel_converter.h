@@ -1,5 +1,5 @@
-// Decoded frames to BGRA and back, with the frame's own matrix and range both ways and the same chroma
-// positions, so that an untouched picture returns as it came. One converter for each thread.
+// Converts decoded frames to BGRA and back. Both ways use the frame's own matrix, range and chroma position,
+// so that an unchanged picture comes back as it was. One converter per thread.
 #pragma once
 
 #include "programs/reelfx/media/av_handles.h"
@@ -7,14 +7,14 @@
 
 namespace velmora::hosts {
 
-// Where a stream does not tell its matrix, players assume BT.709 for high definition and BT.601 below.
+// If a stream has no matrix tag, players assume BT.709 for high definition and BT.601 below.
 AVColorSpace EffectiveMatrix(AVColorSpace space, int width, int height);
 
 bool IsRgb(AVPixelFormat format);
 
 class PixelConverter {
   public:
-    // Fills `picture`, whose size is kept: a frame of another size is scaled to it.
+    // Fills `picture` and keeps its size: a frame of another size is scaled.
     void ToBgra(const AVFrame& frame, BgraPicture& picture);
 
     // Fills the frame's planes; its size, format, range, matrix and chroma position are set by the caller.

@@ -67,7 +67,7 @@ SoundTranscoder::~SoundTranscoder() {
 }
 
 void SoundTranscoder::Send(const AVPacket* packet, const Sink& sink) {
-    // A damaged packet is a gap in the sound, no reason to stop.
+    // A damaged packet leaves a gap in the sound; that is no reason to stop.
     avcodec_send_packet(m_decoder.get(), packet);
     TakeDecoded(sink);
     if (packet) return;
@@ -97,7 +97,7 @@ void SoundTranscoder::Resample(AVFrame& frame) {
     converted->format = m_encoder->sample_fmt;
     converted->sample_rate = m_encoder->sample_rate;
     av_channel_layout_copy(&converted->ch_layout, &m_encoder->ch_layout);
-    // The first frame, and any that differs from the one before, tells what there is to convert.
+    // Converters are set up for the first frame and for any frame whose format differs from the one before.
     int error = swr_convert_frame(m_resampler.get(), converted.get(), &frame);
     if (error == AVERROR_INPUT_CHANGED) {
         swr_close(m_resampler.get());

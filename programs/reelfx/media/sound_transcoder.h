@@ -1,5 +1,5 @@
-// Turns the sound of one source stream into another codec, where the output's container does not take the
-// source's own.
+// Encodes the sound of a source stream with another codec when the output's container does not support its
+// own.
 #pragma once
 
 #include <functional>
@@ -22,7 +22,7 @@ class SoundTranscoder {
 
     [[nodiscard]] const AVCodecContext& Encoder() const { return *m_encoder; }
 
-    // `packet` null: the stream ends, all that is left goes to the sink.
+    // A null `packet` ends the stream: the rest goes to the sink.
     void Send(const AVPacket* packet, const Sink& sink);
 
   private:

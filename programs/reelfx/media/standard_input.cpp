@@ -17,7 +17,7 @@ namespace {
 
 constexpr int kBufferBytes = 1 << 16;
 constexpr int kPatience =
-    100;  // milliseconds between two looks at the interrupts: any thread may have got the signal
+    100;  // milliseconds between checks for interrupts, because any thread may receive the signal
 
 int Read(void*, std::uint8_t* buffer, int size) {
     for (;;) {
@@ -34,7 +34,7 @@ int Read(void*, std::uint8_t* buffer, int size) {
 }  // namespace
 
 void CloseInputStream::operator()(AVIOContext* stream) const {
-    av_freep(static_cast<void*>(&stream->buffer));  // the library may have put another in its place
+    av_freep(static_cast<void*>(&stream->buffer));  // the library may have replaced it
     avio_context_free(&stream);
 }
 

@@ -1,4 +1,4 @@
-// Standard input for the media libraries, read so that a signal ends the waiting for it.
+// Standard input for FFmpeg's libraries, read so that a signal ends the wait.
 #pragma once
 
 #include <memory>

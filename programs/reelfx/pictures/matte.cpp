@@ -8,7 +8,8 @@
 namespace velmora::hosts {
 namespace {
 
-// Evenly apart, around the middle, and within what scratches leave alone of the darkest and brightest values.
+// Evenly spaced around the middle, and away from the darkest and brightest values, which scratches change
+// differently.
 constexpr int kLow = 12, kMiddle = 128, kHigh = 244;
 
 std::uint8_t Byte(double value) {
@@ -17,12 +18,12 @@ std::uint8_t Byte(double value) {
 
 void ReadPixel(std::uint8_t* pixel) {
     const int low = pixel[0], middle = pixel[1], high = pixel[2];
-    // The straight line through the three values that is nearest to all.
+    // The best straight line through the three values.
     const double slope = static_cast<double>(high - low) / (kHigh - kLow);
     const std::uint8_t alpha = Byte(255.0 * (1.0 - slope));
     std::uint8_t grey = 0;
     if (alpha > 0) {
-        // With the alpha as it was rounded, right at the middle.
+        // With the rounded alpha, exact in the middle.
         const double share = alpha / 255.0;
         grey = Byte(((low + middle + high) / 3.0 - (1.0 - share) * kMiddle) / share);
     }

@@ -1,10 +1,10 @@
-// The damage of an effect as a picture of its own, for compositing in other programs: wear, spots and
-// scratches on transparent, with straight alpha (colours not multiplied by it), as editors and their file
-// formats expect it. Laid over the picture it gives the damaged picture.
+// The damage of an effect as a separate picture, for compositing in other programs: wear, spots and scratches
+// on a transparent background, with straight alpha (colours not multiplied by it), as editors and their file
+// formats expect. Laid over the picture, it gives the damaged picture.
 //
-// Each kind of damage makes of a channel's value v a value that is nearly a + b v, the same for all three
-// channels. So the effect draws on a flat picture whose channels are three levels, and from what becomes of
-// them follow opacity and grey of every pixel.
+// Each kind of damage turns a channel's value v into nearly a + b v, with the same a and b for all three
+// channels. So the effect is drawn on a flat picture whose channels have three different levels; the results
+// give the opacity and grey of every pixel.
 #pragma once
 
 #include "programs/reelfx/media/bgra_picture.h"
@@ -12,14 +12,14 @@
 
 namespace velmora::hosts {
 
-// Throws UsageError when the effect makes no damage, or one that a matte with one opacity for all channels
-// cannot hold.
+// Throws UsageError when the effect makes no damage, or damage that a matte with one opacity for all channels
+// cannot show.
 void CheckMatte(const EffectChoice& choice);
 
-// What the effect is to draw its damage on.
+// The picture on which the effect draws its damage.
 void FillMatteGround(BgraPicture& picture);
 
-// Turns a damaged ground into the matte, in place.
+// Turns the damaged picture into the matte, in place.
 void ReadMatte(BgraPicture& picture);
 
 }  // namespace velmora::hosts

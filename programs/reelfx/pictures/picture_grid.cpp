@@ -21,9 +21,9 @@ using ContextPtr = std::unique_ptr<cairo_t, CairoDelete>;
 
 constexpr double kPaper = 0.11;  // dark, so that it does not outshine the pictures
 constexpr double kInk = 0.87;
-constexpr int kMostPixels = 32767;  // of a side, that the drawing library takes
+constexpr int kMostPixels = 32767;  // per side, the limit of the drawing library
 
-// All lengths follow the cells' width, so that sheets of any size look alike.
+// All lengths are proportional to the cell width, so that sheets of any size look alike.
 struct Measures {
     double cellWidth, cellHeight, gap, fontSize, labelHeight, titleHeight;
     int columns, rows;
@@ -61,7 +61,7 @@ void DrawText(cairo_t* context, const std::string& text, double size, double x, 
 }
 
 void DrawPicture(cairo_t* context, const BgraPicture& picture, double x, double y, const Measures& measures) {
-    // The library takes writable memory but does not write to a source.
+    // The library asks for writable memory but does not write to a source.
     auto* const bytes = const_cast<unsigned char*>(picture.Row(0));
     const SurfacePtr surface(cairo_image_surface_create_for_data(
         bytes, CAIRO_FORMAT_RGB24, picture.Width(), picture.Height(), static_cast<int>(picture.Stride())));

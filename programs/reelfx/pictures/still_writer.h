@@ -1,4 +1,4 @@
-// Writes one picture as PNG or JPEG, as its name ends.
+// Writes one picture as PNG or JPEG, according to its file name extension.
 #pragma once
 
 #include <string>
@@ -7,11 +7,11 @@
 
 namespace velmora::hosts {
 
-// Throws UsageError for another ending. Looked at before the work begins.
+// Throws UsageError for any other extension. Called before the work begins.
 void CheckStillName(const std::string& path);
 
 // Throws Failure (kExitOutput) when the file exists and may not be overwritten or cannot be written. Alpha is
-// left out.
+// dropped.
 void WriteStill(const BgraPicture& picture, const std::string& path, bool mayOverwrite);
 
 }  // namespace velmora::hosts

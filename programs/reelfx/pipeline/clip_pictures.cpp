@@ -13,7 +13,7 @@
 namespace velmora::hosts {
 namespace {
 
-// Commands that write stills write at their very end.
+// Commands that write stills write only at the very end.
 void FailIfInterrupted() {
     if (Interrupts() > 0) throw Failure(kExitInterrupted, "interrupted; nothing was written");
 }

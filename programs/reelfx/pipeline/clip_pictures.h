@@ -1,4 +1,4 @@
-// Frames of a clip as pictures that a viewer sees, for the commands that write stills.
+// Frames of a clip as the viewer sees them, for the commands that write stills.
 #pragma once
 
 #include <cstdint>
@@ -14,7 +14,7 @@ namespace velmora::hosts {
 // Which frame of the clip comes first; at most one of the two is set.
 struct FramePlace {
     std::optional<std::int64_t> frame = {};  // counted from 0
-    std::optional<double> start = {};        // seconds: the first frame that is not earlier
+    std::optional<double> start = {};        // seconds: the first frame at or after this time
 };
 
 struct ClipPicture {
@@ -25,12 +25,12 @@ struct ClipPicture {
 
 class ClipPictures {
   public:
-    // Without a place: `count` frames from the middle of the clip, or from its start where it can be read only once
-    // (standard input, a pipe). Throws Failure (kExitInput) as MediaReader does.
+    // Without a place: `count` frames from the middle of the clip, or from its start if it can be read only
+    // once (standard input, a pipe). Throws Failure (kExitInput) as MediaReader does.
     ClipPictures(const InputOptions& input, const FramePlace& place, std::int64_t count);
 
-    // The frames one after the other; nothing at the clip's end. Throws Failure: there is not even the first one
-    // (kExitInput), or the user interrupts.
+    // The frames in order; nothing at the end of the clip. Throws Failure if there is no frame at all
+    // (kExitInput) or the user interrupts.
     std::optional<ClipPicture> Next();
 
   private:
@@ -42,7 +42,7 @@ class ClipPictures {
     bool m_hasBegun = false;
 };
 
-// The picture through the effect. Throws Failure: the user interrupts, or kExitInternal.
+// Applies the effect to the picture. Throws Failure if the user interrupts, or with kExitInternal.
 BgraPicture Rendered(effects::EffectSession& session, ClipPicture& source);
 
 }  // namespace velmora::hosts

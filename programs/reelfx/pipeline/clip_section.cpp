@@ -46,7 +46,7 @@ ClipSection::ClipSection(MediaReader& reader, const SectionOptions& options)
 
 void ClipSection::JumpToFirstFrame() {
     const std::vector<std::int64_t>& times = m_options.frameTimes;
-    // A frame must be known by its time, and the first frame decoded is the first of these.
+    // Each frame must have a unique time, and the first decoded frame must be the first of these.
     const bool isClear = times.front() == m_reader.FirstFrame().pts &&
                          std::ranges::adjacent_find(times, std::ranges::equal_to()) == times.end();
     if (!isClear) return;
@@ -110,7 +110,7 @@ std::int64_t ClipSection::IndexOf(std::int64_t pts, double seconds) {
         const std::vector<std::int64_t>& times = m_options.frameTimes;
         return std::ranges::lower_bound(times, pts) - times.begin();
     }
-    // After a jump nobody has counted the frames.
+    // After a jump the frames before it have not been counted.
     if (m_hasJumped) return std::llround(seconds * av_q2d(m_reader.FrameRateGuess()));
     return m_nextIndex++;
 }

@@ -12,7 +12,7 @@
 
 namespace velmora::hosts {
 
-// One of the parts into which a clip is divided so that many machines render it.
+// One of the parts into which a clip is divided so that many machines can render it.
 struct FarmPart {
     std::int64_t part = 1;  // counted from 1
     std::int64_t parts = 1;
@@ -20,34 +20,35 @@ struct FarmPart {
 
 struct SectionOptions {
     std::int64_t firstFrame = 0;           // counted from 0
-    std::optional<std::int64_t> endFrame;  // the first that is left out
+    std::optional<std::int64_t> endFrame;  // the first frame after the section
     std::optional<double> start;           // seconds since the clip's first frame
     std::optional<double> duration;        // seconds
     std::optional<FarmPart> farm;          // instead of all of these; see ResolveFarm
-    // Of all frames of the clip in order, where they are known: with them a section that begins late jumps to
-    // its first frame instead of decoding those before it.
+    // The times of all frames of the clip in order, if known: a section that begins late then jumps to its
+    // first frame instead of decoding those before it.
     std::vector<std::int64_t> frameTimes = {};
 
     [[nodiscard]] bool IsWholeClip() const { return firstFrame == 0 && !endFrame && !start && !duration; }
 };
 
-// The frames of a part of a clip with frames at these times (MediaReader::FrameTimes). The parts lie side by
-// side, the last one goes to the clip's end. Throws UsageError when there are more parts than frames.
+// The frames of one part of a clip with frames at these times (MediaReader::FrameTimes). The parts are
+// adjacent, and the last one goes to the end of the clip. Throws UsageError when there are more parts than
+// frames.
 SectionOptions ResolveFarm(const FarmPart& farm, std::vector<std::int64_t> frameTimes);
 
 class ClipSection {
   public:
-    // `reader` stands at its start and outlives the section. Jumps ahead where a start is given.
+    // `reader` is at its start and outlives the section. Jumps ahead if a start is given.
     ClipSection(MediaReader& reader, const SectionOptions& options);
 
-    // Null at the section's end and when the user interrupts. Unless the section is the whole clip, the first
-    // item is a frame, and packets that lie before it are left out.
+    // Null at the end of the section and when the user interrupts. Unless the section is the whole clip, the
+    // first item is a frame, and earlier packets are dropped.
     PipelineItemPtr Next();
 
-    // Frames read so far, those before the section too; 0 after a jump.
+    // Frames read so far, including those before the section; 0 after a jump.
     [[nodiscard]] std::int64_t FramesCounted() const { return m_nextIndex; }
 
-    // Frames that will come, as far as can be told; 0 when it cannot.
+    // The expected number of frames; 0 if unknown.
     [[nodiscard]] static std::int64_t FrameCountGuess(const MediaReader& reader,
                                                       const SectionOptions& options);
 
@@ -65,7 +66,7 @@ class ClipSection {
     std::deque<PipelineItemPtr> m_ready;
     std::deque<PacketPtr> m_held;          // packets before the first frame
     std::optional<double> m_firstSeconds;  // of the first frame in the section
-    std::optional<double> m_endSeconds;    // set when the section's last frame has come
+    std::optional<double> m_endSeconds;    // set after the section's last frame
     std::int64_t m_nextIndex = 0;
     bool m_hasJumped = false;      // by time
     bool m_isByFrameTime = false;  // has jumped to a frame

@@ -11,7 +11,7 @@ FramePipeline::FramePipeline(Source source, std::vector<Worker> workers)
     try {
         Start(std::move(source), workers);
     } catch (...) {
-        Stop();  // the system has no more threads to give
+        Stop();  // the system has no more threads
         throw;
     }
 }
@@ -86,7 +86,7 @@ void FramePipeline::Work(const Worker& worker) {
             return m_isStopping || slot || m_isFilled;
         });
         if (m_isStopping || !slot) return;
-        slot->stage = Stage::kInWork;  // stays in the queue until it is done: the pointer stays valid
+        slot->stage = Stage::kInWork;  // it stays in the queue until it is done, so the pointer stays valid
         lock.unlock();
         try {
             worker(*slot->item);

@@ -1,5 +1,5 @@
-// Frames through several workers at once, handed out in the order in which they came. What a worker makes of
-// a frame must depend on the frame alone; then the result does not depend on the number of workers.
+// Runs frames through several workers at once and returns them in their original order. A worker's result
+// must depend only on the frame; then it does not depend on the number of workers.
 #pragma once
 
 #include <condition_variable>
@@ -17,13 +17,13 @@
 
 namespace velmora::hosts {
 
-// A frame on its way, or a packet of another stream that keeps its place between the frames.
+// A frame in the pipeline, or a packet of another stream that keeps its place between the frames.
 struct PipelineItem {
-    FramePtr frame;          // source; the worker puts the result in its place
-    PacketPtr packet;        // set: nothing to work on
+    FramePtr frame;          // the source; the worker replaces it with the result
+    PacketPtr packet;        // set: there is nothing to work on
     std::int64_t index = 0;  // of the frame in the clip
     double seconds = 0.0;    // since the clip's first frame
-    std::string digest;      // when asked for
+    std::string digest;      // if requested
 };
 using PipelineItemPtr = std::unique_ptr<PipelineItem>;
 
@@ -37,7 +37,8 @@ class FramePipeline {
     FramePipeline(const FramePipeline&) = delete;
     FramePipeline& operator=(const FramePipeline&) = delete;
 
-    // The next item, finished; null after the last. Rethrows what the source or a worker threw, in its turn.
+    // The next finished item; null after the last. Rethrows what the source or a worker threw, at the item's
+    // turn.
     PipelineItemPtr Next();
 
   private:
@@ -60,7 +61,7 @@ class FramePipeline {
     std::size_t m_capacity;
     bool m_isStopping = false;
     bool m_isFilled = false;         // the source has ended
-    std::exception_ptr m_fillError;  // with this, behind the last item
+    std::exception_ptr m_fillError;  // rethrown after the last item
     std::vector<std::thread> m_threads;
 };
 

@@ -30,8 +30,8 @@ void FrameWorker::Work(PipelineItem& item) {
         item.digest = FrameDigest(result.Row(0), result.Width(), result.Height(), result.Stride());
     }
     if (!m_job.writer) return;
-    // An untouched frame keeps its own samples, also those that 8-bit RGB cannot hold: more than 8 bits, and
-    // black below black.
+    // An unchanged frame keeps its own samples, including those that 8-bit RGB cannot hold: more than 8 bits,
+    // and values below black.
     if (!m_job.isMatte && &result != &m_source && m_job.writer->TakesAsItIs(*item.frame) &&
         IsSame(m_source, result)) {
         return;

@@ -1,4 +1,5 @@
-// What one thread does with a frame: to BGRA, upright, through the effect, and back.
+// What one thread does with a frame: convert it to BGRA, turn it upright, apply the effect, and convert it
+// back.
 #pragma once
 
 #include <functional>
@@ -15,11 +16,11 @@ namespace velmora::hosts {
 class FrameWorker {
   public:
     struct Job {
-        const MediaWriter* writer = nullptr;  // null: no frames are wanted, only digests
+        const MediaWriter* writer = nullptr;  // null: only digests are wanted
         FrameSize size = {};                  // of the source's frames
         int quarterTurns = 0;                 // see QuarterTurnsOf
         bool withDigest = false;
-        bool isMatte = false;  // the result is the damage alone, see matte.h
+        bool isMatte = false;  // the result is only the damage, see matte.h
     };
     FrameWorker(std::unique_ptr<effects::EffectSession> session, const Job& job);
 
@@ -28,7 +29,7 @@ class FrameWorker {
 
   private:
     BgraPicture& Result(const PipelineItem& item);
-    BgraPicture& Apply(double seconds);  // of m_source; the result, lying as the source does
+    BgraPicture& Apply(double seconds);  // the result for m_source, turned as the source is
 
     std::unique_ptr<effects::EffectSession> m_session;
     Job m_job;

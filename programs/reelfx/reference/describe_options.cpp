@@ -1,5 +1,5 @@
-// Prints the commands and options of reelfx as JSON, from the table that its parser uses: what the man page
-// and the shells' completion are written from.
+// Prints the commands and options of reelfx as JSON, from the table that its parser uses. The man page and
+// the shell completions are written from it.
 
 #include <CLI/CLI.hpp>
 #include <cstdio>
@@ -21,7 +21,7 @@ Json NamesOf(const CLI::Option& option) {
 
 Json JsonOf(const CLI::Option& option) {
     const bool takesValue = option.get_items_expected_max() > 0;
-    // Checks add themselves behind a colon: "N:INT in [0 - 256]".
+    // Checks append their text after a colon: "N:INT in [0 - 256]".
     std::string type = option.get_type_name();
     for (const char* check : {":INT", ":NONNEGATIVE"}) type = type.substr(0, type.find(check));
     return {{"names", NamesOf(option)},

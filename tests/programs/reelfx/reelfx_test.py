@@ -4,12 +4,13 @@ import json
 import math
 import os
 import re
+import shutil
 import sys
 import unittest
 from pathlib import Path
 
 sys.path.insert(0, str(Path(__file__).resolve().parents[2] / "common"))
-from clip import CLIP, Clips, ffmpeg, frame_digests, frame_times, luma_psnr, probe, reelfx, run  # noqa: E402
+from clip import CLIP, Clips, REELFX, ffmpeg, frame_digests, frame_times, luma_psnr, probe, reelfx, run  # noqa: E402
 
 CAMERA = ("--effect", "Film Camera")
 TRAIN = (*CAMERA, "--preset", "Train Ride")
@@ -91,6 +92,23 @@ class Listing(ReelfxTest):
         notes = " ".join(json.loads(reelfx("info", strange, "--json").stdout)["notes"])
         for word in ("10 bits", "no colour matrix tagged; assuming smpte170m", "high dynamic range"):
             self.assertIn(word, notes)
+
+
+class Studio(ReelfxTest):
+    def test_the_page_beside_the_program_is_opened(self):
+        page = self.out / "share/velmora-reel-effects/reel.html"
+        program, opener = self.out / "bin/reelfx", self.out / "bin/xdg-open"
+        for place in (page.parent, program.parent):
+            place.mkdir(parents=True)
+        shutil.copy(REELFX, program)
+        self.assertEqual(3, run(program, "studio").returncode, "there is no page yet")
+        page.touch()
+        environment = dict(os.environ, PATH=str(program.parent))
+        self.assertEqual(4, run(program, "studio", env=environment).returncode, "nothing opens it")
+        opener.write_text(f'#!/bin/sh\necho "$1" > {self.out}/opened\n')
+        opener.chmod(0o755)
+        self.assertEqual(0, run(program, "studio", env=environment).returncode)
+        self.assertEqual(str(page), (self.out / "opened").read_text().strip())
 
 
 class Telling(ReelfxTest):

@@ -1,4 +1,4 @@
-#include "programs/reelhost/effect_run.h"
+#include "programs/common/effect_run.h"
 
 #include <cstring>
 #include <stdexcept>

@@ -1,4 +1,4 @@
-#include "programs/reelhost/effect_library.h"
+#include "programs/common/effect_library.h"
 
 #include <stdexcept>
 
@@ -7,15 +7,20 @@
 namespace velmora::hosts {
 namespace {
 
+// A library that describes for ever is not followed.
+constexpr std::uint32_t kMostParams = kPresetCellCapacity, kMostPresets = 1000, kMostEffects = 100;
+
 EffectInfo Describe(IVideoEffect& effect) {
     EffectInfo info;
     info.name = effect.GetName();
     ParamDescriptor descriptor{};
-    for (std::uint32_t i = 0; effect.GetParamInfo(i, &descriptor); ++i) {
+    for (std::uint32_t i = 0; i < kMostParams && effect.GetParamInfo(i, &descriptor); ++i) {
         info.params.push_back(ReadDescriptor(descriptor));
         descriptor = {};
     }
-    for (std::uint32_t i = 0; const char* name = effect.GetPresetName(i); ++i) {
+    for (std::uint32_t i = 0; i < kMostPresets; ++i) {
+        const char* const name = effect.GetPresetName(i);
+        if (name == nullptr) break;
         info.presets.emplace_back(name);
     }
     return info;
@@ -23,9 +28,11 @@ EffectInfo Describe(IVideoEffect& effect) {
 
 }  // namespace
 
-EffectLibrary::EffectLibrary(const std::string& path) {
+EffectLibrary::EffectLibrary(const std::string& path) : EffectLibrary(LibraryFile(path)) {}
+
+EffectLibrary::EffectLibrary(const std::wstring& file) {
     m_tickBefore = GetTickCount();
-    m_module.reset(LoadLibraryW(LibraryFile(path).c_str()));
+    m_module.reset(LoadLibraryW(file.c_str()));
     m_tickAfter = GetTickCount();
     if (!m_module) {
         throw std::runtime_error("VMReelEffects.dll cannot be loaded, system error " +
@@ -35,7 +42,9 @@ EffectLibrary::EffectLibrary(const std::string& path) {
     if (!address) throw std::runtime_error("VMReelEffects.dll has no GetEffectsLibrary");
     m_library.reset(reinterpret_cast<GetEffectsLibraryFunction>(address)());
     if (!m_library) throw std::runtime_error("VMReelEffects.dll gives no library object");
-    for (std::uint32_t i = 0; const Reference<IVideoEffect> effect{m_library->CreateEffect(i)}; ++i) {
+    for (std::uint32_t i = 0; i < kMostEffects; ++i) {
+        const Reference<IVideoEffect> effect(m_library->CreateEffect(i));
+        if (!effect) break;
         m_effects.push_back(Describe(*effect));
     }
 }

@@ -6,7 +6,7 @@
 
 #include "text/number_text.h"
 #include "programs/common/settings.h"
-#include "programs/reelhost/effect_library.h"
+#include "programs/common/effect_library.h"
 #include "api/host_api.h"
 
 namespace velmora::hosts {

@@ -23,12 +23,15 @@ class EffectLibrary {
   public:
     // `path` empty: the DLL beside this program. Throws std::runtime_error when it cannot be loaded.
     explicit EffectLibrary(const std::string& path);
+    explicit EffectLibrary(const std::wstring& file);
 
     [[nodiscard]] const std::vector<EffectInfo>& Effects() const { return m_effects; }
     // Both throw std::runtime_error when the library gives none.
     [[nodiscard]] Reference<IVideoEffect> CreateEffect(std::uint32_t index) const;
 
     [[nodiscard]] Reference<IFrameProcessor> CreateFrameProcessor() const;
+
+    [[nodiscard]] IEffectLibrary& Object() const { return *m_library; }
 
     // Tick counts just before and just after loading: the library's random sequence began in between.
     [[nodiscard]] std::uint32_t TickBefore() const { return m_tickBefore; }

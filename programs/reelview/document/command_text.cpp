@@ -1,0 +1,35 @@
+#include "programs/reelview/document/command_text.h"
+
+#include "programs/common/settings.h"
+
+namespace velmora::reelview {
+namespace {
+
+// Quoted for the system's own shells: a quotation mark cannot stand in a file name there, nor in a parameter's.
+std::string Quoted(const std::string& text) {
+    return '"' + text + '"';
+}
+
+std::string OutputName(const std::string& input) {
+    const std::size_t name = input.find_last_of("\\/");
+    const std::size_t dot = input.find_last_of('.');
+    const bool hasExtension = dot != std::string::npos && (name == std::string::npos || dot > name);
+    if (!hasExtension) return input + "-film.mp4";
+    return input.substr(0, dot) + "-film" + input.substr(dot);
+}
+
+}  // namespace
+
+std::string CommandText(const std::string& input, const hosts::EffectInfo& effect, const Values& values) {
+    std::string line = "reelfx render " + Quoted(input) + ' ' + Quoted(OutputName(input)) + " --effect " +
+                       Quoted(effect.name);
+    const Values defaults = DefaultsOf(effect);
+    for (std::size_t i = 0; i < effect.params.size() && i < values.size(); ++i) {
+        const hosts::ParamInfo& param = effect.params[i];
+        if (!param.HoldsValue() || values[i].bits == defaults[i].bits) continue;
+        line += " --set " + Quoted(param.name + '=' + hosts::ShownValue(param, values[i]));
+    }
+    return line;
+}
+
+}  // namespace velmora::reelview

@@ -1,0 +1,33 @@
+// The files opened last, the newest first.
+#pragma once
+
+#include <algorithm>
+#include <cstddef>
+#include <string>
+#include <utility>
+#include <vector>
+
+namespace velmora::reelview {
+
+class RecentFiles {
+  public:
+    static constexpr std::size_t kCount = 8;
+
+    RecentFiles() = default;
+    explicit RecentFiles(std::vector<std::u16string> files) : m_files(std::move(files)) { Cut(); }
+
+    void Add(const std::u16string& file) {
+        Remove(file);
+        m_files.insert(m_files.begin(), file);
+        Cut();
+    }
+    void Remove(const std::u16string& file) { std::erase(m_files, file); }
+    [[nodiscard]] const std::vector<std::u16string>& Files() const { return m_files; }
+
+  private:
+    void Cut() { m_files.resize(std::min(m_files.size(), kCount)); }
+
+    std::vector<std::u16string> m_files;
+};
+
+}  // namespace velmora::reelview

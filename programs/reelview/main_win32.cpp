@@ -1,0 +1,68 @@
+// reelview: the library's effects on a picture or a film, with all their knobs.
+
+#include <windows.h>
+#include <commctrl.h>
+#include <shellapi.h>
+
+#include <exception>
+#include <memory>
+#include <vector>
+
+#include "programs/common/library_file.h"
+#include "programs/reelview/library/guarded_call_win32.h"
+#include "programs/reelview/base/com_win32.h"
+#include "programs/reelview/window/main_window_win32.h"
+#include "programs/reelview/base/text_keys.h"
+
+namespace velmora::reelview {
+namespace {
+
+std::vector<std::u16string> Arguments() {
+    std::vector<std::u16string> arguments;
+    int count = 0;
+    wchar_t** const words = CommandLineToArgvW(GetCommandLineW(), &count);
+    for (int i = 1; i < count; ++i) arguments.emplace_back(words[i], words[i] + lstrlenW(words[i]));
+    LocalFree(words);
+    return arguments;
+}
+
+// Without a library there are no texts but the English ones.
+int Complain(const char* key) {
+    const Texts texts(nullptr, "en");
+    MessageBoxW(nullptr, texts(key).c_str(), kProgramName, MB_OK | MB_ICONERROR);
+    return 1;
+}
+
+int Run(int show) {
+    INITCOMMONCONTROLSEX controls = {sizeof controls,
+                                     ICC_LISTVIEW_CLASSES | ICC_BAR_CLASSES | ICC_PROGRESS_CLASS};
+    InitCommonControlsEx(&controls);
+    const ComThread com(COINIT_APARTMENTTHREADED);
+    const ViewOptions options = ReadViewOptions(Arguments());
+    if (!options.isValid) return Complain("reelview [--library PATH] [--effect NAME] [--sequence] [FILE]");
+    std::unique_ptr<hosts::EffectLibrary> library;
+    auto load = [&] {
+        try {
+            const std::wstring file(options.library.begin(), options.library.end());
+            library = std::make_unique<hosts::EffectLibrary>(hosts::LibraryFile(file));
+        } catch (const std::exception&) {
+            library.reset();
+        }
+    };
+    const bool isSound = RunGuarded(load);
+    if (!isSound) return Complain(text::kLibraryFailed);
+    if (!library || library->Effects().empty()) return Complain("The effect library cannot be loaded.");
+    MainWindow(*library, options).Run(show);
+    auto unload = [&] { library.reset(); };
+    static_cast<void>(RunGuarded(unload));
+    return 0;
+}
+
+}  // namespace
+}  // namespace velmora::reelview
+
+int WINAPI wWinMain(HINSTANCE, HINSTANCE, LPWSTR, int show) {
+    const int result = velmora::reelview::Run(show);
+    // A library that failed may hold threads or locks; nothing of ours is left to do.
+    ExitProcess(static_cast<UINT>(result));
+}

@@ -1,0 +1,38 @@
+// How a knob's value follows the mouse and the keys. Values are normalised to 0..1; a round knob turns through 270
+// degrees, from the lower left over the top to the lower right.
+#pragma once
+
+#include <cstdint>
+
+namespace velmora::reelview {
+
+inline constexpr double kKnobSweepDegrees = 270.0;
+
+// Degrees clockwise from straight up: -135..135.
+[[nodiscard]] double KnobAngle(double value);
+
+enum class DragWay { kCircle, kVertical, kHorizontal };
+
+class KnobDrag {
+  public:
+    // The mouse's place is in pixels, from the knob's centre, y down. `travel` is how many pixels of a straight drag
+    // are the whole range, at least 1.
+    void Begin(DragWay way, double value, double x, double y, double travel);
+    // The value for the mouse's new place; a fine drag moves a tenth as far.
+    double Move(double x, double y, bool isFine);
+
+  private:
+    [[nodiscard]] double Way(double x, double y) const;
+
+    DragWay m_way = DragWay::kCircle;
+    double m_value = 0.0, m_x = 0.0, m_y = 0.0, m_travel = 1.0;
+};
+
+enum class KnobKey { kUp, kDown, kPageUp, kPageDown, kHome, kEnd };
+
+// Steps of a hundredth of the range, fine ones of a thousandth, pages of a tenth.
+[[nodiscard]] double AfterKey(double value, KnobKey key, bool isFine);
+// `notches` is positive away from the user.
+[[nodiscard]] double AfterWheel(double value, double notches, bool isFine);
+
+}  // namespace velmora::reelview

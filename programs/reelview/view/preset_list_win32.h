@@ -1,0 +1,48 @@
+// The built-in presets of an effect, each with a small picture of what it does. Windows only.
+#pragma once
+
+#include <windows.h>
+#include <commctrl.h>
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "programs/reelview/base/picture.h"
+#include "programs/reelview/base/theme_win32.h"
+
+namespace velmora::reelview {
+
+class PresetList {
+  public:
+    PresetList(HWND parent, int id, const Theme& theme, const std::wstring& name);
+    ~PresetList();
+    PresetList(const PresetList&) = delete;
+    PresetList& operator=(const PresetList&) = delete;
+
+    [[nodiscard]] HWND Window() const { return m_window; }
+    [[nodiscard]] HWND Label() const { return m_label; }
+    void ShowNames(const std::vector<std::string>& names);
+    // The largest size of a small picture.
+    [[nodiscard]] hosts::FrameSize PictureSize() const;
+    void ShowPicture(std::uint32_t preset, const Picture& picture);
+    // Nothing: none of them is what the controls show.
+    void Select(std::optional<std::uint32_t> preset);
+    // The preset that a notification of the list asks for.
+    [[nodiscard]] std::optional<std::uint32_t> ChosenBy(const NMHDR& notification) const;
+    void Restyle();
+    // The height that shows one row.
+    [[nodiscard]] int NaturalHeight() const;
+
+  private:
+    void MakePictures();
+    [[nodiscard]] HBITMAP BitmapOf(const Picture* picture) const;
+
+    const Theme& m_theme;
+    HWND m_label = nullptr, m_window = nullptr;
+    HIMAGELIST m_pictures = nullptr;
+    std::vector<std::string> m_names;
+    bool m_isShowing = false;
+};
+
+}  // namespace velmora::reelview

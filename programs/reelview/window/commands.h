@@ -1,0 +1,43 @@
+// Numbers of what menus and keys ask for.
+#pragma once
+
+namespace velmora::reelview {
+
+enum Command : int {
+    kCommandOpen = 100,
+    kCommandOpenSequence,
+    kCommandSaveFrame,
+    kCommandSaveClip,
+    kCommandLoadPreset,
+    kCommandSavePreset,
+    kCommandExit,
+    kCommandUndo,
+    kCommandRedo,
+    kCommandCopyFrame,
+    kCommandCopyCommand,
+    kCommandDefaults,
+    kCommandOptions,
+    kCommandAfter,
+    kCommandDivider,
+    kCommandSideBySide,
+    kCommandFit,
+    kCommandFull,
+    kCommandDouble,
+    kCommandPlay,
+    kCommandNextFrame,
+    kCommandPreviousFrame,
+    kCommandFirstFrame,
+    kCommandLastFrame,
+    kCommandLoop,
+    kCommandHelp,
+    kCommandEffectHelp,
+    kCommandAbout,
+    kCommandRecent = 160,  // and the next ones
+    kCommandRecentEnd = 170,
+    kControlEffect = 200,
+    kControlPresets,
+    kControlPicture,
+    kControlStatus,
+};
+
+}  // namespace velmora::reelview
