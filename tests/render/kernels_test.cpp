@@ -201,7 +201,7 @@ class CellsOf {
   public:
     enum class Fill { kRandom, kBlack, kWhite, kEither };
 
-    CellsOf(std::int32_t count, Fill fill, std::uint32_t seed) : m_count(count) {
+    CellsOf(std::int32_t count, Fill fill, std::uint32_t seed) {
         std::mt19937 numbers(seed);
         m_lanes.resize(static_cast<std::size_t>(count + 2 * kCellPad) * kCellLanes);
         for (std::size_t i = 0; i < m_lanes.size(); ++i) {
@@ -220,7 +220,6 @@ class CellsOf {
     }
 
   private:
-    std::int32_t m_count;
     std::vector<std::uint16_t> m_lanes;
 };
 
