@@ -99,9 +99,11 @@ inline Vec ShuffleBytes(Vec table, Vec indices) noexcept {
 inline Vec MulAddU8(Vec bytes, Vec signedBytes) noexcept {
     return _mm256_maddubs_epi16(bytes, signedBytes);
 }
+// The bytes of `a` where those of `sign` are negative, else those of `b`.
 inline Vec SelectBySign8(Vec sign, Vec a, Vec b) noexcept {
     return _mm256_blendv_epi8(b, a, sign);
 }
+// The same 16 bytes, at a multiple of 16, in each block.
 inline Vec RepeatBlock(const void* from) noexcept {
     return _mm256_broadcastsi128_si256(_mm_load_si128(static_cast<const __m128i*>(from)));
 }

@@ -25,6 +25,8 @@ namespace {
 #include "render/simd/rows.inc"
 #include "render/simd/wear.inc"
 #include "render/simd/tone_lines.inc"
+#include "render/simd/table_words.inc"
+#include "render/simd/mix_words.inc"
 #include "render/simd/tone_words.inc"
 #include "render/simd/glow.inc"
 #include "render/simd/ycbcr.inc"

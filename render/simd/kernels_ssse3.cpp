@@ -27,8 +27,9 @@ namespace {
 #include "render/simd/wear.inc"
 #include "render/simd/tone_lines.inc"
 #include "render/simd/channels.inc"
-#include "render/simd/table_shuffles.inc"
-#include "render/simd/tone_channels.inc"
+#include "render/simd/mix_channels.inc"
+#include "render/simd/table_words.inc"
+#include "render/simd/tone_words.inc"
 #include "render/simd/glow.inc"
 #include "render/simd/ycbcr.inc"
 

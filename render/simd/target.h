@@ -32,6 +32,8 @@
 #define VM_HAS_AVX512 VM_IS_X86
 
 #define VM_PRAGMA(text) _Pragma(#text)
+// For what keeps its state in registers only when it is inlined.
+#define VM_ALWAYS_INLINE __attribute__((always_inline)) inline
 // Before a loop whose steps depend on each other so that unrolling only costs registers.
 #if defined(__clang__)
 #define VM_DO_NOT_UNROLL VM_PRAGMA(clang loop unroll(disable))
