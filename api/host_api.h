@@ -353,6 +353,38 @@ class IEffectLibrary : public IUnknown {
 };
 
 // ---------------------------------------------------------------------------------------------------------
+// Bases for what a host implements. They answer everything with "no"; a host overrides what it can answer.
+
+// An object that lives as long as its owner, whoever counts: it ignores references and answers to no identifier.
+template <class Interface>
+class Uncounted : public Interface {
+  public:
+    Status VM_CALL QueryInterface(const Guid*, void** out) override {
+        if (out == nullptr) return kStatusFailure;
+        *out = nullptr;
+        return kStatusNoInterface;
+    }
+    std::uint32_t VM_CALL AddRef() override { return 1; }
+    std::uint32_t VM_CALL Release() override { return 1; }
+
+  protected:
+    ~Uncounted() = default;
+};
+
+// A host without a single value: override GetParamValue.
+class PlainHost : public Uncounted<IVideoHost> {
+  public:
+    bool VM_CALL GetParamValue(std::uint32_t, ValueCell*, std::uint32_t) override { return false; }
+    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) override { return false; }
+    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) override { return 0; }
+    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return false; }
+    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
+
+  protected:
+    ~PlainHost() = default;
+};
+
+// ---------------------------------------------------------------------------------------------------------
 // Exports of VMReelEffects.dll, undecorated names.
 
 // "GetEffectsLibrary": a new library object with one reference that belongs to the caller; null when memory

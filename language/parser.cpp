@@ -1,7 +1,6 @@
 #include "language/parser.h"
 
 #include <atomic>
-#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <ios>
@@ -10,6 +9,7 @@
 #include <string>
 #include <utility>
 
+#include "api/com_object.h"
 #include "language/copy_text.h"
 #include "language/language_table.h"
 
@@ -43,18 +43,15 @@ class Parser final : public LangXMLParser {
     Parser& operator=(const Parser&) = delete;
 
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override {
-        if (!out) return kStatusFailure;
-        *out = nullptr;
-        if (!iid || std::memcmp(iid, &kIidUnknown, sizeof(Guid)) != 0) return kStatusNoInterface;
-        *out = static_cast<IUnknown*>(this);
-        AddRef();
-        return kStatusOk;
+        const Status status = FindFace({{&kIidUnknown, static_cast<LangXMLParser*>(this)}}, iid, out);
+        if (status == kStatusOk) m_references.Add();
+        return status;
     }
 
-    std::uint32_t VM_CALL AddRef() override { return ++m_references; }
+    std::uint32_t VM_CALL AddRef() override { return m_references.Add(); }
 
     std::uint32_t VM_CALL Release() override {
-        const std::uint32_t left = --m_references;
+        const std::uint32_t left = m_references.Drop();
         if (left == 0) delete this;
         return left;
     }
@@ -94,7 +91,7 @@ class Parser final : public LangXMLParser {
   private:
     ~Parser() { --liveParsers; }
 
-    std::atomic<std::uint32_t> m_references{1};
+    ReferenceCount m_references;
     LanguageTable m_table;
 };
 

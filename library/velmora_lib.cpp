@@ -51,8 +51,7 @@ CRsVelmoraLib::CRsVelmoraLib() noexcept {
 
 CRsVelmoraLib::~CRsVelmoraLib() {
     support::WithdrawTextSource(static_cast<IEffectLibrary*>(this));
-    if (m_parser != nullptr) m_parser->Release();
-    m_parser = nullptr;
+    m_parser.Reset();  // its code lies in the module
     FreeLanguageModule();
 }
 
@@ -64,7 +63,7 @@ bool CRsVelmoraLib::FreeLanguageModule() noexcept {
 }
 
 bool CRsVelmoraLib::LoadLanguage(const char16_t* moduleName, const char16_t* fileName) noexcept {
-    if (m_parser != nullptr || moduleName == nullptr || fileName == nullptr) return false;
+    if (m_parser || moduleName == nullptr || fileName == nullptr) return false;
     if (m_languageModule != nullptr) {
         FreeLanguageModule();
         m_languageModule = nullptr;  // a module that asks to be kept is forgotten, not freed
@@ -74,8 +73,8 @@ bool CRsVelmoraLib::LoadLanguage(const char16_t* moduleName, const char16_t* fil
     const auto getParser =
         reinterpret_cast<GetLangXMLParserFunction>(support::FindExport(m_languageModule, "GetLangXMLParser"));
     if (getParser == nullptr) return false;
-    m_parser = getParser();
-    if (m_parser == nullptr) return false;
+    m_parser = Reference<LangXMLParser>::Adopt(getParser());
+    if (!m_parser) return false;
     const std::u16string path = BesideLibrary(fileName);
     return m_parser->Load(path.c_str()) || m_parser->Load(fileName);
 }
@@ -137,14 +136,14 @@ std::int32_t VM_CALL CRsVelmoraLib::LookUpText(std::intptr_t languageCode, std::
                                                std::intptr_t key, std::intptr_t fallback,
                                                std::intptr_t buffer, std::intptr_t capacity,
                                                std::intptr_t found) {
-    if (!m_hasLanguage || m_parser == nullptr) return 0;
+    if (!m_hasLanguage || !m_parser) return 0;
     const FloatGuard guard;
     return m_parser->LookUpText(languageCode, category, key, fallback, buffer, capacity, found);
 }
 
 std::int32_t VM_CALL CRsVelmoraLib::GetText(const char* languageCode, std::int32_t category, const char* key,
                                             char16_t* buffer, std::int32_t capacity) {
-    if (!m_hasLanguage || m_parser == nullptr) return 0;
+    if (!m_hasLanguage || !m_parser) return 0;
     const FloatGuard guard;
     return m_parser->GetText(languageCode, category, key, buffer, capacity);
 }

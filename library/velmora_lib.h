@@ -1,10 +1,11 @@
 // The library object: the one thing that a host gets from GetEffectsLibrary.
 #pragma once
 
-#include "language/lang_parser.h"
 #include "api/com_object.h"
 #include "api/host_api.h"
+#include "api/reference.h"
 #include "effects/process_state.h"
+#include "language/lang_parser.h"
 #include "platform/platform.h"
 
 namespace velmora {
@@ -41,7 +42,7 @@ class CRsVelmoraLib final : public DLLDependentObject, public IEffectLibrary, pu
     bool FreeLanguageModule() noexcept;
 
     ReferenceCount m_references;
-    LangXMLParser* m_parser = nullptr;
+    Reference<LangXMLParser> m_parser;
     support::ModuleHandle m_languageModule = nullptr;
     bool m_hasLanguage = false;
 };

@@ -13,20 +13,20 @@ namespace velmora::reelcheck {
 void CheckExports(CheckContext& context) {
     const Library library(context.libraryPath);
     Require(library.canUnload(), "a fresh library says that it must not be unloaded");
-    Owned<IEffectLibrary> first = library.Open(), second = library.Open();
+    Reference<IEffectLibrary> first = library.Open(), second = library.Open();
     Require(first != second, "two calls give one library object");
     Require(!library.canUnload(), "the library may be unloaded while an object lives");
-    first.reset();
+    first.Reset();
     Require(!library.canUnload(), "the library may be unloaded while a second object lives");
     Require(std::strlen(second->GetLibraryName()) > 0, "the library has no name");
     Require(second->GetShellServices() != nullptr, "the library has no shell services");
     for (std::uint32_t i = 0; i < kEffectCount; ++i) {
-        Require(Owned<IVideoEffect>(second->CreateEffect(i)) != nullptr, "an effect is missing");
+        Require(bool{Reference<IVideoEffect>::Adopt(second->CreateEffect(i))}, "an effect is missing");
     }
     for (const std::uint32_t index : {kEffectCount, 100u, 0x80000000u, 0xFFFFFFFFu}) {
         Require(second->CreateEffect(index) == nullptr, "there is an effect behind the last");
     }
-    second.reset();
+    second.Reset();
     Require(library.canUnload(), "the library may not be unloaded when its last object is gone");
 }
 
@@ -74,11 +74,9 @@ void CheckReferences(CheckContext& context) {
     CheckObject("frame processor", *library.Processor(), nullptr);
     CheckObject("preset saver", *library.Saver(), &kIidPresetSaver);
     for (std::uint32_t i = 0; i < kEffectCount; ++i) {
-        const Owned<IVideoEffect> effect = library.Effect(i);
+        const Reference<IVideoEffect> effect = library.Effect(i);
         CheckObject(effect->GetName(), *effect, &kIidVideoEffect);
-        void* face = nullptr;
-        Require(effect->QueryInterface(&kIidVideoHost, &face) == kStatusOk, "an effect has no host's face");
-        static_cast<IVideoHost*>(face)->Release();
+        Require(bool{QueryFor<IVideoHost>(*effect, kIidVideoHost)}, "an effect has no host's face");
     }
 }
 
@@ -88,7 +86,7 @@ void CheckNullArguments(CheckContext& context) {
     const FrameRecord record = frame.Record();
     const TimingRecord timing = {0, 0, 1.0};
     for (std::uint32_t i = 0; i < kEffectCount; ++i) {
-        const Owned<IVideoEffect> effect = library.Effect(i);
+        const Reference<IVideoEffect> effect = library.Effect(i);
         SetPlace("%s", effect->GetName());
         PlayingHost host;
         Require(!effect->GetParamInfo(0, nullptr), "describes a parameter into nothing");
@@ -104,7 +102,7 @@ void CheckNullArguments(CheckContext& context) {
                 "asks a host that there is not about a stranger");
     }
     SetPlace("frame processor");
-    const Owned<IFrameProcessor> processor = library.Processor();
+    const Reference<IFrameProcessor> processor = library.Processor();
     Require(!processor->ConvertYcbcrToBgra(nullptr, &record, 0) &&
                 !processor->ConvertYcbcrToBgra(&record, nullptr, 0) &&
                 !processor->ConvertBgraToYcbcr(nullptr, &record, 0) &&
@@ -114,9 +112,8 @@ void CheckNullArguments(CheckContext& context) {
                 !processor->Reserved5(nullptr, nullptr, 0),
             "a reserved operation does something");
     SetPlace("texts");
-    void* face = nullptr;
-    if (library->QueryInterface(&kIidMultiLingual, &face) != kStatusOk) return;
-    const Owned<IMultiLingual> texts(static_cast<IMultiLingual*>(face));
+    const auto texts = QueryFor<IMultiLingual>(*library.Get(), kIidMultiLingual);
+    if (!texts) return;
     char16_t buffer[4] = {u'?', u'?', u'?', u'?'};
     for (const char* code : {static_cast<const char*>(nullptr), "", "x", "en", "english", "\xFF\xFF"}) {
         for (const char* key : {static_cast<const char*>(nullptr), "", "no such key"}) {
@@ -132,14 +129,14 @@ void CheckNullArguments(CheckContext& context) {
 
 void CheckOutliving(CheckContext& context) {
     OpenLibrary library(context.libraryPath);
-    std::vector<Owned<IVideoEffect>> effects;
+    std::vector<Reference<IVideoEffect>> effects;
     for (std::uint32_t i = 0; i < kEffectCount; ++i) effects.push_back(library.Effect(i));
-    const Owned<IFrameProcessor> processor = library.Processor();
-    const Owned<IPresetSaver> saver = library.Saver();
+    const Reference<IFrameProcessor> processor = library.Processor();
+    const Reference<IPresetSaver> saver = library.Saver();
     library.Close();
     Frame source(Layout{40, 30}), destination(Layout{40, 30}), packed(Layout{40, 30}, Packing::kYcbcr);
     source.Paint(context.dice);
-    for (const Owned<IVideoEffect>& effect : effects) {
+    for (const Reference<IVideoEffect>& effect : effects) {
         SetPlace("%s", effect->GetName());
         PlayingHost host;
         ChooseFull(host, EffectFacts::Of(*effect));
@@ -153,7 +150,7 @@ void CheckOutliving(CheckContext& context) {
 
 void CheckThreads(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
-    const Owned<IVideoEffect> effect = library.Effect(4);
+    const Reference<IVideoEffect> effect = library.Effect(4);
     const EffectFacts facts = EffectFacts::Of(*effect);
     SetPlace("counting");
     constexpr int kThreads = 4;

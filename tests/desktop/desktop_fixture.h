@@ -39,7 +39,7 @@ class RegisteredText {
 };
 
 // A library object as far as the services see it. Translates "Help" to its own name when it has texts.
-class FakeLibrary final : public IMultiLingual {
+class FakeLibrary final : public Uncounted<IMultiLingual> {
   public:
     explicit FakeLibrary(const char16_t* help, const char16_t* knobs = u"") noexcept
         : m_help(help), m_knobs(knobs) {}

@@ -16,17 +16,17 @@ namespace velmora::support::test {
 namespace {
 
 // The texts of the real language module, as a library object gives them out.
-class RealTexts final : public IMultiLingual {
+class RealTexts final : public Uncounted<IMultiLingual> {
   public:
     RealTexts() : m_module(LoadLibraryW(DesktopPath(L"VMLang.dll").c_str())) {
         const auto create = reinterpret_cast<GetLangXMLParserFunction>(
             reinterpret_cast<void*>(GetProcAddress(m_module, "GetLangXMLParser")));
-        m_parser = create();
+        m_parser = Reference<LangXMLParser>::Adopt(create());
         const std::wstring file = DesktopPath(L"VMReelEffectsLang.xml");
         EXPECT_TRUE(m_parser->Load(reinterpret_cast<const char16_t*>(file.c_str())));
     }
     ~RealTexts() {
-        m_parser->Release();
+        m_parser.Reset();
         FreeLibrary(m_module);
     }
     RealTexts(const RealTexts&) = delete;
@@ -36,8 +36,6 @@ class RealTexts final : public IMultiLingual {
         *out = static_cast<IMultiLingual*>(this);
         return kStatusOk;
     }
-    std::uint32_t VM_CALL AddRef() override { return 1; }
-    std::uint32_t VM_CALL Release() override { return 1; }
     std::int32_t VM_CALL LookUpText(std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t,
                                     std::intptr_t, std::intptr_t) override {
         return 0;
@@ -64,7 +62,7 @@ class RealTexts final : public IMultiLingual {
 
   private:
     HMODULE m_module;
-    LangXMLParser* m_parser = nullptr;
+    Reference<LangXMLParser> m_parser;
 };
 
 // The size of a window's text in its own font; `width`: of the lines that it may be broken into, 0: one line.

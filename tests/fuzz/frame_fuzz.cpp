@@ -9,6 +9,8 @@
 #include <memory>
 #include <optional>
 
+#include "api/host_api.h"
+#include "api/reference.h"
 #include "effects/process_state.h"
 #include "effects/render_session.h"
 #include "render/ycbcr.h"
@@ -19,33 +21,17 @@
 namespace velmora::fuzz {
 namespace {
 
-struct Releaser {
-    void operator()(IUnknown* object) const { object->Release(); }
-};
-template <typename Interface>
-using Owned = std::unique_ptr<Interface, Releaser>;
-
 // Answers with the words that it was given, or not at all.
-class WordHost final : public IVideoHost {
+class WordHost final : public PlainHost {
   public:
     std::array<std::optional<std::uint32_t>, 40> words;
 
-    Status VM_CALL QueryInterface(const Guid*, void** out) override {
-        *out = nullptr;
-        return kStatusNoInterface;
-    }
-    std::uint32_t VM_CALL AddRef() override { return 1; }
-    std::uint32_t VM_CALL Release() override { return 1; }
     bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override {
         if (index >= words.size() || !words[index]) return false;
         cell->value.bits = *words[index];
         cell->kind = kind;
         return true;
     }
-    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) override { return false; }
-    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) override { return 0; }
-    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return false; }
-    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
 };
 
 void ReadWords(FuzzInput& input, IVideoEffect& effect, WordHost& host) {
@@ -120,8 +106,9 @@ class Run {
 
   private:
     void Effect(std::size_t index) {
-        if (m_effects[index] == nullptr) {
-            m_effects[index].reset(m_library.CreateEffect(static_cast<std::uint32_t>(index)));
+        if (!m_effects[index]) {
+            m_effects[index] =
+                Reference<IVideoEffect>::Adopt(m_library.CreateEffect(static_cast<std::uint32_t>(index)));
         }
         IVideoEffect& effect = *m_effects[index];
         ReadWords(m_input, effect, m_host);
@@ -159,7 +146,7 @@ class Run {
     }
 
     void Convert(bool isToBgra) {
-        Owned<IFrameProcessor> processor(NewProcessor());
+        auto processor = Reference<IFrameProcessor>::Adopt(NewProcessor());
         const std::uint8_t alpha = m_input.Byte();
         const PixelLayout& from = isToBgra ? kYcbcrLayout : kBgraLayout;
         const PixelLayout& to = isToBgra ? kBgraLayout : kYcbcrLayout;
@@ -224,7 +211,7 @@ class Run {
     FuzzInput& m_input;
     IEffectLibrary& m_library;
     WordHost m_host;
-    std::array<Owned<IVideoEffect>, 5> m_effects;
+    std::array<Reference<IVideoEffect>, 5> m_effects;
     OtherRoad m_reference, m_other;
 };
 

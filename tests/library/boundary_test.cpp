@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "api/reference.h"
 #include "tests/common/fake_host.h"
 #include "tests/common/guarded_frame.h"
 #include "tests/common/library_under_test.h"
@@ -24,19 +25,13 @@ using testing::Geometry;
 using testing::GuardedFrame;
 using testing::LoadedLibrary;
 
-struct Releaser {
-    void operator()(IUnknown* object) const { object->Release(); }
-};
-template <typename Interface>
-using Owned = std::unique_ptr<Interface, Releaser>;
-
 class Boundary : public ::testing::Test {
   protected:
     LoadedLibrary m_dll;
-    Owned<IEffectLibrary> m_library{m_dll.getEffectsLibrary()};
+    Reference<IEffectLibrary> m_library = Reference<IEffectLibrary>::Adopt(m_dll.getEffectsLibrary());
 
-    Owned<IVideoEffect> Effect(std::uint32_t index) {
-        return Owned<IVideoEffect>(m_library->CreateEffect(index));
+    Reference<IVideoEffect> Effect(std::uint32_t index) {
+        return Reference<IVideoEffect>::Adopt(m_library->CreateEffect(index));
     }
 };
 
@@ -59,14 +54,14 @@ bool Process(IVideoEffect& effect, FakeHost& host, GuardedFrame& source, Guarded
 TEST(Unloading, IsAllowedWhenNoLibraryObjectIsAlive) {
     LoadedLibrary dll;
     EXPECT_TRUE(dll.canUnload());
-    Owned<IEffectLibrary> first(dll.getEffectsLibrary());
+    auto first = Reference<IEffectLibrary>::Adopt(dll.getEffectsLibrary());
     EXPECT_FALSE(dll.canUnload());
-    Owned<IEffectLibrary> second(dll.getEffectsLibrary());
+    auto second = Reference<IEffectLibrary>::Adopt(dll.getEffectsLibrary());
     EXPECT_NE(first, second);
-    Owned<IVideoEffect> effect(first->CreateEffect(1));
-    first.reset();
+    auto effect = Reference<IVideoEffect>::Adopt(first->CreateEffect(1));
+    first.Reset();
     EXPECT_FALSE(dll.canUnload());
-    second.reset();
+    second.Reset();
     EXPECT_TRUE(dll.canUnload()) << "effects do not count";
     EXPECT_STREQ(effect->GetName(), "Film Look");
 }
@@ -85,9 +80,9 @@ TEST_F(Boundary, CountsReferences) {
 }
 
 TEST_F(Boundary, FindsFaces) {
-    Owned<IVideoEffect> effect = Effect(0);
-    Owned<IFrameProcessor> processor(m_library->CreateFrameProcessor());
-    Owned<IPresetSaver> saver(m_library->CreatePresetSaver());
+    Reference<IVideoEffect> effect = Effect(0);
+    auto processor = Reference<IFrameProcessor>::Adopt(m_library->CreateFrameProcessor());
+    auto saver = Reference<IPresetSaver>::Adopt(m_library->CreatePresetSaver());
     ASSERT_TRUE(effect && processor && saver);
     const Guid stranger = {1, 2, 3, {4, 5, 6, 7, 8, 9, 10, 11}};
     struct Row {
@@ -97,18 +92,18 @@ TEST_F(Boundary, FindsFaces) {
         const void* face;  // null: no such interface
     };
     const Row rows[] = {
-        {"library as unknown", m_library.get(), &kIidUnknown, m_library.get()},
-        {"library", m_library.get(), &kIidEffectLibrary, m_library.get()},
-        {"library as effect", m_library.get(), &kIidVideoEffect, nullptr},
-        {"library as stranger", m_library.get(), &stranger, nullptr},
-        {"effect as unknown", effect.get(), &kIidUnknown, effect.get()},
-        {"effect", effect.get(), &kIidVideoEffect, effect.get()},
-        {"effect as library", effect.get(), &kIidEffectLibrary, nullptr},
-        {"processor as unknown", processor.get(), &kIidUnknown, processor.get()},
-        {"processor as effect", processor.get(), &kIidVideoEffect, nullptr},
-        {"saver as unknown", saver.get(), &kIidUnknown, saver.get()},
-        {"saver", saver.get(), &kIidPresetSaver, saver.get()},
-        {"saver as stranger", saver.get(), &stranger, nullptr},
+        {"library as unknown", m_library.Get(), &kIidUnknown, m_library.Get()},
+        {"library", m_library.Get(), &kIidEffectLibrary, m_library.Get()},
+        {"library as effect", m_library.Get(), &kIidVideoEffect, nullptr},
+        {"library as stranger", m_library.Get(), &stranger, nullptr},
+        {"effect as unknown", effect.Get(), &kIidUnknown, effect.Get()},
+        {"effect", effect.Get(), &kIidVideoEffect, effect.Get()},
+        {"effect as library", effect.Get(), &kIidEffectLibrary, nullptr},
+        {"processor as unknown", processor.Get(), &kIidUnknown, processor.Get()},
+        {"processor as effect", processor.Get(), &kIidVideoEffect, nullptr},
+        {"saver as unknown", saver.Get(), &kIidUnknown, saver.Get()},
+        {"saver", saver.Get(), &kIidPresetSaver, saver.Get()},
+        {"saver as stranger", saver.Get(), &stranger, nullptr},
     };
     for (const Row& row : rows) {
         void* out = &out;
@@ -134,22 +129,23 @@ TEST_F(Boundary, OffersFiveEffectsAndTheirCompanions) {
 
 // The tables of an interface, called by slot as a host of another compiler does.
 TEST_F(Boundary, KeepsItsSlots) {
-    Owned<IVideoEffect> effect = Effect(2);
-    void** table = *reinterpret_cast<void***>(effect.get());
+    Reference<IVideoEffect> effect = Effect(2);
+    void** table = *reinterpret_cast<void***>(effect.Get());
     using GetName = const char*(VM_CALL*)(void*);
     using GetPresetName = const char*(VM_CALL*)(void*, std::uint32_t);
-    EXPECT_STREQ(reinterpret_cast<GetName>(table[3])(effect.get()), "Film Damage");
-    EXPECT_STREQ(reinterpret_cast<GetPresetName>(table[7])(effect.get(), 7), "Water Damage");
-    void** libraryTable = *reinterpret_cast<void***>(m_library.get());
-    EXPECT_STREQ(reinterpret_cast<GetName>(libraryTable[3])(m_library.get()), "Velmora Reel Effects");
+    EXPECT_STREQ(reinterpret_cast<GetName>(table[3])(effect.Get()), "Film Damage");
+    EXPECT_STREQ(reinterpret_cast<GetPresetName>(table[7])(effect.Get(), 7), "Water Damage");
+    void** libraryTable = *reinterpret_cast<void***>(m_library.Get());
+    EXPECT_STREQ(reinterpret_cast<GetName>(libraryTable[3])(m_library.Get()), "Velmora Reel Effects");
     using Create = void*(VM_CALL*)(void*);
-    Owned<IUnknown> saver(static_cast<IUnknown*>(reinterpret_cast<Create>(libraryTable[8])(m_library.get())));
-    EXPECT_NE(saver, nullptr);
+    auto saver = Reference<IUnknown>::Adopt(
+        static_cast<IUnknown*>(reinterpret_cast<Create>(libraryTable[8])(m_library.Get())));
+    EXPECT_NE(saver.Get(), nullptr);
 }
 
 TEST_F(Boundary, RendersForEffectsThatOutliveTheLibrary) {
-    Owned<IVideoEffect> effect = Effect(0);
-    m_library.reset();
+    Reference<IVideoEffect> effect = Effect(0);
+    m_library.Reset();
     FakeHost host;
     ShakeFully(host);
     GuardedFrame source{Geometry{30, 20}}, destination{Geometry{30, 20}};
@@ -158,7 +154,7 @@ TEST_F(Boundary, RendersForEffectsThatOutliveTheLibrary) {
 }
 
 TEST_F(Boundary, RefusesFramesItCannotUseAndReadsNoParameterThen) {
-    Owned<IVideoEffect> effect = Effect(0);
+    Reference<IVideoEffect> effect = Effect(0);
     FakeHost host;
     GuardedFrame good{Geometry{8, 6}};
     const FrameRecord valid = good.Record();
@@ -182,7 +178,7 @@ TEST_F(Boundary, RefusesFramesItCannotUseAndReadsNoParameterThen) {
 
 TEST_F(Boundary, WritesNothingButTheProcessedRectangle) {
     for (std::uint32_t index = 0; index < 5; ++index) {
-        Owned<IVideoEffect> effect = Effect(index);
+        Reference<IVideoEffect> effect = Effect(index);
         FakeHost host;
         for (std::uint32_t i = 0; i < 27; ++i) {
             ParamDescriptor descriptor = {};
@@ -213,7 +209,7 @@ TEST_F(Boundary, WritesNothingButTheProcessedRectangle) {
 }
 
 TEST_F(Boundary, ReplaysAFrameOnlyWhenItIsRepeatedAtOnce) {
-    Owned<IVideoEffect> effect = Effect(0);
+    Reference<IVideoEffect> effect = Effect(0);
     FakeHost host;
     ShakeFully(host);
     GuardedFrame source{Geometry{64, 64}};
@@ -235,7 +231,7 @@ TEST_F(Boundary, ReplaysAFrameOnlyWhenItIsRepeatedAtOnce) {
 }
 
 TEST_F(Boundary, ConvertsFramesBothWays) {
-    Owned<IFrameProcessor> processor(m_library->CreateFrameProcessor());
+    auto processor = Reference<IFrameProcessor>::Adopt(m_library->CreateFrameProcessor());
     const std::uint8_t packed[] = {50, 100, 60, 200, 70, 110, 1, 2};  // three pixels
     GuardedFrame pixels{Geometry{5, 1, 1, 0}};
     FrameRecord source = {const_cast<std::uint8_t*>(packed), 3, 1, 8, 0, 0, 0};
@@ -268,7 +264,7 @@ TEST_F(Boundary, ConvertsFramesBothWays) {
 }
 
 TEST_F(Boundary, DoesNotDependOnTheCallersFloatingPointState) {
-    Owned<IVideoEffect> effect = Effect(1);
+    Reference<IVideoEffect> effect = Effect(1);
     FakeHost host;
     for (std::uint32_t i = 0; i < 7; ++i) host.SetNumber(i, 0.37f);
     GuardedFrame source{Geometry{40, 30}}, plain{Geometry{40, 30}}, hostile{Geometry{40, 30}};
@@ -330,7 +326,7 @@ std::uint32_t Word(const void* pointer) {
 TEST_F(Boundary, TakesAStackAlignedToFourBytes) {
     for (const std::uint32_t shift : {0u, 4u, 8u, 12u}) {
         for (std::uint32_t index = 0; index < 5; ++index) {
-            Owned<IVideoEffect> effect = Effect(index);
+            Reference<IVideoEffect> effect = Effect(index);
             FakeHost host;
             for (std::uint32_t i = 0; i < 27; ++i) host.SetNumber(i, 0.6f);
             GuardedFrame source{Geometry{61, 40}}, destination{Geometry{61, 40}}, aligned{Geometry{61, 40}};
@@ -338,24 +334,24 @@ TEST_F(Boundary, TakesAStackAlignedToFourBytes) {
             ASSERT_TRUE(Process(*effect, host, source, aligned, 3.0));
             const FrameRecord in = source.Record(), out = destination.Record();
             const TimingRecord timing = {0, 0, 3.0};
-            void** table = *reinterpret_cast<void***>(effect.get());
+            void** table = *reinterpret_cast<void***>(effect.Get());
             const std::uint32_t done = CallOffBy(
-                shift, table[6], {Word(effect.get()), Word(&host), Word(&in), 0, Word(&out), Word(&timing)});
+                shift, table[6], {Word(effect.Get()), Word(&host), Word(&in), 0, Word(&out), Word(&timing)});
             ASSERT_EQ(done & 0xFFu, 1u) << shift;
             ASSERT_EQ(destination.Bytes(), aligned.Bytes()) << shift << ' ' << index;
             ParamDescriptor descriptor = {};
-            ASSERT_EQ(CallOffBy(shift, table[5], {Word(effect.get()), 1, Word(&descriptor)}) & 0xFFu, 1u);
+            ASSERT_EQ(CallOffBy(shift, table[5], {Word(effect.Get()), 1, Word(&descriptor)}) & 0xFFu, 1u);
         }
     }
 }
 
 TEST(Growth, TenThousandRoundsTakeNoMemory) {
     LoadedLibrary dll;
-    Owned<IEffectLibrary> library(dll.getEffectsLibrary());
+    auto library = Reference<IEffectLibrary>::Adopt(dll.getEffectsLibrary());
     const auto round = [&library](std::uint32_t i) {
-        Owned<IVideoEffect> effect(library->CreateEffect(i % 5));
-        Owned<IFrameProcessor> processor(library->CreateFrameProcessor());
-        Owned<IPresetSaver> saver(library->CreatePresetSaver());
+        auto effect = Reference<IVideoEffect>::Adopt(library->CreateEffect(i % 5));
+        auto processor = Reference<IFrameProcessor>::Adopt(library->CreateFrameProcessor());
+        auto saver = Reference<IPresetSaver>::Adopt(library->CreatePresetSaver());
         ParamDescriptor descriptor = {};
         effect->GetParamInfo(0, &descriptor);
     };
