@@ -1,6 +1,9 @@
 #include "faces/frei0r/host_time_unit.h"
 
+#include <algorithm>
 #include <array>
+
+#include "text/names.h"
 
 namespace velmora::hosts::frei0r {
 namespace {
@@ -26,9 +29,7 @@ TimeUnit UnitOfModule(std::string_view fileName) {
         fileName.remove_prefix(slash + 1);
     }
     std::string lower(fileName);
-    for (char& c : lower) {
-        if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
-    }
+    std::ranges::transform(lower, lower.begin(), ToLower);
     for (const KnownModule& known : kKnownModules) {
         if (lower.find(known.part) != std::string::npos) return known.unit;
     }

@@ -7,6 +7,7 @@
 #include <limits>
 #include <new>
 
+#include "text/names.h"
 #include "text/number_text.h"
 #include "faces/frei0r/pixel_order.h"
 

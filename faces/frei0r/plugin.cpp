@@ -56,8 +56,8 @@ void f0r_get_plugin_info(f0r_plugin_info_t* info) {
                  .plugin_type = F0R_PLUGIN_TYPE_FILTER,
                  .color_model = F0R_COLOR_MODEL_RGBA8888,
                  .frei0r_version = FREI0R_MAJOR_VERSION,
-                 .major_version = 1,
-                 .minor_version = 0,
+                 .major_version = velmora::kReelEffectsMajor,
+                 .minor_version = velmora::kReelEffectsMinor,
                  .num_params = static_cast<int>(Plugin().params.size()),
                  .explanation = Plugin().explanation.c_str()};
     });

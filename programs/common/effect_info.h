@@ -32,10 +32,7 @@ struct EffectInfo {
 
 ParamInfo ReadDescriptor(const ParamDescriptor& descriptor);
 
-// Names are compared without regard to the case of ASCII letters.
-bool NamesAreEqual(std::string_view a, std::string_view b);
-
-// The index of the effect or preset of that name. Throws UsageError that says which ones exist.
+// The index of the effect or preset of that name (text/names.h). Throws UsageError that says which ones exist.
 std::size_t FindEffect(std::span<const EffectInfo> effects, std::string_view name);
 std::uint32_t FindPreset(const EffectInfo& effect, std::string_view name);
 
