@@ -49,7 +49,7 @@ class Reference {
 
 // The interface of `object` that `iid` names; empty when it has none.
 template <class Interface>
-[[nodiscard]] Reference<Interface> QueryFor(IUnknown& object, const Guid& iid) noexcept {
+[[nodiscard]] Reference<Interface> QueryFor(com::IUnknown& object, const Guid& iid) noexcept {
     void* found = nullptr;
     if (object.QueryInterface(&iid, &found) != kStatusOk) return {};
     return Reference<Interface>::Adopt(static_cast<Interface*>(found));

@@ -39,19 +39,19 @@ HMODULE OwnModule() noexcept {
 
 class WindowsShellServices final : public IShellServices {
   public:
-    bool VM_CALL Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
+    bool VM_CALL Start(void* moduleHandle, com::IUnknown* textSource, const char* helpFileName,
                        std::int32_t dialogs) override;
     bool VM_CALL KnobsDragVertical() override { return m_preferences.KnobsDragVertical(); }
     std::int32_t VM_CALL ShowOptions(void* owner) override;
     void VM_CALL ShutDown() override;
     std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic, std::int32_t externalViewer) override;
 
-    void Offer(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept;
-    void Withdraw(IUnknown* library) noexcept;
+    void Offer(ModuleHandle module, com::IUnknown* library, const char* helpFileName) noexcept;
+    void Withdraw(com::IUnknown* library) noexcept;
 
   private:
     void LoadDialogParts(const std::u16string& folder);
-    void UseTextSource(IUnknown* source, const char* languageCode) noexcept;
+    void UseTextSource(com::IUnknown* source, const char* languageCode) noexcept;
 
     HMODULE m_module = nullptr;  // in whose folder the library's files lie; null: not started
     win32::Module m_resources;
@@ -59,19 +59,19 @@ class WindowsShellServices final : public IShellServices {
     HMODULE m_buttonModule = nullptr;  // for which the button class is registered; null: it is not
     Preferences m_preferences;
     TranslationHelper m_texts;
-    IUnknown* m_textSource = nullptr;  // not owned
+    com::IUnknown* m_textSource = nullptr;  // not owned
     HelpLauncher m_help;
     TextSources m_libraries;
     OptionsDialog* m_dialog = nullptr;  // while one is shown
 };
 
-void WindowsShellServices::UseTextSource(IUnknown* source, const char* languageCode) noexcept {
+void WindowsShellServices::UseTextSource(com::IUnknown* source, const char* languageCode) noexcept {
     m_textSource = source;
     m_texts.SetContext(source, languageCode);
 }
 
-bool VM_CALL WindowsShellServices::Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
-                                         std::int32_t dialogs) try {
+bool VM_CALL WindowsShellServices::Start(void* moduleHandle, com::IUnknown* textSource,
+                                         const char* helpFileName, std::int32_t dialogs) try {
     const FloatGuard guard;
     if (m_module != nullptr || moduleHandle == nullptr) return false;
     m_module = static_cast<HMODULE>(moduleHandle);
@@ -141,7 +141,8 @@ std::int32_t VM_CALL WindowsShellServices::ShowHelp(void* owner, std::int32_t to
     return 0;
 }
 
-void WindowsShellServices::Offer(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept {
+void WindowsShellServices::Offer(ModuleHandle module, com::IUnknown* library,
+                                 const char* helpFileName) noexcept {
     constexpr std::int32_t kShowsDialogs = 1;
     m_libraries.Add(library);
     if (!Start(module, library, helpFileName, kShowsDialogs) && m_textSource == nullptr) {
@@ -149,7 +150,7 @@ void WindowsShellServices::Offer(ModuleHandle module, IUnknown* library, const c
     }
 }
 
-void WindowsShellServices::Withdraw(IUnknown* library) noexcept {
+void WindowsShellServices::Withdraw(com::IUnknown* library) noexcept {
     m_libraries.Remove(library);
     if (m_libraries.Count() == 0) {
         ShutDown();
@@ -172,11 +173,11 @@ IShellServices& ShellServices() noexcept {
     return Services();
 }
 
-void OfferTextSource(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept {
+void OfferTextSource(ModuleHandle module, com::IUnknown* library, const char* helpFileName) noexcept {
     Services().Offer(module, library, helpFileName);
 }
 
-void WithdrawTextSource(IUnknown* library) noexcept {
+void WithdrawTextSource(com::IUnknown* library) noexcept {
     Services().Withdraw(library);
 }
 

@@ -72,15 +72,12 @@ class Parser final : public LangXMLParser {
         }
     }
 
-    std::int32_t VM_CALL LookUpText(std::intptr_t languageCode, std::intptr_t category, std::intptr_t key,
-                                    std::intptr_t fallback, std::intptr_t buffer, std::intptr_t capacity,
-                                    std::intptr_t found) override {
-        const char16_t* const text =
-            m_table.Find(reinterpret_cast<const char*>(languageCode), static_cast<std::int32_t>(category),
-                         reinterpret_cast<const char*>(key));
-        if (found != 0) *reinterpret_cast<std::int32_t*>(found) = text ? 1 : 0;
-        return CopyText(text ? text : reinterpret_cast<const char16_t*>(fallback),
-                        reinterpret_cast<char16_t*>(buffer), static_cast<std::int32_t>(capacity));
+    std::int32_t VM_CALL LookUpText(const char* languageCode, std::int32_t category, const char* key,
+                                    const char16_t* fallback, char16_t* buffer, std::int32_t capacity,
+                                    std::int32_t* found) override {
+        const char16_t* const text = m_table.Find(languageCode, category, key);
+        if (found != nullptr) *found = text != nullptr ? 1 : 0;
+        return CopyText(text != nullptr ? text : fallback, buffer, capacity);
     }
 
     std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,

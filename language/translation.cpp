@@ -10,7 +10,7 @@ namespace velmora {
 
 TranslationHelper::~TranslationHelper() = default;
 
-void TranslationHelper::SetContext(IUnknown* textSource, const char* languageCode) noexcept {
+void TranslationHelper::SetContext(com::IUnknown* textSource, const char* languageCode) noexcept {
     m_text[0] = 0;
     m_textSource = textSource;
     // At most three bytes of the code are looked at: a host may pass a long text.

@@ -14,7 +14,8 @@
 namespace velmora {
 namespace {
 
-constexpr char kLibraryName[] = "Velmora Reel Effects";
+static_assert(kReelEffectsMajor == VELMORA_VERSION_MAJOR && kReelEffectsMinor == VELMORA_VERSION_MINOR);
+
 constexpr char kHelpFile[] = "VMReelEffects.chm";
 constexpr char16_t kLanguageModule[] = u"VMLang.dll";
 constexpr char16_t kLanguageFile[] = u"VMReelEffectsLang.xml";
@@ -132,10 +133,9 @@ IPresetSaver* VM_CALL CRsVelmoraLib::CreatePresetSaver() {
     return velmora::CreatePresetSaver();
 }
 
-std::int32_t VM_CALL CRsVelmoraLib::LookUpText(std::intptr_t languageCode, std::intptr_t category,
-                                               std::intptr_t key, std::intptr_t fallback,
-                                               std::intptr_t buffer, std::intptr_t capacity,
-                                               std::intptr_t found) {
+std::int32_t VM_CALL CRsVelmoraLib::LookUpText(const char* languageCode, std::int32_t category,
+                                               const char* key, const char16_t* fallback, char16_t* buffer,
+                                               std::int32_t capacity, std::int32_t* found) {
     if (!m_hasLanguage || !m_parser) return 0;
     const FloatGuard guard;
     return m_parser->LookUpText(languageCode, category, key, fallback, buffer, capacity, found);

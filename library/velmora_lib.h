@@ -26,9 +26,9 @@ class CRsVelmoraLib final : public DLLDependentObject, public IEffectLibrary, pu
     IFrameProcessor* VM_CALL CreateFrameProcessor() override;
     IPresetSaver* VM_CALL CreatePresetSaver() override;
 
-    std::int32_t VM_CALL LookUpText(std::intptr_t languageCode, std::intptr_t category, std::intptr_t key,
-                                    std::intptr_t fallback, std::intptr_t buffer, std::intptr_t capacity,
-                                    std::intptr_t found) override;
+    std::int32_t VM_CALL LookUpText(const char* languageCode, std::int32_t category, const char* key,
+                                    const char16_t* fallback, char16_t* buffer, std::int32_t capacity,
+                                    std::int32_t* found) override;
     std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
                                  char16_t* buffer, std::int32_t capacity) override;
 

@@ -21,7 +21,7 @@ int main() {
     void* const entry = dll ? reinterpret_cast<void*>(GetProcAddress(dll, "GetEffectsLibrary")) : nullptr;
     if (entry == nullptr) return std::puts("VMReelEffects.dll is missing"), 1;
     IEffectLibrary* const library = reinterpret_cast<GetEffectsLibraryFunction>(entry)();
-    IVideoEffect* const effect = library->CreateEffect(1);  // "Film Look"
+    IVideoEffect* const effect = library->CreateEffect(kEffectFilmLook);
     Host host;
     PresetCell cell;
     for (std::uint32_t i = 0; effect->GetPresetValue(25, i, &cell); ++i) host.cells.push_back(cell);

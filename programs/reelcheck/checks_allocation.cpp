@@ -94,7 +94,7 @@ void CheckCreateFailures(CheckContext& context) {
             bool isMade = false;
             {
                 const AllocationWatch watch(failing);
-                isMade = bool{Reference<IUnknown>::Adopt(create())};
+                isMade = bool{Reference<com::IUnknown>::Adopt(create())};
                 count = watch.Count();
             }
             Require(isMade == (failing == 0), isMade ? "is made without memory" : "is not made");

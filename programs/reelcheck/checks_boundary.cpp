@@ -23,7 +23,7 @@ void CheckExports(CheckContext& context) {
     for (std::uint32_t i = 0; i < kEffectCount; ++i) {
         Require(bool{Reference<IVideoEffect>::Adopt(second->CreateEffect(i))}, "an effect is missing");
     }
-    for (const std::uint32_t index : {kEffectCount, 100u, 0x80000000u, 0xFFFFFFFFu}) {
+    for (const std::uint32_t index : {std::uint32_t{kEffectCount}, 100u, 0x80000000u, 0xFFFFFFFFu}) {
         Require(second->CreateEffect(index) == nullptr, "there is an effect behind the last");
     }
     second.Reset();
@@ -35,7 +35,7 @@ namespace {
 constexpr Guid kStranger = {1, 2, 3, {4, 5, 6, 7, 8, 9, 10, 11}};
 
 // Every object answers to IUnknown and to its own identifier, if it has one, and to no other.
-void CheckFaces(IUnknown& object, const Guid* own) {
+void CheckFaces(com::IUnknown& object, const Guid* own) {
     void* face = nullptr;
     Require(object.QueryInterface(&kIidUnknown, &face) == kStatusOk && face == &object,
             "does not answer to IUnknown with itself");
@@ -54,13 +54,13 @@ void CheckFaces(IUnknown& object, const Guid* own) {
     Require(object.QueryInterface(&kIidUnknown, nullptr) == kStatusFailure, "does not refuse a null place");
 }
 
-void CheckCounts(IUnknown& object) {
+void CheckCounts(com::IUnknown& object) {
     constexpr std::uint32_t kMany = 1000;
     for (std::uint32_t i = 0; i < kMany; ++i) Require(object.AddRef() == i + 2, "AddRef counts wrongly");
     for (std::uint32_t i = kMany; i > 0; --i) Require(object.Release() == i, "Release counts wrongly");
 }
 
-void CheckObject(const char* name, IUnknown& object, const Guid* own) {
+void CheckObject(const char* name, com::IUnknown& object, const Guid* own) {
     SetPlace("%s", name);
     CheckFaces(object, own);
     CheckCounts(object);
@@ -120,8 +120,7 @@ void CheckNullArguments(CheckContext& context) {
             Require(texts->GetText(code, 4, key, buffer, 4) == 0, "finds a text for nothing");
             Require(texts->GetText(code, -1, key, nullptr, 4) == 0, "writes a text to nowhere");
             Require(texts->GetText(code, 4, key, buffer, -5) == 0, "writes a text of negative size");
-            Require(texts->LookUpText(reinterpret_cast<std::intptr_t>(code), 4,
-                                      reinterpret_cast<std::intptr_t>(key), 0, 0, 0, 0) == 0,
+            Require(texts->LookUpText(code, 4, key, nullptr, nullptr, 0, nullptr) == 0,
                     "finds a text for nothing");
         }
     }

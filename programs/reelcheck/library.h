@@ -9,8 +9,6 @@
 
 namespace velmora::reelcheck {
 
-inline constexpr std::uint32_t kEffectCount = 5;
-
 // Loaded once: unloads when it goes. Everything that came out of it must be released before.
 class Library {
   public:

@@ -36,8 +36,8 @@ class RealTexts final : public Uncounted<IMultiLingual> {
         *out = static_cast<IMultiLingual*>(this);
         return kStatusOk;
     }
-    std::int32_t VM_CALL LookUpText(std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t,
-                                    std::intptr_t, std::intptr_t) override {
+    std::int32_t VM_CALL LookUpText(const char*, std::int32_t, const char*, const char16_t*, char16_t*,
+                                    std::int32_t, std::int32_t*) override {
         return 0;
     }
     std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,

@@ -119,7 +119,7 @@ TEST(BitButtonState, ClicksOnlyWhenReleasedInside) {
     EXPECT_FALSE(silent.OnButtonUp().click);
 }
 
-class Library final : public Uncounted<IUnknown> {};
+class Library final : public Uncounted<com::IUnknown> {};
 
 TEST(TextSources, AnotherLivingLibraryStepsIn) {
     Library first;

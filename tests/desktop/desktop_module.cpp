@@ -21,11 +21,11 @@ velmora::IShellServices* VM_CALL GetServices() {
     return &velmora::support::ShellServices();
 }
 
-void VM_CALL Offer(velmora::IUnknown* library) {
+void VM_CALL Offer(velmora::com::IUnknown* library) {
     velmora::support::OfferTextSource(ownModule, library, "VMReelEffects.chm");
 }
 
-void VM_CALL Withdraw(velmora::IUnknown* library) {
+void VM_CALL Withdraw(velmora::com::IUnknown* library) {
     velmora::support::WithdrawTextSource(library);
 }
 }

@@ -51,8 +51,8 @@ constexpr std::uint32_t kMasterKinds[21] = {2, 2, 3, 2, 2, 2, 2, 2, 3, 2, 2, 2, 
 TEST(FilmEffect, AnswersToItsThreeIdentifiersFromBothFaces) {
     for (std::uint32_t i = 0; i < 5; ++i) {
         Effect effect(i);
-        IUnknown* const faces[] = {static_cast<IUnknown*>(effect.operator->()), effect.Face()};
-        for (IUnknown* face : faces) {
+        com::IUnknown* const faces[] = {static_cast<com::IUnknown*>(effect.operator->()), effect.Face()};
+        for (com::IUnknown* face : faces) {
             struct {
                 const Guid* iid;
                 Status status;

@@ -87,7 +87,7 @@ TEST_F(Boundary, FindsFaces) {
     const Guid stranger = {1, 2, 3, {4, 5, 6, 7, 8, 9, 10, 11}};
     struct Row {
         const char* name;
-        IUnknown* object;
+        com::IUnknown* object;
         const Guid* iid;
         const void* face;  // null: no such interface
     };
@@ -138,8 +138,8 @@ TEST_F(Boundary, KeepsItsSlots) {
     void** libraryTable = *reinterpret_cast<void***>(m_library.Get());
     EXPECT_STREQ(reinterpret_cast<GetName>(libraryTable[3])(m_library.Get()), "Velmora Reel Effects");
     using Create = void*(VM_CALL*)(void*);
-    auto saver = Reference<IUnknown>::Adopt(
-        static_cast<IUnknown*>(reinterpret_cast<Create>(libraryTable[8])(m_library.Get())));
+    auto saver = Reference<com::IUnknown>::Adopt(
+        static_cast<com::IUnknown*>(reinterpret_cast<Create>(libraryTable[8])(m_library.Get())));
     EXPECT_NE(saver.Get(), nullptr);
 }
 

@@ -17,8 +17,8 @@ class FakeTexts final : public Uncounted<IMultiLingual> {
   public:
     std::uint32_t VM_CALL AddRef() override { return static_cast<std::uint32_t>(++references); }
     std::uint32_t VM_CALL Release() override { return static_cast<std::uint32_t>(--references); }
-    std::int32_t VM_CALL LookUpText(std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t,
-                                    std::intptr_t, std::intptr_t) override {
+    std::int32_t VM_CALL LookUpText(const char*, std::int32_t, const char*, const char16_t*, char16_t*,
+                                    std::int32_t, std::int32_t*) override {
         return 0;
     }
     std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,

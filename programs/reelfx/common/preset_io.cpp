@@ -12,9 +12,6 @@
 namespace velmora::hosts {
 namespace {
 
-// As the library object tells its hosts.
-constexpr char kLibraryName[] = "Velmora Reel Effects";
-
 std::string FieldText(const char (&field)[kPresetNameWidth]) {
     return std::string(field, std::find(field, field + kPresetNameWidth, '\0'));
 }
