@@ -9,8 +9,7 @@
 #include "help/topics.h"
 #include "desktop/bit_button.h"
 #include "desktop/resource_ids.h"
-#include "platform/win32_handles.h"
-#include "text/win32_text.h"
+#include "platform/win32.h"
 
 namespace velmora::support {
 namespace {

@@ -11,8 +11,7 @@
 #include "desktop/resource_ids.h"
 #include "desktop/shell_services.h"
 #include "desktop/text_sources.h"
-#include "platform/win32_handles.h"
-#include "text/win32_text.h"
+#include "platform/win32.h"
 
 namespace velmora::support {
 namespace {
@@ -27,14 +26,6 @@ std::string UserInterfaceLanguage() {
     const LCID locale = MAKELCID(GetUserDefaultUILanguage(), SORT_DEFAULT);
     GetLocaleInfoA(locale, LOCALE_SISO639LANGNAME, code, static_cast<int>(sizeof code));
     return code;
-}
-
-// The module that this code and the dialogs' templates lie in, whichever module a host starts the services for.
-HMODULE OwnModule() noexcept {
-    HMODULE module = nullptr;
-    GetModuleHandleExW(GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,
-                       reinterpret_cast<const wchar_t*>(reinterpret_cast<const void*>(&OwnModule)), &module);
-    return module;
 }
 
 class WindowsShellServices final : public IShellServices {
@@ -107,7 +98,8 @@ std::int32_t VM_CALL WindowsShellServices::ShowOptions(void* owner) try {
         return 0;
     }
     UseTextSource(m_textSource, UserInterfaceLanguage().c_str());
-    OptionsDialog dialog({.templates = OwnModule(),
+    // The dialogs' templates lie in this module, whichever one a host starts the services for.
+    OptionsDialog dialog({.templates = static_cast<HMODULE>(OwnModule()),
                           .buttonModule = m_buttonModule,
                           .logo = m_logo.get(),
                           .texts = &m_texts,

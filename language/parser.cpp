@@ -1,4 +1,5 @@
-#include "language/parser.h"
+// The object behind LangXMLParser, and the exports of the language module, whose names come undecorated from VMLang.def
+// on Windows.
 
 #include <atomic>
 #include <filesystem>
@@ -10,7 +11,8 @@
 #include <utility>
 
 #include "api/com_object.h"
-#include "language/copy_text.h"
+#include "text/utf.h"
+#include "language/lang_parser.h"
 #include "language/language_table.h"
 
 namespace velmora::language {
@@ -94,12 +96,22 @@ class Parser final : public LangXMLParser {
 
 }  // namespace
 
-LangXMLParser* CreateParser() noexcept {
-    return new (std::nothrow) Parser;
-}
-
-bool NoParserIsAlive() noexcept {
-    return liveParsers == 0;
-}
-
 }  // namespace velmora::language
+
+#if defined(_WIN32)
+#define VM_LANGUAGE_EXPORT
+#else
+#define VM_LANGUAGE_EXPORT __attribute__((visibility("default")))
+#endif
+
+extern "C" {
+
+VM_LANGUAGE_EXPORT velmora::LangXMLParser* VM_CALL GetLangXMLParser() {
+    return new (std::nothrow) velmora::language::Parser;
+}
+
+VM_LANGUAGE_EXPORT bool VM_CALL CanUnloadDLLNow() {
+    return velmora::language::liveParsers == 0;
+}
+
+}  // extern "C"

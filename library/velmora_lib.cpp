@@ -6,7 +6,6 @@
 #include "effects/film_effect.h"
 #include "platform/float_guard.h"
 #include "library/frame_processor.h"
-#include "library/module.h"
 #include "effects/velmora_effect.h"
 #include "presets/preset_saver.h"
 #include "desktop/shell_services.h"
@@ -29,7 +28,7 @@ bool AllowsUnload(support::ModuleHandle module) noexcept {
 
 // The path of a file beside the library; empty when it cannot be told.
 std::u16string BesideLibrary(const char16_t* name) noexcept try {
-    std::u16string path = support::ModuleFolder(ModuleHandle());
+    std::u16string path = support::ModuleFolder(support::OwnModule());
     return path.empty() ? path : path + name;
 } catch (...) {
     return {};
@@ -44,7 +43,7 @@ support::ModuleHandle LoadBesideOrByName(const char16_t* name) noexcept {
 }  // namespace
 
 CRsVelmoraLib::CRsVelmoraLib() noexcept {
-    support::OfferTextSource(ModuleHandle(), static_cast<IEffectLibrary*>(this), kHelpFile);
+    support::OfferTextSource(support::OwnModule(), static_cast<IEffectLibrary*>(this), kHelpFile);
     // Frames read only the settings that have been described once.
     if (MasterSettingsList* settings = CurrentMasterSettings()) settings->ExposeAll();
     m_hasLanguage = LoadLanguage(kLanguageModule, kLanguageFile);
@@ -149,3 +148,14 @@ std::int32_t VM_CALL CRsVelmoraLib::GetText(const char* languageCode, std::int32
 }
 
 }  // namespace velmora
+
+velmora::IEffectLibrary* VM_CALL GetEffectsLibrary() {
+    const velmora::FloatGuard guard;
+    velmora::SetBuildMode(velmora::kBuildModeReady);
+    if (!velmora::RenewMasterSettings()) return nullptr;
+    return new (std::nothrow) velmora::CRsVelmoraLib;
+}
+
+bool VM_CALL CanUnloadDLLNow() {
+    return velmora::DLLDependentObject::LiveObjectCount() == 0;
+}

@@ -1,4 +1,4 @@
-// The library object: the one thing that a host gets from GetEffectsLibrary.
+// The library object, and the two exports through which a host gets it.
 #pragma once
 
 #include "api/com_object.h"
@@ -48,3 +48,8 @@ class CRsVelmoraLib final : public DLLDependentObject, public IEffectLibrary, pu
 };
 
 }  // namespace velmora
+
+extern "C" {
+velmora::IEffectLibrary* VM_CALL GetEffectsLibrary();
+bool VM_CALL CanUnloadDLLNow();
+}

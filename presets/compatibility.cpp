@@ -1,4 +1,4 @@
-#include "presets/compatibility.h"
+#include "presets/preset_file.h"
 
 #include <cstring>
 

@@ -7,9 +7,8 @@
 
 #include "api/reference.h"
 #include "platform/float_guard.h"
-#include "presets/compatibility.h"
-#include "presets/dialogs.h"
 #include "presets/preset_file.h"
+#include "presets/dialogs.h"
 #include "presets/preset_names.h"
 #include "text/code_page.h"
 #include "text/strings.h"

@@ -1,6 +1,6 @@
 // From the time that a host passes to the clip's time that an effect renders.
 //
-// Unit. What the calling module is known to use (host_time_unit.h) or what is written behind the frame rate
+// Unit. What the calling module is known to use (UnitOfModule) or what is written behind the frame rate
 // ("25 ms", "25 s"). Of an unknown host: seconds, as frei0r's header says, until a step between two times that
 // follow each other is half a frame in milliseconds or longer (half a frame of 120 a second when no rate is
 // given). No host of a clip steps by so many seconds without a jump.
@@ -15,9 +15,17 @@
 #include <string_view>
 
 #include "text/number_text.h"
-#include "faces/frei0r/host_time_unit.h"
 
 namespace velmora::hosts::frei0r {
+
+// In which unit a host gives times. Frei0r's header says seconds, FFmpeg gives milliseconds. The values do not
+// tell: 40 is the second frame of a clip of 25 frames a second in milliseconds and its thousandth in seconds. So the
+// module that calls the plug-in is asked for its name.
+enum class TimeUnit : std::uint8_t { kUnknown, kSeconds, kMilliseconds };
+
+// By a module's file name, with or without folder: milliseconds for libavfilter and for FFmpeg's own programs,
+// which may have it linked in; seconds for MLT's and GStreamer's frei0r modules.
+[[nodiscard]] TimeUnit UnitOfModule(std::string_view fileName);
 
 class FrameClock {
   public:

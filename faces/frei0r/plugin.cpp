@@ -15,11 +15,11 @@ extern "C" {
 #include <new>
 
 #include "faces/frei0r/instance.h"
+#include "platform/platform.h"
 
 namespace {
 
 using velmora::hosts::frei0r::Instance;
-using velmora::hosts::frei0r::ModuleAt;
 using velmora::hosts::frei0r::PluginDescription;
 using velmora::hosts::frei0r::UnitOfModule;
 
@@ -77,7 +77,7 @@ f0r_instance_t f0r_construct(unsigned int width, unsigned int height) {
     f0r_instance_t instance = nullptr;
     Guarded([&] {
         if (width == 0 || height == 0) return;
-        instance = new Instance(Plugin(), width, height, UnitOfModule(ModuleAt(caller)));
+        instance = new Instance(Plugin(), width, height, UnitOfModule(velmora::support::ModuleAt(caller)));
     });
     return instance;
 }

@@ -9,13 +9,12 @@
 
 #include "programs/common/digest.h"
 #include "programs/common/usage_error.h"
-#include "programs/reelhost/bench.h"
 #include "programs/reelhost/effect_library.h"
 #include "programs/reelhost/effect_run.h"
 #include "programs/reelhost/frame_stream.h"
 #include "programs/reelhost/host_options.h"
 #include "programs/reelhost/random_state.h"
-#include "programs/reelhost/soak.h"
+#include "programs/reelhost/measurements.h"
 #include "text/names.h"
 
 namespace velmora::hosts {

@@ -6,7 +6,6 @@
 #include "programs/common/usage_error.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/output_place.h"
-#include "presets/compatibility.h"
 #include "presets/preset_file.h"
 
 namespace velmora::hosts {
