@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "desktop_fixture.h"
+#include "api/reference.h"
 #include "language/lang_parser.h"
 #include "desktop/bit_button.h"
 #include "desktop/options_dialog.h"
