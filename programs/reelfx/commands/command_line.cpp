@@ -182,6 +182,7 @@ std::string Explain(const CLI::App& app, const CLI::ParseError& error) {
     const auto commands = group->get_subcommands([](const CLI::App*) { return true; });
     if (dynamic_cast<const CLI::RequiredError*>(&error) == nullptr || commands.empty()) return error.what();
     std::vector<std::string> names;
+    names.reserve(commands.size());
     for (const CLI::App* command : commands) names.push_back(command->get_name());
     const std::vector<std::string> typed = group->remaining();
     if (typed.empty()) return "a command is missing; there are " + QuotedList(names);
