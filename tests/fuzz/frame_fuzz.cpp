@@ -132,7 +132,7 @@ void Try(FuzzInput& input, Packing from, Packing to, const Operation& operation)
 }
 
 // The state that a reference renders on, beside the library's.
-struct Reference {
+struct ReferenceRun {
     render::RenderState state;
     render::RenderOptions options;
 };
@@ -189,7 +189,7 @@ class Run {
         const auto render = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
             if (runner == Runner::kLibrary) return Process(effect, &m_host, source, destination, seconds);
             // The references read the values that the library's list has just read, and leave in it what they found.
-            Reference& reference = runner == Runner::kReference ? m_plain : m_other;
+            ReferenceRun& reference = runner == Runner::kReference ? m_plain : m_other;
             const TimingRecord timing = {0.0, 0.0, seconds};
             return RenderFrame({CurrentMasterSettings(), &reference.state, reference.options}, *owner,
                                &source, &destination, &timing);
@@ -217,7 +217,7 @@ class Run {
     IEffectLibrary& m_library;
     PlayingHost m_host;
     std::array<Reference<IVideoEffect>, 5> m_effects;
-    Reference m_plain, m_other;
+    ReferenceRun m_plain, m_other;
 };
 
 }  // namespace

@@ -30,7 +30,7 @@ class Boundary : public ::testing::Test {
 TEST_F(Boundary, EffectsDoNotKeepTheLibraryLoaded) {
     const Reference<IVideoEffect> effect = Effect(1);
     EXPECT_FALSE(m_dll.canUnload());
-    m_library.reset();
+    m_library.Reset();
     EXPECT_TRUE(m_dll.canUnload());
     EXPECT_STREQ(effect->GetName(), "Film Look");
 }
