@@ -1,7 +1,8 @@
 // The one header a host needs to use "Velmora Reel Effects".
 //
 // A host loads VMReelEffects.dll, looks up the two exports named at the end of this header, calls
-// GetEffectsLibrary and works through the interfaces below. The header needs nothing but <cstdint>.
+// GetEffectsLibrary and works through the interfaces below. The header needs nothing but <cstdint> and a compiler of
+// C++17 or later; it can be copied into a host's own sources and may stand before or behind <windows.h>.
 //
 // Binary contract, on 32-bit Windows: little-endian; every operation is __stdcall with the object
 // pointer as first stack argument; the operations of an interface lie in its table in the order of their
@@ -12,9 +13,16 @@
 // Ownership: whoever gets a pointer to a reference-counted interface owns one reference and gives it back
 // with Release. Texts are zero-terminated and stay owned by the library, for as long as it is loaded.
 //
-// Threads: AddRef and Release may be called on any thread. Everything else runs on the thread that calls it
-// without a lock, and the rendering state is shared by the whole process: render one frame at a time.
-// Dialogs, presets, texts and help belong to the user-interface thread.
+// Threads. Nothing is locked, and every operation runs on the thread that calls it. What is safe stands in brackets at
+// each operation or interface:
+//   [any thread]      at any time, also while other calls run: counting references, constant tables and names
+//   [one at a time]   on any thread, but never two such calls at once in the whole process: frames share one state
+//   [user interface]  on the host's user-interface thread only: dialogs, translated texts, help
+//
+// Frames. The frame number is the clip time in seconds x 30, truncated. It alone says which frame is meant: a call with
+// the number of the call before it, whatever the effect and the sizes, repeats that frame's random damage, so a host may
+// render a frame again for another view; a call with another number draws new damage. Two frames of a clip of more than
+// 30 frames a second can therefore show the same damage.
 #pragma once
 
 #include <cstdint>
@@ -29,6 +37,14 @@
 #define VM_OFFSET(record, field) __builtin_offsetof(record, field)
 
 namespace velmora {
+
+// Of this header and of the library that it belongs to. The DLL's version resource has the same numbers.
+inline constexpr std::int32_t kReelEffectsMajor = 1;
+inline constexpr std::int32_t kReelEffectsMinor = 0;
+inline constexpr char kReelEffectsVersion[] = "1.0";
+
+// What GetLibraryName returns, and what preset files say.
+inline constexpr char kLibraryName[] = "Velmora Reel Effects";
 
 // ---------------------------------------------------------------------------------------------------------
 // Identifiers and results
@@ -87,8 +103,8 @@ inline constexpr std::int32_t kMenuItemCapacity = 10;
 inline constexpr std::int32_t kMenuTextWidth = 20;
 inline constexpr std::int32_t kParamNameWidth = 40;
 
-// What parameter k of an effect is. An effect writes only the fields of the parameter's kind and leaves the
-// others as the caller passed them. A text that fills its whole field is not terminated inside it.
+// What parameter k of an effect is. Zero the descriptor first: an effect writes only the fields of the parameter's kind
+// and leaves the others as the caller passed them. A text that fills its whole field is not terminated inside it.
 struct ParamDescriptor {
     ValueWord defaultValue;
     std::uint32_t second;  // not written
@@ -191,23 +207,30 @@ static_assert(VM_OFFSET(PresetRecord, count) == 1980);
 // Interfaces. None has a destructor in its table: compilers lay destructors out differently. The protected
 // ones below only keep a host from deleting what it has to release.
 
+// In a namespace of its own, so that `using namespace velmora` beside <windows.h> leaves one IUnknown, the system's. Both
+// have the same table and the same identifier.
+namespace com {
+
 class IUnknown {
   public:
     // Finds the face of this object that `iid` names. Stores it in *out with one more reference and returns
     // kStatusOk; otherwise stores null and returns kStatusNoInterface. A null `out` is kStatusFailure.
     virtual Status VM_CALL QueryInterface(const Guid* iid, void** out) = 0;
-    // Returns the new count.
+    // Returns the new count. [any thread]
     virtual std::uint32_t VM_CALL AddRef() = 0;
-    // Returns the count left; at 0 the object is gone.
+    // Returns the count left; at 0 the object is gone. [any thread]
     virtual std::uint32_t VM_CALL Release() = 0;
 
   protected:
     ~IUnknown() = default;
 };
 
-// What an effect asks the host while it renders. Implemented by the host; not kept beyond Process but for
-// the identifiers that the effect itself does not know (see IVideoEffect::QueryInterface).
-class IVideoHost : public IUnknown {
+}  // namespace com
+
+// What an effect asks the host while it renders, on the thread that called Process. Implemented by the host (PlainHost
+// below is a start); not kept beyond Process but for the identifiers that the effect itself does not know (see
+// IVideoEffect).
+class IVideoHost : public com::IUnknown {
   public:
     // Writes the value of the effect's parameter `index` into cell->value, in the form of `kind`
     // (ParamKind), and `kind` into cell->kind. Returns true when there is such a parameter; on false the
@@ -224,26 +247,37 @@ class IVideoHost : public IUnknown {
     ~IVideoHost() = default;
 };
 
+// The effects, as CreateEffect counts them.
+enum EffectIndex : std::uint32_t {
+    kEffectFilmCamera = 0,
+    kEffectFilmLook = 1,
+    kEffectFilmDamage = 2,
+    kEffectFilmExpress = 3,
+    kEffectFilmPro = 4,
+    kEffectCount = 5,
+};
+
 // One effect. QueryInterface answers to IUnknown, IVideoEffect and IVideoHost; other identifiers are passed
 // on to the host of the last Process call, so that host must stay alive as long as it is asked.
-class IVideoEffect : public IUnknown {
+class IVideoEffect : public com::IUnknown {
   public:
-    // The name shown to the user, for example "Film Look".
+    // The name shown to the user, for example "Film Look". [any thread]
     virtual const char* VM_CALL GetName() = 0;
-    // Always 1.
+    // Always 1. [any thread]
     virtual std::int32_t VM_CALL GetKind() = 0;
-    // Fills the descriptor of parameter `index`, from 0; false past the last one (nothing is written).
+    // Fills the descriptor of parameter `index`, from 0; false past the last one (nothing is written). [any thread]
     virtual bool VM_CALL GetParamInfo(std::uint32_t index, ParamDescriptor* descriptor) = 0;
     // Renders one frame: reads the parameters from `host` (null: every value reads as 0), processes the
     // smaller of the two regions of `source` and writes it to `destination`. Nothing outside that rectangle
     // of the destination is written, the source never; both may be the same memory. `hostArgument` is not
     // read. False when either frame or `timing` is missing or a frame is invalid: nothing is written then.
+    // [one at a time]
     virtual bool VM_CALL Process(IVideoHost* host, const FrameRecord* source, void* hostArgument,
                                  const FrameRecord* destination, const TimingRecord* timing) = 0;
-    // The name of built-in preset `index`, from 0; null past the last one.
+    // The name of built-in preset `index`, from 0; null past the last one. [any thread]
     virtual const char* VM_CALL GetPresetName(std::uint32_t index) = 0;
     // Copies the value that a built-in preset gives a parameter. False when an index is past its end or
-    // `cell` is null.
+    // `cell` is null. [any thread]
     virtual bool VM_CALL GetPresetValue(std::uint32_t preset, std::uint32_t parameter, PresetCell* cell) = 0;
 
   protected:
@@ -251,8 +285,9 @@ class IVideoEffect : public IUnknown {
 };
 
 // Converts between packed YCbCr 4:2:2 (bytes Y0 Cb Y1 Cr for each started pair of pixels) and 32-bit frames,
-// over the smaller of the two sizes, with the frame rules of IVideoEffect::Process. Answers to IUnknown only.
-class IFrameProcessor : public IUnknown {
+// over the smaller of the two sizes, with the frame rules of IVideoEffect::Process. Answers to IUnknown only. Converters
+// are independent of each other and of effects; each serves one thread at a time.
+class IFrameProcessor : public com::IUnknown {
   public:
     virtual bool VM_CALL Reserved3(const FrameRecord* source, const FrameRecord* destination,
                                    std::uint8_t value) = 0;  // always false
@@ -274,8 +309,8 @@ class IFrameProcessor : public IUnknown {
 
 class IEffectLibrary;
 
-// Lets the user load and save the settings of one effect through the system's file dialogs.
-class IPresetSaver : public IUnknown {
+// Lets the user load and save the settings of one effect through the system's file dialogs. [user interface]
+class IPresetSaver : public com::IUnknown {
   public:
     // `owner` is the dialog's owner window; `library` may be null; `effectIndex` as for CreateEffect;
     // `languageCode` is null (plain dialogs) or a two-letter code (translated dialogs).
@@ -293,15 +328,14 @@ class IPresetSaver : public IUnknown {
 };
 
 // Translated texts. Reached through QueryInterface of the library, when a language file was loaded; shares
-// the library's count.
-class IMultiLingual : public IUnknown {
+// the library's count. [user interface]
+class IMultiLingual : public com::IUnknown {
   public:
-    // Passes seven words on to the language module: language code, category, key, fallback text (16-bit, may
-    // be null), buffer, capacity in characters, pointer to a 32-bit found flag (may be null). Returns the
-    // characters written.
-    virtual std::int32_t VM_CALL LookUpText(std::intptr_t languageCode, std::intptr_t category,
-                                            std::intptr_t key, std::intptr_t fallback, std::intptr_t buffer,
-                                            std::intptr_t capacity, std::intptr_t found) = 0;
+    // As GetText, but when there is no such text `fallback` (may be null) is written in its place. `found` (may be null)
+    // is set to 1 or 0: whether there was one. The arguments go to the language module as they are.
+    virtual std::int32_t VM_CALL LookUpText(const char* languageCode, std::int32_t category, const char* key,
+                                            const char16_t* fallback, char16_t* buffer, std::int32_t capacity,
+                                            std::int32_t* found) = 0;
     // Writes the text for a key in a language (two letters) into `buffer` of `capacity` 16-bit characters,
     // cut and terminated. Returns the characters written, 0 when there is no such text.
     virtual std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
@@ -312,12 +346,12 @@ class IMultiLingual : public IUnknown {
 };
 
 // The process-wide settings, options dialog and help. Not reference-counted; valid while the library is
-// loaded.
+// loaded. [user interface]
 class IShellServices {
   public:
     // Called by the library itself when it is created; false when already started. `dialogs` is non-zero
     // when the library shows dialogs of its own.
-    virtual bool VM_CALL Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
+    virtual bool VM_CALL Start(void* moduleHandle, com::IUnknown* textSource, const char* helpFileName,
                                std::int32_t dialogs) = 0;
     // The user's preference: circular knobs are turned by dragging up and down.
     virtual bool VM_CALL KnobsDragVertical() = 0;
@@ -332,20 +366,20 @@ class IShellServices {
     ~IShellServices() = default;
 };
 
-class IEffectLibrary : public IUnknown {
+class IEffectLibrary : public com::IUnknown {
   public:
-    // "Velmora Reel Effects".
+    // kLibraryName. [any thread]
     virtual const char* VM_CALL GetLibraryName() = 0;
-    // A new effect with one reference: 0 "Film Camera", 1 "Film Look", 2 "Film Damage", 3 "Film Express",
-    // 4 "Film Pro"; null past the last or when memory is short. It may outlive the library object.
+    // A new effect with one reference; `index` is an EffectIndex. Null past the last or when memory is short. It may
+    // outlive the library object. [any thread]
     virtual IVideoEffect* VM_CALL CreateEffect(std::uint32_t index) = 0;
-    // Opens the help file at a topic in the system's viewer; non-zero when it was started.
+    // Opens the help file at a topic in the system's viewer; non-zero when it was started. [user interface]
     virtual std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic) = 0;
-    // Not reference-counted.
+    // Not reference-counted. [any thread]
     virtual IShellServices* VM_CALL GetShellServices() = 0;
-    // A new object with one reference, or null when memory is short.
+    // A new object with one reference, or null when memory is short. [any thread]
     virtual IFrameProcessor* VM_CALL CreateFrameProcessor() = 0;
-    // A new object with one reference, or null when memory is short.
+    // A new object with one reference, or null when memory is short. [any thread]
     virtual IPresetSaver* VM_CALL CreatePresetSaver() = 0;
 
   protected:
@@ -353,12 +387,44 @@ class IEffectLibrary : public IUnknown {
 };
 
 // ---------------------------------------------------------------------------------------------------------
+// Bases for what a host implements. They answer everything with "no"; a host overrides what it can answer.
+
+// An object that lives as long as its owner, whoever counts: it ignores references and answers to no identifier.
+template <class Interface>
+class Uncounted : public Interface {
+  public:
+    Status VM_CALL QueryInterface(const Guid*, void** out) override {
+        if (out == nullptr) return kStatusFailure;
+        *out = nullptr;
+        return kStatusNoInterface;
+    }
+    std::uint32_t VM_CALL AddRef() override { return 1; }
+    std::uint32_t VM_CALL Release() override { return 1; }
+
+  protected:
+    ~Uncounted() = default;
+};
+
+// A host without a single value: override GetParamValue.
+class PlainHost : public Uncounted<IVideoHost> {
+  public:
+    bool VM_CALL GetParamValue(std::uint32_t, ValueCell*, std::uint32_t) override { return false; }
+    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) override { return false; }
+    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) override { return 0; }
+    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return false; }
+    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
+
+  protected:
+    ~PlainHost() = default;
+};
+
+// ---------------------------------------------------------------------------------------------------------
 // Exports of VMReelEffects.dll, undecorated names.
 
 // "GetEffectsLibrary": a new library object with one reference that belongs to the caller; null when memory
-// is short.
+// is short. Loads the translated texts. [user interface], and no frame may be rendered meanwhile.
 using GetEffectsLibraryFunction = IEffectLibrary*(VM_CALL*)();
-// "CanUnloadDLLNow": true when no library object is alive. Effects are not counted: release them first.
+// "CanUnloadDLLNow": true when no library object is alive. Effects are not counted: release them first. [any thread]
 using CanUnloadDLLNowFunction = bool(VM_CALL*)();
 
 }  // namespace velmora

@@ -6,7 +6,7 @@
 #include <memory>
 #include <new>
 
-#include "platform/win32_handles.h"
+#include "platform/win32.h"
 
 namespace velmora::support {
 namespace {

@@ -5,8 +5,8 @@
 
 #include <optional>
 
-#include "platform/win32_handles.h"
-#include "text/win32_text.h"
+#include "platform/win32.h"
+#include "text/code_page.h"
 
 namespace velmora::support {
 namespace {
@@ -54,17 +54,37 @@ class HelpControl {
 
 constinit HelpControl helpControl;
 
+std::u16string ExistingShortPath(const std::u16string& path) {
+    const DWORD size = GetShortPathNameW(win32::Wide(path.c_str()), nullptr, 0);
+    if (size == 0) return {};
+    std::u16string shortPath(size, u'\0');
+    const DWORD length =
+        GetShortPathNameW(win32::Wide(path.c_str()), reinterpret_cast<wchar_t*>(shortPath.data()), size);
+    if (length == 0 || length >= size) return {};
+    shortPath.resize(length);
+    return shortPath;
+}
+
+// The short path of a file. When the file is missing, its folder's short path with the file's own name; empty when
+// the folder has none.
+std::u16string ShortPath(const std::u16string& path) {
+    if (std::u16string found = ExistingShortPath(path); !found.empty()) return found;
+    const std::size_t nameStart = path.find_last_of(u"/\\") + 1;
+    std::u16string folder = ExistingShortPath(path.substr(0, nameStart));
+    return folder.empty() ? folder : folder + path.substr(nameStart);
+}
+
 // An 8-bit form that names the same file: the path itself, else its short path; nothing when there is neither.
 std::optional<std::string> EightBitPath(const std::u16string& path) {
-    if (std::optional<std::string> exact = win32::ExactNarrow(path)) return exact;
-    const std::u16string shortPath = win32::ShortPath(path);
-    return shortPath.empty() ? std::nullopt : win32::ExactNarrow(shortPath);
+    if (std::optional<std::string> exact = NarrowExactly(path)) return exact;
+    const std::u16string shortPath = ShortPath(path);
+    return shortPath.empty() ? std::nullopt : NarrowExactly(shortPath);
 }
 
 }  // namespace
 
 void HelpLauncher::SetFile(std::u16string folder, const std::string& fileName) {
-    m_path = std::move(folder) + win32::Widen(fileName);
+    m_path = std::move(folder) + Widen(fileName);
 }
 
 std::int32_t HelpLauncher::Show(void* owner, std::int32_t topic, bool externalViewer) const {

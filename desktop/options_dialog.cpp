@@ -8,13 +8,13 @@
 
 #include "help/topics.h"
 #include "desktop/bit_button.h"
-#include "desktop/product.h"
 #include "desktop/resource_ids.h"
-#include "platform/win32_handles.h"
-#include "text/win32_text.h"
+#include "platform/win32.h"
 
 namespace velmora::support {
 namespace {
+
+constexpr wchar_t kWebPage[] = L"https://www.velmora.example/reel-effects";  // of the maker
 
 constexpr RECT kLogoPlace = {10, 8, 230, 40};  // in dialog units
 
@@ -123,15 +123,15 @@ void OptionsDialog::CreateLogo() noexcept {
 
 void OptionsDialog::SetTexts() noexcept {
     char version[64];
-    std::snprintf(version, sizeof version, "Version %d.%d", kVersionMajor, kVersionMinor);
+    std::snprintf(version, sizeof version, "Version %d.%d", kReelEffectsMajor, kReelEffectsMinor);
     TranslationHelper& texts = *m_parts.texts;
     const auto set = [&](int control, const char* key, const char* fallback) {
         SetDlgItemTextW(m_window, control, win32::Wide(texts.Translate(kTextsOfOptions, key, fallback)));
     };
-    set(VM_TEXT_PRODUCT, "ProductName", kProductText);
+    set(VM_TEXT_PRODUCT, "ProductName", kLibraryName);
     set(VM_TEXT_VERSION, "Version", version);
     set(VM_TEXT_OPTIONS, "Options", "Options");
-    SetWindowTextW(m_window, win32::Wide(texts.Translate(kTextsOfOptions, "Title", kProductText)));
+    SetWindowTextW(m_window, win32::Wide(texts.Translate(kTextsOfOptions, "Title", kLibraryName)));
     // Texts stand as they are: a translation brings its letter for the Alt key with it, and OK and Cancel have
     // theirs, Enter and Escape.
     set(VM_CHECK_KNOBS_VERTICAL, "Up/Down Knobs Control", "Up / Down mouse control of circular knobs");

@@ -1,6 +1,9 @@
 // What the user prefers, for all hosts: kept in the registry. Windows only; the user-interface thread.
 #pragma once
 
+#include <optional>
+#include <string>
+
 namespace velmora::support {
 
 class Preferences {
@@ -17,5 +20,14 @@ class Preferences {
   private:
     bool m_knobsDragVertical = false;
 };
+
+// Texts under "Software\Velmora\<section>" of the registry, in which preferences are kept. The current user's key is
+// read first, then the machine's; writing goes to the user's.
+
+// The text of a setting; nothing when neither key holds a text of at most 1024 bytes that may be read.
+[[nodiscard]] std::optional<std::string> ReadSetting(const char* section, const char* name);
+
+// Stores a text with its terminator and makes the key when it is missing; false when the registry refuses.
+bool WriteSetting(const char* section, const char* name, const char* text);
 
 }  // namespace velmora::support

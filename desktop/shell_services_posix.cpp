@@ -7,7 +7,7 @@ namespace {
 
 class PortableShellServices final : public IShellServices {
   public:
-    bool VM_CALL Start(void*, IUnknown*, const char*, std::int32_t) override {
+    bool VM_CALL Start(void*, com::IUnknown*, const char*, std::int32_t) override {
         const bool starts = !m_started;
         m_started = true;
         return starts;
@@ -31,12 +31,12 @@ IShellServices& ShellServices() noexcept {
     return services;
 }
 
-void OfferTextSource(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept {
+void OfferTextSource(ModuleHandle module, com::IUnknown* library, const char* helpFileName) noexcept {
     services.sources.Add(library);
     services.Start(module, library, helpFileName, 1);
 }
 
-void WithdrawTextSource(IUnknown* library) noexcept {
+void WithdrawTextSource(com::IUnknown* library) noexcept {
     services.sources.Remove(library);
     if (services.sources.Count() == 0) services.ShutDown();
 }

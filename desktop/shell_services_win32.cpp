@@ -11,8 +11,7 @@
 #include "desktop/resource_ids.h"
 #include "desktop/shell_services.h"
 #include "desktop/text_sources.h"
-#include "platform/win32_handles.h"
-#include "text/win32_text.h"
+#include "platform/win32.h"
 
 namespace velmora::support {
 namespace {
@@ -29,29 +28,21 @@ std::string UserInterfaceLanguage() {
     return code;
 }
 
-// The module that this code and the dialogs' templates lie in, whichever module a host starts the services for.
-HMODULE OwnModule() noexcept {
-    HMODULE module = nullptr;
-    GetModuleHandleExW(GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,
-                       reinterpret_cast<const wchar_t*>(reinterpret_cast<const void*>(&OwnModule)), &module);
-    return module;
-}
-
 class WindowsShellServices final : public IShellServices {
   public:
-    bool VM_CALL Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
+    bool VM_CALL Start(void* moduleHandle, com::IUnknown* textSource, const char* helpFileName,
                        std::int32_t dialogs) override;
     bool VM_CALL KnobsDragVertical() override { return m_preferences.KnobsDragVertical(); }
     std::int32_t VM_CALL ShowOptions(void* owner) override;
     void VM_CALL ShutDown() override;
     std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic, std::int32_t externalViewer) override;
 
-    void Offer(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept;
-    void Withdraw(IUnknown* library) noexcept;
+    void Offer(ModuleHandle module, com::IUnknown* library, const char* helpFileName) noexcept;
+    void Withdraw(com::IUnknown* library) noexcept;
 
   private:
     void LoadDialogParts(const std::u16string& folder);
-    void UseTextSource(IUnknown* source, const char* languageCode) noexcept;
+    void UseTextSource(com::IUnknown* source, const char* languageCode) noexcept;
 
     HMODULE m_module = nullptr;  // in whose folder the library's files lie; null: not started
     win32::Module m_resources;
@@ -59,19 +50,19 @@ class WindowsShellServices final : public IShellServices {
     HMODULE m_buttonModule = nullptr;  // for which the button class is registered; null: it is not
     Preferences m_preferences;
     TranslationHelper m_texts;
-    IUnknown* m_textSource = nullptr;  // not owned
+    com::IUnknown* m_textSource = nullptr;  // not owned
     HelpLauncher m_help;
     TextSources m_libraries;
     OptionsDialog* m_dialog = nullptr;  // while one is shown
 };
 
-void WindowsShellServices::UseTextSource(IUnknown* source, const char* languageCode) noexcept {
+void WindowsShellServices::UseTextSource(com::IUnknown* source, const char* languageCode) noexcept {
     m_textSource = source;
     m_texts.SetContext(source, languageCode);
 }
 
-bool VM_CALL WindowsShellServices::Start(void* moduleHandle, IUnknown* textSource, const char* helpFileName,
-                                         std::int32_t dialogs) try {
+bool VM_CALL WindowsShellServices::Start(void* moduleHandle, com::IUnknown* textSource,
+                                         const char* helpFileName, std::int32_t dialogs) try {
     const FloatGuard guard;
     if (m_module != nullptr || moduleHandle == nullptr) return false;
     m_module = static_cast<HMODULE>(moduleHandle);
@@ -107,7 +98,8 @@ std::int32_t VM_CALL WindowsShellServices::ShowOptions(void* owner) try {
         return 0;
     }
     UseTextSource(m_textSource, UserInterfaceLanguage().c_str());
-    OptionsDialog dialog({.templates = OwnModule(),
+    // The dialogs' templates lie in this module, whichever one a host starts the services for.
+    OptionsDialog dialog({.templates = static_cast<HMODULE>(OwnModule()),
                           .buttonModule = m_buttonModule,
                           .logo = m_logo.get(),
                           .texts = &m_texts,
@@ -141,7 +133,8 @@ std::int32_t VM_CALL WindowsShellServices::ShowHelp(void* owner, std::int32_t to
     return 0;
 }
 
-void WindowsShellServices::Offer(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept {
+void WindowsShellServices::Offer(ModuleHandle module, com::IUnknown* library,
+                                 const char* helpFileName) noexcept {
     constexpr std::int32_t kShowsDialogs = 1;
     m_libraries.Add(library);
     if (!Start(module, library, helpFileName, kShowsDialogs) && m_textSource == nullptr) {
@@ -149,7 +142,7 @@ void WindowsShellServices::Offer(ModuleHandle module, IUnknown* library, const c
     }
 }
 
-void WindowsShellServices::Withdraw(IUnknown* library) noexcept {
+void WindowsShellServices::Withdraw(com::IUnknown* library) noexcept {
     m_libraries.Remove(library);
     if (m_libraries.Count() == 0) {
         ShutDown();
@@ -172,11 +165,11 @@ IShellServices& ShellServices() noexcept {
     return Services();
 }
 
-void OfferTextSource(ModuleHandle module, IUnknown* library, const char* helpFileName) noexcept {
+void OfferTextSource(ModuleHandle module, com::IUnknown* library, const char* helpFileName) noexcept {
     Services().Offer(module, library, helpFileName);
 }
 
-void WithdrawTextSource(IUnknown* library) noexcept {
+void WithdrawTextSource(com::IUnknown* library) noexcept {
     Services().Withdraw(library);
 }
 

@@ -14,7 +14,7 @@ namespace velmora::support {
 // goes.
 class TextSources {
   public:
-    void Add(IUnknown* library) noexcept {
+    void Add(com::IUnknown* library) noexcept {
         ++m_count;
         try {
             m_sources.push_back(library);
@@ -22,19 +22,19 @@ class TextSources {
             // The library counts all the same; its texts are asked for only while no other is needed.
         }
     }
-    void Remove(IUnknown* library) noexcept {
+    void Remove(com::IUnknown* library) noexcept {
         if (m_count > 0) --m_count;
         std::erase(m_sources, library);
         if (m_count == 0) m_sources = {};  // nothing stays allocated in a module about to be unloaded
     }
     // The oldest living library object, null when there is none.
-    [[nodiscard]] IUnknown* Current() const noexcept {
+    [[nodiscard]] com::IUnknown* Current() const noexcept {
         return m_sources.empty() ? nullptr : m_sources.front();
     }
     [[nodiscard]] std::size_t Count() const noexcept { return m_count; }
 
   private:
-    std::vector<IUnknown*> m_sources;
+    std::vector<com::IUnknown*> m_sources;
     std::size_t m_count = 0;
 };
 

@@ -3,6 +3,7 @@
 #include <new>
 #include <span>
 
+#include "api/host_api.h"
 #include "effects/effect_queries.h"
 #include "platform/float_guard.h"
 #include "effects/render_session.h"
@@ -12,27 +13,8 @@
 namespace velmora::effects {
 namespace {
 
-// A host that lives on the stack for one frame: it is not counted and answers nothing but values.
-class LocalHost : public IVideoHost {
-  public:
-    Status VM_CALL QueryInterface(const Guid*, void** out) final {
-        if (out == nullptr) return kStatusFailure;
-        *out = nullptr;
-        return kStatusNoInterface;
-    }
-    std::uint32_t VM_CALL AddRef() final { return 1; }
-    std::uint32_t VM_CALL Release() final { return 1; }
-    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) final { return false; }
-    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) final { return 0; }
-    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) final { return false; }
-    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) final {}
-
-  protected:
-    ~LocalHost() = default;
-};
-
 // Serves the values of the effect's own parameters.
-class OwnValues final : public LocalHost {
+class OwnValues final : public PlainHost {
   public:
     explicit OwnValues(std::span<const ValueWord> values) noexcept : m_values(values) {}
     bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override {
@@ -46,7 +28,7 @@ class OwnValues final : public LocalHost {
 };
 
 // Serves the master settings: what an effect object's host face is to the renderer.
-class MasterFace final : public LocalHost {
+class MasterFace final : public PlainHost {
   public:
     MasterFace(const EffectTable& effect, std::span<const ValueWord> values) noexcept
         : m_effect(effect), m_own(values) {}

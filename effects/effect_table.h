@@ -7,21 +7,9 @@
 #include <span>
 
 #include "api/host_api.h"
+#include "effects/master_table.h"
 
 namespace velmora::effects {
-
-// The renderer's settings in the order in which it asks for them.
-// clang-format off
-enum class Master : std::uint32_t {
-    kYJitter, kXJitter, kBorder,
-    kFlicker, kFlickerSpeed, kBrightness, kContrast,
-    kSaturation, kTintColour, kTint, kFilmGamma,
-    kGlow,
-    kWear, kPattern, kBlueChannelOnly,
-    kSpots, kScratches, kDepth, kBlack, kWhite, kThick,
-};
-// clang-format on
-inline constexpr std::uint32_t kMasterCount = 21;
 
 struct Layout {
     std::int32_t x, y, width, height;
@@ -57,10 +45,10 @@ struct MasterAnswer {
 struct EffectTable {
     const char* name;
     std::span<const ParamRow> params;
-    std::span<const char* const> presetNames;  // alphabetical
-    std::span<const PresetCell> presetCells;   // preset major: [preset * params.size() + parameter]
-    std::array<MasterAnswer, kMasterCount> answers;
-    bool marksSliders;  // writes 1 behind a slider's maximum
+    std::span<const char* const> presetNames;        // alphabetical
+    std::span<const PresetCell> presetCells;         // preset major: [preset * params.size() + parameter]
+    std::array<MasterAnswer, kMasterCount> answers;  // by master index
+    bool marksSliders;                               // writes 1 behind a slider's maximum
 };
 
 // The five effects in the order in which the library offers them.
@@ -71,9 +59,5 @@ extern const EffectTable kFilmExpress;
 extern const EffectTable kFilmPro;
 inline constexpr std::array<const EffectTable*, 5> kAllEffects = {&kFilmCamera, &kFilmLook, &kFilmDamage,
                                                                   &kFilmExpress, &kFilmPro};
-
-// The texts of the "Pattern" menu, in item order.
-inline constexpr std::array<const char*, 7> kPatternItems = {"Wavy",     "Blotchy", "Grainy", "Fine",
-                                                             "Splotchy", "Lite",    "Crackly"};
 
 }  // namespace velmora::effects

@@ -33,31 +33,11 @@ constexpr PresetRow<5> kPresets[] = {
     Preset("Train Ride",                     0.6,    4.9, 0xFF000000,      29,      14),
 };
 
-constexpr AnswerRow kSettings[] = {
-    Own(         Master::kYJitter,         "Y Jitter"),
-    Own(         Master::kXJitter,         "X Jitter"),
-    Own(         Master::kBorder,          "Border"),
-    Own(         Master::kFlicker,         "Flicker"),
-    Own(         Master::kFlickerSpeed,    "Flicker Rate"),
-    Fixed(       Master::kBrightness,      0.5),
-    Fixed(       Master::kContrast,        0.5),
-    Fixed(       Master::kSaturation,      0.5),
-    FixedColour( Master::kTintColour,      0xFF000000),
-    Fixed(       Master::kTint,            0.5),
-    Fixed(       Master::kFilmGamma,       0.0),
-    Fixed(       Master::kGlow,            0.0),
-    Fixed(       Master::kWear,            0.0),
-    FixedItem(   Master::kPattern,         kBlotchy),
-    Fixed(       Master::kBlueChannelOnly, kOff),
-    Fixed(       Master::kSpots,           0.0),
-    Fixed(       Master::kScratches,       0.0),
-    Fixed(       Master::kDepth,           0.0),
-    Fixed(       Master::kBlack,           kOff),
-    Fixed(       Master::kWhite,           kOff),
-    Fixed(       Master::kThick,           kOff),
-};
-
 // clang-format on
+
+constexpr AnswerRow kSettings[] = {
+    Own(Master::kFlickerSpeed, "Flicker Rate"),
+};
 
 constexpr auto kPresetNames = NamesOf(kPresets);
 constexpr auto kPresetCells = StorePresets(kParams, kPresets);

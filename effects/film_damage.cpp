@@ -40,31 +40,11 @@ constexpr PresetRow<9> kPresets[] = {
     Preset("Water Damage",    89,    kWavy,     kOn,  74.5,    38.5,  42.5,   kOn,  kOff,  kOff),
 };
 
-constexpr AnswerRow kSettings[] = {
-    Fixed(       Master::kYJitter,         0.0),
-    Fixed(       Master::kXJitter,         0.0),
-    FixedColour( Master::kBorder,          0xFF000000),
-    Fixed(       Master::kFlicker,         0.0),
-    Fixed(       Master::kFlickerSpeed,    0.0),
-    Fixed(       Master::kBrightness,      0.5),
-    Fixed(       Master::kContrast,        0.5),
-    Fixed(       Master::kSaturation,      0.5),
-    FixedColour( Master::kTintColour,      0xFF000000),
-    Fixed(       Master::kTint,            0.5),
-    Fixed(       Master::kFilmGamma,       0.0),
-    Fixed(       Master::kGlow,            0.0),
-    Own(         Master::kWear,            "Wear"),
-    Own(         Master::kPattern,         "Pattern"),
-    Own(         Master::kBlueChannelOnly, "Blue Channel Only"),
-    Own(         Master::kSpots,           "Spots"),
-    Own(         Master::kScratches,       "Density"),
-    Own(         Master::kDepth,           "Depth"),
-    Own(         Master::kBlack,           "Black"),
-    Own(         Master::kWhite,           "White"),
-    Own(         Master::kThick,           "Thick"),
-};
-
 // clang-format on
+
+constexpr AnswerRow kSettings[] = {
+    Own(Master::kScratches, "Density"),
+};
 
 constexpr auto kPresetNames = NamesOf(kPresets);
 constexpr auto kPresetCells = StorePresets(kParams, kPresets);

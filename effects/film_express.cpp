@@ -45,31 +45,13 @@ constexpr PresetRow<9> kPresets[] = {
     Preset("Vivid",              0,       0, 0x00F0DCCC,   23,        100,  98.5,    0,     0,         0),
 };
 
-constexpr AnswerRow kSettings[] = {
-    Own(         Master::kYJitter,         "Jitter"),
-    Own(         Master::kXJitter,         "Jitter"),
-    FixedColour( Master::kBorder,          0xFF000000),
-    Own(         Master::kFlicker,         "Flicker"),
-    Fixed(       Master::kFlickerSpeed,    0.2),
-    Fixed(       Master::kBrightness,      0.5),
-    Fixed(       Master::kContrast,        0.5),
-    Own(         Master::kSaturation,      "Saturation"),
-    Own(         Master::kTintColour,      "Tint"),
-    Own(         Master::kTint,            "Tint"),
-    Own(         Master::kFilmGamma,       "Film Gamma"),
-    Fixed(       Master::kGlow,            0.0),
-    Own(         Master::kWear,            "Wear"),
-    FixedItem(   Master::kPattern,         kBlotchy),
-    Fixed(       Master::kBlueChannelOnly, kOff),
-    Own(         Master::kSpots,           "Spots"),
-    Own(         Master::kScratches,       "Scratches"),
-    DepthOf(     Master::kDepth,           "Scratches"),
-    Fixed(       Master::kBlack,           kOn),
-    Fixed(       Master::kWhite,           kOn),
-    Fixed(       Master::kThick,           kOn),
-};
-
 // clang-format on
+
+constexpr AnswerRow kSettings[] = {
+    Own(Master::kYJitter, "Jitter"),      Own(Master::kXJitter, "Jitter"), Fixed(Master::kFlickerSpeed, 0.2),
+    DepthOf(Master::kDepth, "Scratches"), Fixed(Master::kBlack, kOn),      Fixed(Master::kWhite, kOn),
+    Fixed(Master::kThick, kOn),
+};
 
 constexpr auto kPresetNames = NamesOf(kPresets);
 constexpr auto kPresetCells = StorePresets(kParams, kPresets);

@@ -56,31 +56,12 @@ constexpr PresetRow<7> kPresets[] = {
     Preset("Washed Out",        0x00F4F3E8,  100,        -28,         52,       80,   100,         0),
 };
 
-constexpr AnswerRow kSettings[] = {
-    Fixed(       Master::kYJitter,         0.0),
-    Fixed(       Master::kXJitter,         0.0),
-    FixedColour( Master::kBorder,          0x00000000),  // no top byte, unlike the others; no border shows
-    Fixed(       Master::kFlicker,         0.0),
-    Fixed(       Master::kFlickerSpeed,    0.0),
-    Own(         Master::kBrightness,      "Brightness"),
-    Own(         Master::kContrast,        "Contrast"),
-    Own(         Master::kSaturation,      "Saturation"),
-    Own(         Master::kTintColour,      "Tint"),
-    Own(         Master::kTint,            "Tint"),
-    Own(         Master::kFilmGamma,       "Film Gamma"),
-    Own(         Master::kGlow,            "Diffusion"),
-    Fixed(       Master::kWear,            0.0),
-    FixedItem(   Master::kPattern,         kBlotchy),
-    Fixed(       Master::kBlueChannelOnly, kOff),
-    Fixed(       Master::kSpots,           0.0),
-    Fixed(       Master::kScratches,       0.0),
-    Fixed(       Master::kDepth,           0.0),
-    Fixed(       Master::kBlack,           kOff),
-    Fixed(       Master::kWhite,           kOff),
-    Fixed(       Master::kThick,           kOff),
-};
-
 // clang-format on
+
+constexpr AnswerRow kSettings[] = {
+    FixedColour(Master::kBorder, 0x00000000),  // no top byte, unlike the others; no border shows
+    Own(Master::kGlow, "Diffusion"),
+};
 
 constexpr auto kPresetNames = NamesOf(kPresets);
 constexpr auto kPresetCells = StorePresets(kParams, kPresets);

@@ -71,31 +71,13 @@ constexpr PresetRow<19> kPresets[] = {
     Preset("Worn Color Print",   1.25,    1.1,      15,    11.5, 0x00FFFFFF,    0,        -68,          0,        0,     0,         0, 21.5,    94,  kBlotchy,      40,  60.5,   kOn,   kOn,   kOn),
 };
 
-constexpr AnswerRow kSettings[] = {
-    Own(         Master::kYJitter,         "Y Jitter"),
-    Own(         Master::kXJitter,         "X Jitter"),
-    FixedColour( Master::kBorder,          0xFF000000),
-    Own(         Master::kFlicker,         "Flicker"),
-    Own(         Master::kFlickerSpeed,    "Flicker Rate"),
-    Own(         Master::kBrightness,      "Brightness"),
-    Own(         Master::kContrast,        "Contrast"),
-    Own(         Master::kSaturation,      "Saturation"),
-    Own(         Master::kTintColour,      "Tint"),
-    Own(         Master::kTint,            "Tint"),
-    Own(         Master::kFilmGamma,       "Film Gamma"),
-    Own(         Master::kGlow,            "Diffusion"),
-    Own(         Master::kWear,            "Wear"),
-    Own(         Master::kPattern,         "Pattern"),
-    Fixed(       Master::kBlueChannelOnly, kOff),
-    Own(         Master::kSpots,           "Spots"),
-    Own(         Master::kScratches,       "Density"),
-    Own(         Master::kDepth,           "Depth"),
-    Own(         Master::kBlack,           "Black"),
-    Own(         Master::kWhite,           "White"),
-    Own(         Master::kThick,           "Thick"),
-};
-
 // clang-format on
+
+constexpr AnswerRow kSettings[] = {
+    Own(Master::kFlickerSpeed, "Flicker Rate"),
+    Own(Master::kGlow, "Diffusion"),
+    Own(Master::kScratches, "Density"),
+};
 
 constexpr auto kPresetNames = NamesOf(kPresets);
 constexpr auto kPresetCells = StorePresets(kParams, kPresets);

@@ -1,10 +1,10 @@
-// The master settings list: the 21 settings of the renderer, with group markers between them, in the order
-// in which every frame reads them.
+// The master settings list: the rows of effects/master_table.h as objects that hold the present values.
 #pragma once
 
 #include <array>
 #include <cstdint>
 
+#include "effects/master_table.h"
 #include "effects/params.h"
 #include "render/stage_settings.h"
 
@@ -34,16 +34,19 @@ class MasterSettingsList {
     void Append(CRsFX_Param* entry) noexcept { m_entries[m_count++] = entry; }
     // The first entry with this id when it is of this kind; null otherwise.
     [[nodiscard]] CRsFX_Param* Find(std::uint32_t id, std::uint32_t code) const noexcept;
+    [[nodiscard]] CRsFX_Param* Find(Master setting, std::uint32_t code) const noexcept {
+        return Find(static_cast<std::uint32_t>(setting), code);
+    }
 
     // Typed getters: leave the destination alone when there is no such entry. They compute in double
     // precision and narrow when they write.
-    void GetPercentRaw(std::uint32_t id, float& value) const noexcept;
-    void GetPercentNormalised(std::uint32_t id, float& value) const noexcept;  // 0..1 over the range
-    void GetPercentSigned(std::uint32_t id, float& value) const noexcept;      // 2 * normalised - 1
-    void GetInteger(std::uint32_t id, std::int32_t& value) const noexcept;
-    void GetCheckBox(std::uint32_t id, bool& value) const noexcept;
-    void GetMenu(std::uint32_t id, std::int32_t& value) const noexcept;
-    void GetColour(std::uint32_t id, std::uint32_t& value) const noexcept;  // 0xFFRRGGBB
+    void GetPercentRaw(Master setting, float& value) const noexcept;
+    void GetPercentNormalised(Master setting, float& value) const noexcept;  // 0..1 over the range
+    void GetPercentSigned(Master setting, float& value) const noexcept;      // 2 * normalised - 1
+    void GetInteger(Master setting, std::int32_t& value) const noexcept;
+    void GetCheckBox(Master setting, bool& value) const noexcept;
+    void GetMenu(Master setting, std::int32_t& value) const noexcept;
+    void GetColour(Master setting, std::uint32_t& value) const noexcept;  // 0xFFRRGGBB
 
   private:
     std::array<CRsFX_Param*, kCapacity> m_entries{};  // ends with the first null

@@ -4,18 +4,10 @@
 #include "render/renderer.h"
 
 namespace velmora {
-namespace {
-
-render::FrameDescription Describe(const FrameRecord& record) noexcept {
-    return {record.pixels, record.width, record.height, record.rowStep, record.xOrigin, record.yOrigin};
-}
-
-}  // namespace
-
 bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameRecord* source,
                  const FrameRecord* destination, const TimingRecord* timing) noexcept {
     if (source == nullptr || destination == nullptr || timing == nullptr) return false;
-    render::FrameContext context(Describe(*source), Describe(*destination));
+    render::FrameContext context(DescriptionOf(*source), DescriptionOf(*destination));
     context.SetTime(timing->frameTime);
     // A frame that turns out to be invalid still counts as the last one.
     session.state->random.BeginFrame(context.FrameNumber());

@@ -5,6 +5,7 @@
 
 #include "api/host_api.h"
 #include "effects/master_settings.h"
+#include "render/image.h"
 #include "render/render_state.h"
 #include "render/renderer.h"
 
@@ -16,6 +17,11 @@ struct RenderSession {
     render::RenderOptions options;
     std::uint32_t hostSeed = 0;  // StageSettings::hostSeed; the library's hosts give none
 };
+
+// A host's frame as the renderer takes it.
+[[nodiscard]] inline render::FrameDescription DescriptionOf(const FrameRecord& frame) noexcept {
+    return {frame.pixels, frame.width, frame.height, frame.rowStep, frame.xOrigin, frame.yOrigin};
+}
 
 // Renders one frame: builds the views, moves the random state on, reads every exposed setting through
 // `face` (an effect's host face) and runs the stages. False when a frame or `timing` is missing or invalid;

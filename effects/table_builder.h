@@ -123,7 +123,8 @@ consteval std::array<const char*, kPresets> NamesOf(const PresetRow<kValues> (&p
 }
 
 // ---------------------------------------------------------------------------------------------------------
-// The setting map: one row for each setting of the renderer, in its order.
+// The setting map. A setting is answered by the parameter that has its name and kind, or else by its neutral value;
+// a row is written for a setting that is answered in another way.
 
 struct AnswerRow {
     Master master;
@@ -146,46 +147,63 @@ consteval AnswerRow Fixed(Master master, double normalised) {
 consteval AnswerRow FixedColour(Master master, std::uint32_t word) {
     return {master, MasterAnswer::Source::kWord, nullptr, word, kKindColour};
 }
-consteval AnswerRow FixedItem(Master master, Pattern item) {
-    return {master, MasterAnswer::Source::kWord, nullptr, item, kKindMenu};
-}
 consteval AnswerRow Fixed(Master master, Flag flag) {
     return {master, MasterAnswer::Source::kFlag, nullptr, flag, kKindCheckBox};
 }
 
-consteval ParamKind KindOf(Master master) {
-    switch (master) {
-        case Master::kBorder:
-        case Master::kTintColour:
-            return kKindColour;
-        case Master::kPattern:
-            return kKindMenu;
-        case Master::kBlueChannelOnly:
-        case Master::kBlack:
-        case Master::kWhite:
-        case Master::kThick:
-            return kKindCheckBox;
-        default:
-            return kKindSlider;
-    }
+consteval MasterAnswer NeutralAnswer(const MasterRow& row) {
+    const std::uint32_t word = row.HostKind() == kKindSlider
+                                   ? StoredSlider(row.neutral, row.minimum, row.maximum).bits
+                                   : StoredWord(row.neutral, 4294967296.0);
+    const auto source =
+        row.HostKind() == kKindCheckBox ? MasterAnswer::Source::kFlag : MasterAnswer::Source::kWord;
+    return {source, 0, {.bits = word}};
 }
 
-// Name and kind together find the parameter: a colour and its amount may share a name.
-consteval std::uint32_t OwnIndex(std::span<const ParamRow> params, const AnswerRow& row) {
-    for (std::uint32_t i = 0; i < params.size(); ++i) {
-        if (params[i].kind == KindOf(row.master) && std::string_view(params[i].name) == row.own) return i;
+// Name and kind together find the parameter: a colour and its amount may share a name. The number of parameters when
+// there is none.
+consteval std::uint32_t OwnIndex(std::span<const ParamRow> params, ParamKind kind, std::string_view name) {
+    std::uint32_t index = 0;
+    while (index < params.size() && (params[index].kind != kind || params[index].name != name)) ++index;
+    return index;
+}
+
+consteval MasterAnswer AnswerOf(const MasterRow& setting, std::span<const ParamRow> params,
+                                std::span<const AnswerRow> rows) {
+    for (const AnswerRow& row : rows) {
+        if (row.master != setting.Setting()) continue;
+        if (row.own == nullptr) {
+            if (row.kind != setting.HostKind()) throw "a fixed value is of another kind";
+            return {row.source, 0, {.bits = row.word}};
+        }
+        const std::uint32_t own = OwnIndex(params, setting.HostKind(), row.own);
+        if (own == params.size()) throw "a setting names a parameter that the effect does not have";
+        return {row.source, own, {}};
     }
-    throw "a setting names a parameter that the effect does not have";
+    const std::uint32_t own = OwnIndex(params, setting.HostKind(), setting.name);
+    if (own == params.size()) return NeutralAnswer(setting);
+    return {MasterAnswer::Source::kOwn, own, {}};
+}
+
+consteval bool IsAsked(std::uint32_t param, std::span<const MasterAnswer> answers) {
+    for (const MasterAnswer& answer : answers) {
+        const bool isFixed =
+            answer.source == MasterAnswer::Source::kWord || answer.source == MasterAnswer::Source::kFlag;
+        if (!isFixed && answer.own == param) return true;
+    }
+    return false;
 }
 
 consteval std::array<MasterAnswer, kMasterCount> MapSettings(std::span<const ParamRow> params,
-                                                             const AnswerRow (&rows)[kMasterCount]) {
+                                                             std::span<const AnswerRow> rows) {
     std::array<MasterAnswer, kMasterCount> answers{};
-    for (std::uint32_t i = 0; i < kMasterCount; ++i) {
-        const AnswerRow& row = rows[i];
-        if (row.master != Master{i}) throw "the settings are out of order";
-        if (row.own == nullptr && row.kind != KindOf(row.master)) throw "a fixed value is of another kind";
-        answers[i] = {row.source, row.own == nullptr ? 0 : OwnIndex(params, row), {.bits = row.word}};
+    std::size_t index = 0;
+    for (const MasterRow& setting : kMasterRows) {
+        if (setting.IsSetting()) answers[index++] = AnswerOf(setting, params, rows);
+    }
+    for (std::uint32_t param = 0; param < params.size(); ++param) {
+        if (params[param].kind != kKindGroup && !IsAsked(param, answers))
+            throw "a parameter answers no setting";
     }
     return answers;
 }

@@ -1,7 +1,5 @@
 #include "effects/velmora_effect.h"
 
-#include <new>
-
 #include "platform/float_guard.h"
 #include "effects/process_state.h"
 
@@ -19,9 +17,7 @@ std::uint32_t VM_CALL CRsVelmoraEffect::AddRef() {
 }
 
 std::uint32_t VM_CALL CRsVelmoraEffect::Release() {
-    const std::uint32_t left = m_references.Drop();
-    if (left == 0) ::operator delete(this);
-    return left;
+    return m_references.Drop();
 }
 
 const char* VM_CALL CRsVelmoraEffect::GetName() {

@@ -11,8 +11,7 @@ class CRsVelmoraEffect final : public IVideoEffect {
   public:
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
     std::uint32_t VM_CALL AddRef() override;
-    // At zero the storage is freed and no destructor runs: there is nothing to destroy. Inside an effect
-    // the count stays at its first reference.
+    // Counts only: the storage belongs to the effect that contains this object.
     std::uint32_t VM_CALL Release() override;
     const char* VM_CALL GetName() override;
     std::int32_t VM_CALL GetKind() override;

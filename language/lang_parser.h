@@ -10,7 +10,7 @@ namespace velmora {
 
 // Holds the texts of one language file. Answers to IUnknown only. One thread at a time; the references may be
 // counted on any thread.
-class LangXMLParser : public IUnknown {
+class LangXMLParser : public com::IUnknown {
   public:
     // Not used; always 0.
     virtual std::int32_t VM_CALL Reserved3() = 0;
@@ -20,16 +20,12 @@ class LangXMLParser : public IUnknown {
     // anywhere, or when memory is short: the texts are then those of the last file that was read, if any.
     virtual bool VM_CALL Load(const char16_t* path) = 0;
 
-    // GetText with a fallback, as seven words (pointers and 32-bit integers, widened where words are wider):
-    //   languageCode, category, key   as in GetText
-    //   fallback                      const char16_t*, zero-terminated, may be null
-    //   buffer, capacity              as in GetText
-    //   found                         std::int32_t*, may be null: 1 when there is such a text, else 0
-    // When there is no such text the fallback is written, by the same rules; without a fallback an empty text
-    // is. Returns the characters written, without the terminator.
-    virtual std::int32_t VM_CALL LookUpText(std::intptr_t languageCode, std::intptr_t category,
-                                            std::intptr_t key, std::intptr_t fallback, std::intptr_t buffer,
-                                            std::intptr_t capacity, std::intptr_t found) = 0;
+    // GetText with a fallback. When there is no such text `fallback` (zero-terminated, may be null) is written by the same
+    // rules; without a fallback an empty text is. `found` (may be null) is set to 1 when there is such a text, else to 0.
+    // Returns the characters written, without the terminator.
+    virtual std::int32_t VM_CALL LookUpText(const char* languageCode, std::int32_t category, const char* key,
+                                            const char16_t* fallback, char16_t* buffer, std::int32_t capacity,
+                                            std::int32_t* found) = 0;
 
     // Writes the text of a key into `buffer`, which holds `capacity` 16-bit characters: always terminated,
     // and cut where the buffer is too small, never inside a surrogate pair. Returns the characters written,

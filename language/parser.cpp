@@ -1,7 +1,7 @@
-#include "language/parser.h"
+// The object behind LangXMLParser, and the exports of the language module, whose names come undecorated from VMLang.def
+// on Windows.
 
 #include <atomic>
-#include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <ios>
@@ -10,7 +10,9 @@
 #include <string>
 #include <utility>
 
-#include "language/copy_text.h"
+#include "api/com_object.h"
+#include "text/utf.h"
+#include "language/lang_parser.h"
 #include "language/language_table.h"
 
 namespace velmora::language {
@@ -43,18 +45,15 @@ class Parser final : public LangXMLParser {
     Parser& operator=(const Parser&) = delete;
 
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override {
-        if (!out) return kStatusFailure;
-        *out = nullptr;
-        if (!iid || std::memcmp(iid, &kIidUnknown, sizeof(Guid)) != 0) return kStatusNoInterface;
-        *out = static_cast<IUnknown*>(this);
-        AddRef();
-        return kStatusOk;
+        const Status status = FindFace({{&kIidUnknown, static_cast<LangXMLParser*>(this)}}, iid, out);
+        if (status == kStatusOk) m_references.Add();
+        return status;
     }
 
-    std::uint32_t VM_CALL AddRef() override { return ++m_references; }
+    std::uint32_t VM_CALL AddRef() override { return m_references.Add(); }
 
     std::uint32_t VM_CALL Release() override {
-        const std::uint32_t left = --m_references;
+        const std::uint32_t left = m_references.Drop();
         if (left == 0) delete this;
         return left;
     }
@@ -75,15 +74,12 @@ class Parser final : public LangXMLParser {
         }
     }
 
-    std::int32_t VM_CALL LookUpText(std::intptr_t languageCode, std::intptr_t category, std::intptr_t key,
-                                    std::intptr_t fallback, std::intptr_t buffer, std::intptr_t capacity,
-                                    std::intptr_t found) override {
-        const char16_t* const text =
-            m_table.Find(reinterpret_cast<const char*>(languageCode), static_cast<std::int32_t>(category),
-                         reinterpret_cast<const char*>(key));
-        if (found != 0) *reinterpret_cast<std::int32_t*>(found) = text ? 1 : 0;
-        return CopyText(text ? text : reinterpret_cast<const char16_t*>(fallback),
-                        reinterpret_cast<char16_t*>(buffer), static_cast<std::int32_t>(capacity));
+    std::int32_t VM_CALL LookUpText(const char* languageCode, std::int32_t category, const char* key,
+                                    const char16_t* fallback, char16_t* buffer, std::int32_t capacity,
+                                    std::int32_t* found) override {
+        const char16_t* const text = m_table.Find(languageCode, category, key);
+        if (found != nullptr) *found = text != nullptr ? 1 : 0;
+        return CopyText(text != nullptr ? text : fallback, buffer, capacity);
     }
 
     std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
@@ -94,18 +90,28 @@ class Parser final : public LangXMLParser {
   private:
     ~Parser() { --liveParsers; }
 
-    std::atomic<std::uint32_t> m_references{1};
+    ReferenceCount m_references;
     LanguageTable m_table;
 };
 
 }  // namespace
 
-LangXMLParser* CreateParser() noexcept {
-    return new (std::nothrow) Parser;
-}
-
-bool NoParserIsAlive() noexcept {
-    return liveParsers == 0;
-}
-
 }  // namespace velmora::language
+
+#if defined(_WIN32)
+#define VM_LANGUAGE_EXPORT
+#else
+#define VM_LANGUAGE_EXPORT __attribute__((visibility("default")))
+#endif
+
+extern "C" {
+
+VM_LANGUAGE_EXPORT velmora::LangXMLParser* VM_CALL GetLangXMLParser() {
+    return new (std::nothrow) velmora::language::Parser;
+}
+
+VM_LANGUAGE_EXPORT bool VM_CALL CanUnloadDLLNow() {
+    return velmora::language::liveParsers == 0;
+}
+
+}  // extern "C"

@@ -3,13 +3,14 @@
 #include <algorithm>
 #include <cstring>
 
+#include "api/reference.h"
 #include "text/strings.h"
 
 namespace velmora {
 
 TranslationHelper::~TranslationHelper() = default;
 
-void TranslationHelper::SetContext(IUnknown* textSource, const char* languageCode) noexcept {
+void TranslationHelper::SetContext(com::IUnknown* textSource, const char* languageCode) noexcept {
     m_text[0] = 0;
     m_textSource = textSource;
     // At most three bytes of the code are looked at: a host may pass a long text.
@@ -30,11 +31,9 @@ const char16_t* TranslationHelper::Translate(std::int32_t category, const char* 
 // The interface is asked for at every lookup and never kept: the source may gain or lose its language file.
 bool TranslationHelper::LookUp(std::int32_t category, const char* key) noexcept {
     if (m_textSource == nullptr) return false;
-    void* face = nullptr;
-    if (m_textSource->QueryInterface(&kIidMultiLingual, &face) != kStatusOk || face == nullptr) return false;
-    auto* texts = static_cast<IMultiLingual*>(face);
+    const auto texts = QueryFor<IMultiLingual>(*m_textSource, kIidMultiLingual);
+    if (!texts) return false;
     const std::int32_t written = texts->GetText(m_languageCode, category, key, m_text, kCapacity);
-    texts->Release();
     m_text[kCapacity - 1] = 0;  // whatever a language module of another maker wrote
     return written > 0;
 }

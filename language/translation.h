@@ -23,7 +23,7 @@ class TranslationHelper {
 
     // Sets who is asked for texts (null: nobody; no reference is taken, the source has to stay alive while it
     // is set) and the language, a two-letter code; any other code, or null, is "en".
-    void SetContext(IUnknown* textSource, const char* languageCode) noexcept;
+    void SetContext(com::IUnknown* textSource, const char* languageCode) noexcept;
 
     // The text for a key, at most 2047 characters; without a translation the fallback (8-bit text in the
     // system code page), which is the key itself when `fallback` is null. Never null; valid until the next
@@ -39,7 +39,7 @@ class TranslationHelper {
 
     char m_languageCode[3] = "en";
     char16_t m_text[kCapacity] = {};
-    IUnknown* m_textSource = nullptr;
+    com::IUnknown* m_textSource = nullptr;
 };
 
 }  // namespace velmora

@@ -3,26 +3,25 @@
 #include <algorithm>
 #include <cstddef>
 #include <cstdint>
-#include <limits>
 
+#include "effects/render_session.h"
 #include "platform/float_guard.h"
 
 namespace velmora {
 namespace {
 
-// The two layouts that a frame record can describe here.
-struct PackedLayout {
-    std::int64_t (*rowBytes)(std::int32_t width) noexcept;
+// The two packings that a frame record can describe here.
+struct Packing {
+    render::RowBytesOf rowBytes;
     std::int64_t (*columnOffset)(std::int32_t column) noexcept;
 };
 
-constexpr PackedLayout kBgra = {[](std::int32_t width) noexcept { return std::int64_t{width} * 4; },
-                                [](std::int32_t column) noexcept { return std::int64_t{column} * 4; }};
+constexpr Packing kBgra = {render::BgraRowBytes, render::BgraRowBytes};
 // A region starts with the group that holds its first pixel.
-constexpr PackedLayout kYcbcr = {render::YcbcrRowBytes,
-                                 [](std::int32_t column) noexcept { return std::int64_t{column} / 2 * 4; }};
+constexpr Packing kYcbcr = {render::YcbcrRowBytes,
+                            [](std::int32_t column) noexcept { return std::int64_t{column} / 2 * 4; }};
 
-// A frame's region as rows in memory order, after the checks that rendering makes as well.
+// A frame's region as rows in memory order.
 struct Region {
     std::uint8_t* first = nullptr;  // null: the frame is not valid
     std::ptrdiff_t step = 0;
@@ -33,29 +32,18 @@ struct Region {
     [[nodiscard]] std::uint8_t* Row(std::int32_t row) const noexcept { return first + step * row; }
 };
 
-Region RegionOf(const FrameRecord* frame, const PackedLayout& layout) noexcept {
-    if (frame == nullptr || frame->pixels == nullptr || frame->width < 1 || frame->height < 1 ||
-        frame->xOrigin < 0 || frame->yOrigin < 0) {
-        return {};
-    }
-    constexpr std::int32_t kMost = std::numeric_limits<std::int32_t>::max();
-    const std::int64_t bufferWidth = std::int64_t{frame->xOrigin} + frame->width;
-    const std::int64_t bufferHeight = std::int64_t{frame->yOrigin} + frame->height;
-    const std::int64_t step = std::abs(std::int64_t{frame->rowStep});
-    if (bufferWidth > kMost || bufferHeight > kMost || step > kMost ||
-        layout.rowBytes(static_cast<std::int32_t>(bufferWidth)) > step ||
-        step * bufferHeight > std::numeric_limits<std::ptrdiff_t>::max()) {
-        return {};
-    }
-    Region region;
-    region.first = static_cast<std::uint8_t*>(frame->pixels);
-    if (frame->rowStep < 0) region.first -= static_cast<std::ptrdiff_t>(step * (bufferHeight - 1));
-    region.first += static_cast<std::ptrdiff_t>(step * frame->yOrigin + layout.columnOffset(frame->xOrigin));
-    region.step = static_cast<std::ptrdiff_t>(step);
-    region.width = frame->width;
-    region.height = frame->height;
-    region.rowBytes = layout.rowBytes(frame->width);
-    return region;
+Region RegionOf(const FrameRecord* frame, const Packing& packing) noexcept {
+    if (frame == nullptr) return {};
+    const render::ImageView view =
+        render::ViewOf(DescriptionOf(*frame), frame->width, frame->height, packing.rowBytes);
+    if (!view.IsValid()) return {};
+    const std::ptrdiff_t step = view.rowStep;
+    return {
+        .first = view.base + step * view.top + static_cast<std::ptrdiff_t>(packing.columnOffset(view.left)),
+        .step = step,
+        .width = frame->width,
+        .height = frame->height,
+        .rowBytes = packing.rowBytes(frame->width)};
 }
 
 bool Overlap(const Region& a, const Region& b) noexcept {

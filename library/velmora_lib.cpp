@@ -6,7 +6,6 @@
 #include "effects/film_effect.h"
 #include "platform/float_guard.h"
 #include "library/frame_processor.h"
-#include "library/module.h"
 #include "effects/velmora_effect.h"
 #include "presets/preset_saver.h"
 #include "desktop/shell_services.h"
@@ -14,7 +13,8 @@
 namespace velmora {
 namespace {
 
-constexpr char kLibraryName[] = "Velmora Reel Effects";
+static_assert(kReelEffectsMajor == VELMORA_VERSION_MAJOR && kReelEffectsMinor == VELMORA_VERSION_MINOR);
+
 constexpr char kHelpFile[] = "VMReelEffects.chm";
 constexpr char16_t kLanguageModule[] = u"VMLang.dll";
 constexpr char16_t kLanguageFile[] = u"VMReelEffectsLang.xml";
@@ -28,7 +28,7 @@ bool AllowsUnload(support::ModuleHandle module) noexcept {
 
 // The path of a file beside the library; empty when it cannot be told.
 std::u16string BesideLibrary(const char16_t* name) noexcept try {
-    std::u16string path = support::ModuleFolder(ModuleHandle());
+    std::u16string path = support::ModuleFolder(support::OwnModule());
     return path.empty() ? path : path + name;
 } catch (...) {
     return {};
@@ -43,7 +43,7 @@ support::ModuleHandle LoadBesideOrByName(const char16_t* name) noexcept {
 }  // namespace
 
 CRsVelmoraLib::CRsVelmoraLib() noexcept {
-    support::OfferTextSource(ModuleHandle(), static_cast<IEffectLibrary*>(this), kHelpFile);
+    support::OfferTextSource(support::OwnModule(), static_cast<IEffectLibrary*>(this), kHelpFile);
     // Frames read only the settings that have been described once.
     if (MasterSettingsList* settings = CurrentMasterSettings()) settings->ExposeAll();
     m_hasLanguage = LoadLanguage(kLanguageModule, kLanguageFile);
@@ -51,8 +51,7 @@ CRsVelmoraLib::CRsVelmoraLib() noexcept {
 
 CRsVelmoraLib::~CRsVelmoraLib() {
     support::WithdrawTextSource(static_cast<IEffectLibrary*>(this));
-    if (m_parser != nullptr) m_parser->Release();
-    m_parser = nullptr;
+    m_parser.Reset();  // its code lies in the module
     FreeLanguageModule();
 }
 
@@ -64,7 +63,7 @@ bool CRsVelmoraLib::FreeLanguageModule() noexcept {
 }
 
 bool CRsVelmoraLib::LoadLanguage(const char16_t* moduleName, const char16_t* fileName) noexcept {
-    if (m_parser != nullptr || moduleName == nullptr || fileName == nullptr) return false;
+    if (m_parser || moduleName == nullptr || fileName == nullptr) return false;
     if (m_languageModule != nullptr) {
         FreeLanguageModule();
         m_languageModule = nullptr;  // a module that asks to be kept is forgotten, not freed
@@ -74,8 +73,8 @@ bool CRsVelmoraLib::LoadLanguage(const char16_t* moduleName, const char16_t* fil
     const auto getParser =
         reinterpret_cast<GetLangXMLParserFunction>(support::FindExport(m_languageModule, "GetLangXMLParser"));
     if (getParser == nullptr) return false;
-    m_parser = getParser();
-    if (m_parser == nullptr) return false;
+    m_parser = Reference<LangXMLParser>::Adopt(getParser());
+    if (!m_parser) return false;
     const std::u16string path = BesideLibrary(fileName);
     return m_parser->Load(path.c_str()) || m_parser->Load(fileName);
 }
@@ -133,20 +132,30 @@ IPresetSaver* VM_CALL CRsVelmoraLib::CreatePresetSaver() {
     return velmora::CreatePresetSaver();
 }
 
-std::int32_t VM_CALL CRsVelmoraLib::LookUpText(std::intptr_t languageCode, std::intptr_t category,
-                                               std::intptr_t key, std::intptr_t fallback,
-                                               std::intptr_t buffer, std::intptr_t capacity,
-                                               std::intptr_t found) {
-    if (!m_hasLanguage || m_parser == nullptr) return 0;
+std::int32_t VM_CALL CRsVelmoraLib::LookUpText(const char* languageCode, std::int32_t category,
+                                               const char* key, const char16_t* fallback, char16_t* buffer,
+                                               std::int32_t capacity, std::int32_t* found) {
+    if (!m_hasLanguage || !m_parser) return 0;
     const FloatGuard guard;
     return m_parser->LookUpText(languageCode, category, key, fallback, buffer, capacity, found);
 }
 
 std::int32_t VM_CALL CRsVelmoraLib::GetText(const char* languageCode, std::int32_t category, const char* key,
                                             char16_t* buffer, std::int32_t capacity) {
-    if (!m_hasLanguage || m_parser == nullptr) return 0;
+    if (!m_hasLanguage || !m_parser) return 0;
     const FloatGuard guard;
     return m_parser->GetText(languageCode, category, key, buffer, capacity);
 }
 
 }  // namespace velmora
+
+velmora::IEffectLibrary* VM_CALL GetEffectsLibrary() {
+    const velmora::FloatGuard guard;
+    velmora::SetBuildMode(velmora::kBuildModeReady);
+    if (!velmora::RenewMasterSettings()) return nullptr;
+    return new (std::nothrow) velmora::CRsVelmoraLib;
+}
+
+bool VM_CALL CanUnloadDLLNow() {
+    return velmora::DLLDependentObject::LiveObjectCount() == 0;
+}

@@ -1,10 +1,11 @@
-// The library object: the one thing that a host gets from GetEffectsLibrary.
+// The library object, and the two exports through which a host gets it.
 #pragma once
 
-#include "language/lang_parser.h"
 #include "api/com_object.h"
 #include "api/host_api.h"
+#include "api/reference.h"
 #include "effects/process_state.h"
+#include "language/lang_parser.h"
 #include "platform/platform.h"
 
 namespace velmora {
@@ -25,9 +26,9 @@ class CRsVelmoraLib final : public DLLDependentObject, public IEffectLibrary, pu
     IFrameProcessor* VM_CALL CreateFrameProcessor() override;
     IPresetSaver* VM_CALL CreatePresetSaver() override;
 
-    std::int32_t VM_CALL LookUpText(std::intptr_t languageCode, std::intptr_t category, std::intptr_t key,
-                                    std::intptr_t fallback, std::intptr_t buffer, std::intptr_t capacity,
-                                    std::intptr_t found) override;
+    std::int32_t VM_CALL LookUpText(const char* languageCode, std::int32_t category, const char* key,
+                                    const char16_t* fallback, char16_t* buffer, std::int32_t capacity,
+                                    std::int32_t* found) override;
     std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
                                  char16_t* buffer, std::int32_t capacity) override;
 
@@ -41,9 +42,14 @@ class CRsVelmoraLib final : public DLLDependentObject, public IEffectLibrary, pu
     bool FreeLanguageModule() noexcept;
 
     ReferenceCount m_references;
-    LangXMLParser* m_parser = nullptr;
+    Reference<LangXMLParser> m_parser;
     support::ModuleHandle m_languageModule = nullptr;
     bool m_hasLanguage = false;
 };
 
 }  // namespace velmora
+
+extern "C" {
+velmora::IEffectLibrary* VM_CALL GetEffectsLibrary();
+bool VM_CALL CanUnloadDLLNow();
+}

@@ -13,6 +13,8 @@ namespace velmora::support {
 // A module of the system's loader; null when none.
 using ModuleHandle = void*;
 
+// The module that this code is linked into; null in a native program, which needs none to find its files.
+[[nodiscard]] ModuleHandle OwnModule() noexcept;
 // Loads a module by path or bare name (16-bit text); null when it cannot be loaded.
 [[nodiscard]] ModuleHandle LoadModule(const char16_t* name) noexcept;
 void UnloadModule(ModuleHandle module) noexcept;
@@ -21,5 +23,8 @@ void UnloadModule(ModuleHandle module) noexcept;
 // The folder of a module with its trailing separator; null asks for the running program's. Empty when it
 // cannot be told or memory is short.
 [[nodiscard]] std::u16string ModuleFolder(ModuleHandle module) noexcept;
+
+// The path of the module that holds a code address, in the system's 8-bit text; empty when the system cannot tell.
+[[nodiscard]] std::string ModuleAt(const void* address);
 
 }  // namespace velmora::support

@@ -13,6 +13,10 @@ std::uint32_t TickCount() noexcept {
     return static_cast<std::uint32_t>(std::chrono::duration_cast<std::chrono::milliseconds>(now).count());
 }
 
+ModuleHandle OwnModule() noexcept {
+    return nullptr;
+}
+
 ModuleHandle LoadModule(const char16_t* name) noexcept try {
     return dlopen(std::filesystem::path(name).c_str(), RTLD_NOW | RTLD_LOCAL);
 } catch (...) {
@@ -34,6 +38,11 @@ std::u16string ModuleFolder(ModuleHandle) noexcept try {
     return error ? std::u16string() : (program.parent_path() / "").u16string();
 } catch (...) {
     return {};
+}
+
+std::string ModuleAt(const void* address) {
+    Dl_info info{};
+    return dladdr(address, &info) != 0 && info.dli_fname != nullptr ? info.dli_fname : "";
 }
 
 }  // namespace velmora::support

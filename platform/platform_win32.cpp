@@ -1,18 +1,20 @@
 #include <windows.h>
 
 #include "platform/platform.h"
+#include "platform/win32.h"
 
 namespace velmora::support {
 namespace {
 
-// Windows' 16-bit text is wchar_t; the library's is char16_t. Both are UTF-16.
-static_assert(sizeof(wchar_t) == sizeof(char16_t));
-const wchar_t* Wide(const char16_t* text) noexcept {
-    return reinterpret_cast<const wchar_t*>(text);
-}
-
 // The longest path that the system handles.
 constexpr DWORD kLongestPath = 32768;
+
+HMODULE Holding(const void* address) noexcept {
+    HMODULE module = nullptr;
+    GetModuleHandleExW(GET_MODULE_HANDLE_EX_FLAG_FROM_ADDRESS | GET_MODULE_HANDLE_EX_FLAG_UNCHANGED_REFCOUNT,
+                       static_cast<const wchar_t*>(address), &module);
+    return module;
+}
 
 }  // namespace
 
@@ -20,8 +22,12 @@ std::uint32_t TickCount() noexcept {
     return GetTickCount();
 }
 
+ModuleHandle OwnModule() noexcept {
+    return Holding(reinterpret_cast<const void*>(&OwnModule));
+}
+
 ModuleHandle LoadModule(const char16_t* name) noexcept {
-    return LoadLibraryW(Wide(name));
+    return LoadLibraryW(win32::Wide(name));
 }
 
 void UnloadModule(ModuleHandle module) noexcept {
@@ -47,6 +53,13 @@ std::u16string ModuleFolder(ModuleHandle module) noexcept try {
     return {};
 } catch (...) {
     return {};
+}
+
+std::string ModuleAt(const void* address) {
+    const HMODULE module = Holding(address);
+    if (module == nullptr) return "";
+    char path[MAX_PATH * 4];
+    return {path, GetModuleFileNameA(module, path, sizeof path)};
 }
 
 }  // namespace velmora::support

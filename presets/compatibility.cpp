@@ -1,6 +1,8 @@
-#include "presets/compatibility.h"
+#include "presets/preset_file.h"
 
 #include <cstring>
+
+#include "api/reference.h"
 
 namespace velmora {
 
@@ -43,11 +45,8 @@ bool IsCompatible(const char* libraryName, const char* effectName, std::span<con
 bool IsCompatible(IEffectLibrary* library, std::uint32_t effectIndex, const PresetRecord* record) noexcept {
     if (record == nullptr) return false;
     if (library == nullptr) return record->count > 0;
-    IVideoEffect* effect = library->CreateEffect(effectIndex);
-    if (effect == nullptr) return false;
-    const bool isCompatible = IsEffectOf(*library, *effect, *record);
-    effect->Release();
-    return isCompatible;
+    const auto effect = Reference<IVideoEffect>::Adopt(library->CreateEffect(effectIndex));
+    return effect && IsEffectOf(*library, *effect, *record);
 }
 
 }  // namespace velmora

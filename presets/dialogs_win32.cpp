@@ -3,13 +3,13 @@
 #include <windows.h>
 #include <commdlg.h>
 
+#include "platform/win32.h"
+
 namespace velmora {
 
 namespace {
 
-const wchar_t* Wide(const char16_t* text) {
-    return reinterpret_cast<const wchar_t*>(text);
-}
+using support::win32::Wide;
 
 // The file dialogs leave the process in the folder where the user went. A host's relative names must not
 // change their meaning for that.

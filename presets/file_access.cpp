@@ -2,8 +2,6 @@
 
 #include <memory>
 
-#include "presets/file_system.h"
-
 namespace velmora {
 
 namespace {

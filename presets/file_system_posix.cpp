@@ -1,4 +1,4 @@
-#include "presets/file_system.h"
+#include "presets/file_access.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>

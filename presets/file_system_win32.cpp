@@ -1,11 +1,9 @@
-#include "presets/file_system.h"
+#include "presets/file_access.h"
 
 #include <fcntl.h>
 #include <io.h>
 #include <sys/stat.h>
 #include <windows.h>
-
-#include <cstring>
 
 #include "text/code_page.h"
 
@@ -14,11 +12,9 @@ namespace velmora {
 bool MakeNativePath(const char* fileName, NativePath* path) {
     // The C library's narrow functions would take the name for the console's code page in some hosts.
     if (fileName == nullptr) return false;
-    const auto length = static_cast<std::uint32_t>(std::strlen(fileName));
-    const std::uint32_t needed = WidenText(fileName, length, nullptr, 0);
-    if (needed == 0) return false;
-    path->resize(needed);
-    return WidenText(fileName, length, reinterpret_cast<char16_t*>(path->data()), needed) == needed;
+    const std::u16string wide = Widen(fileName);
+    path->assign(wide.begin(), wide.end());
+    return !wide.empty();
 }
 
 std::FILE* OpenForReading(const NativePath& path) {

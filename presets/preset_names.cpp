@@ -4,6 +4,8 @@
 #include <cstring>
 #include <string_view>
 
+#include "api/host_api.h"
+
 namespace velmora {
 
 namespace {
@@ -15,7 +17,7 @@ struct LibraryCode {
 
 // Other libraries of the family would have their rows here.
 constexpr LibraryCode kLibraryCodes[] = {
-    {"Velmora Reel Effects", u"rel"},
+    {kLibraryName, u"rel"},
 };
 constexpr std::u16string_view kUnknownLibrary = u"unk";
 

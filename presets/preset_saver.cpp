@@ -5,10 +5,10 @@
 #include <new>
 #include <string_view>
 
+#include "api/reference.h"
 #include "platform/float_guard.h"
-#include "presets/compatibility.h"
-#include "presets/dialogs.h"
 #include "presets/preset_file.h"
+#include "presets/dialogs.h"
 #include "presets/preset_names.h"
 #include "text/code_page.h"
 #include "text/strings.h"
@@ -57,11 +57,11 @@ void CopyName(char (&field)[kPresetNameWidth], const char* name) {
     std::memset(field + length, 0, sizeof field - length);
 }
 
-// The effect, with a reference that the caller releases, once the record carries its name and the library's;
-// null when there is none.
-IVideoEffect* TakeEffect(IEffectLibrary* library, std::uint32_t effectIndex, PresetRecord& record) {
-    IVideoEffect* effect = library != nullptr ? library->CreateEffect(effectIndex) : nullptr;
-    if (effect == nullptr) return nullptr;
+// The effect, once the record carries its name and the library's; empty when there is none.
+Reference<IVideoEffect> TakeEffect(IEffectLibrary* library, std::uint32_t effectIndex, PresetRecord& record) {
+    if (library == nullptr) return {};
+    auto effect = Reference<IVideoEffect>::Adopt(library->CreateEffect(effectIndex));
+    if (!effect) return {};
     CopyName(record.libraryName, library->GetLibraryName());
     CopyName(record.effectName, effect->GetName());
     return effect;
@@ -133,8 +133,7 @@ std::int32_t VM_CALL CPresetSaver::SavePreset(void* owner, IEffectLibrary* libra
             return kDone;
         }
         if (fileName[0] != 0) {
-            IVideoEffect* effect = TakeEffect(library, effectIndex, *record);
-            if (effect != nullptr) effect->Release();
+            static_cast<void>(TakeEffect(library, effectIndex, *record));
             isSaved = Save(fileName, *record);
         }
     }
@@ -148,7 +147,7 @@ std::int32_t VM_CALL CPresetSaver::LoadPreset(void* owner, IEffectLibrary* libra
                                               PresetRecord* record, const char* languageCode) {
     const FloatGuard guard;
     Result result = kFailed;
-    IVideoEffect* effect = nullptr;
+    Reference<IVideoEffect> effect;
     if (record != nullptr) {
         DialogFileName fileName = {};
         if (!AskForFile(kLoadFlow, owner, library, effectIndex, languageCode, m_translation, fileName)) {
@@ -163,10 +162,9 @@ std::int32_t VM_CALL CPresetSaver::LoadPreset(void* owner, IEffectLibrary* libra
         ShowWarning(
             u"Sorry, can't open the preset specified.\nPossible reason: access denied or file is corrupted.",
             u"Preset load error");
-    } else if (result == kOtherEffect && effect != nullptr) {
+    } else if (result == kOtherEffect && effect) {
         WarnOfOtherEffect(record->effectName, effect->GetName());
     }
-    if (effect != nullptr) effect->Release();
     return result;
 }
 

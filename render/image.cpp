@@ -11,20 +11,16 @@ Rectangle Rectangle::Clipped(const Rectangle& bounds) const noexcept {
             std::min(right, bounds.right)};
 }
 
-bool ImageView::IsValid() const noexcept {
-    return base != nullptr && format->bytesPerPixel != 0 && bufferWidth >= 1 && bufferHeight >= 1 &&
-           format->RowBytes(bufferWidth) <= rowStep && top >= 0 && left >= 0 && top < bufferHeight &&
-           left < bufferWidth;
-}
-
-ImageView ViewOf(const FrameDescription& frame, std::int32_t width, std::int32_t height) noexcept {
+ImageView ViewOf(const FrameDescription& frame, std::int32_t width, std::int32_t height,
+                 RowBytesOf rowBytes) noexcept {
     constexpr std::int64_t kMost = std::numeric_limits<std::int32_t>::max();
     const std::int64_t bufferWidth = std::int64_t{frame.xOrigin} + frame.width;
     const std::int64_t bufferHeight = std::int64_t{frame.yOrigin} + frame.height;
     const std::int64_t step = std::abs(std::int64_t{frame.rowStep});
     // The buffer must also lie within what a pointer can reach.
     if (frame.pixels == nullptr || bufferWidth > kMost || bufferHeight > kMost || step > kMost ||
-        frame.xOrigin < 0 || frame.yOrigin < 0 || width < 1 || height < 1 ||
+        frame.xOrigin < 0 || frame.yOrigin < 0 || frame.width < 1 || frame.height < 1 || width < 1 ||
+        height < 1 || rowBytes(static_cast<std::int32_t>(bufferWidth)) > step ||
         step * bufferHeight > std::numeric_limits<std::ptrdiff_t>::max()) {
         return {};
     }

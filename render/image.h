@@ -14,19 +14,11 @@ struct Bgra {
 };
 static_assert(sizeof(Bgra) == 4 && alignof(Bgra) == 1);
 
-struct PixelFormat {
-    std::int32_t code;
-    std::int32_t secondCode;
-    std::int32_t bitsPerPixel;
-    std::int32_t bytesPerPixel;
-    std::int32_t planeCount;
-
-    [[nodiscard]] constexpr std::int64_t RowBytes(std::int32_t width) const noexcept {
-        return std::int64_t{width} * bytesPerPixel;
-    }
-};
-inline constexpr std::int32_t kFormatBgra32 = 1002;
-inline constexpr PixelFormat kBgra32 = {kFormatBgra32, 1100, 32, 4, 1};
+// Bytes that a row of so many pixels takes: all that the judgement of a frame needs to know of its pixels.
+using RowBytesOf = std::int64_t (*)(std::int32_t width) noexcept;
+[[nodiscard]] constexpr std::int64_t BgraRowBytes(std::int32_t width) noexcept {
+    return std::int64_t{width} * 4;
+}
 
 // Rows and columns of a buffer; bottom and right are exclusive.
 struct Rectangle {
@@ -57,7 +49,6 @@ struct FrameDescription {
 // The descriptor that stages read and write through. Rows, origins and shifts count from the lowest address,
 // also for a buffer stored bottom-up. Does not own the pixels. Empty views are not valid.
 struct ImageView {
-    const PixelFormat* format = &kBgra32;
     std::int32_t bufferWidth = 0;
     std::int32_t bufferHeight = 0;
     std::int32_t rowStep = 0;  // bytes, positive when valid; need not be a multiple of 4
@@ -72,12 +63,12 @@ struct ImageView {
         return reinterpret_cast<Bgra*>(base + std::ptrdiff_t{rowStep} * (top + row)) + left;
     }
     [[nodiscard]] constexpr Rectangle Region() const noexcept { return {top, bottom, left, right}; }
-    [[nodiscard]] bool IsValid() const noexcept;
+    [[nodiscard]] constexpr bool IsValid() const noexcept { return base != nullptr; }
 };
 
-// A view of a frame whose processed rectangle is width x height pixels. A description whose numbers overflow
-// or that has no pixels gives a view that is not valid.
-[[nodiscard]] ImageView ViewOf(const FrameDescription& frame, std::int32_t width,
-                               std::int32_t height) noexcept;
+// A view of a frame whose processed rectangle is width x height pixels. The one judgement of frames: a description whose
+// numbers overflow, whose rows do not fit their step or that has no pixels gives a view that is not valid.
+[[nodiscard]] ImageView ViewOf(const FrameDescription& frame, std::int32_t width, std::int32_t height,
+                               RowBytesOf rowBytes = BgraRowBytes) noexcept;
 
 }  // namespace velmora::render

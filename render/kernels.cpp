@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
-#include "render/simd/levels.h"
+#include "render/kernel_levels.h"
 #include "render/simd/target.h"
 
 namespace velmora::render {

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <iterator>
-#include <string>
 
 namespace velmora {
 
@@ -17,7 +16,7 @@ constexpr char16_t kHighControls[32] = {
     0x02DC, 0x2122, 0x0161, 0x203A, 0x0153, 0x009D, 0x017E, 0x0178,  // 98
 };
 
-char16_t Widen(char character) {
+char16_t WidenByte(char character) {
     const auto byte = static_cast<unsigned char>(character);
     return byte >= 0x80 && byte < 0xA0 ? kHighControls[byte - 0x80] : byte;
 }
@@ -37,21 +36,19 @@ std::uint32_t WidenText(const char* text, std::uint32_t length, char16_t* buffer
     if (text == nullptr || length == 0) return 0;
     if (buffer == nullptr) return length;
     if (capacity < length) return 0;
-    std::transform(text, text + length, buffer, Widen);
+    std::transform(text, text + length, buffer, WidenByte);
     return length;
 }
 
-bool NarrowFileName(const char16_t* name, char* buffer, std::uint32_t capacity) noexcept {
-    if (name == nullptr || *name == 0) return false;
-    const std::size_t length = std::char_traits<char16_t>::length(name);
-    if (length >= capacity) return false;
-    for (std::size_t i = 0; i < length; ++i) {
-        const int byte = Narrow(name[i]);
-        if (byte < 0) return false;
+std::uint32_t NarrowText(const char16_t* text, std::uint32_t length, char* buffer,
+                         std::uint32_t capacity) noexcept {
+    if (text == nullptr || length > capacity) return 0;
+    for (std::uint32_t i = 0; i < length; ++i) {
+        const int byte = Narrow(text[i]);
+        if (byte < 0) return 0;
         buffer[i] = static_cast<char>(byte);
     }
-    buffer[length] = '\0';
-    return true;
+    return length;
 }
 
 }  // namespace velmora

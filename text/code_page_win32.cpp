@@ -2,8 +2,6 @@
 
 #include <windows.h>
 
-#include <string>
-
 namespace velmora {
 
 static_assert(sizeof(wchar_t) == sizeof(char16_t));
@@ -18,21 +16,19 @@ std::uint32_t WidenText(const char* text, std::uint32_t length, char16_t* buffer
     return written > 0 ? static_cast<std::uint32_t>(written) : 0;
 }
 
-bool NarrowFileName(const char16_t* name, char* buffer, std::uint32_t capacity) noexcept {
-    if (name == nullptr || *name == 0) return false;
-    const std::size_t length = std::char_traits<char16_t>::length(name);
-    if (length >= capacity || length > 0x7FFFFFFEu) return false;
-    const int count = static_cast<int>(length);
-    // A system whose code page is UTF-8 accepts neither the flag nor the question for replacements, and needs
-    // neither: every replacement takes more than one byte there.
+std::uint32_t NarrowText(const char16_t* text, std::uint32_t length, char* buffer,
+                         std::uint32_t capacity) noexcept {
+    if (text == nullptr || length == 0 || length > 0x7FFFFFFFu || capacity > 0x7FFFFFFFu) return 0;
+    if (capacity == 0) return 0;  // would only measure
+    // A system whose code page is UTF-8 accepts neither the flag nor the question for replacements, and needs neither:
+    // there every character has an exact form.
     const bool isUtf8 = GetACP() == CP_UTF8;
     BOOL isReplaced = FALSE;
-    const int written = WideCharToMultiByte(
-        CP_ACP, isUtf8 ? 0 : WC_NO_BEST_FIT_CHARS, reinterpret_cast<const wchar_t*>(name), count, buffer,
-        static_cast<int>(capacity), nullptr, isUtf8 ? nullptr : &isReplaced);
-    if (written != count || isReplaced) return false;
-    buffer[length] = '\0';
-    return true;
+    const int written =
+        WideCharToMultiByte(CP_ACP, isUtf8 ? 0 : WC_NO_BEST_FIT_CHARS, reinterpret_cast<const wchar_t*>(text),
+                            static_cast<int>(length), buffer, static_cast<int>(capacity), nullptr,
+                            isUtf8 ? nullptr : &isReplaced);
+    return written > 0 && !isReplaced ? static_cast<std::uint32_t>(written) : 0;
 }
 
 }  // namespace velmora

@@ -36,6 +36,10 @@ void Append(std::u16string& text, std::uint32_t value) {
     text.push_back(static_cast<char16_t>(0xDC00 + (offset & 0x3FF)));
 }
 
+constexpr bool IsHighSurrogate(char16_t character) {
+    return character >= 0xD800 && character <= 0xDBFF;
+}
+
 // Takes one character off the front of a text that is not empty; nothing when it is not well-formed.
 std::optional<std::uint32_t> TakeCharacter(std::string_view& text) {
     const Sequence sequence = SequenceOf(ByteAt(text, 0));
@@ -69,6 +73,19 @@ std::optional<std::u16string> Utf16FromUtf8(std::string_view text) {
         Append(result, *value);
     }
     return result;
+}
+
+std::int32_t CopyText(const char16_t* text, char16_t* buffer, std::int32_t capacity) noexcept {
+    if (!buffer || capacity < 1) return 0;
+    std::int32_t length = 0;
+    while (text && length < capacity - 1 && text[length] != 0) {
+        buffer[length] = text[length];
+        ++length;
+    }
+    const bool isCut = text && text[length] != 0;
+    if (isCut && length > 0 && IsHighSurrogate(buffer[length - 1])) --length;
+    buffer[length] = 0;
+    return length;
 }
 
 }  // namespace velmora::language

@@ -7,20 +7,13 @@
 using namespace velmora;
 
 // Answers an effect's parameters: here from a built-in preset, in an editor from its own controls.
-struct Host final : IVideoHost {
+struct Host final : PlainHost {
     std::vector<PresetCell> cells;
-    Status VM_CALL QueryInterface(const Guid*, void** out) override { return *out = nullptr, kStatusNoInterface; }
-    std::uint32_t VM_CALL AddRef() override { return 1; }
-    std::uint32_t VM_CALL Release() override { return 1; }
     bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override {
         if (index >= cells.size()) return false;
         *cell = {cells[index].value, 0, kind};
         return true;
     }
-    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) override { return false; }
-    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) override { return 0; }
-    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return false; }
-    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
 };
 
 int main() {
@@ -28,7 +21,7 @@ int main() {
     void* const entry = dll ? reinterpret_cast<void*>(GetProcAddress(dll, "GetEffectsLibrary")) : nullptr;
     if (entry == nullptr) return std::puts("VMReelEffects.dll is missing"), 1;
     IEffectLibrary* const library = reinterpret_cast<GetEffectsLibraryFunction>(entry)();
-    IVideoEffect* const effect = library->CreateEffect(1);  // "Film Look"
+    IVideoEffect* const effect = library->CreateEffect(kEffectFilmLook);
     Host host;
     PresetCell cell;
     for (std::uint32_t i = 0; effect->GetPresetValue(25, i, &cell); ++i) host.cells.push_back(cell);

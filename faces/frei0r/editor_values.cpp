@@ -1,4 +1,4 @@
-#include "faces/frei0r/editor_values.h"
+#include "faces/frei0r/editor_files.h"
 
 #include <frei0r.h>
 

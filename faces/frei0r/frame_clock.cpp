@@ -1,7 +1,11 @@
 #include "faces/frei0r/frame_clock.h"
 
 #include <algorithm>
+#include <array>
 #include <cmath>
+#include <string>
+
+#include "text/names.h"
 
 namespace velmora::hosts::frei0r {
 namespace {
@@ -10,6 +14,20 @@ constexpr double kLibraryFrameRate = 30.0;
 constexpr double kFastestUsualRate = 120.0;
 constexpr double kLargestFrame = 1e15;  // keeps the result of llround and the sum with a start frame exact
 
+struct KnownModule {
+    std::string_view part;  // of the file name, in lower case
+    TimeUnit unit;
+};
+
+constexpr std::array<KnownModule, 6> kKnownModules = {{
+    {"avfilter", TimeUnit::kMilliseconds},
+    {"ffmpeg", TimeUnit::kMilliseconds},
+    {"ffplay", TimeUnit::kMilliseconds},
+    {"ffprobe", TimeUnit::kMilliseconds},
+    {"mltfrei0r", TimeUnit::kSeconds},
+    {"gstfrei0r", TimeUnit::kSeconds},
+}};
+
 bool TakeSuffix(std::string_view& text, std::string_view suffix) {
     if (!text.ends_with(suffix)) return false;
     text.remove_suffix(suffix.size());
@@ -17,6 +35,18 @@ bool TakeSuffix(std::string_view& text, std::string_view suffix) {
 }
 
 }  // namespace
+
+TimeUnit UnitOfModule(std::string_view fileName) {
+    if (const auto slash = fileName.find_last_of("/\\"); slash != std::string_view::npos) {
+        fileName.remove_prefix(slash + 1);
+    }
+    std::string lower(fileName);
+    std::ranges::transform(lower, lower.begin(), ToLower);
+    for (const KnownModule& known : kKnownModules) {
+        if (lower.find(known.part) != std::string::npos) return known.unit;
+    }
+    return TimeUnit::kUnknown;
+}
 
 void FrameClock::SetFrameRate(std::string_view text) noexcept {
     m_toldUnit = TakeSuffix(text, "ms")  ? TimeUnit::kMilliseconds

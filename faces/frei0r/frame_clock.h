@@ -1,6 +1,6 @@
 // Converts the time that a host passes to the clip time that an effect renders.
 //
-// Unit. Written after the frame rate ("25 ms", "25 s"), or known from the calling module (host_time_unit.h).
+// Unit. Written after the frame rate ("25 ms", "25 s"), or known from the calling module (UnitOfModule).
 // For an unknown host it is seconds, as frei0r's header says, until two consecutive times differ by at least
 // half a frame in milliseconds (half a frame at 120 per second if no rate is given). A host playing a clip
 // never advances by so many seconds.
@@ -15,9 +15,17 @@
 #include <string_view>
 
 #include "text/number_text.h"
-#include "faces/frei0r/host_time_unit.h"
 
 namespace velmora::hosts::frei0r {
+
+// In which unit a host gives times. Frei0r's header says seconds, FFmpeg gives milliseconds. The values do not
+// tell: 40 is the second frame of a clip of 25 frames a second in milliseconds and its thousandth in seconds. So the
+// module that calls the plug-in is asked for its name.
+enum class TimeUnit : std::uint8_t { kUnknown, kSeconds, kMilliseconds };
+
+// By a module's file name, with or without folder: milliseconds for libavfilter and for FFmpeg's own programs,
+// which may have it linked in; seconds for MLT's and GStreamer's frei0r modules.
+[[nodiscard]] TimeUnit UnitOfModule(std::string_view fileName);
 
 class FrameClock {
   public:

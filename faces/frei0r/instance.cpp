@@ -7,8 +7,8 @@
 #include <limits>
 #include <new>
 
+#include "text/names.h"
 #include "text/number_text.h"
-#include "faces/frei0r/pixel_order.h"
 
 namespace velmora::hosts::frei0r {
 namespace {
@@ -57,6 +57,15 @@ std::uint32_t SeedOf(std::string_view text) {
     return seed && *seed >= 0 && *seed <= std::numeric_limits<std::uint32_t>::max()
                ? static_cast<std::uint32_t>(*seed)
                : 0;
+}
+
+// Frei0r's cheapest colour model in hosts is red, green, blue, alpha; the effects work on blue, green, red, alpha.
+// Exchanges bytes 0 and 2 of each pixel. `in` and `out` may be the same. Written for the compiler's vectors.
+void SwapRedAndBlue(const std::uint32_t* in, std::uint32_t* out, std::size_t count) noexcept {
+    for (std::size_t i = 0; i < count; ++i) {
+        const std::uint32_t pixel = in[i];
+        out[i] = (pixel & 0xFF00FF00u) | ((pixel & 0xFFu) << 16) | ((pixel >> 16) & 0xFFu);
+    }
 }
 
 void WarnOfPreset(const PluginDescription& plugin, const std::string& name) {

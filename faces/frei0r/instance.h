@@ -17,7 +17,6 @@
 
 #include "effects/effect_session.h"
 #include "faces/frei0r/frame_clock.h"
-#include "faces/frei0r/host_time_unit.h"
 #include "faces/frei0r/plugin_params.h"
 
 namespace velmora::hosts::frei0r {

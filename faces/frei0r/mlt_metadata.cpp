@@ -1,7 +1,6 @@
 #include <frei0r.h>
 
 #include "faces/frei0r/editor_files.h"
-#include "faces/frei0r/editor_values.h"
 
 namespace velmora::hosts::frei0r {
 namespace {

@@ -15,11 +15,11 @@ extern "C" {
 #include <new>
 
 #include "faces/frei0r/instance.h"
+#include "platform/platform.h"
 
 namespace {
 
 using velmora::hosts::frei0r::Instance;
-using velmora::hosts::frei0r::ModuleAt;
 using velmora::hosts::frei0r::PluginDescription;
 using velmora::hosts::frei0r::UnitOfModule;
 
@@ -56,8 +56,8 @@ void f0r_get_plugin_info(f0r_plugin_info_t* info) {
                  .plugin_type = F0R_PLUGIN_TYPE_FILTER,
                  .color_model = F0R_COLOR_MODEL_RGBA8888,
                  .frei0r_version = FREI0R_MAJOR_VERSION,
-                 .major_version = 1,
-                 .minor_version = 0,
+                 .major_version = velmora::kReelEffectsMajor,
+                 .minor_version = velmora::kReelEffectsMinor,
                  .num_params = static_cast<int>(Plugin().params.size()),
                  .explanation = Plugin().explanation.c_str()};
     });
@@ -77,7 +77,7 @@ f0r_instance_t f0r_construct(unsigned int width, unsigned int height) {
     f0r_instance_t instance = nullptr;
     Guarded([&] {
         if (width == 0 || height == 0) return;
-        instance = new Instance(Plugin(), width, height, UnitOfModule(ModuleAt(caller)));
+        instance = new Instance(Plugin(), width, height, UnitOfModule(velmora::support::ModuleAt(caller)));
     });
     return instance;
 }

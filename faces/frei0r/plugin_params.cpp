@@ -4,30 +4,15 @@
 
 #include <algorithm>
 
+#include "text/names.h"
 #include "text/number_text.h"
 
 namespace velmora::hosts::frei0r {
 namespace {
 
-bool IsNameCharacter(char c) {
-    return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || (c >= '0' && c <= '9');
-}
-
-char Lower(char c) {
-    return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
-}
-
-std::string Essence(std::string_view text) {
-    std::string essence;
-    for (const char c : text) {
-        if (IsNameCharacter(c)) essence += Lower(c);
-    }
-    return essence;
-}
-
 std::string FileName(std::string_view effectName) {
     std::string name = "velmora_";
-    for (const char c : effectName) name += c == ' ' ? '_' : Lower(c);
+    for (const char c : effectName) name += c == ' ' ? '_' : ToLower(c);
     return name;
 }
 
@@ -101,10 +86,6 @@ PluginDescription DescribePlugin(const effects::EffectTable& effect) {
             {OwnName(effect, param), TypeOf(param.kind), OwnExplanation(param), ParamRole::kOwn, i});
     }
     return plugin;
-}
-
-bool IsSameName(std::string_view a, std::string_view b) {
-    return Essence(a) == Essence(b);
 }
 
 std::optional<std::uint32_t> FindPreset(const effects::EffectTable& effect, std::string_view name) {

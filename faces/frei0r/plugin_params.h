@@ -47,11 +47,7 @@ struct PluginDescription {
 
 PluginDescription DescribePlugin(const effects::EffectTable& effect);
 
-// Compares names and item texts as users type them: only letters and digits count, in upper or lower case, so
-// that "60s-memories" is "60's Memories" and command lines need no quoting.
-[[nodiscard]] bool IsSameName(std::string_view a, std::string_view b);
-
-// The preset of that name; nothing when there is none.
+// The preset of that name (text/names.h); nothing when there is none.
 [[nodiscard]] std::optional<std::uint32_t> FindPreset(const effects::EffectTable& effect,
                                                       std::string_view name);
 

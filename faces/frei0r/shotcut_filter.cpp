@@ -2,7 +2,6 @@
 
 #include "text/number_text.h"
 #include "faces/frei0r/editor_files.h"
-#include "faces/frei0r/editor_values.h"
 
 namespace velmora::hosts::frei0r {
 namespace {

@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "programs/common/usage_error.h"
+#include "text/names.h"
 
 namespace velmora::hosts {
 namespace {
@@ -10,10 +11,6 @@ namespace {
 // Texts that fill their field have no terminating zero.
 std::string FieldText(const char* field, std::size_t width) {
     return std::string(field, std::find(field, field + width, '\0'));
-}
-
-char Lower(char c) {
-    return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
 }
 
 }  // namespace
@@ -42,10 +39,6 @@ ParamInfo ReadDescriptor(const ParamDescriptor& descriptor) {
     return info;
 }
 
-bool NamesAreEqual(std::string_view a, std::string_view b) {
-    return std::ranges::equal(a, b, [](char x, char y) { return Lower(x) == Lower(y); });
-}
-
 std::string QuotedList(std::span<const std::string> names) {
     std::string list;
     for (const std::string& name : names) {
@@ -58,7 +51,7 @@ std::string QuotedList(std::span<const std::string> names) {
 std::size_t FindEffect(std::span<const EffectInfo> effects, std::string_view name) {
     std::vector<std::string> names;
     for (std::size_t i = 0; i < effects.size(); ++i) {
-        if (NamesAreEqual(effects[i].name, name)) return i;
+        if (IsSameName(effects[i].name, name)) return i;
         names.push_back(effects[i].name);
     }
     throw UsageError("there is no effect \"" + std::string(name) + "\"; there are " + QuotedList(names));
@@ -66,7 +59,7 @@ std::size_t FindEffect(std::span<const EffectInfo> effects, std::string_view nam
 
 std::uint32_t FindPreset(const EffectInfo& effect, std::string_view name) {
     for (std::size_t i = 0; i < effect.presets.size(); ++i) {
-        if (NamesAreEqual(effect.presets[i], name)) return static_cast<std::uint32_t>(i);
+        if (IsSameName(effect.presets[i], name)) return static_cast<std::uint32_t>(i);
     }
     throw UsageError('"' + effect.name + "\" has no preset \"" + std::string(name) + "\"; it has " +
                      QuotedList(effect.presets));

@@ -34,11 +34,8 @@ struct EffectInfo {
 
 ParamInfo ReadDescriptor(const ParamDescriptor& descriptor);
 
-// Names are compared without regard to the case of ASCII letters.
-bool NamesAreEqual(std::string_view a, std::string_view b);
-
-// The index of the effect or preset with that name. If there is none, throws a UsageError that lists those
-// that exist.
+// The index of the effect or preset with that name (text/names.h). If there is none, throws a UsageError that lists
+// those that exist.
 std::size_t FindEffect(std::span<const EffectInfo> effects, std::string_view name);
 std::uint32_t FindPreset(const EffectInfo& effect, std::string_view name);
 

@@ -40,23 +40,23 @@ EffectLibrary::EffectLibrary(const std::wstring& file) {
     }
     void* const address = reinterpret_cast<void*>(GetProcAddress(m_module.get(), "GetEffectsLibrary"));
     if (!address) throw std::runtime_error("VMReelEffects.dll has no GetEffectsLibrary");
-    m_library.reset(reinterpret_cast<GetEffectsLibraryFunction>(address)());
+    m_library = Reference<IEffectLibrary>::Adopt(reinterpret_cast<GetEffectsLibraryFunction>(address)());
     if (!m_library) throw std::runtime_error("VMReelEffects.dll gives no library object");
     for (std::uint32_t i = 0; i < kMostEffects; ++i) {
-        const Reference<IVideoEffect> effect(m_library->CreateEffect(i));
+        const auto effect = Reference<IVideoEffect>::Adopt(m_library->CreateEffect(i));
         if (!effect) break;
         m_effects.push_back(Describe(*effect));
     }
 }
 
 Reference<IVideoEffect> EffectLibrary::CreateEffect(std::uint32_t index) const {
-    Reference<IVideoEffect> effect(m_library->CreateEffect(index));
+    auto effect = Reference<IVideoEffect>::Adopt(m_library->CreateEffect(index));
     if (!effect) throw std::runtime_error("VMReelEffects.dll cannot create the effect");
     return effect;
 }
 
 Reference<IFrameProcessor> EffectLibrary::CreateFrameProcessor() const {
-    Reference<IFrameProcessor> processor(m_library->CreateFrameProcessor());
+    auto processor = Reference<IFrameProcessor>::Adopt(m_library->CreateFrameProcessor());
     if (!processor) throw std::runtime_error("VMReelEffects.dll cannot create the frame processor");
     return processor;
 }

@@ -6,18 +6,12 @@
 #include <string>
 #include <vector>
 
+#include "api/reference.h"
 #include "programs/common/effect_info.h"
-#include "api/host_api.h"
 
 #include <windows.h>
 
 namespace velmora::hosts {
-
-struct ReleaseReference {
-    void operator()(IUnknown* object) const { object->Release(); }
-};
-template <class Interface>
-using Reference = std::unique_ptr<Interface, ReleaseReference>;
 
 class EffectLibrary {
   public:
@@ -28,7 +22,6 @@ class EffectLibrary {
     [[nodiscard]] const std::vector<EffectInfo>& Effects() const { return m_effects; }
     // Both throw std::runtime_error when the library gives none.
     [[nodiscard]] Reference<IVideoEffect> CreateEffect(std::uint32_t index) const;
-
     [[nodiscard]] Reference<IFrameProcessor> CreateFrameProcessor() const;
 
     [[nodiscard]] IEffectLibrary& Object() const { return *m_library; }

@@ -1,6 +1,5 @@
 #include "programs/common/effect_run.h"
 
-#include <cstring>
 #include <stdexcept>
 
 namespace velmora::hosts {
@@ -13,14 +12,6 @@ std::vector<ValueWord> DefaultsOf(const EffectInfo& info) {
 }
 
 }  // namespace
-
-Status VM_CALL SettingsHost::QueryInterface(const Guid* iid, void** out) {
-    if (!iid || !out) return kStatusFailure;
-    const bool isOurs = std::memcmp(iid, &kIidUnknown, sizeof *iid) == 0 ||
-                        std::memcmp(iid, &kIidVideoHost, sizeof *iid) == 0;
-    *out = isOurs ? static_cast<IVideoHost*>(this) : nullptr;
-    return isOurs ? kStatusOk : kStatusNoInterface;
-}
 
 bool VM_CALL SettingsHost::GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) {
     if (index >= m_values.size() || !cell) return false;

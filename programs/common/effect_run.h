@@ -12,21 +12,13 @@
 namespace velmora::hosts {
 
 // The host's side of a running effect: answers what the effect asks while it renders.
-class SettingsHost final : public IVideoHost {
+class SettingsHost final : public PlainHost {
   public:
     explicit SettingsHost(std::vector<ValueWord> values) : m_values(std::move(values)) {}
-    virtual ~SettingsHost() = default;
 
     void SetValue(std::uint32_t parameter, ValueWord value) { m_values[parameter] = value; }
 
-    Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
-    std::uint32_t VM_CALL AddRef() override { return 1; }  // lives as long as its EffectRun
-    std::uint32_t VM_CALL Release() override { return 1; }
     bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override;
-    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) override { return false; }
-    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) override { return 0; }
-    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return false; }
-    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
 
   private:
     std::vector<ValueWord> m_values;  // by parameter

@@ -1,6 +1,7 @@
 #include <windows.h>
 
 #include "programs/common/library_file.h"
+#include "text/code_page.h"
 
 namespace velmora::hosts {
 namespace {
@@ -21,11 +22,8 @@ std::wstring LibraryFile(const std::wstring& path) {
 
 std::wstring LibraryFile(const std::string& path) {
     if (path.empty()) return BesideThisProgram();
-    std::wstring wide(path.size(), L'\0');
-    const int length = MultiByteToWideChar(CP_ACP, 0, path.data(), static_cast<int>(path.size()), wide.data(),
-                                           static_cast<int>(wide.size()));
-    wide.resize(static_cast<std::size_t>(length));
-    return wide;
+    const std::u16string wide = Widen(path);
+    return {wide.begin(), wide.end()};
 }
 
 }  // namespace velmora::hosts

@@ -3,8 +3,9 @@
 #include <optional>
 #include <vector>
 
-#include "text/number_text.h"
 #include "programs/common/usage_error.h"
+#include "text/names.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts {
 namespace {
@@ -42,7 +43,7 @@ std::optional<ValueWord> ParseColour(std::string_view text) {
 
 std::optional<ValueWord> ParseMenu(const ParamInfo& param, std::string_view text) {
     for (std::size_t item = 0; item < param.items.size(); ++item) {
-        if (NamesAreEqual(param.items[item], text)) return Word(static_cast<std::uint32_t>(item));
+        if (IsSameName(param.items[item], text)) return Word(static_cast<std::uint32_t>(item));
     }
     const auto item = ParseInteger(text);
     if (!item || *item < 0 || *item >= static_cast<std::int64_t>(param.items.size())) return std::nullopt;
@@ -51,10 +52,10 @@ std::optional<ValueWord> ParseMenu(const ParamInfo& param, std::string_view text
 
 std::optional<ValueWord> ParseCheckBox(std::string_view text) {
     for (const char* yes : {"on", "yes", "true", "1"}) {
-        if (NamesAreEqual(text, yes)) return Word(1);
+        if (IsSameName(text, yes)) return Word(1);
     }
     for (const char* no : {"off", "no", "false", "0"}) {
-        if (NamesAreEqual(text, no)) return Word(0);
+        if (IsSameName(text, no)) return Word(0);
     }
     return std::nullopt;
 }
@@ -108,7 +109,7 @@ Setting ParseSetting(const EffectInfo& effect, std::string_view text) {
     std::string expected;
     for (std::uint32_t i = 0; i < effect.params.size(); ++i) {
         const ParamInfo& param = effect.params[i];
-        if (!param.HoldsValue() || !NamesAreEqual(param.name, name)) continue;
+        if (!param.HoldsValue() || !IsSameName(param.name, name)) continue;
         if (const auto value = ParseValue(param, valueText)) return {i, *value};
         expected += (expected.empty() ? "" : " or ") + Expected(param);
     }

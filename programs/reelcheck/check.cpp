@@ -12,6 +12,15 @@ char g_place[256] = "";
 
 }  // namespace
 
+std::string Text(const char* format, ...) {
+    char text[1024];
+    std::va_list arguments;
+    va_start(arguments, format);
+    std::vsnprintf(text, sizeof text, format, arguments);
+    va_end(arguments);
+    return text;
+}
+
 void SetPlace(const char* format, ...) {
     std::va_list arguments;
     va_start(arguments, format);

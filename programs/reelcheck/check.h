@@ -7,9 +7,17 @@
 #include <string>
 
 #include "programs/reelcheck/dice.h"
-#include "programs/reelcheck/text.h"
 
 namespace velmora::reelcheck {
+
+#if defined(__MINGW32__)
+#define REELCHECK_PRINTF(text, first) __attribute__((format(__MINGW_PRINTF_FORMAT, text, first)))
+#else
+#define REELCHECK_PRINTF(text, first) __attribute__((format(printf, text, first)))
+#endif
+
+// A text with numbers in it.
+[[nodiscard]] std::string Text(const char* format, ...) REELCHECK_PRINTF(1, 2);
 
 inline constexpr int kLowestLevel = 1;
 inline constexpr int kHighestLevel = 10;

@@ -30,24 +30,23 @@ class Visit {
             library = Library::TryLoad(path);  // this program's own memory stays out of the watch
         const AllocationWatch watch(failing);
         if (library == nullptr) library = Library::TryLoad(path);
-        IEffectLibrary* const object = library != nullptr ? library->getEffectsLibrary() : nullptr;
-        if (object != nullptr) Use(*object);
+        const bool isOpened = library != nullptr && Use(library->getEffectsLibrary);
         if (IsModule()) library.reset();
         m_count = watch.Count();
-        return object != nullptr;
+        return isOpened;
     }
     [[nodiscard]] std::uint64_t Count() const noexcept { return m_count; }
 
   private:
-    void Use(IEffectLibrary& object) {
-        IVideoEffect* const effect = object.CreateEffect(kEffectCount - 1);
-        if (effect != nullptr) {
+    bool Use(GetEffectsLibraryFunction getEffectsLibrary) {
+        const auto object = Reference<IEffectLibrary>::Adopt(getEffectsLibrary());
+        if (!object) return false;
+        if (const auto effect = Reference<IVideoEffect>::Adopt(object->CreateEffect(kEffectCount - 1))) {
             const FrameRecord from = m_source.Record(), to = m_destination.Record();
             const TimingRecord timing = {0, 0, 1.0};
             effect->Process(&m_host, &from, nullptr, &to, &timing);
-            effect->Release();
         }
-        object.Release();
+        return true;
     }
 
     Frame m_source, m_destination;
@@ -95,9 +94,7 @@ void CheckCreateFailures(CheckContext& context) {
             bool isMade = false;
             {
                 const AllocationWatch watch(failing);
-                IUnknown* const object = create();
-                isMade = object != nullptr;
-                if (isMade) object->Release();
+                isMade = bool{Reference<com::IUnknown>::Adopt(create())};
                 count = watch.Count();
             }
             Require(isMade == (failing == 0), isMade ? "is made without memory" : "is not made");
@@ -114,7 +111,7 @@ void CheckCreateFailures(CheckContext& context) {
 void CheckTableAllocations(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
     for (std::uint32_t index = 0; index < kEffectCount; ++index) {
-        const Owned<IVideoEffect> effect = library.Effect(index);
+        const Reference<IVideoEffect> effect = library.Effect(index);
         SetPlace("%s", effect->GetName());
         ParamDescriptor descriptor = {};
         PresetCell cell = {};
@@ -148,7 +145,7 @@ void CheckFrameAllocations(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
     for (const Layout& size : {Layout{320, 240}, Layout{1280, 720}, Layout{64, 64}}) {
         for (std::uint32_t index = 0; index < kEffectCount; ++index) {
-            const Owned<IVideoEffect> effect = library.Effect(index);
+            const Reference<IVideoEffect> effect = library.Effect(index);
             const EffectFacts facts = EffectFacts::Of(*effect);
             Frame source(size), destination(size);
             source.Paint(context.dice);
@@ -167,7 +164,7 @@ void CheckFrameAllocations(CheckContext& context) {
         }
     }
     SetPlace("frame processor");
-    const Owned<IFrameProcessor> processor = library.Processor();
+    const Reference<IFrameProcessor> processor = library.Processor();
     Frame bgra(Layout{320, 240}), packed(Layout{320, 240}, Packing::kYcbcr);
     const FrameRecord pixels = bgra.Record(), groups = packed.Record();
     FrameRecord inPlace = pixels;
@@ -185,7 +182,7 @@ void CheckFrameFailures(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
     std::int32_t width = 1400;  // wider each time, so that kept buffers do not do
     for (std::uint32_t index = 0; index < kEffectCount; ++index) {
-        const Owned<IVideoEffect> effect = library.Effect(index);
+        const Reference<IVideoEffect> effect = library.Effect(index);
         const EffectFacts facts = EffectFacts::Of(*effect);
         PlayingHost host;
         ChooseFull(host, facts);
@@ -220,7 +217,7 @@ void CheckEndurance(CheckContext& context) {
     const Layout size{640, 360};
     Frame source(size), destination(size);
     source.Paint(context.dice);
-    std::vector<Owned<IVideoEffect>> effects;
+    std::vector<Reference<IVideoEffect>> effects;
     std::vector<EffectFacts> facts;
     for (std::uint32_t i = 0; i < kEffectCount; ++i) {
         effects.push_back(library.Effect(i));

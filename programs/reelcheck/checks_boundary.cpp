@@ -13,20 +13,20 @@ namespace velmora::reelcheck {
 void CheckExports(CheckContext& context) {
     const Library library(context.libraryPath);
     Require(library.canUnload(), "a fresh library says that it must not be unloaded");
-    Owned<IEffectLibrary> first = library.Open(), second = library.Open();
+    Reference<IEffectLibrary> first = library.Open(), second = library.Open();
     Require(first != second, "two calls give one library object");
     Require(!library.canUnload(), "the library may be unloaded while an object lives");
-    first.reset();
+    first.Reset();
     Require(!library.canUnload(), "the library may be unloaded while a second object lives");
     Require(std::strlen(second->GetLibraryName()) > 0, "the library has no name");
     Require(second->GetShellServices() != nullptr, "the library has no shell services");
     for (std::uint32_t i = 0; i < kEffectCount; ++i) {
-        Require(Owned<IVideoEffect>(second->CreateEffect(i)) != nullptr, "an effect is missing");
+        Require(bool{Reference<IVideoEffect>::Adopt(second->CreateEffect(i))}, "an effect is missing");
     }
-    for (const std::uint32_t index : {kEffectCount, 100u, 0x80000000u, 0xFFFFFFFFu}) {
+    for (const std::uint32_t index : {std::uint32_t{kEffectCount}, 100u, 0x80000000u, 0xFFFFFFFFu}) {
         Require(second->CreateEffect(index) == nullptr, "there is an effect behind the last");
     }
-    second.reset();
+    second.Reset();
     Require(library.canUnload(), "the library may not be unloaded when its last object is gone");
 }
 
@@ -35,7 +35,7 @@ namespace {
 constexpr Guid kStranger = {1, 2, 3, {4, 5, 6, 7, 8, 9, 10, 11}};
 
 // Every object answers to IUnknown and to its own identifier, if it has one, and to no other.
-void CheckFaces(IUnknown& object, const Guid* own) {
+void CheckFaces(com::IUnknown& object, const Guid* own) {
     void* face = nullptr;
     Require(object.QueryInterface(&kIidUnknown, &face) == kStatusOk && face == &object,
             "does not answer to IUnknown with itself");
@@ -54,13 +54,13 @@ void CheckFaces(IUnknown& object, const Guid* own) {
     Require(object.QueryInterface(&kIidUnknown, nullptr) == kStatusFailure, "does not refuse a null place");
 }
 
-void CheckCounts(IUnknown& object) {
+void CheckCounts(com::IUnknown& object) {
     constexpr std::uint32_t kMany = 1000;
     for (std::uint32_t i = 0; i < kMany; ++i) Require(object.AddRef() == i + 2, "AddRef counts wrongly");
     for (std::uint32_t i = kMany; i > 0; --i) Require(object.Release() == i, "Release counts wrongly");
 }
 
-void CheckObject(const char* name, IUnknown& object, const Guid* own) {
+void CheckObject(const char* name, com::IUnknown& object, const Guid* own) {
     SetPlace("%s", name);
     CheckFaces(object, own);
     CheckCounts(object);
@@ -74,11 +74,9 @@ void CheckReferences(CheckContext& context) {
     CheckObject("frame processor", *library.Processor(), nullptr);
     CheckObject("preset saver", *library.Saver(), &kIidPresetSaver);
     for (std::uint32_t i = 0; i < kEffectCount; ++i) {
-        const Owned<IVideoEffect> effect = library.Effect(i);
+        const Reference<IVideoEffect> effect = library.Effect(i);
         CheckObject(effect->GetName(), *effect, &kIidVideoEffect);
-        void* face = nullptr;
-        Require(effect->QueryInterface(&kIidVideoHost, &face) == kStatusOk, "an effect has no host's face");
-        static_cast<IVideoHost*>(face)->Release();
+        Require(bool{QueryFor<IVideoHost>(*effect, kIidVideoHost)}, "an effect has no host's face");
     }
 }
 
@@ -88,7 +86,7 @@ void CheckNullArguments(CheckContext& context) {
     const FrameRecord record = frame.Record();
     const TimingRecord timing = {0, 0, 1.0};
     for (std::uint32_t i = 0; i < kEffectCount; ++i) {
-        const Owned<IVideoEffect> effect = library.Effect(i);
+        const Reference<IVideoEffect> effect = library.Effect(i);
         SetPlace("%s", effect->GetName());
         PlayingHost host;
         Require(!effect->GetParamInfo(0, nullptr), "describes a parameter into nothing");
@@ -104,7 +102,7 @@ void CheckNullArguments(CheckContext& context) {
                 "asks a host that there is not about a stranger");
     }
     SetPlace("frame processor");
-    const Owned<IFrameProcessor> processor = library.Processor();
+    const Reference<IFrameProcessor> processor = library.Processor();
     Require(!processor->ConvertYcbcrToBgra(nullptr, &record, 0) &&
                 !processor->ConvertYcbcrToBgra(&record, nullptr, 0) &&
                 !processor->ConvertBgraToYcbcr(nullptr, &record, 0) &&
@@ -114,17 +112,15 @@ void CheckNullArguments(CheckContext& context) {
                 !processor->Reserved5(nullptr, nullptr, 0),
             "a reserved operation does something");
     SetPlace("texts");
-    void* face = nullptr;
-    if (library->QueryInterface(&kIidMultiLingual, &face) != kStatusOk) return;
-    const Owned<IMultiLingual> texts(static_cast<IMultiLingual*>(face));
+    const auto texts = QueryFor<IMultiLingual>(*library.Get(), kIidMultiLingual);
+    if (!texts) return;
     char16_t buffer[4] = {u'?', u'?', u'?', u'?'};
     for (const char* code : {static_cast<const char*>(nullptr), "", "x", "en", "english", "\xFF\xFF"}) {
         for (const char* key : {static_cast<const char*>(nullptr), "", "no such key"}) {
             Require(texts->GetText(code, 4, key, buffer, 4) == 0, "finds a text for nothing");
             Require(texts->GetText(code, -1, key, nullptr, 4) == 0, "writes a text to nowhere");
             Require(texts->GetText(code, 4, key, buffer, -5) == 0, "writes a text of negative size");
-            Require(texts->LookUpText(reinterpret_cast<std::intptr_t>(code), 4,
-                                      reinterpret_cast<std::intptr_t>(key), 0, 0, 0, 0) == 0,
+            Require(texts->LookUpText(code, 4, key, nullptr, nullptr, 0, nullptr) == 0,
                     "finds a text for nothing");
         }
     }
@@ -132,14 +128,14 @@ void CheckNullArguments(CheckContext& context) {
 
 void CheckOutliving(CheckContext& context) {
     OpenLibrary library(context.libraryPath);
-    std::vector<Owned<IVideoEffect>> effects;
+    std::vector<Reference<IVideoEffect>> effects;
     for (std::uint32_t i = 0; i < kEffectCount; ++i) effects.push_back(library.Effect(i));
-    const Owned<IFrameProcessor> processor = library.Processor();
-    const Owned<IPresetSaver> saver = library.Saver();
+    const Reference<IFrameProcessor> processor = library.Processor();
+    const Reference<IPresetSaver> saver = library.Saver();
     library.Close();
     Frame source(Layout{40, 30}), destination(Layout{40, 30}), packed(Layout{40, 30}, Packing::kYcbcr);
     source.Paint(context.dice);
-    for (const Owned<IVideoEffect>& effect : effects) {
+    for (const Reference<IVideoEffect>& effect : effects) {
         SetPlace("%s", effect->GetName());
         PlayingHost host;
         ChooseFull(host, EffectFacts::Of(*effect));
@@ -153,7 +149,7 @@ void CheckOutliving(CheckContext& context) {
 
 void CheckThreads(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
-    const Owned<IVideoEffect> effect = library.Effect(4);
+    const Reference<IVideoEffect> effect = library.Effect(4);
     const EffectFacts facts = EffectFacts::Of(*effect);
     SetPlace("counting");
     constexpr int kThreads = 4;

@@ -71,7 +71,7 @@ void ConvertInPlace(IFrameProcessor& processor, const Layout& size, Dice& dice) 
 
 void CheckConverter(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
-    const Owned<IFrameProcessor> processor = library.Processor();
+    const Reference<IFrameProcessor> processor = library.Processor();
     for (const Direction& direction : kDirections) {
         for (std::int32_t width = 1; width <= context.Rounds(40, 150); ++width) {
             for (const Edge edge : {Edge::kFront, Edge::kBack}) {
@@ -91,7 +91,7 @@ void CheckConverter(CheckContext& context) {
 
 void CheckConverterShapes(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
-    const Owned<IFrameProcessor> processor = library.Processor();
+    const Reference<IFrameProcessor> processor = library.Processor();
     for (int i = 0; i < context.Rounds(200, 5000); ++i) {
         const Direction& direction = kDirections[i % 2];
         ConvertInside(*processor, direction, RandomLayout(context.dice), RandomLayout(context.dice),

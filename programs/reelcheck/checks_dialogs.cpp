@@ -56,7 +56,7 @@ bool SameSettings(const PresetRecord& a, const PresetRecord& b) noexcept {
 
 struct Desk {
     OpenLibrary library;
-    Owned<IPresetSaver> saver;
+    Reference<IPresetSaver> saver;
     WorkFolder folder;
 
     explicit Desk(const CheckContext& context) : library(context.libraryPath), saver(library.Saver()) {}
@@ -86,7 +86,7 @@ struct Desk {
 void CheckPresetFiles(CheckContext& context) {
     const Desk desk(context);
     for (std::uint32_t index = 0; index < kEffectCount; ++index) {
-        const Owned<IVideoEffect> effect = desk.library.Effect(index);
+        const Reference<IVideoEffect> effect = desk.library.Effect(index);
         const EffectFacts facts = EffectFacts::Of(*effect);
         const std::string file = desk.folder.PathOf("one.preset");
         const char* const path = file.c_str();
@@ -136,7 +136,7 @@ void CheckPresetFailures(CheckContext& context) {
     const Desk desk(context);
     const auto most = static_cast<std::uint64_t>(context.Rounds(150, 100000));
     const std::uint32_t index = kEffectCount - 1;
-    const Owned<IVideoEffect> effect = desk.library.Effect(index);
+    const Reference<IVideoEffect> effect = desk.library.Effect(index);
     const EffectFacts facts = EffectFacts::Of(*effect);
     PresetRecord old = RecordOf(*effect, facts, 1), fresh = RecordOf(*effect, facts, 2), read = {};
     const std::string file = desk.folder.PathOf("one.preset");

@@ -16,7 +16,7 @@ template <typename Visit>
 void ForEachEffect(CheckContext& context, Visit&& check) {
     const OpenLibrary library(context.libraryPath);
     for (std::uint32_t index = 0; index < kEffectCount; ++index) {
-        const Owned<IVideoEffect> effect = library.Effect(index);
+        const Reference<IVideoEffect> effect = library.Effect(index);
         const EffectFacts facts = EffectFacts::Of(*effect);
         SetPlace("%s", facts.name.c_str());
         PlayingHost host;

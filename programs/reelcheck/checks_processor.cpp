@@ -163,7 +163,7 @@ std::vector<std::uint64_t> TryAll(const Library& library, const Caller& caller, 
 
 void CheckProcessorState(CheckContext& context) {
     const Library library(context.libraryPath);
-    const Owned<IEffectLibrary> keeper = library.Open();
+    const Reference<IEffectLibrary> keeper = library.Open();
     Pictures pictures;
     pictures.source.Paint(context.dice);
     std::vector<std::uint64_t> usual;
@@ -178,7 +178,7 @@ void CheckProcessorState(CheckContext& context) {
 void CheckStack(CheckContext& context) {
     if (!MayShiftStack()) return;
     const Library library(context.libraryPath);
-    const Owned<IEffectLibrary> keeper = library.Open();
+    const Reference<IEffectLibrary> keeper = library.Open();
     Pictures pictures;
     pictures.source.Paint(context.dice);
     std::vector<std::uint64_t> usual;

@@ -106,7 +106,7 @@ void CheckPresetValues(IVideoEffect& effect, const EffectFacts& facts, std::uint
 void CheckDescriptions(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
     for (std::uint32_t index = 0; index < kEffectCount; ++index) {
-        const Owned<IVideoEffect> effect = library.Effect(index);
+        const Reference<IVideoEffect> effect = library.Effect(index);
         const EffectFacts facts = EffectFacts::Of(*effect);
         SetPlace("%s", facts.name.c_str());
         Require(effect->GetKind() == 1, "another kind of effect");
@@ -125,7 +125,7 @@ void CheckDescriptions(CheckContext& context) {
 void CheckPresets(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
     for (std::uint32_t index = 0; index < kEffectCount; ++index) {
-        const Owned<IVideoEffect> effect = library.Effect(index);
+        const Reference<IVideoEffect> effect = library.Effect(index);
         const EffectFacts facts = EffectFacts::Of(*effect);
         SetPlace("%s", facts.name.c_str());
         static_cast<void>(facts.Preset("Reset To None"));

@@ -18,7 +18,7 @@ constexpr Layout kSmall{61, 47};
 
 // One effect at work on one small picture.
 struct Bench {
-    Owned<IVideoEffect> effect;
+    Reference<IVideoEffect> effect;
     EffectFacts facts;
     PlayingHost host;
     Frame source, destination;

@@ -1,4 +1,4 @@
-#include "programs/reelcheck/child_run.h"
+#include "programs/reelcheck/run.h"
 
 #include <atomic>
 #include <chrono>

@@ -5,17 +5,9 @@
 #include <memory>
 #include <string>
 
-#include "api/host_api.h"
+#include "api/reference.h"
 
 namespace velmora::reelcheck {
-
-struct Releaser {
-    void operator()(IUnknown* object) const { object->Release(); }
-};
-template <typename Interface>
-using Owned = std::unique_ptr<Interface, Releaser>;
-
-inline constexpr std::uint32_t kEffectCount = 5;
 
 // Loaded once: unloads when it goes. Everything that came out of it must be released before.
 class Library {
@@ -33,7 +25,7 @@ class Library {
     CanUnloadDLLNowFunction canUnload = nullptr;
 
     // A library object. Throws CheckFailed when there is none.
-    [[nodiscard]] Owned<IEffectLibrary> Open() const;
+    [[nodiscard]] Reference<IEffectLibrary> Open() const;
 
   private:
     explicit Library(void* module) noexcept;
@@ -49,18 +41,18 @@ class OpenLibrary {
   public:
     explicit OpenLibrary(const std::string& path) : m_library(path), m_object(m_library.Open()) {}
 
-    IEffectLibrary* operator->() const noexcept { return m_object.get(); }
-    [[nodiscard]] IEffectLibrary* Get() const noexcept { return m_object.get(); }
+    IEffectLibrary* operator->() const noexcept { return m_object.Get(); }
+    [[nodiscard]] IEffectLibrary* Get() const noexcept { return m_object.Get(); }
     // Lets the library object go; what it created may stay.
-    void Close() noexcept { m_object.reset(); }
+    void Close() noexcept { m_object.Reset(); }
     // Throws CheckFailed when there is none.
-    [[nodiscard]] Owned<IVideoEffect> Effect(std::uint32_t index) const;
-    [[nodiscard]] Owned<IFrameProcessor> Processor() const;
-    [[nodiscard]] Owned<IPresetSaver> Saver() const;
+    [[nodiscard]] Reference<IVideoEffect> Effect(std::uint32_t index) const;
+    [[nodiscard]] Reference<IFrameProcessor> Processor() const;
+    [[nodiscard]] Reference<IPresetSaver> Saver() const;
 
   private:
     Library m_library;
-    Owned<IEffectLibrary> m_object;
+    Reference<IEffectLibrary> m_object;
 };
 
 }  // namespace velmora::reelcheck

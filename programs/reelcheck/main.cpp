@@ -3,7 +3,6 @@
 #include <cstdio>
 #include <exception>
 
-#include "programs/reelcheck/child_run.h"
 #include "programs/reelcheck/options.h"
 #include "programs/reelcheck/run.h"
 

@@ -76,12 +76,6 @@ void SpoilRounding() noexcept {
 
 }  // namespace
 
-Status VM_CALL PlayingHost::QueryInterface(const Guid*, void** out) {
-    if (out == nullptr) return kStatusFailure;
-    *out = nullptr;
-    return kStatusNoInterface;
-}
-
 bool VM_CALL PlayingHost::GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) {
     ++questions;
     if (spoilsRounding) SpoilRounding();

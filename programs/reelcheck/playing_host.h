@@ -6,13 +6,13 @@
 #include <string>
 #include <vector>
 
+#include "api/host_api.h"
 #include "programs/reelcheck/dice.h"
 #include "programs/reelcheck/frame.h"
-#include "api/host_api.h"
 
 namespace velmora::reelcheck {
 
-class PlayingHost final : public IVideoHost {
+class PlayingHost final : public PlainHost {
   public:
     static constexpr std::uint32_t kCapacity = 64;
 
@@ -21,14 +21,7 @@ class PlayingHost final : public IVideoHost {
     bool spoilsRounding = false;  // every answer leaves other floating-point control words behind
     std::uint32_t questions = 0;
 
-    Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
-    std::uint32_t VM_CALL AddRef() override { return 1; }  // lives as long as its check
-    std::uint32_t VM_CALL Release() override { return 1; }
     bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override;
-    bool VM_CALL HostOperation4(std::intptr_t, std::intptr_t, std::intptr_t) override { return false; }
-    std::uint32_t VM_CALL HostOperation5(std::intptr_t, std::intptr_t) override { return 0; }
-    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return false; }
-    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
 };
 
 // What an effect tells of itself.

@@ -1,4 +1,4 @@
-#include "programs/reelhost/bench.h"
+#include "programs/reelhost/measurements.h"
 
 #include <cstdio>
 #include <stdexcept>

@@ -9,13 +9,13 @@
 
 #include "programs/common/digest.h"
 #include "programs/common/usage_error.h"
-#include "programs/reelhost/bench.h"
 #include "programs/common/effect_library.h"
 #include "programs/common/effect_run.h"
 #include "programs/reelhost/frame_stream.h"
 #include "programs/reelhost/host_options.h"
 #include "programs/reelhost/random_state.h"
-#include "programs/reelhost/soak.h"
+#include "programs/reelhost/measurements.h"
+#include "text/names.h"
 
 namespace velmora::hosts {
 namespace {
@@ -97,7 +97,7 @@ void HashAllPresets(const HostOptions& options, const EffectLibrary& library) {
         frames.push_back(frame);
     }
     RandomStateFinder finder(library);
-    if (!NamesAreEqual(options.effect, "all")) {
+    if (!IsSameName(options.effect, "all")) {
         const std::size_t effect = FindEffect(library.Effects(), options.effect);
         HashPresets(library, static_cast<std::uint32_t>(effect), input, frames, finder);
         return;

@@ -1,4 +1,4 @@
-#include "programs/reelhost/soak.h"
+#include "programs/reelhost/measurements.h"
 
 #include <algorithm>
 #include <chrono>

@@ -5,12 +5,11 @@
 #include <map>
 #include <vector>
 
-#include "api/com_object.h"
 #include "api/host_api.h"
 
 namespace velmora::testing {
 
-class FakeHost final : public IVideoHost {
+class FakeHost final : public PlainHost {
   public:
     struct Request {
         std::uint32_t index;
@@ -31,8 +30,7 @@ class FakeHost final : public IVideoHost {
 
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override {
         lastQueried = iid;
-        *out = nullptr;
-        return kStatusNoInterface;
+        return PlainHost::QueryInterface(iid, out);
     }
     std::uint32_t VM_CALL AddRef() override { return ++m_count; }
     std::uint32_t VM_CALL Release() override { return --m_count; }
@@ -61,8 +59,6 @@ class FakeHost final : public IVideoHost {
         forwarded = {a, b};
         return 55;
     }
-    bool VM_CALL HostOperation6(std::intptr_t, std::intptr_t) override { return true; }
-    void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override {}
 
     [[nodiscard]] std::uint32_t Count() const { return m_count; }
 

@@ -39,15 +39,15 @@ class RegisteredText {
 };
 
 // A library object as far as the services see it. Translates "Help" to its own name when it has texts.
-class FakeLibrary final : public IMultiLingual {
+class FakeLibrary final : public Uncounted<IMultiLingual> {
   public:
     explicit FakeLibrary(const char16_t* help, const char16_t* knobs = u"") noexcept
         : m_help(help), m_knobs(knobs) {}
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
     std::uint32_t VM_CALL AddRef() override { return ++references; }
     std::uint32_t VM_CALL Release() override { return --references; }
-    std::int32_t VM_CALL LookUpText(std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t,
-                                    std::intptr_t, std::intptr_t) override {
+    std::int32_t VM_CALL LookUpText(const char*, std::int32_t, const char*, const char16_t*, char16_t*,
+                                    std::int32_t, std::int32_t*) override {
         return 0;
     }
     std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
@@ -72,12 +72,12 @@ class ServicesModule {
     IShellServices& operator*() const { return *m_services; }
     IShellServices* operator->() const { return m_services; }
     [[nodiscard]] HMODULE Module() const { return m_module; }
-    void Offer(IUnknown& library) const { m_offer(&library); }
-    void Withdraw(IUnknown& library) const { m_withdraw(&library); }
+    void Offer(com::IUnknown& library) const { m_offer(&library); }
+    void Withdraw(com::IUnknown& library) const { m_withdraw(&library); }
 
   private:
     using ServicesFunction = IShellServices*(VM_CALL*)();
-    using LibraryFunction = void(VM_CALL*)(IUnknown*);
+    using LibraryFunction = void(VM_CALL*)(com::IUnknown*);
 
     HMODULE m_module;
     IShellServices* m_services = nullptr;

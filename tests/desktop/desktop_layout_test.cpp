@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "desktop_fixture.h"
+#include "api/reference.h"
 #include "language/lang_parser.h"
 #include "desktop/bit_button.h"
 #include "desktop/options_dialog.h"
@@ -16,17 +17,17 @@ namespace velmora::support::test {
 namespace {
 
 // The texts of the real language module, as a library object gives them out.
-class RealTexts final : public IMultiLingual {
+class RealTexts final : public Uncounted<IMultiLingual> {
   public:
     RealTexts() : m_module(LoadLibraryW(DesktopPath(L"VMLang.dll").c_str())) {
         const auto create = reinterpret_cast<GetLangXMLParserFunction>(
             reinterpret_cast<void*>(GetProcAddress(m_module, "GetLangXMLParser")));
-        m_parser = create();
+        m_parser = Reference<LangXMLParser>::Adopt(create());
         const std::wstring file = DesktopPath(L"VMReelEffectsLang.xml");
         EXPECT_TRUE(m_parser->Load(reinterpret_cast<const char16_t*>(file.c_str())));
     }
     ~RealTexts() {
-        m_parser->Release();
+        m_parser.Reset();
         FreeLibrary(m_module);
     }
     RealTexts(const RealTexts&) = delete;
@@ -36,10 +37,8 @@ class RealTexts final : public IMultiLingual {
         *out = static_cast<IMultiLingual*>(this);
         return kStatusOk;
     }
-    std::uint32_t VM_CALL AddRef() override { return 1; }
-    std::uint32_t VM_CALL Release() override { return 1; }
-    std::int32_t VM_CALL LookUpText(std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t,
-                                    std::intptr_t, std::intptr_t) override {
+    std::int32_t VM_CALL LookUpText(const char*, std::int32_t, const char*, const char16_t*, char16_t*,
+                                    std::int32_t, std::int32_t*) override {
         return 0;
     }
     std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
@@ -64,7 +63,7 @@ class RealTexts final : public IMultiLingual {
 
   private:
     HMODULE m_module;
-    LangXMLParser* m_parser = nullptr;
+    Reference<LangXMLParser> m_parser;
 };
 
 // The size of a window's text in its own font; `width`: of the lines that it may be broken into, 0: one line.

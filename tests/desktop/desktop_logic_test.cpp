@@ -3,6 +3,7 @@
 
 #include <functional>
 
+#include "api/host_api.h"
 #include "desktop/bit_button_state.h"
 #include "desktop/text_sources.h"
 
@@ -103,12 +104,7 @@ TEST(BitButtonState, ChoosesTheImage) {
     }
 }
 
-class Library final : public IUnknown {
-  public:
-    Status VM_CALL QueryInterface(const Guid*, void**) override { return kStatusNoInterface; }
-    std::uint32_t VM_CALL AddRef() override { return 1; }
-    std::uint32_t VM_CALL Release() override { return 0; }
-};
+class Library final : public Uncounted<com::IUnknown> {};
 
 TEST(TextSources, AnotherLivingLibraryStepsIn) {
     Library first;

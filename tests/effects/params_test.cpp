@@ -142,14 +142,14 @@ TEST(MasterSettings, GettersLeaveTheDestinationWhenTheKindIsWrong) {
     EXPECT_EQ(list.Find(999, kClassGroup), nullptr);
     EXPECT_NE(list.Find(100, kClassGroup), nullptr);
     std::int32_t kept = -7;
-    list.GetInteger(304, kept);
+    list.GetInteger(Master::kBrightness, kept);
     EXPECT_EQ(kept, -7);
-    list.GetInteger(101, kept);
+    list.GetInteger(Master::kYJitter, kept);
     EXPECT_EQ(kept, 2);
     float number = 0;
-    list.GetPercentNormalised(304, number);
+    list.GetPercentNormalised(Master::kBrightness, number);
     EXPECT_EQ(number, 0.5f);
-    list.GetPercentSigned(304, number);
+    list.GetPercentSigned(Master::kBrightness, number);
     EXPECT_EQ(number, 0.0f);
 }
 

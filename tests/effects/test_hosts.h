@@ -10,7 +10,7 @@ namespace velmora::tests {
 
 // Counts references, and answers the identifier kIidPresetSaver as if it were its own. Its destructor lies
 // behind the interface's operations in the table.
-class TestHost : public IVideoHost {
+class TestHost : public PlainHost {
   public:
     virtual ~TestHost() = default;
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override {
@@ -22,7 +22,6 @@ class TestHost : public IVideoHost {
     }
     std::uint32_t VM_CALL AddRef() override { return ++references; }
     std::uint32_t VM_CALL Release() override { return --references; }
-    bool VM_CALL GetParamValue(std::uint32_t, ValueCell*, std::uint32_t) override { return false; }
     bool VM_CALL HostOperation4(std::intptr_t a, std::intptr_t b, std::intptr_t c) override {
         arguments = {a, b, c};
         return true;

@@ -54,6 +54,7 @@ void Check(const TextCommand& command) {
     Require(!command.text.empty());
 }
 void Check(const ListOptions&) {}
+void Check(const StudioOptions&) {}
 void Check(const PresetsOptions& options) {
     Require(!options.effect.empty());
 }

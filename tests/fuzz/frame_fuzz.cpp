@@ -10,6 +10,8 @@
 #include <limits>
 #include <vector>
 
+#include "api/host_api.h"
+#include "api/reference.h"
 #include "effects/process_state.h"
 #include "effects/render_session.h"
 #include "programs/reelcheck/library.h"
@@ -22,7 +24,6 @@ namespace {
 
 using reelcheck::Frame;
 using reelcheck::Layout;
-using reelcheck::Owned;
 using reelcheck::Packing;
 using reelcheck::PlayingHost;
 
@@ -131,7 +132,7 @@ void Try(FuzzInput& input, Packing from, Packing to, const Operation& operation)
 }
 
 // The state that a reference renders on, beside the library's.
-struct Reference {
+struct ReferenceRun {
     render::RenderState state;
     render::RenderOptions options;
 };
@@ -175,19 +176,20 @@ class Run {
     }
 
     void Effect(std::size_t index) {
-        if (m_effects[index] == nullptr) {
-            m_effects[index].reset(m_library.CreateEffect(static_cast<std::uint32_t>(index)));
+        if (!m_effects[index]) {
+            m_effects[index] =
+                Reference<IVideoEffect>::Adopt(m_library.CreateEffect(static_cast<std::uint32_t>(index)));
         }
         IVideoEffect& effect = *m_effects[index];
         ReadValues(effect);
         const double seconds = ReadTime(m_input);
         void* face = nullptr;
         Require(effect.QueryInterface(&kIidVideoHost, &face) == kStatusOk);
-        const Owned<IVideoHost> owner(static_cast<IVideoHost*>(face));
+        const auto owner = Reference<IVideoHost>::Adopt(static_cast<IVideoHost*>(face));
         const auto render = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
             if (runner == Runner::kLibrary) return Process(effect, &m_host, source, destination, seconds);
             // The references read the values that the library's list has just read, and leave in it what they found.
-            Reference& reference = runner == Runner::kReference ? m_plain : m_other;
+            ReferenceRun& reference = runner == Runner::kReference ? m_plain : m_other;
             const TimingRecord timing = {0.0, 0.0, seconds};
             return RenderFrame({CurrentMasterSettings(), &reference.state, reference.options}, *owner,
                                &source, &destination, &timing);
@@ -202,7 +204,7 @@ class Run {
         const auto convert = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
             // A processor takes the SIMD level that the environment names when it is made.
             setenv("VELMORA_FORM", runner == Runner::kLibrary ? level : kLevels[0], 1);
-            const Owned<IFrameProcessor> processor(m_library.CreateFrameProcessor());
+            const auto processor = Reference<IFrameProcessor>::Adopt(m_library.CreateFrameProcessor());
             unsetenv("VELMORA_FORM");
             return isToBgra ? processor->ConvertYcbcrToBgra(&source, &destination, alpha)
                             : processor->ConvertBgraToYcbcr(&source, &destination, alpha);
@@ -214,8 +216,8 @@ class Run {
     FuzzInput& m_input;
     IEffectLibrary& m_library;
     PlayingHost m_host;
-    std::array<Owned<IVideoEffect>, 5> m_effects;
-    Reference m_plain, m_other;
+    std::array<Reference<IVideoEffect>, 5> m_effects;
+    ReferenceRun m_plain, m_other;
 };
 
 }  // namespace

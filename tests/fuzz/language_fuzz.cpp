@@ -7,9 +7,8 @@
 #include <string>
 #include <string_view>
 
-#include "language/copy_text.h"
-#include "language/language_table.h"
 #include "text/utf.h"
+#include "language/language_table.h"
 
 namespace {
 

@@ -141,11 +141,6 @@ TEST_F(LanguageModule, HasEveryTextInEveryLanguage) {
     EXPECT_EQ(Text("fi", 8, "Cancel"), u"");
 }
 
-template <typename T>
-std::intptr_t Word(T* pointer) {
-    return reinterpret_cast<std::intptr_t>(pointer);
-}
-
 TEST_F(LanguageModule, LooksUpSevenWords) {
     ASSERT_TRUE(m_parser->Load(kLanguageFile));
     const struct {
@@ -168,15 +163,15 @@ TEST_F(LanguageModule, LooksUpSevenWords) {
         char16_t buffer[32] = {0xCCCC};
         std::int32_t found = 7;
         const std::int32_t length =
-            m_parser->LookUpText(Word(row.language), 8, Word("Cancel"), Word(row.fallback), Word(buffer),
-                                 row.capacity, Word(&found));
+            m_parser->LookUpText(row.language, 8, "Cancel", row.fallback, buffer, row.capacity, &found);
         EXPECT_EQ(std::u16string(buffer), row.written);
         EXPECT_EQ(length, static_cast<std::int32_t>(row.written.size()));
         EXPECT_EQ(found, row.found);
     }
-    EXPECT_EQ(m_parser->LookUpText(Word("de"), 8, Word("OK"), 0, 0, 32, 0), 0) << "neither buffer nor flag";
+    EXPECT_EQ(m_parser->LookUpText("de", 8, "OK", nullptr, nullptr, 32, nullptr), 0)
+        << "neither buffer nor flag";
     char16_t buffer[3];
-    EXPECT_EQ(m_parser->LookUpText(Word("de"), 8, Word("OK"), 0, Word(buffer), 3, 0), 2) << "no flag";
+    EXPECT_EQ(m_parser->LookUpText("de", 8, "OK", nullptr, buffer, 3, nullptr), 2) << "no flag";
 }
 
 TEST_F(LanguageModule, KeepsItsTextsWhenALoadFails) {

@@ -4,6 +4,7 @@
 
 #include <memory>
 
+#include "api/reference.h"
 #include "tests/common/fake_host.h"
 #include "tests/common/guarded_frame.h"
 #include "tests/common/library_under_test.h"
@@ -16,48 +17,43 @@ using testing::Geometry;
 using testing::GuardedFrame;
 using testing::LoadedLibrary;
 
-struct Releaser {
-    void operator()(IUnknown* object) const { object->Release(); }
-};
-template <typename Interface>
-using Owned = std::unique_ptr<Interface, Releaser>;
-
 class Boundary : public ::testing::Test {
   protected:
     LoadedLibrary m_dll;
-    Owned<IEffectLibrary> m_library{m_dll.getEffectsLibrary()};
+    Reference<IEffectLibrary> m_library = Reference<IEffectLibrary>::Adopt(m_dll.getEffectsLibrary());
 
-    Owned<IVideoEffect> Effect(std::uint32_t index) {
-        return Owned<IVideoEffect>(m_library->CreateEffect(index));
+    Reference<IVideoEffect> Effect(std::uint32_t index) {
+        return Reference<IVideoEffect>::Adopt(m_library->CreateEffect(index));
     }
 };
 
 TEST_F(Boundary, EffectsDoNotKeepTheLibraryLoaded) {
-    const Owned<IVideoEffect> effect = Effect(1);
+    const Reference<IVideoEffect> effect = Effect(1);
     EXPECT_FALSE(m_dll.canUnload());
-    m_library.reset();
+    m_library.Reset();
     EXPECT_TRUE(m_dll.canUnload());
     EXPECT_STREQ(effect->GetName(), "Film Look");
 }
 
 // The tables of an interface, called by slot as a host of another compiler does.
 TEST_F(Boundary, KeepsItsSlots) {
-    Owned<IVideoEffect> effect = Effect(2);
-    void** table = *reinterpret_cast<void***>(effect.get());
+    Reference<IVideoEffect> effect = Effect(2);
+    void** table = *reinterpret_cast<void***>(effect.Get());
     using GetName = const char*(VM_CALL*)(void*);
     using GetPresetName = const char*(VM_CALL*)(void*, std::uint32_t);
-    EXPECT_STREQ(reinterpret_cast<GetName>(table[3])(effect.get()), "Film Damage");
-    EXPECT_STREQ(reinterpret_cast<GetPresetName>(table[7])(effect.get(), 7), "Water Damage");
-    void** libraryTable = *reinterpret_cast<void***>(m_library.get());
-    EXPECT_STREQ(reinterpret_cast<GetName>(libraryTable[3])(m_library.get()), "Velmora Reel Effects");
+    EXPECT_STREQ(reinterpret_cast<GetName>(table[3])(effect.Get()), "Film Damage");
+    EXPECT_STREQ(reinterpret_cast<GetPresetName>(table[7])(effect.Get(), 7), "Water Damage");
+    void** libraryTable = *reinterpret_cast<void***>(m_library.Get());
+    EXPECT_STREQ(reinterpret_cast<GetName>(libraryTable[3])(m_library.Get()), "Velmora Reel Effects");
     using Create = void*(VM_CALL*)(void*);
-    Owned<IUnknown> saver(static_cast<IUnknown*>(reinterpret_cast<Create>(libraryTable[8])(m_library.get())));
-    EXPECT_NE(saver, nullptr);
+    auto saver = Reference<com::IUnknown>::Adopt(
+        static_cast<com::IUnknown*>(reinterpret_cast<Create>(libraryTable[8])(m_library.Get())));
+    EXPECT_NE(saver.Get(), nullptr);
 }
 
 // That a frame repeated at once has the same bytes is reelcheck's; another frame in between draws other numbers.
 TEST_F(Boundary, ReplaysAFrameOnlyWhenItIsRepeatedAtOnce) {
-    const Owned<IVideoEffect> effect = Effect(0);
+    const Reference<IVideoEffect> effect = Effect(0);
     FakeHost host;
     for (const std::uint32_t jitter : {0u, 1u}) host.SetNumber(jitter, 1.0f);
     GuardedFrame source{Geometry{64, 64}};
@@ -80,7 +76,7 @@ TEST_F(Boundary, ReplaysAFrameOnlyWhenItIsRepeatedAtOnce) {
 }
 
 TEST_F(Boundary, ConvertsFramesBothWays) {
-    Owned<IFrameProcessor> processor(m_library->CreateFrameProcessor());
+    auto processor = Reference<IFrameProcessor>::Adopt(m_library->CreateFrameProcessor());
     const std::uint8_t packed[] = {50, 100, 60, 200, 70, 110, 1, 2};  // three pixels
     GuardedFrame pixels{Geometry{5, 1, 1, 0}};
     FrameRecord source = {const_cast<std::uint8_t*>(packed), 3, 1, 8, 0, 0, 0};

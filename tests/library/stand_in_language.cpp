@@ -30,10 +30,13 @@ class Parser final : public velmora::LangXMLParser {
         const char* accepted = std::getenv("VM_TEST_ACCEPT");
         return accepted != nullptr && ++m_requests == std::atoi(accepted);
     }
-    std::int32_t VM_CALL LookUpText(std::intptr_t a, std::intptr_t b, std::intptr_t c, std::intptr_t d,
-                                    std::intptr_t e, std::intptr_t f, std::intptr_t g) override {
-        return static_cast<std::int32_t>(a + 10 * b + 100 * c + 1000 * d + 10000 * e + 100000 * f +
-                                         1000000 * g);
+    std::int32_t VM_CALL LookUpText(const char* a, std::int32_t b, const char* c, const char16_t* d,
+                                    char16_t* e, std::int32_t f, std::int32_t* g) override {
+        const auto word = [](const void* pointer) {
+            return static_cast<std::int32_t>(reinterpret_cast<std::intptr_t>(pointer));
+        };
+        return word(a) + 10 * b + 100 * word(c) + 1000 * word(d) + 10000 * word(e) + 100000 * f +
+               1000000 * word(g);
     }
     std::int32_t VM_CALL GetText(const char* language, std::int32_t category, const char* key,
                                  char16_t* buffer, std::int32_t capacity) override {

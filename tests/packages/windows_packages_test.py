@@ -17,7 +17,7 @@ from packing import CLIP, DIST, ROOT, check_digest_list, check_no_build_paths, f
 
 PRODUCT = "velmora-reel-effects-1.0"
 WINE = ROOT / "scripts" / "wine32"
-MUST_HAVE = """VMReelEffects.dll VMLang.dll VMReelEffectsLang.xml resources.dll VMReelEffects.chm reelhost.exe reelview.exe
+MUST_HAVE = """VMReelEffects.dll VMLang.dll VMReelEffectsLang.xml resources.dll VMReelEffects.chm reelhost.exe reelview.exe reelcheck.exe
     frei0r/velmora_film_camera.dll frei0r/velmora_film_look.dll frei0r/velmora_film_damage.dll
     frei0r/velmora_film_express.dll frei0r/velmora_film_pro.dll sdk/host_api.h sdk/example_host.cpp docs/hosts.txt
     docs/help/start.html README.txt reel.html LICENSE.txt third-party.txt SHA256SUMS""".split()

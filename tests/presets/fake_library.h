@@ -8,20 +8,17 @@
 #include "effects/film_effect.h"
 #include "api/com_object.h"
 #include "api/host_api.h"
+#include "api/reference.h"
 
 namespace velmora::tests {
 
 // Answers one language; counts what is taken and given back.
-class FakeTexts final : public IMultiLingual {
+class FakeTexts final : public Uncounted<IMultiLingual> {
   public:
-    Status VM_CALL QueryInterface(const Guid*, void** out) override {
-        *out = nullptr;
-        return kStatusNoInterface;
-    }
     std::uint32_t VM_CALL AddRef() override { return static_cast<std::uint32_t>(++references); }
     std::uint32_t VM_CALL Release() override { return static_cast<std::uint32_t>(--references); }
-    std::int32_t VM_CALL LookUpText(std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t,
-                                    std::intptr_t, std::intptr_t) override {
+    std::int32_t VM_CALL LookUpText(const char*, std::int32_t, const char*, const char16_t*, char16_t*,
+                                    std::int32_t, std::int32_t*) override {
         return 0;
     }
     std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
@@ -44,7 +41,7 @@ class FakeTexts final : public IMultiLingual {
     int references = 0;
 };
 
-class FakeLibrary final : public IEffectLibrary {
+class FakeLibrary final : public Uncounted<IEffectLibrary> {
   public:
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override {
         *out = nullptr;
@@ -53,8 +50,6 @@ class FakeLibrary final : public IEffectLibrary {
         *out = static_cast<IMultiLingual*>(texts);
         return kStatusOk;
     }
-    std::uint32_t VM_CALL AddRef() override { return 2; }
-    std::uint32_t VM_CALL Release() override { return 1; }
     const char* VM_CALL GetLibraryName() override { return name; }
     IVideoEffect* VM_CALL CreateEffect(std::uint32_t index) override {
         return effects::CreateEffectByIndex(index);
@@ -75,7 +70,7 @@ inline constexpr std::uint32_t kIndexOfDamage = 2;
 // saver, but for the preset's own.
 inline PresetRecord MakeRecord(std::uint32_t effectIndex, std::uint32_t preset) {
     PresetRecord record = {};
-    IVideoEffect* effect = effects::CreateEffectByIndex(effectIndex);
+    const auto effect = Reference<IVideoEffect>::Adopt(effects::CreateEffectByIndex(effectIndex));
     const char* name = effect->GetPresetName(preset);
     std::copy_n(name, std::min<std::size_t>(std::char_traits<char>::length(name), 259), record.name);
     ParamDescriptor descriptor = {};
@@ -85,7 +80,6 @@ inline PresetRecord MakeRecord(std::uint32_t effectIndex, std::uint32_t preset) 
         record.values[record.count++] = {cell.value, 0, descriptor.kind};
         descriptor = {};
     }
-    effect->Release();
     return record;
 }
 

@@ -7,9 +7,8 @@
 #include <string>
 #include <vector>
 
-#include "presets/compatibility.h"
-#include "presets/dialogs.h"
 #include "presets/preset_file.h"
+#include "presets/dialogs.h"
 #include "tests/presets/fake_library.h"
 #include "tests/presets/temporary_folder.h"
 

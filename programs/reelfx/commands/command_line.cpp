@@ -7,6 +7,7 @@
 #include <sstream>
 
 #include "text/number_text.h"
+#include "programs/common/effect_info.h"
 #include "programs/common/usage_error.h"
 #include "programs/reelfx/commands/command_options.h"
 
@@ -172,6 +173,25 @@ PresetSaveOptions ReadPresetSave(const TypedOptions& typed) {
 
 }  // namespace
 
+namespace {
+
+// The parser asks for a command before it looks at what was typed in its place.
+std::string Explain(const CLI::App& app, const CLI::ParseError& error) {
+    const CLI::App* group = &app;
+    while (!group->get_subcommands().empty()) group = group->get_subcommands().front();
+    const auto commands = group->get_subcommands([](const CLI::App*) { return true; });
+    if (dynamic_cast<const CLI::RequiredError*>(&error) == nullptr || commands.empty()) return error.what();
+    std::vector<std::string> names;
+    names.reserve(commands.size());
+    for (const CLI::App* command : commands) names.push_back(command->get_name());
+    const std::vector<std::string> typed = group->remaining();
+    if (typed.empty()) return "a command is missing; there are " + QuotedList(names);
+    return std::string(typed.front().starts_with('-') ? "there is no option \"" : "there is no command \"") +
+           typed.front() + "\"; there are the commands " + QuotedList(names);
+}
+
+}  // namespace
+
 Command ReadCommandLine(int count, const char* const* arguments) {
     TypedOptions typed;
     CLI::App app;
@@ -183,7 +203,7 @@ Command ReadCommandLine(int count, const char* const* arguments) {
         app.exit(wish, text, text);  // writes the help or the version
         return TextCommand{text.str()};
     } catch (const CLI::ParseError& error) {
-        throw UsageError(std::string(error.what()) + "; see reelfx --help");
+        throw UsageError(Explain(app, error) + "; see reelfx --help");
     }
     if (app.got_subcommand("list")) {
         typed.list.effect = Given(typed.listEffect);

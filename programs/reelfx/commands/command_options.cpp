@@ -210,7 +210,7 @@ void AddCommands(CLI::App& app, TypedOptions& typed) {
     app.name("reelfx");
     app.description("The look of old film for any footage.");
     app.footer(ExitCodesText());
-    app.set_version_flag("--version", std::string("reelfx ") + kReelfxVersion);
+    app.set_version_flag("--version", std::string("reelfx ") + kReelEffectsVersion);
     app.require_subcommand(1);
     AddList(app, typed);
     AddRender(app, typed);

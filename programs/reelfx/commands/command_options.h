@@ -20,8 +20,6 @@ class App;
 
 namespace velmora::hosts {
 
-inline constexpr char kReelfxVersion[] = "1.0";
-
 struct ExitMeaning {
     ExitCode code;
     const char* meaning;

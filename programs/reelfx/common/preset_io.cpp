@@ -6,14 +6,10 @@
 #include "programs/common/usage_error.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/output_place.h"
-#include "presets/compatibility.h"
 #include "presets/preset_file.h"
 
 namespace velmora::hosts {
 namespace {
-
-// The name that the library object reports to hosts.
-constexpr char kLibraryName[] = "Velmora Reel Effects";
 
 std::string FieldText(const char (&field)[kPresetNameWidth]) {
     return std::string(field, std::find(field, field + kPresetNameWidth, '\0'));

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <string_view>
 
 #include "programs/common/usage_error.h"
 
@@ -38,10 +39,9 @@ void CheckMatte(const EffectChoice& choice) {
     bool hasDamage = false;
     for (std::uint32_t i = 0; i < choice.Info().params.size(); ++i) {
         const ParamInfo& param = choice.Info().params[i];
-        hasDamage = hasDamage || NamesAreEqual(param.name, "Wear");
-        if (NamesAreEqual(param.name, "Blue Channel Only") && session->Value(i).flag != 0) {
-            throw UsageError("--matte cannot show wear in one channel only; add --set \"" + param.name +
-                             "=off\"");
+        hasDamage = hasDamage || param.name == std::string_view("Wear");
+        if (param.name == std::string_view("Blue Channel Only") && session->Value(i).flag != 0) {
+            throw UsageError("--matte cannot show wear in one channel only; add --set \"" + param.name + "=off\"");
         }
     }
     if (!hasDamage) throw UsageError("--matte needs damage, and \"" + choice.Info().name + "\" has none");

@@ -3,11 +3,11 @@
 #include <filesystem>
 #include <fstream>
 
-#include "programs/common/effect_info.h"
 #include "programs/common/usage_error.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/output_place.h"
 #include "programs/reelfx/media/pixel_converter.h"
+#include "text/names.h"
 
 namespace velmora::hosts {
 namespace {
@@ -27,7 +27,7 @@ constexpr int kJpegQuantiser = 4;  // 1 is best, 31 worst
 const StillFormat& FormatOf(const std::string& path) {
     const std::string ending = std::filesystem::path(path).extension().string();
     for (const StillFormat& format : kFormats) {
-        if (NamesAreEqual(ending, format.ending)) return format;
+        if (IsSameButForCase(ending, format.ending)) return format;
     }
     throw UsageError(path + ": pictures must end in .png or .jpg");
 }

@@ -51,7 +51,7 @@ int main() {
     CLI::App app;
     AddCommands(app, typed);
     Json program = JsonOf(app);
-    program["version"] = kReelfxVersion;
+    program["version"] = velmora::kReelEffectsVersion;
     program["interrupt"] = kOnInterrupt;
     for (const ExitMeaning& exit : kExitMeanings) {
         program["exits"].push_back({{"code", static_cast<int>(exit.code)}, {"detail", exit.detail}});

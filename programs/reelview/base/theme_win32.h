@@ -10,7 +10,7 @@
 
 #include "programs/reelview/base/box.h"
 #include "programs/reelview/base/knob_colours.h"
-#include "platform/win32_handles.h"
+#include "platform/win32.h"
 
 namespace velmora::reelview {
 

@@ -12,7 +12,7 @@
 
 #include "programs/reelview/source/media_clip_win32.h"
 #include "programs/reelview/base/text_keys.h"
-#include "platform/win32_handles.h"
+#include "platform/win32.h"
 
 namespace velmora::reelview {
 namespace {

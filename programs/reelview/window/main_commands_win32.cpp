@@ -184,7 +184,7 @@ void MainWindow::OnExported(const ExportResult& result, const std::wstring& file
 }
 
 void MainWindow::LoadPreset() {
-    const hosts::Reference<IPresetSaver> saver(m_library.Object().CreatePresetSaver());
+    const auto saver = Reference<IPresetSaver>::Adopt(m_library.Object().CreatePresetSaver());
     if (!saver) return;
     PresetRecord record = {};
     const std::int32_t result = saver->LoadPreset(m_window, &m_library.Object(), m_history.Now().effect,
@@ -199,7 +199,7 @@ void MainWindow::LoadPreset() {
 }
 
 void MainWindow::SavePreset() {
-    const hosts::Reference<IPresetSaver> saver(m_library.Object().CreatePresetSaver());
+    const auto saver = Reference<IPresetSaver>::Adopt(m_library.Object().CreatePresetSaver());
     if (!saver) return;
     PresetRecord record = {};
     const Values& values = m_history.Now().Current();

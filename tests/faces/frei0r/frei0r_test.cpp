@@ -12,9 +12,9 @@
 
 #include "effects/effect_session.h"
 #include "faces/frei0r/frame_clock.h"
-#include "faces/frei0r/host_time_unit.h"
 #include "faces/frei0r/instance.h"
 #include "faces/frei0r/plugin_params.h"
+#include "platform/platform.h"
 
 namespace velmora::hosts::frei0r {
 namespace {
@@ -239,7 +239,7 @@ TEST(Frei0rTimeUnit, FollowsTheCallingModule) {
     };
     for (const auto& row : rows) EXPECT_EQ(UnitOfModule(row.module), row.unit) << row.module;
     static const int here = 0;
-    EXPECT_NE(ModuleAt(&here).find("frei0r_test"), std::string::npos);
+    EXPECT_NE(support::ModuleAt(&here).find("frei0r_test"), std::string::npos);
 }
 
 TEST(Frei0rClock, FindsTheNearestFrame) {

@@ -32,7 +32,7 @@ TEST(Settings, StoreShownValues) {
         std::uint32_t parameter;
         float number;
     };
-    for (const Row& row : {Row{"Shake=4", 1, 0.4f}, Row{"shake=10", 1, 1.0f}, Row{"Tint=-20", 3, 0.4f},
+    for (const Row& row : {Row{"Shake=4", 1, 0.4f}, Row{"sh-ake'=10", 1, 1.0f}, Row{"Tint=-20", 3, 0.4f},
                            Row{"Tint=0", 3, 0.5f}}) {
         const Setting setting = ParseSetting(TestEffect(), row.text);
         EXPECT_EQ(setting.parameter, row.parameter) << row.text;
@@ -46,7 +46,7 @@ TEST(Settings, StoreColoursItemsAndFlags) {
         std::uint32_t parameter, bits;
     };
     // Colour words have red in the lowest byte.
-    for (const Row& row : {Row{"Tint=#336699", 2, 0x00996633u}, Row{"Grain=coarse", 4, 1},
+    for (const Row& row : {Row{"Tint=#336699", 2, 0x00996633u}, Row{"grain=COARSE", 4, 1},
                            Row{"Grain=0", 4, 0}, Row{"Thick=on", 5, 1}, Row{"Thick=NO", 5, 0}}) {
         const Setting setting = ParseSetting(TestEffect(), row.text);
         EXPECT_EQ(setting.parameter, row.parameter) << row.text;

@@ -127,7 +127,7 @@ class Telling(ReelfxTest):
         self.assertNotIn(b'"end"', done.stderr)
 
     def test_a_dry_run_tells_and_writes_nothing(self):
-        options = ("-e", "Film Look", "-p", "Sepia", "-s", "Tint=60", "--seed", 5, "--frames", "3:9", "-j", 2)
+        options = ("-e", "film-look", "-p", "sepia", "-s", "tint=60", "--seed", 5, "--frames", "3:9", "-j", 2)
         done = reelfx("render", clips.small, self.out / "a.mp4", *options, "--dry-run")
         self.assertEqual((done.returncode, done.stderr, self.left_over()), (0, b"", []))
         text = done.stdout.decode()
@@ -410,6 +410,10 @@ class Refusing(ReelfxTest):
             (2, ["#RRGGBB", "red"], (*render, *CAMERA, "-s", "Border=red")),
             (2, ["NAME=VALUE"], (*render, *CAMERA, "-s", "X Jitter")),
             (2, ["--effect"], render),
+            (2, ["no command \"frobnicate\"", "render"], ("frobnicate", small)),
+            (2, ["no command \"dance\"", "show"], ("preset", "dance")),
+            (2, ["no option \"--verson\""], ("--verson",)),
+            (2, ["command is missing"], ()),
             (2, ["--wrong"], (*render, *CAMERA, "--wrong")),
             (2, ["--seed"], (*render, *CAMERA, "--seed", "x")),
             (2, ["A:B"], (*render, *CAMERA, "--frames", "9:3")),

@@ -75,7 +75,7 @@ bool BecomesNumber(std::uint32_t parameter, double value) {
     return Becomes(parameter, [&](ValueWord word) { return std::abs(word.number - value) < 1e-5; });
 }
 
-std::wstring WithRecorder(const std::string& effect, const std::wstring& clip = L"small.y4m") {
+std::wstring WithRecorder(const std::string& effect, const std::wstring& clip = L"wide.y4m") {
     SetEnvironmentVariableW(L"REELVIEW_RECORD", RecordFile().c_str());
     DeleteFileW(RecordFile().c_str());
     return L"--library " + Quoted(Variable(L"REELVIEW_RECORDER")) + L" --effect " + Quoted(Wide(effect)) +

@@ -25,6 +25,7 @@ def windows(path):
 def make_media(folder):
     source = ("-f", "lavfi", "-i")
     ffmpeg(*source, "testsrc2=s=64x48:r=25:d=0.48", "-pix_fmt", "yuv420p", folder / "small.y4m")
+    ffmpeg(*source, "testsrc2=s=320x180:r=25:d=0.48", "-pix_fmt", "yuv420p", folder / "wide.y4m")
     ffmpeg(*source, "testsrc2=s=640x360:r=25:d=8", "-pix_fmt", "yuv420p", folder / "long.y4m")
     ffmpeg(*source, "testsrc2=s=64x48:r=25:d=0.48", "-c:v", "rawvideo", "-pix_fmt", "bgr24", folder / "plain.avi")
     ffmpeg(*source, "testsrc2=s=64x48:r=25:d=0.48", folder / "seq%02d.png")

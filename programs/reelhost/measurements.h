@@ -1,4 +1,5 @@
-// An hour of film through one loaded library: does it cost at the end what it cost at the beginning?
+// What a frame costs through the DLL, beside a memcpy of one (bench.cpp); and whether an hour of film through one loaded
+// library costs at the end what it cost at the beginning (soak.cpp).
 #pragma once
 
 #include <cstdint>
@@ -6,6 +7,9 @@
 #include "programs/common/effect_library.h"
 
 namespace velmora::hosts {
+
+// Prints a Markdown table to standard output. Throws std::runtime_error when an effect refuses a frame.
+void PrintBench(const EffectLibrary& library);
 
 // Renders at least `frames` frames of 1920x1080, 30 to the second of film, in rounds through every preset of every
 // effect, each with an effect object of its own. Prints what the process holds and what a frame costs after each

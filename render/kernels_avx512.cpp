@@ -1,4 +1,4 @@
-// The kernels with AVX2.
+// The kernels with AVX-512.
 
 #include <algorithm>
 #include <array>
@@ -10,33 +10,30 @@
 
 #include "render/glow_kernels.h"
 #include "render/scratch_line.h"
-#include "render/simd/levels.h"
+#include "render/kernel_levels.h"
 #include "render/simd/target.h"
 #include "render/ycbcr.h"
 
-#if VM_HAS_AVX2
-VM_BEGIN_TARGET("avx2")
+#if VM_HAS_AVX512
+VM_BEGIN_TARGET("avx512f,avx512bw,avx512vl,avx512vbmi")
 
 namespace velmora::render {
 namespace {
 
-#include "render/simd/avx2.h"
+#include "render/simd/avx512.h"
 
 #include "render/simd/rows.inc"
 #include "render/simd/wear.inc"
 #include "render/simd/tone_lines.inc"
 #include "render/simd/channels.inc"
-#include "render/simd/table_shuffles.inc"
+#include "render/simd/table_permutes.inc"
 #include "render/simd/tone_channels.inc"
-#include "render/simd/glow.inc"
 #include "render/simd/ycbcr.inc"
 
 }  // namespace
 
-const GlowKernels kAvx2Glow = kGlow;
-
-const Kernels kAvx2Kernels = {ToneRow,   WearRow,   DrawScratchesSse2, CopyRow,
-                              StreamRow, EndStream, &kAvx2Glow,        &kYcbcr};
+const Kernels kAvx512Kernels = {ToneRow,   WearRow,   DrawScratchesSse2, CopyRow,
+                                StreamRow, EndStream, &kAvx2Glow,        &kYcbcr};
 
 }  // namespace velmora::render
 

@@ -1,4 +1,4 @@
-// The kernels with SSE2.
+// The kernels with SSSE3.
 
 #include <algorithm>
 #include <array>
@@ -10,38 +10,33 @@
 
 #include "render/glow_kernels.h"
 #include "render/scratch_line.h"
-#include "render/simd/levels.h"
+#include "render/kernel_levels.h"
 #include "render/simd/target.h"
 #include "render/ycbcr.h"
 
-#if VM_HAS_SSE2
-VM_BEGIN_TARGET("sse2")
+#if VM_HAS_SSSE3
+VM_BEGIN_TARGET("ssse3")
 
 namespace velmora::render {
 namespace {
 
 #include "render/simd/sse2.h"
+#include "render/simd/ssse3.h"
 
 #include "render/simd/rows.inc"
 #include "render/simd/wear.inc"
 #include "render/simd/tone_lines.inc"
+#include "render/simd/channels.inc"
+#include "render/simd/mix_channels.inc"
 #include "render/simd/table_words.inc"
-#include "render/simd/mix_words.inc"
 #include "render/simd/tone_words.inc"
 #include "render/simd/glow.inc"
 #include "render/simd/ycbcr.inc"
-#include "render/scratch_rows.inc"
-#include "render/simd/scratch_span.inc"
 
 }  // namespace
 
-void DrawScratchesSse2(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
-                       const ScratchRowPlace& place) noexcept {
-    DrawLines(lines, count, row, width, place);
-}
-
-const Kernels kSse2Kernels = {ToneRow, WearRow, DrawScratchesSse2, CopyRow, StreamRow, EndStream,
-                              &kGlow,  &kYcbcr};
+const Kernels kSsse3Kernels = {ToneRow, WearRow, DrawScratchesSse2, CopyRow, StreamRow, EndStream,
+                               &kGlow,  &kYcbcr};
 
 }  // namespace velmora::render
 

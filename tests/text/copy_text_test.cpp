@@ -4,7 +4,7 @@
 
 #include <gtest/gtest.h>
 
-#include "language/copy_text.h"
+#include "text/utf.h"
 
 namespace velmora::language {
 namespace {

@@ -1,4 +1,5 @@
-// Owners of Windows handles: acquire straight into them, and they are closed in reverse order.
+// What files for Windows share: 16-bit text as the system's functions take it, and owners of handles. Acquire straight
+// into an owner, and handles are closed in reverse order.
 #pragma once
 
 #include <windows.h>
@@ -7,6 +8,12 @@
 #include <type_traits>
 
 namespace velmora::support::win32 {
+
+// Windows' 16-bit text is wchar_t; the library's is char16_t. Both are UTF-16.
+static_assert(sizeof(wchar_t) == sizeof(char16_t));
+inline const wchar_t* Wide(const char16_t* text) noexcept {
+    return reinterpret_cast<const wchar_t*>(text);
+}
 
 // Closes a handle through the function that belongs to its kind.
 template <auto close>
