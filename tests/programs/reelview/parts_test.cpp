@@ -248,7 +248,7 @@ TEST(Texts, AreInTheLanguageFile) {
     ASSERT_GT(keys.size(), 60u);
     for (const char* code : {"en", "de", "fr", "es", "it", "pt", "nl", "pl", "cs", "ru", "ja", "zh", "ko"}) {
         for (const std::string& key : keys) {
-            const char16_t* const text = table->Find(code, 9, key.c_str());
+            const char16_t* const text = table->Find(code, text::kCategory, key.c_str());
             ASSERT_NE(text, nullptr) << code << ": " << key;
             const bool hasLetter = key.find('&') != std::string::npos;
             EXPECT_EQ(std::u16string(text).find(u'&') != std::u16string::npos, hasLetter)
