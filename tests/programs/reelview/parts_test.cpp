@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "language/language_table.h"
+#include "programs/reelview/base/text_keys.h"
 #include "programs/reelview/document/command_text.h"
 #include "programs/reelview/document/settings_history.h"
 #include "programs/reelview/document/view_options.h"
