@@ -247,7 +247,8 @@ TEST(Texts, AreInTheLanguageFile) {
         keys.push_back((*match)[1]);
     }
     ASSERT_GT(keys.size(), 60u);
-    for (const char* code : {"en", "de", "fr", "es", "it", "pt", "nl", "pl", "cs", "ru", "ja", "zh", "ko"}) {
+    for (const char* code :
+         {"en", "de", "fr", "es", "it", "pt", "nl", "sv", "pl", "cs", "tr", "ru", "ja", "zh", "ko"}) {
         for (const std::string& key : keys) {
             const char16_t* const text = table->Find(code, text::kCategory, key.c_str());
             ASSERT_NE(text, nullptr) << code << ": " << key;
