@@ -132,8 +132,8 @@ inline constexpr MasterRow kRows[] = {
 }  // namespace master_table
 
 inline constexpr const auto& kMasterRows = master_table::kRows;
-inline constexpr std::uint32_t kMasterCount =
-    static_cast<std::uint32_t>(std::ranges::count_if(kMasterRows, &MasterRow::IsSetting));
+inline constexpr std::uint32_t kMasterCount = static_cast<std::uint32_t>(std::count_if(
+    std::begin(kMasterRows), std::end(kMasterRows), [](const MasterRow& row) { return row.IsSetting(); }));
 static_assert(kMasterCount == 21 && std::size(kMasterRows) == 33);
 
 // The texts of the "Pattern" menu, in item order. Item i has the value 2000 + i.
