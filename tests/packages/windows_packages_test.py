@@ -179,8 +179,9 @@ def check_life(prefix, setup, packed, expected):
     kept |= {parent.as_posix() for parent in Path(*kept).parents} - {"."}
     assert prefix.files() - files == kept, prefix.files() ^ files ^ kept
     assert files <= prefix.files()
-    # The key below which all programs have their entries is the system's: made when first needed, and never removed.
-    left = {line for line in prefix.registry() - registry if line[1] or not line[0].endswith(UNINSTALL)}
+    # The keys below which all programs have their entries are the system's: made when first needed, and never removed.
+    shared = (UNINSTALL, "\\Software\\Classes")
+    left = {line for line in prefix.registry() - registry if line[1] or not line[0].endswith(shared)}
     assert left == {setting, (setting[0], ""), (setting[0].removesuffix("\\Common"), "")}, left
     assert registry <= prefix.registry(), registry - prefix.registry()
 
