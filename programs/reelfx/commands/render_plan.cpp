@@ -46,7 +46,7 @@ std::string PlanText(const RenderOptions& options, const SectionOptions& section
                      const MediaReader& reader, const MediaWriter* writer, unsigned threads) {
     const MediaFacts facts = FactsOf(reader);
     std::string effect = choice.Info().name;
-    if (options.effect.preset) effect += ", preset " + *options.effect.preset;
+    if (choice.Preset()) effect += ", preset " + choice.Info().presets[*choice.Preset()];
     if (options.effect.presetFile) effect += ", preset file " + *options.effect.presetFile;
     std::string text = Line("input", reader.Name() + ": " + ShortText(facts));
     for (const std::string& note : NotesOn(facts)) text += Line("note", note);

@@ -35,6 +35,8 @@ class EffectChoice {
     explicit EffectChoice(const EffectOptions& options);
 
     [[nodiscard]] const EffectInfo& Info() const { return *m_info; }
+    // The chosen built-in preset; nothing when none was named.
+    [[nodiscard]] std::optional<std::uint32_t> Preset() const { return m_preset; }
     // Frames must come in order and to one session only.
     [[nodiscard]] bool IsSequence() const { return m_options.randomState.has_value(); }
     // Each thread needs its own. `preset` replaces the chosen preset and all settings.

@@ -451,7 +451,7 @@ class Refusing(ReelfxTest):
         for code, words, args in rows:
             with self.subTest(args=args[1:]):
                 self.check(code, words, *args)
-                if args[0] == "render":
+                if args[:1] == ("render",):
                     self.check(code, words, *args, "--dry-run")
         self.assertEqual(self.left_over(), ["text.mp4"])
         self.assertEqual(text.read_text(), "no film")
