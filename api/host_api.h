@@ -282,9 +282,9 @@ class IVideoEffect : public com::IUnknown {
     ~IVideoEffect() = default;
 };
 
-// Converts between packed YCbCr 4:2:2 (bytes Y0 Cb Y1 Cr for each started pair of pixels) and 32-bit frames,
-// over the smaller of the two sizes, with the frame rules of IVideoEffect::Process. Answers to IUnknown only. Converters
-// are independent of each other and of effects; each serves one thread at a time.
+// Converts between packed YCbCr 4:2:2 (bytes Y0 Cb Y1 Cr for each pair of pixels, also for a single last pixel) and
+// 32-bit frames, over the smaller of the two sizes, with the frame rules of IVideoEffect::Process. Answers to IUnknown
+// only. Converters are independent of each other and of effects; each serves one thread at a time.
 class IFrameProcessor : public com::IUnknown {
   public:
     virtual bool VM_CALL Reserved3(const FrameRecord* source, const FrameRecord* destination,

@@ -76,7 +76,8 @@ bool VM_CALL WindowsShellServices::Start(void* moduleHandle, com::IUnknown* text
     return m_module != nullptr;  // not enough memory: started with what there is
 }
 
-// The bitmap and the button class are the resource module's; without it the buttons are the library's own, empty.
+// The resource module owns the bitmap and the button class; without it the library registers the class itself and the
+// buttons have no bitmap.
 void WindowsShellServices::LoadDialogParts(const std::u16string& folder) {
     if (!folder.empty()) {
         m_resources.reset(static_cast<HMODULE>(LoadModule((folder + kResourceModule).c_str())));

@@ -26,7 +26,7 @@ class TextSources {
         std::erase(m_sources, library);
         if (m_count == 0) m_sources = {};  // leave nothing allocated in a module about to be unloaded
     }
-    // The oldest living library object, null when there is none.
+    // The oldest live library object, null when there is none.
     [[nodiscard]] com::IUnknown* Current() const noexcept {
         return m_sources.empty() ? nullptr : m_sources.front();
     }
