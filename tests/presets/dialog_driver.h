@@ -84,7 +84,7 @@ inline HWND AnswerFileDialog(const std::string& fileName, SeenFileDialog* seen) 
         ADD_FAILURE() << "no file dialog";
         return nullptr;
     }
-    Sleep(300);  // until it has filled its controls~
+    Sleep(300);  // until it has filled its controls
     *seen = See(dialog);
     if (!fileName.empty()) Type(dialog, fileName);
     Press(dialog, fileName.empty() ? IDCANCEL : IDOK);
