@@ -1,4 +1,4 @@
-// What every reference-counted object of the library does alike.
+// What all reference-counted objects of the library have in common.
 #pragma once
 
 #include <atomic>
@@ -13,13 +13,13 @@ namespace velmora {
     return a != nullptr && std::memcmp(a, &b, sizeof(Guid)) == 0;
 }
 
-// One identifier that an object answers to, with the face that belongs to it.
+// One identifier that an object answers to, with the interface that it stands for.
 struct Face {
     const Guid* iid;
     void* pointer;
 };
 
-// The first face whose identifier matches; null when none does.
+// The first interface whose identifier matches; null when none does.
 template <std::size_t kCount>
 [[nodiscard]] void* FaceOf(const Face (&faces)[kCount], const Guid* iid) noexcept {
     for (const Face& face : faces) {
@@ -28,7 +28,7 @@ template <std::size_t kCount>
     return nullptr;
 }
 
-// Stores that face, or null. Does not count: the caller adds the reference when the result is kStatusOk.
+// Stores that interface, or null. Does not count: the caller adds the reference when the result is kStatusOk.
 template <std::size_t kCount>
 [[nodiscard]] Status FindFace(const Face (&faces)[kCount], const Guid* iid, void** out) noexcept {
     if (out == nullptr) return kStatusFailure;
@@ -36,7 +36,7 @@ template <std::size_t kCount>
     return *out != nullptr ? kStatusOk : kStatusNoInterface;
 }
 
-// A count that starts with the creator's reference.
+// A reference count that starts with the creator's reference.
 class ReferenceCount {
   public:
     std::uint32_t Add() noexcept { return static_cast<std::uint32_t>(m_count.fetch_add(1) + 1); }

@@ -1,28 +1,27 @@
 // The one header a host needs to use "Velmora Reel Effects".
 //
-// A host loads VMReelEffects.dll, looks up the two exports named at the end of this header, calls
-// GetEffectsLibrary and works through the interfaces below. The header needs nothing but <cstdint> and a compiler of
-// C++17 or later; it can be copied into a host's own sources and may stand before or behind <windows.h>.
+// A host loads VMReelEffects.dll, looks up the two exports declared at the end of this header, calls GetEffectsLibrary
+// and works through the interfaces below. The header needs only <cstdint> and a C++17 compiler; it can be copied into a
+// host's own sources and included before or after <windows.h>.
 //
-// Binary contract, on 32-bit Windows: little-endian; every operation is __stdcall with the object
-// pointer as first stack argument; the operations of an interface lie in its table in the order of their
-// declaration; booleans are one byte (read the low byte of the result); no exception leaves an operation.
-// A host may call with a stack aligned to 4 bytes only. The floating-point state of the calling thread is
-// after every call what it was before it.
+// Binary contract, on 32-bit Windows: little-endian; every operation is __stdcall with the object pointer as first
+// stack argument; an interface's table holds its operations in the order of declaration; booleans are one byte (read
+// the low byte of the result); no exception leaves an operation. A host may call with a stack aligned to only 4 bytes.
+// Every call leaves the calling thread's floating-point state as it found it.
 //
 // Ownership: whoever gets a pointer to a reference-counted interface owns one reference and gives it back
 // with Release. Texts are zero-terminated and stay owned by the library, for as long as it is loaded.
 //
-// Threads. Nothing is locked, and every operation runs on the thread that calls it. What is safe stands in brackets at
-// each operation or interface:
+// Threads. Nothing is locked, and every operation runs on the thread that calls it. The brackets at each operation or
+// interface say what is safe:
 //   [any thread]      at any time, also while other calls run: counting references, constant tables and names
 //   [one at a time]   on any thread, but never two such calls at once in the whole process: frames share one state
 //   [user interface]  on the host's user-interface thread only: dialogs, translated texts, help
 //
-// Frames. The frame number is the clip time in seconds x 30, truncated. It alone says which frame is meant: a call with
-// the number of the call before it, whatever the effect and the sizes, repeats that frame's random damage, so a host may
-// render a frame again for another view; a call with another number draws new damage. Two frames of a clip of more than
-// 30 frames a second can therefore show the same damage.
+// Frames. The frame number is the clip time in seconds x 30, truncated. It alone identifies a frame: a call with the
+// same number as the call before it, whatever the effect and the sizes, repeats that frame's random damage, so a host
+// may render a frame again for another view; a call with a different number draws new damage. Above 30 frames a second,
+// two frames of a clip can therefore show the same damage.
 #pragma once
 
 #include <cstdint>
@@ -33,17 +32,17 @@
 #define VM_CALL
 #endif
 
-// The compiler's own form of offsetof, which would need another header.
+// The compiler's built-in offsetof; the standard one would need another header.
 #define VM_OFFSET(record, field) __builtin_offsetof(record, field)
 
 namespace velmora {
 
-// Of this header and of the library that it belongs to. The DLL's version resource has the same numbers.
+// The version of this header and its library. The DLL's version resource has the same numbers.
 inline constexpr std::int32_t kReelEffectsMajor = 1;
 inline constexpr std::int32_t kReelEffectsMinor = 0;
 inline constexpr char kReelEffectsVersion[] = "1.0";
 
-// What GetLibraryName returns, and what preset files say.
+// What GetLibraryName returns and what preset files contain.
 inline constexpr char kLibraryName[] = "Velmora Reel Effects";
 
 // ---------------------------------------------------------------------------------------------------------
@@ -79,13 +78,13 @@ inline constexpr Guid kIidPresetSaver = {
 // ---------------------------------------------------------------------------------------------------------
 // Records
 
-// One 32-bit word that holds a value in the form of its kind.
+// One 32-bit word that holds a value in the format of its kind.
 union ValueWord {
     float number;          // slider: normalised to 0..1
     std::uint32_t colour;  // colour: 0x00BBGGRR, red in the lowest byte
     std::uint32_t count;   // menu: number of items
     std::int32_t item;     // menu: item index, from 0
-    std::uint8_t flag;     // check box: 0 or 1; group marker: 0 begin, 1 end. The other bytes do not count
+    std::uint8_t flag;     // check box: 0 or 1; group marker: 0 begin, 1 end. The other bytes are ignored
     std::uint32_t bits;
 };
 static_assert(sizeof(ValueWord) == 4);
@@ -96,15 +95,15 @@ enum ParamKind : std::uint32_t {
     kKindSlider = 2,
     kKindColour = 3,
     kKindCheckBox = 4,
-    kKindGroup = 5,  // a marker that holds no value: a frame drawn round the parameters between two of them
+    kKindGroup = 5,  // a marker without a value: a frame is drawn round the parameters between two of them
 };
 
 inline constexpr std::int32_t kMenuItemCapacity = 10;
 inline constexpr std::int32_t kMenuTextWidth = 20;
 inline constexpr std::int32_t kParamNameWidth = 40;
 
-// What parameter k of an effect is. Zero the descriptor first: an effect writes only the fields of the parameter's kind
-// and leaves the others as the caller passed them. A text that fills its whole field is not terminated inside it.
+// Describes parameter k of an effect. Zero the descriptor first: an effect writes only the fields of the parameter's
+// kind and leaves the others as the caller passed them. A text that fills its whole field has no terminator.
 struct ParamDescriptor {
     ValueWord defaultValue;
     std::uint32_t second;  // not written
@@ -135,7 +134,7 @@ static_assert(VM_OFFSET(ParamDescriptor, width) == 264);
 static_assert(VM_OFFSET(ParamDescriptor, height) == 268);
 static_assert(VM_OFFSET(ParamDescriptor, visible) == 272);
 
-// A parameter's value as it is exchanged while rendering and in presets that a user saves.
+// A parameter's value as exchanged during rendering and in presets that a user saves.
 struct ValueCell {
     ValueWord value;
     std::uint32_t second;
@@ -154,9 +153,9 @@ struct PresetCell {
 static_assert(sizeof(PresetCell) == 8);
 static_assert(VM_OFFSET(PresetCell, second) == 4);
 
-// A picture in the host's memory: 32-bit pixels, bytes blue, green, red, alpha. The processed region is
-// width x height pixels with its left top corner at (xOrigin, yOrigin) of the buffer; the buffer is
-// xOrigin + width pixels wide and yOrigin + height rows high.
+// A picture in the host's memory: 32-bit pixels, bytes blue, green, red, alpha. The processed region is width x height
+// pixels with its top left corner at (xOrigin, yOrigin) of the buffer; the buffer is xOrigin + width pixels wide and
+// yOrigin + height rows high.
 struct FrameRecord {
     void* pixels;            // first byte of the first stored row
     std::int32_t width;      // of the region, in pixels, at least 1
@@ -180,7 +179,7 @@ static_assert(VM_OFFSET(FrameRecord, yOrigin) == 24);
 struct TimingRecord {
     double first;
     double second;
-    double frameTime;  // seconds from the start of the clip; not a number counts as 0
+    double frameTime;  // seconds from the start of the clip; NaN counts as 0
 };
 static_assert(sizeof(TimingRecord) == 24);
 static_assert(VM_OFFSET(TimingRecord, frameTime) == 16);
@@ -188,8 +187,8 @@ static_assert(VM_OFFSET(TimingRecord, frameTime) == 16);
 inline constexpr std::int32_t kPresetNameWidth = 260;
 inline constexpr std::int32_t kPresetCellCapacity = 100;
 
-// The settings of an effect, as they are saved to and loaded from a preset file. Names are 8-bit text in
-// the system code page, zero-terminated.
+// The settings of an effect, as saved to and loaded from a preset file. Names are 8-bit text in the system code page,
+// zero-terminated.
 struct PresetRecord {
     char name[kPresetNameWidth];
     char libraryName[kPresetNameWidth];
@@ -204,17 +203,17 @@ static_assert(VM_OFFSET(PresetRecord, values) == 780);
 static_assert(VM_OFFSET(PresetRecord, count) == 1980);
 
 // ---------------------------------------------------------------------------------------------------------
-// Interfaces. None has a destructor in its table: compilers lay destructors out differently. The protected
-// ones below only keep a host from deleting what it has to release.
+// Interfaces. None has a destructor in its table: compilers lay destructors out differently. The protected ones below
+// only keep a host from deleting what it must release.
 
-// In a namespace of its own, so that `using namespace velmora` beside <windows.h> leaves one IUnknown, the system's. Both
-// have the same table and the same identifier.
+// In its own namespace, so that `using namespace velmora` alongside <windows.h> leaves only one IUnknown, the system's.
+// Both have the same table and the same identifier.
 namespace com {
 
 class IUnknown {
   public:
-    // Finds the face of this object that `iid` names. Stores it in *out with one more reference and returns
-    // kStatusOk; otherwise stores null and returns kStatusNoInterface. A null `out` is kStatusFailure.
+    // Looks up this object's interface `iid`. Stores it in *out with one more reference and returns kStatusOk;
+    // otherwise stores null and returns kStatusNoInterface. A null `out` is kStatusFailure.
     virtual Status VM_CALL QueryInterface(const Guid* iid, void** out) = 0;
     // Returns the new count. [any thread]
     virtual std::uint32_t VM_CALL AddRef() = 0;
@@ -228,15 +227,15 @@ class IUnknown {
 }  // namespace com
 
 // What an effect asks the host while it renders, on the thread that called Process. Implemented by the host (PlainHost
-// below is a start); not kept beyond Process but for the identifiers that the effect itself does not know (see
+// below is a start). Not used after Process, except for identifiers that the effect itself does not know (see
 // IVideoEffect).
 class IVideoHost : public com::IUnknown {
   public:
-    // Writes the value of the effect's parameter `index` into cell->value, in the form of `kind`
-    // (ParamKind), and `kind` into cell->kind. Returns true when there is such a parameter; on false the
-    // value reads as whatever the cell holds (0 when untouched).
+    // Writes the value of the effect's parameter `index` into cell->value, in the format of `kind` (ParamKind), and
+    // `kind` into cell->kind. Returns true when there is such a parameter; on false the value is read as whatever the
+    // cell holds (0 when untouched).
     virtual bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) = 0;
-    // The next four are not called while rendering. An effect's own host face forwards the first two to the
+    // The next four are not called while rendering. An effect's own host interface forwards the first two to the
     // attached host, answers false to the third and does nothing in the fourth.
     virtual bool VM_CALL HostOperation4(std::intptr_t a, std::intptr_t b, std::intptr_t c) = 0;
     virtual std::uint32_t VM_CALL HostOperation5(std::intptr_t a, std::intptr_t b) = 0;
@@ -247,7 +246,7 @@ class IVideoHost : public com::IUnknown {
     ~IVideoHost() = default;
 };
 
-// The effects, as CreateEffect counts them.
+// The effects, as CreateEffect numbers them.
 enum EffectIndex : std::uint32_t {
     kEffectFilmCamera = 0,
     kEffectFilmLook = 1,
@@ -257,8 +256,8 @@ enum EffectIndex : std::uint32_t {
     kEffectCount = 5,
 };
 
-// One effect. QueryInterface answers to IUnknown, IVideoEffect and IVideoHost; other identifiers are passed
-// on to the host of the last Process call, so that host must stay alive as long as it is asked.
+// One effect. QueryInterface answers to IUnknown, IVideoEffect and IVideoHost; other identifiers are passed on to the
+// host of the last Process call, so that host must stay alive for as long as such queries are made.
 class IVideoEffect : public com::IUnknown {
   public:
     // The name shown to the user, for example "Film Look". [any thread]
@@ -267,11 +266,10 @@ class IVideoEffect : public com::IUnknown {
     virtual std::int32_t VM_CALL GetKind() = 0;
     // Fills the descriptor of parameter `index`, from 0; false past the last one (nothing is written). [any thread]
     virtual bool VM_CALL GetParamInfo(std::uint32_t index, ParamDescriptor* descriptor) = 0;
-    // Renders one frame: reads the parameters from `host` (null: every value reads as 0), processes the
-    // smaller of the two regions of `source` and writes it to `destination`. Nothing outside that rectangle
-    // of the destination is written, the source never; both may be the same memory. `hostArgument` is not
-    // read. False when either frame or `timing` is missing or a frame is invalid: nothing is written then.
-    // [one at a time]
+    // Renders one frame: reads the parameters from `host` (null: every value reads as 0), processes the smaller of the
+    // two regions of `source` and writes it to `destination`. Nothing outside that rectangle of the destination is
+    // written, and the source is never written; both may be the same memory. `hostArgument` is not read. Returns false,
+    // with nothing written, when either frame or `timing` is missing or a frame is invalid. [one at a time]
     virtual bool VM_CALL Process(IVideoHost* host, const FrameRecord* source, void* hostArgument,
                                  const FrameRecord* destination, const TimingRecord* timing) = 0;
     // The name of built-in preset `index`, from 0; null past the last one. [any thread]
@@ -284,9 +282,9 @@ class IVideoEffect : public com::IUnknown {
     ~IVideoEffect() = default;
 };
 
-// Converts between packed YCbCr 4:2:2 (bytes Y0 Cb Y1 Cr for each started pair of pixels) and 32-bit frames,
-// over the smaller of the two sizes, with the frame rules of IVideoEffect::Process. Answers to IUnknown only. Converters
-// are independent of each other and of effects; each serves one thread at a time.
+// Converts between packed YCbCr 4:2:2 (bytes Y0 Cb Y1 Cr for each pair of pixels, also for a single last pixel) and
+// 32-bit frames, over the smaller of the two sizes, with the frame rules of IVideoEffect::Process. Answers to IUnknown
+// only. Converters are independent of each other and of effects; each serves one thread at a time.
 class IFrameProcessor : public com::IUnknown {
   public:
     virtual bool VM_CALL Reserved3(const FrameRecord* source, const FrameRecord* destination,
@@ -295,8 +293,8 @@ class IFrameProcessor : public com::IUnknown {
                                    std::uint8_t value) = 0;  // always false
     virtual bool VM_CALL Reserved5(const FrameRecord* source, const FrameRecord* destination,
                                    std::uint8_t value) = 0;  // always false
-    // 4:2:2 to 32-bit; `alpha` is stored in every pixel. False when a frame is missing or invalid, or
-    // memory is short.
+    // 4:2:2 to 32-bit; `alpha` is stored in every pixel. False when a frame is missing or invalid, or when there is not
+    // enough memory.
     virtual bool VM_CALL ConvertYcbcrToBgra(const FrameRecord* source, const FrameRecord* destination,
                                             std::uint8_t alpha) = 0;
     // 32-bit to 4:2:2; the byte is not read.
@@ -312,14 +310,14 @@ class IEffectLibrary;
 // Lets the user load and save the settings of one effect through the system's file dialogs. [user interface]
 class IPresetSaver : public com::IUnknown {
   public:
-    // `owner` is the dialog's owner window; `library` may be null; `effectIndex` as for CreateEffect;
-    // `languageCode` is null (plain dialogs) or a two-letter code (translated dialogs).
-    // Returns 0 when done or cancelled, 1 after a failure that the user has been told, 2 when the preset
-    // read does not belong to this effect (the user has been told; do not apply it). A null `record` is a
-    // failure.
+    // `owner` is the dialog's owner window; `library` may be null; `effectIndex` as for CreateEffect; `languageCode` is
+    // null (plain dialogs) or a two-letter code (translated dialogs). Returns 0 when done or cancelled, 1 after a
+    // failure, 2 when the preset read does not belong to this effect (do not apply it). The user has already seen a
+    // message for 1 and 2. A null `record` is a failure.
     virtual std::int32_t VM_CALL LoadPreset(void* owner, IEffectLibrary* library, std::uint32_t effectIndex,
                                             PresetRecord* record, const char* languageCode) = 0;
-    // As above; 0 or 1. Stores the library's and the effect's name in the record; record->name is the host's.
+    // As above; returns 0 or 1. Stores the names of the library and the effect in the record; record->name is the
+    // host's.
     virtual std::int32_t VM_CALL SavePreset(void* owner, IEffectLibrary* library, std::uint32_t effectIndex,
                                             PresetRecord* record, const char* languageCode) = 0;
 
@@ -327,17 +325,17 @@ class IPresetSaver : public com::IUnknown {
     ~IPresetSaver() = default;
 };
 
-// Translated texts. Reached through QueryInterface of the library, when a language file was loaded; shares
-// the library's count. [user interface]
+// Translated texts. Available through the library's QueryInterface once a language file is loaded; shares the library's
+// reference count. [user interface]
 class IMultiLingual : public com::IUnknown {
   public:
-    // As GetText, but when there is no such text `fallback` (may be null) is written in its place. `found` (may be null)
-    // is set to 1 or 0: whether there was one. The arguments go to the language module as they are.
+    // Like GetText, but writes `fallback` (may be null) when there is no such text. Sets `found` (may be null) to 1
+    // when there is one, otherwise to 0. The arguments are passed to the language module unchanged.
     virtual std::int32_t VM_CALL LookUpText(const char* languageCode, std::int32_t category, const char* key,
                                             const char16_t* fallback, char16_t* buffer, std::int32_t capacity,
                                             std::int32_t* found) = 0;
-    // Writes the text for a key in a language (two letters) into `buffer` of `capacity` 16-bit characters,
-    // cut and terminated. Returns the characters written, 0 when there is no such text.
+    // Writes the text for a key in a language (two letters) into `buffer` of `capacity` 16-bit characters, truncated to
+    // fit and terminated. Returns the characters written, 0 when there is no such text.
     virtual std::int32_t VM_CALL GetText(const char* languageCode, std::int32_t category, const char* key,
                                          char16_t* buffer, std::int32_t capacity) = 0;
 
@@ -370,16 +368,16 @@ class IEffectLibrary : public com::IUnknown {
   public:
     // kLibraryName. [any thread]
     virtual const char* VM_CALL GetLibraryName() = 0;
-    // A new effect with one reference; `index` is an EffectIndex. Null past the last or when memory is short. It may
-    // outlive the library object. [any thread]
+    // A new effect with one reference; `index` is an EffectIndex. Null past the last one or when there is not enough
+    // memory. It may outlive the library object. [any thread]
     virtual IVideoEffect* VM_CALL CreateEffect(std::uint32_t index) = 0;
     // Opens the help file at a topic in the system's viewer; non-zero when it was started. [user interface]
     virtual std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic) = 0;
     // Not reference-counted. [any thread]
     virtual IShellServices* VM_CALL GetShellServices() = 0;
-    // A new object with one reference, or null when memory is short. [any thread]
+    // A new object with one reference, or null when there is not enough memory. [any thread]
     virtual IFrameProcessor* VM_CALL CreateFrameProcessor() = 0;
-    // A new object with one reference, or null when memory is short. [any thread]
+    // A new object with one reference, or null when there is not enough memory. [any thread]
     virtual IPresetSaver* VM_CALL CreatePresetSaver() = 0;
 
   protected:
@@ -387,9 +385,9 @@ class IEffectLibrary : public com::IUnknown {
 };
 
 // ---------------------------------------------------------------------------------------------------------
-// Bases for what a host implements. They answer everything with "no"; a host overrides what it can answer.
+// Base classes for what a host implements. They answer "no" to everything; a host overrides what it can answer.
 
-// An object that lives as long as its owner, whoever counts: it ignores references and answers to no identifier.
+// An object that lives as long as its owner: it ignores reference counting and answers to no identifier.
 template <class Interface>
 class Uncounted : public Interface {
   public:
@@ -405,7 +403,7 @@ class Uncounted : public Interface {
     ~Uncounted() = default;
 };
 
-// A host without a single value: override GetParamValue.
+// A host without any values: override GetParamValue.
 class PlainHost : public Uncounted<IVideoHost> {
   public:
     bool VM_CALL GetParamValue(std::uint32_t, ValueCell*, std::uint32_t) override { return false; }
@@ -421,8 +419,8 @@ class PlainHost : public Uncounted<IVideoHost> {
 // ---------------------------------------------------------------------------------------------------------
 // Exports of VMReelEffects.dll, undecorated names.
 
-// "GetEffectsLibrary": a new library object with one reference that belongs to the caller; null when memory
-// is short. Loads the translated texts. [user interface], and no frame may be rendered meanwhile.
+// "GetEffectsLibrary": a new library object with one reference that belongs to the caller; null when there is not
+// enough memory. Loads the translated texts. [user interface], and no frame may be rendering at the time.
 using GetEffectsLibraryFunction = IEffectLibrary*(VM_CALL*)();
 // "CanUnloadDLLNow": true when no library object is alive. Effects are not counted: release them first. [any thread]
 using CanUnloadDLLNowFunction = bool(VM_CALL*)();

@@ -1,7 +1,8 @@
-// Holds one reference to a reference-counted object and gives it back: nobody calls Release by hand.
+// Holds one reference to a reference-counted object and releases it, so that nobody calls Release by hand.
 //
-// The two ways in are named, because a pointer does not show which one is right: Adopt for a pointer that came with a
-// reference (whatever creates an object, QueryInterface), Share for one that is only lent (an argument).
+// There are two named ways to create one, because a pointer does not show which is right: Adopt for a pointer that came
+// with a reference (from a function that creates objects, or QueryInterface), Share for one that is only lent (an
+// argument).
 #pragma once
 
 #include <utility>
@@ -30,7 +31,7 @@ class Reference {
     }
     ~Reference() { Reset(); }
 
-    // Gives the reference back now.
+    // Releases the reference now.
     void Reset() noexcept {
         if (Interface* const object = std::exchange(m_object, nullptr)) object->Release();
     }
@@ -47,7 +48,7 @@ class Reference {
     Interface* m_object = nullptr;
 };
 
-// The interface of `object` that `iid` names; empty when it has none.
+// The interface `iid` of `object`; empty when it has none.
 template <class Interface>
 [[nodiscard]] Reference<Interface> QueryFor(com::IUnknown& object, const Guid& iid) noexcept {
     void* found = nullptr;

@@ -1,7 +1,7 @@
-// The cost of a frame, as a ratio to a memcpy of one frame that is timed in the same loop. Buffers rotate
-// through more memory than the caches hold, so that every frame is read from memory and written to memory.
+// The cost of a frame, as a ratio to a memcpy of one frame timed in the same loop. The buffers rotate through more
+// memory than the caches hold, so every frame is read from and written to main memory.
 //
-// The result is printed as Markdown; Google Benchmark's own options select and repeat.
+// Prints the result as Markdown. Google Benchmark's options select and repeat cases.
 
 #include <benchmark/benchmark.h>
 
@@ -21,7 +21,7 @@ void Report(benchmark::State& state, const PairedTimes& times) {
     state.counters["work_ms"] = 1000 * times.Work();
 }
 
-// Runs rounds and reports their times: `round(times)` adds a pair.
+// Runs rounds and reports their times; `round(times)` adds a pair.
 template <typename Round>
 void RunRounds(benchmark::State& state, Round&& round) {
     PairedTimes times;
@@ -62,7 +62,7 @@ void RunJumps(benchmark::State& state, const BenchCase& test) {
     RunRounds(state, [&](PairedTimes& times) { RunJump(pool, times, render); });
 }
 
-// The frame processor's conversion to 32 bits or back; the 4:2:2 frame is in the first half of its buffer.
+// The frame processor's conversion to 32 bits or back. The 4:2:2 frame is in the first half of its buffer.
 void RunConversion(benchmark::State& state, bool toBgra) {
     FramePool pool(kFullHd);
     FrameProcessor processor;

@@ -1,5 +1,5 @@
-// The gain of a second worker in reelfx: "Film Pro" on frames in memory, through the pipeline of reelfx but
-// without decoding and encoding. Prints a Markdown table.
+// The gain from a second worker in reelfx: "Film Pro" on frames in memory, through reelfx's pipeline but without
+// decoding and encoding. Prints a Markdown table.
 
 #include <algorithm>
 #include <chrono>
@@ -44,7 +44,7 @@ double FramesPerSecond(FramePool& pool, const BenchCase& test, std::size_t worke
     return kFrames / std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
 }
 
-// The upper quartile: the rate of a run on an idle machine.
+// The upper quartile, which is close to the rate on an idle machine.
 double Typical(std::vector<double> values) {
     std::sort(values.begin(), values.end());
     return values[values.size() * 3 / 4];

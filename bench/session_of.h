@@ -1,4 +1,4 @@
-// A session of a case's effect with its settings.
+// A session for a case's effect with its settings.
 #pragma once
 
 #include <memory>

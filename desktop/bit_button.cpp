@@ -13,12 +13,12 @@ namespace {
 
 constexpr SIZE kSizeWithoutBitmap = {74, 32};
 constexpr int kImages = 3;
-constexpr int kPlainMargin = 8;  // how much lower than the button its standard button is
+constexpr int kPlainMargin = 8;  // how much lower than the bitmap button the standard button is
 constexpr int kPlainLowest = 10;
-constexpr int kWindowExtraBytes = 4;  // the window's record
+constexpr int kWindowExtraBytes = 4;  // a pointer to the window's record
 static_assert(sizeof(void*) <= kWindowExtraBytes, "the record's address lies in the window's extra bytes");
 
-// The colour that dialogs are painted with.
+// The background colour of dialogs.
 HBRUSH DialogBrush() noexcept {
     return GetSysColorBrush(COLOR_3DFACE);
 }
@@ -32,7 +32,7 @@ class BitButton {
           m_plain(description.plain),
           m_state(description.notify) {}
 
-    // Called when the window exists and has its size.
+    // Called once the window exists and has its size.
     void Attach(HWND window) noexcept {
         m_window = window;
         GetClientRect(window, &m_client);

@@ -10,13 +10,13 @@ namespace velmora::support {
 
 inline constexpr wchar_t kBitButtonClass[] = L"Velmora BitButton";
 
-// Registers the class for `module`, in whose name the buttons are then made; false when that failed. Taking it
-// back fails while buttons are alive.
+// Registers the class for `module`, which must then be given when a button is made; false when that failed.
+// Unregistering fails while buttons exist.
 [[nodiscard]] bool RegisterBitButtonClass(HMODULE module) noexcept;
 bool UnregisterBitButtonClass(HMODULE module) noexcept;
 
 struct BitButtonDescription {
-    HWND owner = nullptr;      // parent, gets the command
+    HWND owner = nullptr;      // parent; receives the command
     HMODULE module = nullptr;  // for which the class was registered
     HBITMAP bitmap =
         nullptr;  // 32-bit, colours premultiplied by alpha; three images; outlives the button; may be null
@@ -29,7 +29,7 @@ struct BitButtonDescription {
 // The size in pixels of a button with this bitmap: a third of its height; 74 x 32 without a bitmap.
 [[nodiscard]] SIZE BitButtonSize(HBITMAP bitmap) noexcept;
 
-// The new button, visible; null when it could not be made. It is destroyed with its owner.
+// The new button, visible; null when it could not be created. It is destroyed with its owner.
 HWND CreateBitButton(const BitButtonDescription& description) noexcept;
 
 }  // namespace velmora::support

@@ -1,5 +1,5 @@
-// What the bitmap button does on mouse events, without a window: which of its three images it shows and when
-// it is clicked. BitButton (bit_button.h) carries the answers out.
+// How the bitmap button reacts to mouse events, without a window: which of its three images it shows and when it is
+// clicked. BitButton (bit_button.h) carries out the results.
 //
 // The bitmap holds the images one above the other: 0 pressed, 1 under the mouse, 2 at rest.
 #pragma once
@@ -8,12 +8,12 @@ namespace velmora::support {
 
 enum class BitButtonMouse { kNormal, kHover, kPressedInside, kPressedOutside };
 
-// What the window has to do after an event, in the order of the members.
+// What the window must do after an event, in the order of the members.
 struct BitButtonReaction {
-    bool click = false;       // tell the owner
-    bool trackLeave = false;  // ask the system to tell when the mouse leaves
+    bool click = false;       // notify the owner
+    bool trackLeave = false;  // ask the system for a notification when the mouse leaves
     bool captureMouse = false;
-    bool releaseCapture = false;  // the system answers with "capture changed" while it is done
+    bool releaseCapture = false;  // the system sends "capture changed" during this
     bool redraw = false;
 
     bool operator==(const BitButtonReaction&) const = default;

@@ -15,15 +15,15 @@ constexpr wchar_t kViewer[] = L"%SystemRoot%\\hh.exe";
 constexpr wchar_t kControlKey[] = L"CLSID\\{ADB880A6-D8FF-11CF-9377-00AA003B7A11}\\InprocServer32";
 constexpr wchar_t kControlName[] = L"hhctrl.ocx";
 constexpr WORD kControlOrdinal = 14;
-constexpr UINT kShowContext = 15;  // the control's command: show the topic with this context number
+constexpr UINT kShowContext = 15;  // the control's command to show the topic with this context number
 constexpr DWORD kLongestControlPath = 260;
 
 using HtmlHelpFunction = HWND(WINAPI*)(HWND owner, const char* file, UINT command, DWORD_PTR data);
 
-// The HTML help control. Once loaded it stays: it may show windows for as long as the process lives.
+// The HTML help control. Once loaded it stays: it may show windows until the process ends.
 class HelpControl {
   public:
-    // Null when there is none; a first failure is final.
+    // Null when there is none; a failed first attempt is not repeated.
     HtmlHelpFunction Entry() noexcept {
         if (m_givenUp) return nullptr;
         if (m_module == nullptr) Load();
@@ -39,7 +39,7 @@ class HelpControl {
     void Load() noexcept {
         wchar_t path[kLongestControlPath + 1] = {};
         DWORD size = kLongestControlPath * sizeof(wchar_t);
-        // Also reads, and expands, a path that is stored with environment variables.
+        // Also expands a path that is stored with environment variables.
         if (RegGetValueW(HKEY_CLASSES_ROOT, kControlKey, nullptr, RRF_RT_REG_SZ, nullptr, path, &size) ==
             ERROR_SUCCESS) {
             m_module = LoadLibraryW(path);
@@ -65,8 +65,8 @@ std::u16string ExistingShortPath(const std::u16string& path) {
     return shortPath;
 }
 
-// The short path of a file. When the file is missing, its folder's short path with the file's own name; empty when
-// the folder has none.
+// The short path of a file. When the file is missing, its folder's short path plus the file's own name; empty when the
+// folder has no short path.
 std::u16string ShortPath(const std::u16string& path) {
     if (std::u16string found = ExistingShortPath(path); !found.empty()) return found;
     const std::size_t nameStart = path.find_last_of(u"/\\") + 1;
@@ -74,7 +74,8 @@ std::u16string ShortPath(const std::u16string& path) {
     return folder.empty() ? folder : folder + path.substr(nameStart);
 }
 
-// An 8-bit form that names the same file: the path itself, else its short path; nothing when there is neither.
+// An exact 8-bit name for the same file: the path itself, or else its short path; nothing when neither can be
+// converted.
 std::optional<std::string> EightBitPath(const std::u16string& path) {
     if (std::optional<std::string> exact = NarrowExactly(path)) return exact;
     const std::u16string shortPath = ShortPath(path);

@@ -1,4 +1,4 @@
-// Opens the help file at a numbered topic: in the system's help viewer, a program of its own, or through the HTML
+// Opens the help file at a numbered topic, either in the system's help viewer (a separate program) or through the HTML
 // help control inside this process. Windows only; the user-interface thread.
 #pragma once
 

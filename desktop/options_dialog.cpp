@@ -14,11 +14,11 @@
 namespace velmora::support {
 namespace {
 
-constexpr wchar_t kWebPage[] = L"https://www.velmora.example/reel-effects";  // of the maker
+constexpr wchar_t kWebPage[] = L"https://www.velmora.example/reel-effects";  // the maker's page
 
 constexpr RECT kLogoPlace = {10, 8, 230, 40};  // in dialog units
 
-// Over the middle of its owner, inside the screen's free area. Without an owner the system has centred it.
+// Centres the dialog over its owner, inside the screen's work area. Without an owner the system has already centred it.
 void CentreOverOwner(HWND window) noexcept {
     const HWND owner = GetWindow(window, GW_OWNER);
     RECT over = {};
@@ -76,7 +76,7 @@ INT_PTR CALLBACK OptionsDialog::Procedure(HWND window, UINT message, WPARAM wPar
         auto* opened = reinterpret_cast<OptionsDialog*>(lParam);
         opened->m_window = window;
         opened->OnOpen();
-        return TRUE;  // the system puts the focus on the first control
+        return TRUE;  // the system sets the focus to the first control
     }
     auto* dialog = reinterpret_cast<OptionsDialog*>(GetWindowLongPtrW(window, DWLP_USER));
     if (dialog == nullptr) return FALSE;
@@ -132,8 +132,8 @@ void OptionsDialog::SetTexts() noexcept {
     set(VM_TEXT_VERSION, "Version", version);
     set(VM_TEXT_OPTIONS, "Options", "Options");
     SetWindowTextW(m_window, win32::Wide(texts.Translate(kTextsOfOptions, "Title", kLibraryName)));
-    // Texts stand as they are: a translation brings its letter for the Alt key with it, and OK and Cancel have
-    // theirs, Enter and Escape.
+    // Texts are used as they are: a translation includes its letter for the Alt key, and OK and Cancel have Enter and
+    // Escape.
     set(VM_CHECK_KNOBS_VERTICAL, "Up/Down Knobs Control", "Up / Down mouse control of circular knobs");
     const auto setButton = [&](int control, const char* key) {
         SetDlgItemTextW(m_window, control, win32::Wide(texts.Translate(kTextsOfButtons, key)));
@@ -163,7 +163,7 @@ void OptionsDialog::OnCommand(int control) noexcept {
 }
 
 void OptionsDialog::OnOk() noexcept {
-    // Stored before the dialog goes: a host that sees it go may ask for the preference at once.
+    // Stored before the dialog closes: a host that notices it closing may ask for the preference at once.
     if (GetDlgItem(m_window, VM_CHECK_KNOBS_VERTICAL) != nullptr) {
         m_parts.preferences->SetKnobsDragVertical(IsDlgButtonChecked(m_window, VM_CHECK_KNOBS_VERTICAL) ==
                                                   BST_CHECKED);
@@ -174,7 +174,7 @@ void OptionsDialog::OnOk() noexcept {
 void OptionsDialog::OpenHelp() const noexcept try {
     static_cast<void>(m_parts.help->Show(m_window, help::kOptions, false));
 } catch (...) {
-    // As with every help that cannot be opened, nothing is said.
+    // No message: no failure to open help is reported.
 }
 
 }  // namespace velmora::support

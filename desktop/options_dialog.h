@@ -10,14 +10,14 @@
 
 namespace velmora::support {
 
-// What the dialog is made of. Everything outlives it.
+// What the dialog uses. All of it must outlive the dialog.
 struct OptionsDialogParts {
     HMODULE templates = nullptr;     // holds the dialog's template and manifest
     HMODULE buttonModule = nullptr;  // for which the button class is registered; null: no logo
     HBITMAP logo = nullptr;          // may be null, see BitButtonDescription
     TranslationHelper* texts = nullptr;
     const HelpLauncher* help = nullptr;
-    Preferences* preferences = nullptr;  // shown, and changed by OK
+    Preferences* preferences = nullptr;  // shown in the dialog; changed by OK
 };
 
 class OptionsDialog {
@@ -26,12 +26,12 @@ class OptionsDialog {
     OptionsDialog(const OptionsDialog&) = delete;
     OptionsDialog& operator=(const OptionsDialog&) = delete;
 
-    // Shows the dialog until the user closes it. True: with OK. False: cancelled, or it could not be shown.
+    // Shows the dialog until the user closes it. True after OK; false after Cancel, or when it could not be shown.
     [[nodiscard]] bool Show(HWND owner) noexcept;
 
-    // Brings a dialog that is shown already to the user's eyes.
+    // Brings a dialog that is already open to the front.
     void ToFront() const noexcept;
-    // Closes a dialog that is shown, as Cancel does, and destroys its logo at once.
+    // Closes an open dialog, as Cancel does, and destroys its logo at once.
     void Abandon() noexcept;
 
   private:

@@ -21,7 +21,7 @@ std::optional<std::string> ReadText(HKEY root, const std::string& path, const ch
     HKEY opened = nullptr;
     if (RegOpenKeyExA(root, path.c_str(), 0, KEY_READ, &opened) != ERROR_SUCCESS) return {};
     const win32::RegistryKey key(opened);
-    char text[kLongestText + 1] = {};  // one more: a stored text need not be terminated
+    char text[kLongestText + 1] = {};  // one extra: a stored text need not be terminated
     DWORD type = REG_NONE;
     DWORD size = kLongestText;
     const LSTATUS status =
@@ -36,14 +36,14 @@ void Preferences::Read() noexcept try {
     const std::optional<std::string> knobs = ReadSetting(kSection, kKnobsSetting);
     m_knobsDragVertical = knobs && knobs->starts_with('y');
 } catch (...) {
-    m_knobsDragVertical = false;  // short of memory
+    m_knobsDragVertical = false;  // not enough memory
 }
 
 void Preferences::SetKnobsDragVertical(bool vertical) noexcept try {
     m_knobsDragVertical = vertical;
     WriteSetting(kSection, kKnobsSetting, vertical ? "yes" : "no");
 } catch (...) {
-    // Short of memory: as when the registry refuses.
+    // Not enough memory: treated as if the registry had refused.
 }
 
 std::optional<std::string> ReadSetting(const char* section, const char* name) {

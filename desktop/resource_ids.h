@@ -1,4 +1,4 @@
-// Numbers of the library's own resources and of the controls of its dialogs. Read by the resource compiler too.
+// Ids of the library's own resources and of its dialogs' controls. Also read by the resource compiler.
 #pragma once
 
 #define VM_DIALOG_OPTIONS 100

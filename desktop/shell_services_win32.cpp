@@ -19,8 +19,7 @@ namespace {
 constexpr char16_t kResourceModule[] = u"resources.dll";
 constexpr std::size_t kLongestHelpFileName = 259;
 
-// The two letters of the language in which the user sees the system; the translations decide what an unknown or
-// longer code means.
+// The two-letter code of the system's display language; the translations decide how to treat an unknown or longer code.
 std::string UserInterfaceLanguage() {
     char code[16] = {};
     const LCID locale = MAKELCID(GetUserDefaultUILanguage(), SORT_DEFAULT);
@@ -44,10 +43,10 @@ class WindowsShellServices final : public IShellServices {
     void LoadDialogParts(const std::u16string& folder);
     void UseTextSource(com::IUnknown* source, const char* languageCode) noexcept;
 
-    HMODULE m_module = nullptr;  // in whose folder the library's files lie; null: not started
+    HMODULE m_module = nullptr;  // its folder holds the library's files; null: not started
     win32::Module m_resources;
     win32::Bitmap m_logo;
-    HMODULE m_buttonModule = nullptr;  // for which the button class is registered; null: it is not
+    HMODULE m_buttonModule = nullptr;  // for which the button class is registered; null: not registered
     Preferences m_preferences;
     TranslationHelper m_texts;
     com::IUnknown* m_textSource = nullptr;  // not owned
@@ -74,10 +73,11 @@ bool VM_CALL WindowsShellServices::Start(void* moduleHandle, com::IUnknown* text
     m_help.SetFile(folder, std::string(name, strnlen(name, kLongestHelpFileName)));
     return true;
 } catch (...) {
-    return m_module != nullptr;  // short of memory: started with what there is
+    return m_module != nullptr;  // not enough memory: started with what there is
 }
 
-// The bitmap and the button class are the resource module's; without it the buttons are the library's own, empty.
+// The resource module owns the bitmap and the button class; without it the library registers the class itself and the
+// buttons have no bitmap.
 void WindowsShellServices::LoadDialogParts(const std::u16string& folder) {
     if (!folder.empty()) {
         m_resources.reset(static_cast<HMODULE>(LoadModule((folder + kResourceModule).c_str())));
@@ -98,7 +98,7 @@ std::int32_t VM_CALL WindowsShellServices::ShowOptions(void* owner) try {
         return 0;
     }
     UseTextSource(m_textSource, UserInterfaceLanguage().c_str());
-    // The dialogs' templates lie in this module, whichever one a host starts the services for.
+    // This module holds the dialog templates, whichever module a host starts the services for.
     OptionsDialog dialog({.templates = static_cast<HMODULE>(OwnModule()),
                           .buttonModule = m_buttonModule,
                           .logo = m_logo.get(),
@@ -115,7 +115,7 @@ std::int32_t VM_CALL WindowsShellServices::ShowOptions(void* owner) try {
 
 void VM_CALL WindowsShellServices::ShutDown() {
     const FloatGuard guard;
-    if (m_dialog != nullptr) m_dialog->Abandon();  // its logo uses what goes now
+    if (m_dialog != nullptr) m_dialog->Abandon();  // its logo uses what is released below
     m_logo.reset();
     if (m_buttonModule != nullptr) UnregisterBitButtonClass(m_buttonModule);
     m_buttonModule = nullptr;
@@ -151,8 +151,8 @@ void WindowsShellServices::Withdraw(com::IUnknown* library) noexcept {
     }
 }
 
-// Never destroyed: the last library object has shut it down, and when a module is unloaded it is too late to free
-// others.
+// Never destroyed: the last library object has already shut it down, and during the unloading of a module it is too
+// late to free other modules.
 WindowsShellServices& Services() noexcept {
     alignas(WindowsShellServices) static unsigned char storage[sizeof(WindowsShellServices)];
     static WindowsShellServices* const services = new (storage) WindowsShellServices;

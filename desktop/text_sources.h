@@ -1,4 +1,4 @@
-// The living library objects, each of which can give translated texts.
+// The live library objects, each of which can supply translated texts.
 #pragma once
 
 #include <algorithm>
@@ -10,8 +10,7 @@
 
 namespace velmora::support {
 
-// Counts the library objects and remembers them without references of its own: each takes itself out before it
-// goes.
+// Counts the library objects and remembers them without taking references: each removes itself before it is destroyed.
 class TextSources {
   public:
     void Add(com::IUnknown* library) noexcept {
@@ -19,15 +18,15 @@ class TextSources {
         try {
             m_sources.push_back(library);
         } catch (const std::bad_alloc&) {
-            // The library counts all the same; its texts are asked for only while no other is needed.
+            // The library still counts, but is never asked for texts.
         }
     }
     void Remove(com::IUnknown* library) noexcept {
         if (m_count > 0) --m_count;
         std::erase(m_sources, library);
-        if (m_count == 0) m_sources = {};  // nothing stays allocated in a module about to be unloaded
+        if (m_count == 0) m_sources = {};  // leave nothing allocated in a module about to be unloaded
     }
-    // The oldest living library object, null when there is none.
+    // The oldest live library object, null when there is none.
     [[nodiscard]] com::IUnknown* Current() const noexcept {
         return m_sources.empty() ? nullptr : m_sources.front();
     }

@@ -21,8 +21,8 @@ void DescribeMenu(const ParamRow& param, ParamDescriptor& descriptor) noexcept {
     for (const char* item : param.items) CopyBounded(*text++, kMenuTextWidth, item);
 }
 
-// The fewer scratches, the faster the depth rises with them: the little slider of a simple effect goes from
-// a few faint scratches to many deep ones. The range of the amount is the host's promise, not ours.
+// The depth rises fastest while there are few scratches: the single slider of a simple effect goes from a few faint
+// scratches to many deep ones. The host guarantees the range of the amount; it is not checked here.
 float DepthOfAmount(float amount) noexcept {
     const FloatGuard guard;
     const float rest = render::Narrow(1.0 - SanitizeNormalised(amount));
@@ -91,7 +91,7 @@ bool AnswerMaster(const EffectTable& effect, IVideoHost* host, std::uint32_t ind
             cell->value.flag = answer.fixed.flag;
             return true;
         case MasterAnswer::Source::kDepthOf:
-            // Whether or not the host answers: the depth follows from what the cell then holds.
+            // Done whether or not the host answers: the depth is computed from whatever the cell then holds.
             host->GetParamValue(answer.own, cell, kind);
             cell->value.number = DepthOfAmount(cell->value.number);
             return true;

@@ -1,4 +1,4 @@
-// What an effect's host can ask of its table. The effect objects and the sessions both answer with these.
+// What a host can ask about an effect, answered from its table. Both the effect objects and the sessions use these.
 #pragma once
 
 #include <cstdint>
@@ -20,9 +20,9 @@ namespace velmora::effects {
 [[nodiscard]] bool CopyPresetValue(const EffectTable& effect, std::uint32_t preset, std::uint32_t parameter,
                                    PresetCell* cell) noexcept;
 
-// Answers the renderer's request for master setting `index` (0..20) as the effect's setting map says, own
-// parameters from `host`, and stores `kind` in the cell. False, with the cell untouched, without a host or a
-// cell; false for other indices and when the host has no answer.
+// Answers the renderer's request for master setting `index` (0..20) according to the effect's setting map, taking the
+// effect's own parameters from `host`, and stores `kind` in the cell. False, with the cell untouched, without a host or
+// a cell; also false for other indices and when the host has no answer.
 [[nodiscard]] bool AnswerMaster(const EffectTable& effect, IVideoHost* host, std::uint32_t index,
                                 ValueCell* cell, std::uint32_t kind);
 

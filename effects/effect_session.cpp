@@ -27,7 +27,7 @@ class OwnValues final : public PlainHost {
     std::span<const ValueWord> m_values;
 };
 
-// Serves the master settings: what an effect object's host face is to the renderer.
+// Serves the master settings to the renderer, as an effect object's host interface does.
 class MasterFace final : public PlainHost {
   public:
     MasterFace(const EffectTable& effect, std::span<const ValueWord> values) noexcept

@@ -1,5 +1,5 @@
-// An effect for hosts that link the core instead of loading the library: its own settings and its own state
-// of the renderer, nothing process-wide. One session per thread; sessions do not know of each other.
+// An effect for hosts that link the core instead of loading the library: it has its own settings and its own renderer
+// state, and nothing process-wide. One session per thread; sessions are independent of each other.
 #pragma once
 
 #include <array>
@@ -16,35 +16,33 @@ namespace velmora::effects {
 
 class EffectSession {
   public:
-    // A session with the parameters' defaults and with randomness pinned by seed 0. Null when memory is
-    // short.
+    // A session with the parameters' defaults and its randomness fixed by seed 0. Null when there is not enough memory.
     [[nodiscard]] static std::unique_ptr<EffectSession> Create(const EffectTable& effect) noexcept;
 
     [[nodiscard]] const EffectTable& Effect() const noexcept { return m_effect; }
 
-    // In stored form: a slider normalised to 0..1, a colour 0x00BBGGRR, an item index, a flag. Sliders are
-    // clamped and menu items outside the menu ignored when a frame reads them. Past the last parameter
-    // nothing is set.
+    // In stored format: a slider normalised to 0..1, a colour 0x00BBGGRR, an item index, a flag. When a frame reads
+    // them, sliders are clamped and menu items outside the menu are ignored. Does nothing past the last parameter.
     void SetValue(std::uint32_t parameter, ValueWord value) noexcept;
     // Past the last parameter: 0.
     [[nodiscard]] ValueWord Value(std::uint32_t parameter) const noexcept;
-    // Sets all parameters as the built-in preset has them. Past the last preset nothing is set.
+    // Sets all parameters to the values of the built-in preset. Does nothing past the last preset.
     void ApplyPreset(std::uint32_t preset) noexcept;
 
-    // From now on every frame's randomness follows from the seed and the frame number alone: frames may be
-    // rendered in any order, by any session. Seed 0 leaves scratches and flicker where the library has them;
-    // any other seed moves them too.
+    // From now on every frame's randomness depends only on the seed and the frame number: frames may be rendered in any
+    // order, by any session. With seed 0 scratches and flicker are where the library has them; any other seed moves
+    // them too.
     void PinRandom(std::uint32_t seed) noexcept;
-    // From now on the randomness is a running sequence from `state`, as in the library: a frame goes on
-    // where the frame before left off, and a frame rendered twice in a row repeats itself. Scratches and
-    // flicker are the library's.
+    // From now on the random numbers are a running sequence from `state`, as in the library: each frame continues where
+    // the frame before left off, and a frame rendered twice in a row repeats itself. Scratches and flicker are the
+    // library's.
     void StartRandom(std::uint32_t state) noexcept;
-    // How many random numbers a frame of this processed width takes with the present values. With it a host
-    // finds the state that a later frame of a sequence starts from.
+    // How many random numbers a frame of this processed width uses with the current values. A host can compute from it
+    // the state that a later frame of a sequence starts from.
     [[nodiscard]] std::uint32_t DrawsPerFrame(std::int32_t width) noexcept;
 
-    // From now on only wear, scratches and spots are drawn, where and as strong as the whole effect draws them:
-    // nothing moves the picture or changes its colours.
+    // From now on only wear, scratches and spots are drawn, with the same positions and strength as in the whole
+    // effect; nothing moves the picture or changes its colours.
     void KeepDamageOnly() noexcept { m_options.isDamageOnly = true; }
 
     // Renders the frame at a clip time: the frame number is seconds * 30, truncated. False, with nothing

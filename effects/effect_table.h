@@ -1,5 +1,5 @@
-// What tells one effect from another: its parameters, its presets and how each of the renderer's settings is
-// answered. An effect is these tables and nothing else; they are constant and shared by all its instances.
+// What distinguishes the effects: their parameters, their presets and how each of the renderer's settings is answered.
+// An effect consists of these tables alone; they are constant and shared by all its instances.
 #pragma once
 
 #include <array>
@@ -21,15 +21,15 @@ struct ParamRow {
     ParamKind kind;
     float minimum;  // shown range of a slider
     float maximum;
-    ValueWord defaultValue;  // stored form: normalised number, colour word, item index, flag
+    ValueWord defaultValue;  // stored format: normalised number, colour word, item index, flag
     Layout layout;
     bool isGroupEnd;                     // group markers only
     std::span<const char* const> items;  // menus only
     std::uint32_t groupWord;             // group markers only: fills their cells in every preset
 };
 
-// How a setting of the renderer is answered: from one of the effect's own parameters or by a fixed value in
-// the form of the setting's kind.
+// How a setting of the renderer is answered: from one of the effect's own parameters or by a fixed value in the format
+// of the setting's kind.
 struct MasterAnswer {
     enum class Source : std::uint8_t {
         kOwn,      // own parameter `own`
@@ -48,10 +48,10 @@ struct EffectTable {
     std::span<const char* const> presetNames;        // alphabetical
     std::span<const PresetCell> presetCells;         // preset major: [preset * params.size() + parameter]
     std::array<MasterAnswer, kMasterCount> answers;  // by master index
-    bool marksSliders;                               // writes 1 behind a slider's maximum
+    bool marksSliders;                               // writes 1 after a slider's maximum
 };
 
-// The five effects in the order in which the library offers them.
+// The five effects in the order in which the library lists them.
 extern const EffectTable kFilmCamera;
 extern const EffectTable kFilmLook;
 extern const EffectTable kFilmDamage;

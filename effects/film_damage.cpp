@@ -9,7 +9,7 @@ using namespace tables;
 // clang-format off
 
 // The two "Scratches" markers differ in width on purpose.
-// Of a group marker the number is what its cell holds in every preset.
+// A group marker's number is the content of its cell in every preset.
 constexpr ParamRow kParams[] = {
     //          name                   min   max    default     x    y  width height
     Slider(     "Wear",                  0, 100,         0,  {  0,   0,   0,   0}),

@@ -12,7 +12,7 @@ Status VM_CALL FilmEffect<kTable>::QueryInterface(const Guid* iid, void** out) {
     IVideoEffect* const effect = this;
     IVideoHost* const hostFace = this;
     const Face faces[] = {{&kIidUnknown, effect}, {&kIidVideoEffect, effect}, {&kIidVideoHost, hostFace}};
-    // What lies in `out` is then the host's affair.
+    // The host decides what `out` then holds.
     if (m_host != nullptr && out != nullptr && FaceOf(faces, iid) == nullptr) {
         return m_host->QueryInterface(iid, out);
     }

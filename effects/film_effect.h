@@ -1,6 +1,6 @@
-// The effects as hosts get them. Towards the host an effect is an IVideoEffect; towards the renderer that it
-// contains it poses as the host (IVideoHost) and answers what the renderer asks, from its own parameters in
-// the real host or with fixed values. All that tells one effect from another is its table.
+// The effects as hosts get them. To the host an effect is an IVideoEffect. To the renderer inside it, it acts as the
+// host (IVideoHost) and answers the renderer's requests from its own parameters in the real host or with fixed values.
+// Effects differ only in their tables.
 //
 // An effect does not need the library object that created it, but the library must stay loaded.
 #pragma once
@@ -15,7 +15,7 @@ namespace velmora::effects {
 template <const EffectTable& kTable>
 class FilmEffect final : public IVideoEffect, public IVideoHost {
   public:
-    // Both faces share these. Identifiers that the effect does not know go to the attached host.
+    // Shared by both interfaces. Identifiers that the effect does not know go to the attached host.
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
     std::uint32_t VM_CALL AddRef() override;
     std::uint32_t VM_CALL Release() override;
@@ -24,13 +24,13 @@ class FilmEffect final : public IVideoEffect, public IVideoHost {
     const char* VM_CALL GetName() override;
     std::int32_t VM_CALL GetKind() override;
     bool VM_CALL GetParamInfo(std::uint32_t index, ParamDescriptor* descriptor) override;
-    // Attaches `host`, uncounted, until the next call replaces it.
+    // Attaches `host`, without a reference, until the next call replaces it.
     bool VM_CALL Process(IVideoHost* host, const FrameRecord* source, void* hostArgument,
                          const FrameRecord* destination, const TimingRecord* timing) override;
     const char* VM_CALL GetPresetName(std::uint32_t index) override;
     bool VM_CALL GetPresetValue(std::uint32_t preset, std::uint32_t parameter, PresetCell* cell) override;
 
-    // IVideoHost, towards the renderer: `index` is a master setting.
+    // IVideoHost, for the renderer: `index` is a master setting.
     bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override;
     bool VM_CALL HostOperation4(std::intptr_t a, std::intptr_t b, std::intptr_t c) override;
     std::uint32_t VM_CALL HostOperation5(std::intptr_t a, std::intptr_t b) override;
@@ -43,7 +43,7 @@ class FilmEffect final : public IVideoEffect, public IVideoHost {
     ReferenceCount m_references;
 };
 
-// The classes' names are crossed with the names that users see.
+// The class names do not match the names that users see: CFilmLook is "Film Pro".
 using CFilmProjector = FilmEffect<kFilmCamera>;
 using CFilmColor = FilmEffect<kFilmLook>;
 using CFilmDamage = FilmEffect<kFilmDamage>;
@@ -56,8 +56,8 @@ extern template class FilmEffect<kFilmDamage>;
 extern template class FilmEffect<kFilmExpress>;
 extern template class FilmEffect<kFilmPro>;
 
-// A new effect with one reference that belongs to the caller: the index is that of kAllEffects. Null past
-// the last effect or when memory is short.
+// A new effect with one reference that belongs to the caller; the index is the one in kAllEffects. Null past the last
+// effect or when there is not enough memory.
 [[nodiscard]] IVideoEffect* CreateEffectByIndex(std::uint32_t index) noexcept;
 
 }  // namespace velmora::effects

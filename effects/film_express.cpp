@@ -9,7 +9,7 @@ using namespace tables;
 
 // clang-format off
 
-// Of a group marker the number is what its cell holds in every preset.
+// A group marker's number is the content of its cell in every preset.
 constexpr ParamRow kParams[] = {
     //          name                   min   max    default     x    y  width height
     GroupBegin( "Camera",                      0x3E6147AE,  {  0,   0,  66, 190}),

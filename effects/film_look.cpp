@@ -1,5 +1,5 @@
-// "Film Look": colour grading. Tint, saturation, brightness, contrast, film gamma and diffusion; the picture
-// neither moves nor suffers.
+// "Film Look": colour grading. Tint, saturation, brightness, contrast, film gamma and diffusion, without movement or
+// damage.
 #include "effects/table_builder.h"
 
 namespace velmora::effects {
@@ -20,7 +20,7 @@ constexpr ParamRow kParams[] = {
     Slider(     "Diffusion",             0, 100,         0,  {198,  90, 198,  30}),
 };
 
-// "Flourescent Light" is spelled as users know it: saved projects name presets by it.
+// "Flourescent Light" keeps the spelling that users know: saved projects refer to presets by name.
 constexpr PresetRow<7> kPresets[] = {
     //                                Tint                                           Film
     //                              colour  Tint  Saturation  Brightness  Contrast  Gamma  Diffusion

@@ -1,5 +1,5 @@
-// "Film Pro": camera, look and damage with nearly every setting as a control. Only the border colour and
-// the wear of the blue channel alone are fixed.
+// "Film Pro": camera, look and damage with nearly every setting as a control. Only the border colour and wear in the
+// blue channel alone are fixed.
 #include "effects/table_builder.h"
 
 namespace velmora::effects {
@@ -9,8 +9,8 @@ using namespace tables;
 
 // clang-format off
 
-// A begin marker carries a placeholder; the end marker has the frame drawn round its group.
-// Of a group marker the number is what its cell holds in every preset.
+// A begin marker carries a placeholder; the end marker holds the frame drawn round its group.
+// A group marker's number is the content of its cell in every preset.
 constexpr ParamRow kParams[] = {
     //          name                   min   max    default     x    y  width height
     GroupBegin( "Camera",                      0x3E6147AE,  {  0,   0, 300, 100}),

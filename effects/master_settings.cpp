@@ -11,7 +11,7 @@ namespace {
 
 static_assert(std::size(kMasterRows) <= MasterSettingsList::kCapacity);
 
-// Ends with a null text.
+// Terminated by a null text.
 constexpr auto kPatterns = [] {
     std::array<MenuItem, kPatternItems.size() + 1> items{};
     for (std::size_t i = 0; i < kPatternItems.size(); ++i) {

@@ -1,4 +1,4 @@
-// The master settings list: the rows of effects/master_table.h as objects that hold the present values.
+// The master settings list: the rows of effects/master_table.h as objects that hold the current values.
 #pragma once
 
 #include <array>
@@ -20,26 +20,26 @@ class MasterSettingsList {
     // Frees the entries. (The library keeps its lists until the process ends.)
     ~MasterSettingsList();
 
-    // Adds the 33 entries; false when memory is short (the list is then incomplete and not to be used).
+    // Adds the 33 entries; false when there is not enough memory (the list is then incomplete and must not be used).
     [[nodiscard]] bool Fill() noexcept;
-    // Describes the k-th exposed entry; false past the last one. Describing an entry exposes it, so that one
-    // walk to the end exposes all settings.
+    // Describes the k-th exposed entry; false past the last one. Describing an entry exposes it, so walking to the end
+    // exposes all settings.
     bool DescribeExposed(std::uint32_t index, ParamDescriptor& descriptor) noexcept;
-    // Exposes every setting, as the walk does.
+    // Exposes every setting, as that walk does.
     void ExposeAll() noexcept;
     // Lets every exposed entry read its value from `host`, with a running index from 0.
     void ReadFromHost(IVideoHost& host) noexcept;
 
-    // Takes ownership. The caller keeps within the capacity.
+    // Takes ownership. The caller must not exceed the capacity.
     void Append(CRsFX_Param* entry) noexcept { m_entries[m_count++] = entry; }
-    // The first entry with this id when it is of this kind; null otherwise.
+    // The first entry with this id if it is of this kind; otherwise null.
     [[nodiscard]] CRsFX_Param* Find(std::uint32_t id, std::uint32_t code) const noexcept;
     [[nodiscard]] CRsFX_Param* Find(Master setting, std::uint32_t code) const noexcept {
         return Find(static_cast<std::uint32_t>(setting), code);
     }
 
-    // Typed getters: leave the destination alone when there is no such entry. They compute in double
-    // precision and narrow when they write.
+    // Typed getters: they leave the destination alone when there is no such entry. They compute in double precision and
+    // narrow when they write.
     void GetPercentRaw(Master setting, float& value) const noexcept;
     void GetPercentNormalised(Master setting, float& value) const noexcept;  // 0..1 over the range
     void GetPercentSigned(Master setting, float& value) const noexcept;      // 2 * normalised - 1
@@ -49,11 +49,11 @@ class MasterSettingsList {
     void GetColour(Master setting, std::uint32_t& value) const noexcept;  // 0xFFRRGGBB
 
   private:
-    std::array<CRsFX_Param*, kCapacity> m_entries{};  // ends with the first null
+    std::array<CRsFX_Param*, kCapacity> m_entries{};  // terminated by a null
     std::uint32_t m_count = 0;
 };
 
-// What the stages are to do, from the list's present values.
+// The stages' settings, from the list's current values.
 [[nodiscard]] render::StageSettings ReadStageSettings(const MasterSettingsList& list) noexcept;
 
 }  // namespace velmora

@@ -1,6 +1,6 @@
 // The master settings: what the renderer asks an effect for at every frame. One row each, with group markers between
-// them, in the order in which they are asked; a setting's place among the rows that are no markers is the index by
-// which hosts and effects name it.
+// them, in the order in which they are asked for. Hosts and effects refer to a setting by its index among the rows that
+// are not markers.
 #pragma once
 
 #include <algorithm>
@@ -12,7 +12,7 @@
 
 namespace velmora {
 
-// The settings' ids. They are not in the order of the rows.
+// The settings' ids, in a different order from the rows.
 enum class Master : std::uint32_t {
     kYJitter = 101,
     kXJitter = 102,
@@ -48,13 +48,13 @@ struct MasterRow {
     float
         value;  // before the first frame. Menu: item value; check box: 0 or 1; colours start as opaque black
     double
-        neutral;  // the answer of an effect that lets the setting alone. Slider: as shown; menu: item index
+        neutral;  // the answer of an effect that does not use the setting. Slider: as shown; menu: item index
 
     [[nodiscard]] constexpr Master Setting() const { return Master{id}; }
     [[nodiscard]] constexpr bool IsSetting() const {
         return kind != MasterKind::kBegin && kind != MasterKind::kEnd;
     }
-    // As hosts exchange it.
+    // In the format that hosts exchange.
     [[nodiscard]] constexpr ParamKind HostKind() const {
         switch (kind) {
             case MasterKind::kInteger:

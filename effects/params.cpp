@@ -9,7 +9,7 @@ namespace velmora {
 namespace {
 
 ValueCell ReadCell(IVideoHost& host, std::uint32_t index, ParamKind kind) noexcept {
-    const FloatGuard guard;  // whatever the host does to the processor's state while it answers
+    const FloatGuard guard;  // the host may change the processor's state while it answers
     ValueCell cell = {};
     host.GetParamValue(index, &cell, kind);
     return cell;
@@ -42,8 +42,8 @@ void CRsFX_Param::DescribeAs(ParamDescriptor& descriptor, ParamKind kind) noexce
     m_exposed = true;
 }
 
-// The default of a slider is its value divided by the maximum, not by the range: these descriptors only
-// mark settings as exposed, the host sees those of the effects.
+// A slider's default is its value divided by the maximum, not by the range: these descriptors only mark settings as
+// exposed; the host sees the descriptors of the effects.
 void CRsFX_PercentSlider::Describe(ParamDescriptor& descriptor) noexcept {
     DescribeAs(descriptor, kKindSlider);
     descriptor.defaultValue.number = m_value / m_maximum;

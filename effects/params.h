@@ -1,5 +1,5 @@
-// The master settings as objects: each can describe itself to a host, read its value from one and tell its
-// kind. They live in a MasterSettingsList (effects/master_settings.h) and are overwritten by every frame.
+// The master settings as objects: each can describe itself to a host, read its value from one and return its kind. They
+// live in a MasterSettingsList (effects/master_settings.h) and are overwritten by every frame.
 #pragma once
 
 #include <cstdint>
@@ -18,11 +18,11 @@ enum ParamClassCode : std::uint32_t {
     kClassGroup = 9006,
 };
 
-// Copies a text into a field, stopping after its zero or at the field's end, whichever comes first: a text
-// that fills the field is not terminated inside it. The bytes behind the zero are left alone.
+// Copies a text into a field, stopping after its zero or at the field's end, whichever comes first: a text that fills
+// the field is not terminated. The bytes after the zero are left alone.
 void CopyBounded(char* field, std::int32_t width, const char* text) noexcept;
 
-// A slider value from a host: not a number reads as 0, others are clamped to 0..1.
+// A slider value from a host: NaN reads as 0, other values are clamped to 0..1.
 float SanitizeNormalised(float value) noexcept;
 
 class CRsFX_Param {
@@ -34,8 +34,8 @@ class CRsFX_Param {
 
     // Sets the whole descriptor. All but groups are exposed from their first description on.
     virtual void Describe(ParamDescriptor& descriptor) noexcept;
-    // Takes the value from the host's master setting `index`. What the host returns is not looked at: a
-    // value that it does not write reads as 0.
+    // Takes the value from the host's master setting `index`. The host's return value is ignored: a value that it does
+    // not write reads as 0.
     virtual void ReadFromHost(IVideoHost& host, std::uint32_t index) noexcept;
     [[nodiscard]] virtual bool IsKind(std::uint32_t code) const noexcept { return code == kClassParam; }
 
@@ -109,7 +109,7 @@ class CRsFX_CheckBox final : public CRsFX_Param {
     bool m_value;
 };
 
-// An item of a menu; a table of them ends with a null text.
+// A menu item; a table of them ends with a null text.
 struct MenuItem {
     const char* text;
     std::int32_t value;
@@ -121,7 +121,7 @@ class CRsFX_Menu final : public CRsFX_Param {
         : CRsFX_Param(id, name), m_items(items), m_defaultValue(defaultValue) {}
 
     void Describe(ParamDescriptor& descriptor) noexcept override;
-    // An index outside the items that the last description counted keeps the value.
+    // An index outside the items counted by the last description leaves the value unchanged.
     void ReadFromHost(IVideoHost& host, std::uint32_t index) noexcept override;
     [[nodiscard]] bool IsKind(std::uint32_t code) const noexcept override { return code == kClassMenu; }
 
@@ -161,7 +161,7 @@ class CRsFX_Group final : public CRsFX_Param {
     [[nodiscard]] bool IsKind(std::uint32_t code) const noexcept override { return code == kClassGroup; }
 
   private:
-    // Part of the entry; nothing in the library asks for it, as hosts draw their groups from the effects' tables.
+    // Part of the entry; the library does not use it, as hosts draw their groups from the effects' tables.
     [[maybe_unused]] bool m_isBegin;
 };
 

@@ -19,7 +19,7 @@ struct KeptList {
 };
 KeptList* g_currentList = nullptr;
 
-// Seeded when the library is loaded: initialisers of statics run then.
+// Seeded when the library is loaded, by static initialisation.
 struct SeededState : render::RenderState {
     SeededState() noexcept { random.Seed(support::TickCount()); }
 } g_state;

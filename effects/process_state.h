@@ -1,5 +1,5 @@
-// The state that the library keeps for the whole process, unguarded, as hosts of this kind expect: frames
-// are rendered one at a time.
+// The state that the library keeps for the whole process. It is not locked, as hosts of this kind expect: frames are
+// rendered one at a time.
 #pragma once
 
 #include <cstdint>
@@ -9,7 +9,7 @@
 
 namespace velmora {
 
-// Library objects alive; changed atomically. Effects and other objects are not counted: the host may unload
+// Number of live library objects; changed atomically. Effects and other objects are not counted: the host may unload
 // the library as soon as all library objects are gone.
 class DLLDependentObject {
   public:
@@ -21,13 +21,13 @@ class DLLDependentObject {
     [[nodiscard]] static std::int32_t LiveObjectCount() noexcept;
 };
 
-// The one value of the build mode under which the master settings are filled and read.
+// The only build mode value under which the master settings are filled and read.
 inline constexpr std::int32_t kBuildModeReady = 2;
 
 void SetBuildMode(std::int32_t mode) noexcept;
 [[nodiscard]] std::int32_t BuildMode() noexcept;
 
-// Makes a new master settings list the current one; false when memory is short (the current list stays).
+// Makes a new master settings list the current one; false when there is not enough memory (the current list stays).
 // Earlier lists are kept until the process ends: effects that read them may outlive their library object.
 [[nodiscard]] bool RenewMasterSettings() noexcept;
 [[nodiscard]] MasterSettingsList* CurrentMasterSettings() noexcept;

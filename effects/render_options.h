@@ -1,5 +1,5 @@
-// How the pixels of a process are worked on: the best way, unless whoever runs it wants another one for tests or
-// to look for a fault. The bytes are the same.
+// Chooses how pixels are processed. The fastest level is used unless the environment asks for another one, for tests or
+// to track down a fault. The output bytes are the same.
 //
 //   VELMORA_FORM=plain, sse2, ssse3, avx2 or avx512   no faster SIMD level of the pixel kernels than this
 #pragma once
@@ -8,8 +8,8 @@
 
 namespace velmora {
 
-// Reads the process's environment anew. Other values than those above count as none; a level that the processor
-// lacks gives the best one that it has.
+// Reads the process's environment again. Values other than those above are ignored; a level that the processor lacks
+// gives the best one that it has.
 [[nodiscard]] render::RenderOptions ReadRenderOptions() noexcept;
 
 }  // namespace velmora

@@ -9,7 +9,7 @@ bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameReco
     if (source == nullptr || destination == nullptr || timing == nullptr) return false;
     render::FrameContext context(DescriptionOf(*source), DescriptionOf(*destination));
     context.SetTime(timing->frameTime);
-    // A frame that turns out to be invalid still counts as the last one.
+    // An invalid frame still counts as the last one.
     session.state->random.BeginFrame(context.FrameNumber());
     if (!context.IsValid(render::Slot::kSource) || !context.IsValid(render::Slot::kDestination)) return false;
     session.settings->ReadFromHost(face);

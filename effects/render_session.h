@@ -1,6 +1,6 @@
-// What the renderer front works on: the list of master settings that every frame reads anew, and the state
-// that outlives a frame. The library has one session for the whole process, as hosts expect; a host that
-// links the core makes one for each of its threads.
+// What a render works on: the list of master settings, which every frame reads again, and the state that outlives a
+// frame. The library has one session for the whole process, as hosts expect; a host that links the core makes one for
+// each of its threads.
 #pragma once
 
 #include "api/host_api.h"
@@ -15,17 +15,17 @@ struct RenderSession {
     MasterSettingsList* settings = nullptr;  // not owned
     render::RenderState* state = nullptr;    // not owned
     render::RenderOptions options;
-    std::uint32_t hostSeed = 0;  // StageSettings::hostSeed; the library's hosts give none
+    std::uint32_t hostSeed = 0;  // StageSettings::hostSeed; hosts of the library set none
 };
 
-// A host's frame as the renderer takes it.
+// A host's frame in the renderer's terms.
 [[nodiscard]] inline render::FrameDescription DescriptionOf(const FrameRecord& frame) noexcept {
     return {frame.pixels, frame.width, frame.height, frame.rowStep, frame.xOrigin, frame.yOrigin};
 }
 
-// Renders one frame: builds the views, moves the random state on, reads every exposed setting through
-// `face` (an effect's host face) and runs the stages. False when a frame or `timing` is missing or invalid;
-// nothing is written then and no parameter is read.
+// Renders one frame: builds the views, advances the random state, reads every exposed setting through `face` (an
+// effect's host interface) and runs the stages. False when a frame or `timing` is missing or invalid; then nothing is
+// written and no parameter is read.
 bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameRecord* source,
                  const FrameRecord* destination, const TimingRecord* timing) noexcept;
 

@@ -1,4 +1,4 @@
-// How the master settings' values become what the stages are to do.
+// Turns the master settings' values into the settings of the stages.
 
 #include "effects/master_settings.h"
 #include "render/rounding.h"
@@ -46,7 +46,7 @@ void ReadTint(const MasterSettingsList& list, StageSettings& settings) noexcept 
     settings.tintBlue = channel(0);
 }
 
-// Amount and depth count only when a kind of scratch is on; the sum of the two is a seed and nothing else.
+// Amount and depth count only when a kind of scratch is on; their sum serves only as a seed.
 void ReadScratches(const MasterSettingsList& list, StageSettings& settings) noexcept {
     constexpr double kLeast = 0.00001;
     settings.scratchKinds = (IsTicked(list, Master::kBlack) ? render::kScratchBlack : 0u) |

@@ -1,7 +1,6 @@
-// The words in which the effects' tables are written, and what turns them into the stored form: presets and
-// defaults are written as shown to the user, settings are matched to parameters by name. All of it runs
-// while compiling, and a slip in a table (a missing column, a value out of range, an unknown name) does not
-// compile.
+// The vocabulary for writing the effects' tables, and the code that converts them to the stored format: presets and
+// defaults are written as shown to the user, and settings are matched to parameters by name. All of it runs at compile
+// time, so a mistake in a table (a missing column, a value out of range, an unknown name) does not compile.
 #pragma once
 
 #include <array>
@@ -48,7 +47,7 @@ consteval ParamRow Menu(const char* name, std::span<const char* const> items, st
     return {name, kKindMenu, 0.0f, 0.0f, {.bits = item}, layout, false, items, 0};
 }
 
-// `presetWord` stands in the marker's cell of every preset. It means nothing and is kept as hosts know it.
+// `presetWord` fills the marker's cell in every preset. It has no meaning; hosts know it, so it is kept.
 consteval ParamRow GroupBegin(const char* name, std::uint32_t presetWord, Layout layout) {
     return {name, kKindGroup, 0.0f, 0.0f, {.bits = 0}, layout, false, {}, presetWord};
 }
@@ -59,7 +58,7 @@ consteval ParamRow GroupEnd(const char* name, std::uint32_t presetWord, Layout l
 
 // ---------------------------------------------------------------------------------------------------------
 // Presets: one shown value for each parameter that holds one, in the parameters' order. A colour is its word
-// 0x00BBGGRR, a menu its item, a check box kOff or kOn. Doubles hold all of them exactly.
+// 0x00BBGGRR, a menu its item, a check box kOff or kOn. A double holds all of them exactly.
 
 template <std::size_t kValues>
 struct PresetRow {
@@ -111,7 +110,7 @@ consteval std::array<PresetCell, kPresets * kParams> StorePresets(
     return cells;
 }
 
-// The presets' names. Hosts show them in this order, so it must be the alphabet's.
+// The presets' names. Hosts show them in this order, so it must be alphabetical.
 template <std::size_t kPresets, std::size_t kValues>
 consteval std::array<const char*, kPresets> NamesOf(const PresetRow<kValues> (&presets)[kPresets]) {
     std::array<const char*, kPresets> names{};
@@ -123,8 +122,8 @@ consteval std::array<const char*, kPresets> NamesOf(const PresetRow<kValues> (&p
 }
 
 // ---------------------------------------------------------------------------------------------------------
-// The setting map. A setting is answered by the parameter that has its name and kind, or else by its neutral value;
-// a row is written for a setting that is answered in another way.
+// The setting map. By default a setting is answered by the parameter with its name and kind, or else by its neutral
+// value; only settings that are answered in another way have a row.
 
 struct AnswerRow {
     Master master;
@@ -160,8 +159,8 @@ consteval MasterAnswer NeutralAnswer(const MasterRow& row) {
     return {source, 0, {.bits = word}};
 }
 
-// Name and kind together find the parameter: a colour and its amount may share a name. The number of parameters when
-// there is none.
+// Finds a parameter by name and kind together, as a colour and its amount may share a name. Returns the number of
+// parameters when there is none.
 consteval std::uint32_t OwnIndex(std::span<const ParamRow> params, ParamKind kind, std::string_view name) {
     std::uint32_t index = 0;
     while (index < params.size() && (params[index].kind != kind || params[index].name != name)) ++index;

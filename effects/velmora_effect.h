@@ -1,5 +1,5 @@
-// The renderer that all effects share, in the shape of an effect: it shows the master settings as its
-// parameters and renders from them. Every effect contains one and poses to it as the host.
+// The renderer that all effects share, with the interface of an effect: it shows the master settings as its parameters
+// and renders from them. Every effect contains one and acts as its host.
 #pragma once
 
 #include "api/com_object.h"

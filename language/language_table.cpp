@@ -43,7 +43,7 @@ std::optional<std::int32_t> CategoryFrom(const char* text) {
     return category;
 }
 
-// The text inside an element that holds nothing else; null when it holds something else, or nothing.
+// The text of an element that contains nothing else; null when it contains anything else or is empty.
 const char* OnlyText(const TiXmlElement& element) {
     const TiXmlText* found = nullptr;
     for (const TiXmlNode* child = element.FirstChild(); child; child = child->NextSibling()) {
@@ -74,7 +74,7 @@ const TiXmlElement* RootOf(const TiXmlDocument& document) {
 
 }  // namespace
 
-// Fills a table from the tree, one level of elements per operation. False ends the reading.
+// Fills a table from the tree, with one operation for each level of elements. False stops the reading.
 class TableReader {
   public:
     explicit TableReader(LanguageTable& table) : m_table(table) {}

@@ -16,12 +16,12 @@ inline constexpr std::size_t kLongestKey = 255;                    // bytes
 
 class LanguageTable {
   public:
-    // Reads the bytes of a language file (its form is told at the head of VMReelEffectsLang.xml). Nothing
-    // when anything in it is broken or unknown. Throws std::bad_alloc.
+    // Reads the bytes of a language file (format: see the head of VMReelEffectsLang.xml). Nothing when any part of it
+    // is broken or unknown. Throws std::bad_alloc.
     static std::optional<LanguageTable> Read(std::string_view file);
 
-    // The text of a key, zero-terminated and never empty; null when there is none. `languageCode` and `key`
-    // are zero-terminated or null; letters of the code may be small or capital.
+    // The text of a key, zero-terminated and never empty; null when there is none. `languageCode` and `key` are
+    // zero-terminated or null; the code may be in either case.
     const char16_t* Find(const char* languageCode, std::int32_t category, const char* key) const noexcept;
 
     std::size_t Size() const noexcept { return m_texts.size(); }
@@ -29,9 +29,9 @@ class LanguageTable {
   private:
     friend class TableReader;
 
-    // What names a text, so that one can be looked for without allocating.
+    // Identifies a text, so that it can be looked up without allocating.
     struct PlaceView {
-        std::string_view code;  // in small letters
+        std::string_view code;  // lower case
         std::int32_t category;
         std::string_view key;
     };

@@ -24,7 +24,7 @@ bool IsCharacter(std::uint32_t value) {
     return !isSurrogate && value <= 0x10FFFF && value != 0xFFFE && value != 0xFFFF;
 }
 
-// `name` is what stands between '&' and ';'.
+// `name` is the text between '&' and ';'.
 bool IsKnownReference(std::string_view name) {
     constexpr std::array<std::string_view, 5> kNamed = {"amp", "lt", "gt", "quot", "apos"};
     if (!name.starts_with('#')) return std::find(kNamed.begin(), kNamed.end(), name) != kNamed.end();
@@ -38,7 +38,7 @@ bool IsKnownReference(std::string_view name) {
 
 bool HasOnlyKnownReferences(std::string_view text) {
     for (std::size_t at = text.find('&'); at != std::string_view::npos; at = text.find('&', at + 1)) {
-        // The longest is "#1114111" with some leading zeros; a bound keeps a file full of '&' quick.
+        // The longest is "#1114111" with some leading zeros; the limit keeps a file full of '&' fast.
         const std::size_t length = text.substr(at + 1, 16).find(';');
         if (length == std::string_view::npos || !IsKnownReference(text.substr(at + 1, length))) return false;
     }
@@ -80,8 +80,8 @@ class Scanner {
         return tag.ends_with('?');
     }
 
-    // From '<' to '>': the tag's inside, empty when there is no such tag. With '<' and '>' kept out of
-    // attribute values, no reading of the quotes can disagree about where a tag ends.
+    // Takes a tag and returns what is between '<' and '>'; empty when there is no such tag. Attribute values contain
+    // neither character, so the end of a tag is never ambiguous, however quotes are read.
     std::string_view TakeTag() {
         const std::size_t end = m_rest.find_first_of("<>", 1);
         if (end == std::string_view::npos || m_rest[end] == '<') return {};

@@ -1,5 +1,5 @@
-// The object behind LangXMLParser, and the exports of the language module, whose names come undecorated from VMLang.def
-// on Windows.
+// The object behind LangXMLParser, and the exports of the language module; VMLang.def gives them undecorated names on
+// Windows.
 
 #include <atomic>
 #include <filesystem>
@@ -18,11 +18,11 @@
 namespace velmora::language {
 namespace {
 
-// Parsers alive in this module: a host must not free the module while it is above 0.
+// Live parsers in this module: a host must not free the module while there are any.
 std::atomic<std::int32_t> liveParsers{0};
 
-// The file's bytes; nothing when it cannot be read. Stops one byte past the largest size allowed, so that a
-// file that never ends is refused like one that is too large.
+// The file's bytes; nothing when it cannot be read. Reads at most one byte more than the largest size allowed, so that
+// an endless file is refused like one that is too large.
 std::optional<std::string> ReadBytes(const std::filesystem::path& path) {
     std::ifstream stream(path, std::ios::binary);
     if (!stream) return std::nullopt;
@@ -70,7 +70,7 @@ class Parser final : public LangXMLParser {
             m_table = std::move(*table);
             return true;
         } catch (...) {
-            return false;  // memory, or a path that is not well-formed 16-bit text
+            return false;  // not enough memory, or the path is not well-formed UTF-16
         }
     }
 

@@ -13,7 +13,7 @@ TranslationHelper::~TranslationHelper() = default;
 void TranslationHelper::SetContext(com::IUnknown* textSource, const char* languageCode) noexcept {
     m_text[0] = 0;
     m_textSource = textSource;
-    // At most three bytes of the code are looked at: a host may pass a long text.
+    // Reads at most three bytes of the code: a host may pass a long text.
     const bool isCode = languageCode != nullptr && languageCode[0] != '\0' && languageCode[1] != '\0' &&
                         languageCode[2] == '\0';
     std::memcpy(m_languageCode, isCode ? languageCode : "en", sizeof m_languageCode);
@@ -28,13 +28,13 @@ const char16_t* TranslationHelper::Translate(std::int32_t category, const char* 
     return m_text;
 }
 
-// The interface is asked for at every lookup and never kept: the source may gain or lose its language file.
+// The interface is requested for every lookup and never kept: the source may gain or lose its language file.
 bool TranslationHelper::LookUp(std::int32_t category, const char* key) noexcept {
     if (m_textSource == nullptr) return false;
     const auto texts = QueryFor<IMultiLingual>(*m_textSource, kIidMultiLingual);
     if (!texts) return false;
     const std::int32_t written = texts->GetText(m_languageCode, category, key, m_text, kCapacity);
-    m_text[kCapacity - 1] = 0;  // whatever a language module of another maker wrote
+    m_text[kCapacity - 1] = 0;  // in case another maker's language module did not terminate it
     return written > 0;
 }
 

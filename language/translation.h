@@ -14,20 +14,19 @@ enum TextCategory : std::int32_t {
     kTextsOfButtons = 8,
 };
 
-// A member of every object that shows translated texts. Used from one thread at a time: all lookups share
-// one buffer.
+// A member of every object that shows translated texts. For one thread at a time: all lookups share one buffer.
 class TranslationHelper {
   public:
     TranslationHelper() noexcept = default;
     virtual ~TranslationHelper();
 
-    // Sets who is asked for texts (null: nobody; no reference is taken, the source has to stay alive while it
-    // is set) and the language, a two-letter code; any other code, or null, is "en".
+    // Sets the source of texts (null: none; no reference is taken, so the source must stay alive while it is set) and
+    // the language, a two-letter code; any other code, or null, means "en".
     void SetContext(com::IUnknown* textSource, const char* languageCode) noexcept;
 
-    // The text for a key, at most 2047 characters; without a translation the fallback (8-bit text in the
-    // system code page), which is the key itself when `fallback` is null. Never null; valid until the next
-    // lookup or SetContext. `wasFound` (may be null) tells whether there was a translation.
+    // The text for a key, at most 2047 characters; without a translation, the fallback (8-bit text in the system code
+    // page), or the key itself when `fallback` is null. Never null; valid until the next lookup or SetContext.
+    // `wasFound` (may be null) receives whether there was a translation.
     const char16_t* Translate(std::int32_t category, const char* key, const char* fallback = nullptr,
                               bool* wasFound = nullptr) noexcept;
 

@@ -17,13 +17,13 @@ struct Packing {
 };
 
 constexpr Packing kBgra = {render::BgraRowBytes, render::BgraRowBytes};
-// A region starts with the group that holds its first pixel.
+// A region starts at the pixel group that holds its first pixel.
 constexpr Packing kYcbcr = {render::YcbcrRowBytes,
                             [](std::int32_t column) noexcept { return std::int64_t{column} / 2 * 4; }};
 
 // A frame's region as rows in memory order.
 struct Region {
-    std::uint8_t* first = nullptr;  // null: the frame is not valid
+    std::uint8_t* first = nullptr;  // null: the frame is invalid
     std::ptrdiff_t step = 0;
     std::int32_t width = 0;
     std::int32_t height = 0;
@@ -75,7 +75,7 @@ render::Bgra* PixelsOf(const Region& region, std::int32_t row) noexcept {
     return reinterpret_cast<render::Bgra*>(region.Row(row));
 }
 
-// Frames that share memory: takes all rows to the scratch image before the first one is written.
+// For frames that share memory: converts all rows into the scratch image before the first one is written.
 template <typename ToScratch, typename FromScratch>
 bool ConvertThrough(render::PackedImage& scratch, std::int32_t width, std::int32_t height,
                     ToScratch&& toScratch, FromScratch&& fromScratch) noexcept {
@@ -122,7 +122,7 @@ bool VM_CALL FrameProcessor::ConvertYcbcrToBgra(const FrameRecord* source, const
     const FloatGuard guard;
     const Region from = RegionOf(source, kYcbcr), to = RegionOf(destination, kBgra);
     if (from.first == nullptr || to.first == nullptr) return false;
-    // The source is decoded by its own width: where that is odd decides about its last pixel.
+    // The source is decoded at its own width: an odd width affects how its last pixel is decoded.
     const std::int32_t width = std::min(from.width, to.width), height = std::min(from.height, to.height);
     if (!Overlap(from, to)) {
         for (std::int32_t y = 0; y < height; ++y) {

@@ -1,4 +1,4 @@
-// The converter between packed YCbCr 4:2:2 frames and 32-bit frames that the library offers hosts.
+// The converter that the library offers hosts, between packed YCbCr 4:2:2 frames and 32-bit frames.
 #pragma once
 
 #include "api/com_object.h"

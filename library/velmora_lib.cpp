@@ -26,7 +26,7 @@ bool AllowsUnload(support::ModuleHandle module) noexcept {
     return canUnload == nullptr || canUnload();
 }
 
-// The path of a file beside the library; empty when it cannot be told.
+// The path of a file in the library's folder; empty when that is unknown.
 std::u16string BesideLibrary(const char16_t* name) noexcept try {
     std::u16string path = support::ModuleFolder(support::OwnModule());
     return path.empty() ? path : path + name;
@@ -44,20 +44,20 @@ support::ModuleHandle LoadBesideOrByName(const char16_t* name) noexcept {
 
 CRsVelmoraLib::CRsVelmoraLib() noexcept {
     support::OfferTextSource(support::OwnModule(), static_cast<IEffectLibrary*>(this), kHelpFile);
-    // Frames read only the settings that have been described once.
+    // Frames read only settings that have been described once.
     if (MasterSettingsList* settings = CurrentMasterSettings()) settings->ExposeAll();
     m_hasLanguage = LoadLanguage(kLanguageModule, kLanguageFile);
 }
 
 CRsVelmoraLib::~CRsVelmoraLib() {
     support::WithdrawTextSource(static_cast<IEffectLibrary*>(this));
-    m_parser.Reset();  // its code lies in the module
+    m_parser.Reset();  // its code is in the module
     FreeLanguageModule();
 }
 
 bool CRsVelmoraLib::FreeLanguageModule() noexcept {
     if (m_languageModule != nullptr && !AllowsUnload(m_languageModule)) return false;
-    support::UnloadModule(m_languageModule);  // also when none is held: freeing nothing does nothing
+    support::UnloadModule(m_languageModule);  // also when none is held: freeing null does nothing
     m_languageModule = nullptr;
     return true;
 }
@@ -66,7 +66,7 @@ bool CRsVelmoraLib::LoadLanguage(const char16_t* moduleName, const char16_t* fil
     if (m_parser || moduleName == nullptr || fileName == nullptr) return false;
     if (m_languageModule != nullptr) {
         FreeLanguageModule();
-        m_languageModule = nullptr;  // a module that asks to be kept is forgotten, not freed
+        m_languageModule = nullptr;  // a module that must not be unloaded is abandoned, not freed
     }
     m_languageModule = LoadBesideOrByName(moduleName);
     if (m_languageModule == nullptr) return false;
@@ -79,7 +79,7 @@ bool CRsVelmoraLib::LoadLanguage(const char16_t* moduleName, const char16_t* fil
     return m_parser->Load(path.c_str()) || m_parser->Load(fileName);
 }
 
-// IMultiLingual is given out only when it has texts to give.
+// IMultiLingual is available only when there are texts.
 Status VM_CALL CRsVelmoraLib::QueryInterface(const Guid* iid, void** out) {
     IEffectLibrary* const library = this;
     const Face faces[] = {{&kIidUnknown, library}, {&kIidEffectLibrary, library}};

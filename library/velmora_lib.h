@@ -1,4 +1,4 @@
-// The library object, and the two exports through which a host gets it.
+// The library object, and the DLL's two exports.
 #pragma once
 
 #include "api/com_object.h"
@@ -12,7 +12,7 @@ namespace velmora {
 
 class CRsVelmoraLib final : public DLLDependentObject, public IEffectLibrary, public IMultiLingual {
   public:
-    // Offers the texts to the shell services, exposes the master settings and loads the language.
+    // Offers its texts to the shell services, exposes the master settings and loads the language.
     CRsVelmoraLib() noexcept;
 
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override;
@@ -35,10 +35,10 @@ class CRsVelmoraLib final : public DLLDependentObject, public IEffectLibrary, pu
   private:
     ~CRsVelmoraLib() override;
 
-    // Loads the module, from beside the library or else by its bare name, and lets its parser load the file
-    // the same way. False when there is no module, no parser or no readable file, or a name is missing.
+    // Loads the module from the library's folder, or else by its bare name, and makes its parser load the file in the
+    // same way. False when there is no module, no parser or no readable file, or when a name is missing.
     bool LoadLanguage(const char16_t* moduleName, const char16_t* fileName) noexcept;
-    // False when the module's "CanUnloadDLLNow" asks to be kept; the handle is then kept as well.
+    // False when the module's "CanUnloadDLLNow" forbids unloading; the handle is then kept too.
     bool FreeLanguageModule() noexcept;
 
     ReferenceCount m_references;

@@ -1,8 +1,8 @@
-// Gives the code behind it the floating-point state that it is compiled for, and the caller its own back.
+// Sets the floating-point state that our code is compiled for, and restores the caller's state at the end.
 //
-// Hosts change rounding, precision, denormal handling and exception masks for their own purposes; results
-// must not depend on that, and a host must find its state as it left it: x87 environment, vector control word
-// and direction flag.
+// Hosts change rounding, precision, denormal handling and exception masks for their own purposes. Results must not
+// depend on that, and a host must get its state back unchanged: x87 environment, vector control word and direction
+// flag.
 #pragma once
 
 #include <cstdint>
@@ -18,12 +18,12 @@ namespace velmora {
 class FloatGuard {
   public:
     FloatGuard() noexcept : m_processorFlags(ProcessorFlags()) {
-        // With the environment saved, exceptions that our work raises cannot reach a caller who unmasked them.
+        // The environment is saved first: exceptions raised by our work cannot reach a caller who unmasked them.
         __asm__ __volatile__("fnstenv %0" : "=m"(m_x87));
         __asm__ __volatile__("stmxcsr %0" : "=m"(m_vectorControl));
-        const std::uint16_t control = 0x037F;        // exceptions masked, extended precision, to nearest
-        const std::uint32_t vectorControl = 0x1F80;  // exceptions masked, to nearest, denormals kept
-        // "cld": string operations upward, as compiled code takes for granted.
+        const std::uint16_t control = 0x037F;  // exceptions masked, extended precision, round to nearest
+        const std::uint32_t vectorControl = 0x1F80;  // exceptions masked, round to nearest, denormals kept
+        // "cld": string operations go upward, as compiled code assumes.
         __asm__ __volatile__("fldcw %0\n\tldmxcsr %1\n\tcld" : : "m"(control), "m"(vectorControl) : "memory");
     }
     ~FloatGuard() {
@@ -34,8 +34,8 @@ class FloatGuard {
     FloatGuard& operator=(const FloatGuard&) = delete;
 
   private:
-    // By hand: the compiler's own way may pop the flags to another place than it reads them from. A leaf
-    // function's locals can lie below the stack pointer on x86-64, so the push keeps its distance.
+    // By hand: the compiler's own code may pop the flags to a different address than it reads them from. On x86-64 a
+    // leaf function's locals can lie below the stack pointer, so the push leaves a gap.
     static std::uintptr_t ProcessorFlags() noexcept {
         std::uintptr_t flags;
 #if defined(__x86_64__)
@@ -60,8 +60,8 @@ class FloatGuard {
 
 #else
 
-// Elsewhere the C library knows the state; on WebAssembly there is none to change. Saving it clears the exception
-// flags and masks the exceptions, as above.
+// On other processors the C library handles the state; on WebAssembly there is none to change. Saving it clears the
+// exception flags and masks the exceptions, as above.
 class FloatGuard {
   public:
     FloatGuard() noexcept {

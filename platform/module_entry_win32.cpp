@@ -1,22 +1,23 @@
-// The entry of a module that may be unloaded while the process goes on: each of ours.
+// The entry point of a module that may be unloaded while the process runs on, as all of ours may.
 
 #include <windows.h>
 
 extern "C" const IMAGE_TLS_DIRECTORY _tls_used;  // the module's own, made by the linker
 
 namespace __gnu_cxx {
-void __freeres();  // of the C++ runtime; it has no header
+void __freeres();  // from the C++ runtime; no header declares it
 }
 
 namespace {
 
-// The C++ runtime that is linked into a module keeps handles for a thread that uses it and gives them back when that
-// thread ends, but not when the module goes before: a host that loads and unloads the library again and again would
-// lose some each time. So the runtime is told that the unloading thread ends, which for the module is true.
+// The C++ runtime linked into a module keeps handles for each thread that uses it. It releases them when that thread
+// ends, but not when the module is unloaded first: a host that loads and unloads the library repeatedly would leak some
+// each time. So the runtime is notified that the unloading thread ends, which is true as far as the module is
+// concerned.
 class RuntimeRelease {
   public:
-    // Call at DLL_PROCESS_DETACH; `reserved` is the entry's last argument, not null when the whole process ends:
-    // then nothing has to be done.
+    // Call at DLL_PROCESS_DETACH. `reserved` is the entry point's last argument; it is not null when the whole process
+    // ends, and then nothing needs to be done.
     void Arm(HINSTANCE module, const void* reserved) noexcept {
         m_module = reserved == nullptr ? module : nullptr;
     }
@@ -26,7 +27,7 @@ class RuntimeRelease {
         for (; callback != nullptr && *callback != nullptr; ++callback) {
             (*callback)(m_module, DLL_THREAD_DETACH, nullptr);
         }
-        // The memory that the runtime sets aside for throwing when there is none.
+        // The runtime's emergency memory for throwing exceptions when there is not enough memory.
         __gnu_cxx::__freeres();
     }
 
@@ -34,7 +35,7 @@ class RuntimeRelease {
     HINSTANCE m_module = nullptr;
 };
 
-// Made before and so destroyed after everything else in the module, which may still use the runtime.
+// Constructed before, and so destroyed after, everything else in the module, which may still use the runtime.
 __attribute__((init_priority(101))) RuntimeRelease runtimeRelease;
 
 }  // namespace

@@ -1,9 +1,9 @@
-// For a module that may be unloaded while the process goes on: what the runtimes linked into it take of the process for
-// ever goes with the module. That is memory, which all comes from a heap of the module's own, and slots of thread-local
-// storage, of which a process has no more than 1088: the thread library takes one at each load.
+// For a module that may be unloaded while the process runs on: releases with the module what its linked runtimes take
+// from the process and never give back. That is memory, all of which comes from the module's own heap, and thread-local
+// storage slots, of which a process has at most 1088: the thread library takes one at each load.
 //
-// The allocating functions of C and C++ are defined here for the module's own use. What those of msvcrt.dll return must
-// not come here: no function that hands out memory of its own is used.
+// The C and C++ allocation functions are defined here for the module's own use. Blocks that msvcrt.dll returns must not
+// be freed here, so no function that returns memory of its own is used.
 
 #include <windows.h>
 
@@ -18,8 +18,8 @@ namespace {
 
 HANDLE g_heap = nullptr;
 
-// Made by the first allocation, which comes before any code of ours: callbacks for threads run first. Loading has the
-// loader's lock, so that nobody else can be here.
+// Created by the first allocation, which happens before any code of ours: thread callbacks run first. The loader lock
+// is held during loading, so no other thread can be here.
 HANDLE Heap() noexcept {
     if (g_heap == nullptr) g_heap = HeapCreate(0, 0, 0);
     return g_heap;
@@ -39,7 +39,7 @@ DWORD g_slots[8];
 std::atomic<std::size_t> g_slotCount{0};
 
 DWORD WINAPI TakeSlot() noexcept {
-    // The import itself is replaced below.
+    // Looked up by name, because the import itself is replaced below.
     const HMODULE system = GetModuleHandleW(L"kernel32.dll");
     const auto allocate =
         reinterpret_cast<DWORD(WINAPI*)()>(reinterpret_cast<void*>(GetProcAddress(system, "TlsAlloc")));
@@ -54,9 +54,9 @@ void GiveSlotsBack() noexcept {
     g_slotCount = 0;
 }
 
-// The runtimes, which allocate by malloc, take their locks and what they know of each thread when they are first needed,
-// and do not survive a null: the exception that tells of short memory would end the process. For them there are some small
-// blocks apart; our own code allocates by the operators, and is told.
+// The runtimes use malloc to create their locks and per-thread data on first use, and do not survive a null: throwing
+// bad_alloc would end the process. A few small blocks are reserved for them. Our own code allocates with the operators
+// and gets the exception.
 class Reserve {
   public:
     void* Take(std::size_t size) noexcept {
@@ -66,7 +66,7 @@ class Reserve {
         }
         return nullptr;
     }
-    // False when the block is not of here.
+    // False when the block is not from this reserve.
     bool GiveBack(const void* block) noexcept {
         if (!Holds(block)) return false;
         const auto offset = static_cast<const unsigned char*>(block) - m_blocks[0];
@@ -118,7 +118,7 @@ void operator delete[](void* block, const std::nothrow_t&) noexcept { Free(block
 
 extern "C" {
 
-// Where the thread library looks for the system's TlsAlloc.
+// The thread library's import of TlsAlloc.
 extern DWORD(WINAPI* const importedTlsAlloc)() __asm__("__imp__TlsAlloc@0");
 DWORD(WINAPI* const importedTlsAlloc)() = TakeSlot;
 
@@ -146,10 +146,10 @@ void* realloc(void* block, std::size_t size) {
     return g_reserve.Holds(block) ? nullptr : HeapReAlloc(g_heap, 0, block, size);
 }
 
-// The module's entry: the runtime's, which ends in DllMain, and round it the life of what is the module's own. When the whole process ends
-// (`reserved` is not null) there is nothing to give back.
+// The module's entry point: calls the runtime's, which ends in DllMain, and creates and destroys the module's own
+// resources around it. When the whole process ends (`reserved` is not null) there is nothing to release.
 BOOL WINAPI ModuleEntry(HINSTANCE module, DWORD reason, LPVOID reserved) {
-    static bool isOver = false;  // the loader may announce the end of a module that did not start
+    static bool isOver = false;  // the loader may send a detach to a module that failed to start
     if (isOver) return TRUE;
     if (reason == DLL_PROCESS_ATTACH && Heap() == nullptr) return FALSE;
     const BOOL isDone = DllMainCRTStartup(module, reason, reserved);

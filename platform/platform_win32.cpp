@@ -6,7 +6,7 @@
 namespace velmora::support {
 namespace {
 
-// The longest path that the system handles.
+// The longest path that the system supports.
 constexpr DWORD kLongestPath = 32768;
 
 HMODULE Holding(const void* address) noexcept {
@@ -45,7 +45,7 @@ std::u16string ModuleFolder(ModuleHandle module) noexcept try {
         const DWORD length =
             GetModuleFileNameW(static_cast<HMODULE>(module), reinterpret_cast<wchar_t*>(path.data()), room);
         if (length == 0) return {};
-        if (length == room) continue;  // cut
+        if (length == room) continue;  // truncated
         path.resize(length);
         path.resize(path.find_last_of(u"/\\") + 1);
         return path;

@@ -1,5 +1,5 @@
-// What files for Windows share: 16-bit text as the system's functions take it, and owners of handles. Acquire straight
-// into an owner, and handles are closed in reverse order.
+// Shared by the Windows files: 16-bit text as the system's functions take it, and owners of handles. Store a handle in
+// its owner at once; handles are then closed in reverse order.
 #pragma once
 
 #include <windows.h>
@@ -15,7 +15,7 @@ inline const wchar_t* Wide(const char16_t* text) noexcept {
     return reinterpret_cast<const wchar_t*>(text);
 }
 
-// Closes a handle through the function that belongs to its kind.
+// Closes a handle with the function for its type.
 template <auto close>
 struct Closer {
     template <class Handle>
@@ -33,7 +33,7 @@ using Bitmap = Owner<HBITMAP, &DeleteObject>;
 using MemoryDc = Owner<HDC, &DeleteDC>;
 using Handle = Owner<HANDLE, &CloseHandle>;
 
-// Selects an object into a device context, and what was there before when it ends.
+// Selects an object into a device context and restores the previous one at the end.
 class Selection {
   public:
     Selection(HDC dc, HGDIOBJ object) noexcept : m_dc(dc), m_before(SelectObject(dc, object)) {}
@@ -75,8 +75,8 @@ class WindowDc {
     HDC m_dc;
 };
 
-// Lets dialogs made inside the scope use the controls that a module's manifest (resource 2) asks for. Without
-// such a manifest, or without the system's support for it, nothing changes.
+// Within its scope, new dialogs use the controls that a module's manifest (resource 2) asks for. Nothing changes
+// without such a manifest or without the system's support for it.
 class ManifestScope {
   public:
     explicit ManifestScope(HMODULE module) noexcept {

@@ -8,7 +8,7 @@ namespace velmora {
 
 namespace {
 
-// A field may be full, without a terminator.
+// A full field has no terminator.
 bool IsName(const char (&field)[kPresetNameWidth], const char* name) {
     return name != nullptr && std::strncmp(field, name, sizeof field) == 0;
 }

@@ -1,4 +1,4 @@
-// The system dialogs that the preset saver shows. Each returns after the user closed it.
+// The system dialogs that the preset saver shows. Each returns once the user has closed it.
 #pragma once
 
 #include <array>
@@ -15,9 +15,9 @@ struct FileDialog {
     const char16_t* defaultExtension;
 };
 
-// For a file that is there. True when the user chose one; false, with the name undefined, when not.
+// For an existing file. True when the user chose one; otherwise false, and the name is undefined.
 [[nodiscard]] bool ShowOpenDialog(const FileDialog& dialog, DialogFileName& fileName) noexcept;
-// For a file to write; asks before an existing one is chosen.
+// For a file to write; asks before an existing one is accepted.
 [[nodiscard]] bool ShowSaveDialog(const FileDialog& dialog, DialogFileName& fileName) noexcept;
 
 // With an exclamation icon and an OK button, owned by the foreground window.

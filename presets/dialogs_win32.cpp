@@ -11,8 +11,8 @@ namespace {
 
 using support::win32::Wide;
 
-// The file dialogs leave the process in the folder where the user went. A host's relative names must not
-// change their meaning for that.
+// The file dialogs change the process's current folder to the one that the user opened. A host's relative names must
+// not change their meaning because of that.
 class CurrentFolderGuard {
   public:
     CurrentFolderGuard() noexcept

@@ -6,12 +6,12 @@ namespace velmora {
 
 namespace {
 
-// False also when memory is too short for writing: the file must be closed, and a half-written one removed.
+// Also false when there is not enough memory to write: the file must be closed, and a half-written one removed.
 bool Writes(std::FILE* file, const TextWriter& write) noexcept try { return write(file); } catch (...) {
     return false;
 }
 
-// Reports what buffered writing finds out only at the end: a full disk.
+// Reports what buffered writing detects only at the end, such as a full disk.
 bool WriteAndClose(std::FILE* file, const TextWriter& write) noexcept {
     const bool isWritten = Writes(file, write) && std::fflush(file) == 0 && std::ferror(file) == 0;
     return std::fclose(file) == 0 && isWritten;

@@ -12,7 +12,7 @@ namespace velmora {
 
 bool MakeNativePath(const char* fileName, NativePath* path) {
     if (fileName == nullptr || *fileName == '\0') return false;
-    // A name that is a link stays one: what it points to is replaced.
+    // A link stays a link: its target is replaced.
     const std::unique_ptr<char, decltype(&std::free)> resolved(realpath(fileName, nullptr), &std::free);
     *path = resolved != nullptr ? resolved.get() : fileName;
     return true;
@@ -35,7 +35,7 @@ std::FILE* OpenForWriting(const NativePath& path) {
 std::FILE* CreateBeside(const NativePath& path, NativePath* beside) {
     struct stat status {};
     const bool exists = stat(path.c_str(), &status) == 0;
-    // Renaming needs no right to the file itself: a write-protected preset must stay.
+    // Renaming needs no permission on the file itself, but a write-protected preset must stay.
     if (exists && (!S_ISREG(status.st_mode) || faccessat(AT_FDCWD, path.c_str(), W_OK, AT_EACCESS) != 0))
         return nullptr;
     *beside = path.substr(0, path.rfind('/') + 1) + ".preset-XXXXXX";

@@ -10,7 +10,7 @@
 namespace velmora {
 
 bool MakeNativePath(const char* fileName, NativePath* path) {
-    // The C library's narrow functions would take the name for the console's code page in some hosts.
+    // In some hosts the C library's narrow functions would interpret the name in the console's code page.
     if (fileName == nullptr) return false;
     const std::u16string wide = Widen(fileName);
     path->assign(wide.begin(), wide.end());
@@ -20,16 +20,16 @@ bool MakeNativePath(const char* fileName, NativePath* path) {
 std::FILE* OpenForReading(const NativePath& path) {
     std::FILE* file = _wfopen(path.c_str(), L"rb");
     if (file == nullptr) return nullptr;
-    // "COM1" in any folder is a device: reading from it would wait for ever.
+    // "COM1" in any folder is a device: reading from it would block for ever.
     const auto handle = reinterpret_cast<HANDLE>(_get_osfhandle(_fileno(file)));
     if (GetFileType(handle) == FILE_TYPE_DISK) return file;
     std::fclose(file);
     return nullptr;
 }
 
-// "t", as the host may have made binary files the default.
+// "t", as the host may have made binary mode the default.
 std::FILE* OpenForWriting(const NativePath& path) {
-    // Where Windows' files lie on another system's disk, an administrator's rights would pass the protection by.
+    // Where Windows files are stored on another system's disk, administrator rights would bypass the write protection.
     const DWORD attributes = GetFileAttributesW(path.c_str());
     if (attributes != INVALID_FILE_ATTRIBUTES && (attributes & FILE_ATTRIBUTE_READONLY) != 0) return nullptr;
     return _wfopen(path.c_str(), L"wt");
@@ -38,7 +38,7 @@ std::FILE* OpenForWriting(const NativePath& path) {
 std::FILE* CreateBeside(const NativePath& path, NativePath* beside) {
     const DWORD attributes = GetFileAttributesW(path.c_str());
     const DWORD unfit = FILE_ATTRIBUTE_DIRECTORY | FILE_ATTRIBUTE_DEVICE | FILE_ATTRIBUTE_READONLY |
-                        FILE_ATTRIBUTE_REPARSE_POINT;  // the last: a link stays one
+                        FILE_ATTRIBUTE_REPARSE_POINT;  // the last: a link stays a link
     if (attributes != INVALID_FILE_ATTRIBUTES && (attributes & unfit) != 0) return nullptr;
     const std::size_t folderEnd = path.find_last_of(L"\\/:");
     const NativePath folder = folderEnd == NativePath::npos ? L"" : path.substr(0, folderEnd + 1);

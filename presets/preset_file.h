@@ -15,8 +15,8 @@
 //     4 check box        value        0 or 1
 //     any other          none         carries over, as below
 //
-// The document is 8-bit text in the system code page of the machine that wrote it; names are kept byte for
-// byte. Numbers are written with a point and six digits whatever the host's locale.
+// The document is 8-bit text in the system code page of the machine that wrote it; names are kept byte for byte.
+// Numbers are written with a decimal point and six digits whatever the host's locale.
 //
 // File names are 8-bit text in the system code page on Windows, bytes as they are (UTF-8) elsewhere.
 #pragma once
@@ -31,33 +31,32 @@ namespace velmora {
 
 inline constexpr std::size_t kPresetFileLimit = 16u << 20;  // bytes; a longer file is not read
 
-// Writes the record, with CR LF line ends on Windows. True when the whole file is on the disk. An existing
-// file stays as it was after a failure, unless its folder takes no new files: then it is written in place.
-// Names end at their zero or with their field; a count outside 0..100 counts as the nearer end.
+// Writes the record, with CR LF line ends on Windows. True when the whole file is on the disk. After a failure an
+// existing file is unchanged, unless its folder accepts no new files: then it is written in place. Names end at their
+// zero or at the end of the field; a count outside 0..100 is clamped.
 [[nodiscard]] bool WritePreset(const char* fileName, const PresetRecord* record) noexcept;
 
-// Fills the record from a file. True when it could be parsed as a whole, has a "Preset" element and yielded at
-// least one value. Lax where files that people changed need it: after the first "parameter" every element is
-// read as one; a missing or unreadable value takes the place of the previous element's, a missing type is
-// 0, elements behind the hundredth are dropped, names are cut at 259 bytes, and a number that is infinite or
-// not a number is read as such.
-// After a failure the record is untouched, or, when the file has a "Preset" without values, holds its names
-// and a count of 0. A file over the limits of size, depth, attributes and nodes (presets/xml_limits.h) is a
-// failure, as is a null record.
+// Fills the record from a file. True when the whole file could be parsed, has a "Preset" element and yielded at least
+// one value. Tolerant of hand-edited files: after the first "parameter" every element is read as one; a missing or
+// unreadable value is replaced by the previous element's, a missing type is 0, elements after the hundredth are
+// dropped, names are cut at 259 bytes, and infinities and NaN are read as such.
+// After a failure the record is untouched or, when the file has a "Preset" without values, holds its names and a count
+// of 0. A file over the limits of size, depth, attributes and nodes (presets/xml_limits.h) is a failure, as is a null
+// record.
 [[nodiscard]] bool ReadPreset(const char* fileName, PresetRecord* record) noexcept;
 
-// ReadPreset for a text at hand.
+// ReadPreset for a text in memory.
 [[nodiscard]] bool ParsePreset(const char* text, std::size_t length, PresetRecord* record) noexcept;
 
 // Whether a preset belongs to an effect (compatibility.cpp).
 //
-// True when the record's library and effect names are these, byte for byte, and its first values have the
-// kinds of the effect's parameters, in their order. More values than parameters are accepted, fewer are not.
+// True when the record's library and effect names are these, byte for byte, and its first values have the kinds of the
+// effect's parameters, in their order. More values than parameters are accepted, fewer are not.
 [[nodiscard]] bool IsCompatible(const char* libraryName, const char* effectName,
                                 std::span<const std::uint32_t> kinds, const PresetRecord* record) noexcept;
 
-// The same for effect `effectIndex` of a library. Without a library every preset with values fits; an effect
-// that is not there, or a null record, fits nothing.
+// The same for effect `effectIndex` of a library. Without a library every preset with values matches; an effect that
+// does not exist, or a null record, matches nothing.
 [[nodiscard]] bool IsCompatible(IEffectLibrary* library, std::uint32_t effectIndex,
                                 const PresetRecord* record) noexcept;
 

@@ -15,7 +15,7 @@ struct LibraryCode {
     std::u16string_view code;
 };
 
-// Other libraries of the family would have their rows here.
+// Other libraries of the family would add their rows here.
 constexpr LibraryCode kLibraryCodes[] = {
     {kLibraryName, u"rel"},
 };
@@ -32,7 +32,7 @@ char16_t* Put(char16_t* out, std::u16string_view text) {
     return std::copy(text.begin(), text.end(), out);
 }
 
-// The part of a label word that leaves `room` characters unexceeded, without half a character at its end.
+// As much of a label word as fits in `room` characters, without half a surrogate pair at its end.
 std::u16string_view Cut(std::u16string_view word, std::size_t room) {
     if (word.size() <= room) return word;
     const bool isSplit = room > 0 && (word[room - 1] & 0xFC00) == 0xD800;
@@ -48,7 +48,7 @@ PresetExtension MakePresetExtension(const char* libraryName, std::uint32_t effec
         return extension;
     }
     char16_t* out = Put(Put(extension.data(), u"fxp"), FindLibraryCode(libraryName));
-    // No library has more effects than there are letters; a host that asks for one gets no letter.
+    // No library has more effects than there are letters; an index past "z" gets no letter.
     if (effectIndex < 26) *out = static_cast<char16_t>(u'a' + effectIndex);
     return extension;
 }
@@ -58,7 +58,7 @@ PresetFilter MakePresetFilter(const char* libraryName, std::uint32_t effectIndex
     const PresetExtension buffer = MakePresetExtension(libraryName, effectIndex);
     const std::u16string_view extension(buffer.data());
     const std::u16string_view word = labelWord != nullptr ? labelWord : u"Preset Files";
-    // Besides the word: " (*." ")" "*." around twice the extension, and three terminators.
+    // Everything but the word: " (*.", ")" and "*.", the extension twice and three terminators.
     PresetFilter filter = {};
     const std::size_t room = filter.size() - (4 + 1 + 2 + 2 * extension.size() + 3);
     char16_t* out = Put(Put(Put(Put(filter.data(), Cut(word, room)), u" (*."), extension), u")") + 1;

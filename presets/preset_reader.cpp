@@ -19,7 +19,7 @@ bool ReadInteger(const TiXmlElement& element, const char* attribute, std::int32_
     return text != nullptr && ParseInteger(text, value);
 }
 
-// Leaves the word as it is when there is no number.
+// Leaves the word unchanged when there is no number.
 void ReadNumber(const TiXmlElement& element, const char* attribute, std::uint32_t* word) {
     const char* text = element.Attribute(attribute);
     double value = 0;
@@ -27,7 +27,7 @@ void ReadNumber(const TiXmlElement& element, const char* attribute, std::uint32_
     *word = ValueWord{.number = static_cast<float>(value)}.bits;
 }
 
-// `cell` holds the previous element's value, which stays in every part that this element does not set.
+// `cell` holds the previous element's value; the parts that this element does not set keep it.
 void ReadParameter(const TiXmlElement& element, ValueCell& cell) {
     std::int32_t integer = 0;
     cell.kind = ReadInteger(element, "type", &integer) ? static_cast<std::uint32_t>(integer) : kKindNone;
@@ -63,7 +63,7 @@ void ReadRecord(const TiXmlElement& preset, PresetRecord& record) {
     ReadName(preset, "LibraryName", record.libraryName);
     ReadName(preset, "EffectName", record.effectName);
     ValueCell cell = {};
-    // Only the first is looked up by name: what follows is a parameter whatever it is called.
+    // Only the first is looked up by name: every element after it is read as a parameter, whatever its name.
     for (const TiXmlElement* element = preset.FirstChildElement("parameter");
          element != nullptr && record.count < kPresetCellCapacity; element = element->NextSiblingElement()) {
         ReadParameter(*element, cell);
@@ -71,8 +71,7 @@ void ReadRecord(const TiXmlElement& preset, PresetRecord& record) {
     }
 }
 
-// CR LF and CR become LF, as line ends inside attributes are read by every XML parser. The text ends at
-// its first zero.
+// CR LF and CR become LF: every XML parser reads line ends inside attributes this way. The text ends at its first zero.
 std::string NormaliseLineEnds(const char* text, std::size_t length) {
     std::string lines;
     lines.reserve(length);
@@ -85,7 +84,7 @@ std::string NormaliseLineEnds(const char* text, std::size_t length) {
 }
 
 bool ReadDocument(const char* text, std::size_t length, PresetRecord& record) {
-    // An editor that saves as UTF-8 may put a mark in front. It is no part of the document.
+    // An editor that saves as UTF-8 may add a byte order mark, which is not part of the document.
     constexpr const char* kByteOrderMark = "\xEF\xBB\xBF";
     if (length >= 3 && std::memcmp(text, kByteOrderMark, 3) == 0) {
         text += 3;
@@ -107,7 +106,7 @@ bool ParsePreset(const char* text, std::size_t length, PresetRecord* record) noe
     if (text == nullptr || record == nullptr || length > kPresetFileLimit) return false;
     try {
         return ReadDocument(text, length, *record);
-    } catch (const std::exception&) {  // memory is short
+    } catch (const std::exception&) {  // not enough memory
         return false;
     }
 }

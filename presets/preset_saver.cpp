@@ -25,7 +25,7 @@ enum Result : std::int32_t {
 
 using ShowFileDialog = bool (*)(const FileDialog&, DialogFileName&) noexcept;
 
-// What saving and loading show alike.
+// What saving and loading have in common.
 struct Flow {
     ShowFileDialog show;
     const char16_t* plainTitle;
@@ -43,7 +43,7 @@ bool AskForFile(const Flow& flow, void* owner, IEffectLibrary* library, std::uin
         translation.SetContext(library, languageCode);
         labelWord = translation.Translate(kTextsOfPresets, "Preset Files");
     }
-    // The filter copies its label: the next lookup replaces it.
+    // Copies the label, which the next lookup overwrites.
     const PresetFilter filter = MakePresetFilter(libraryName, effectIndex, labelWord);
     const PresetExtension extension = MakePresetExtension(libraryName, effectIndex);
     const char16_t* title =
@@ -57,7 +57,7 @@ void CopyName(char (&field)[kPresetNameWidth], const char* name) {
     std::memset(field + length, 0, sizeof field - length);
 }
 
-// The effect, once the record carries its name and the library's; empty when there is none.
+// Returns the effect after storing its name and the library's in the record; empty when there is none.
 Reference<IVideoEffect> TakeEffect(IEffectLibrary* library, std::uint32_t effectIndex, PresetRecord& record) {
     if (library == nullptr) return {};
     auto effect = Reference<IVideoEffect>::Adopt(library->CreateEffect(effectIndex));

@@ -7,8 +7,8 @@
 
 namespace velmora {
 
-// See IPresetSaver for the operations. Keeps no state between calls but the last translated call's language
-// and library: the library must be alive while an operation runs, no longer.
+// See IPresetSaver for the operations. The only state kept between calls is the last translated call's language and
+// library: the library must be alive while an operation runs, but no longer.
 class CPresetSaver final : public IPresetSaver {
   public:
     CPresetSaver() noexcept = default;
@@ -22,7 +22,7 @@ class CPresetSaver final : public IPresetSaver {
                                     PresetRecord* record, const char* languageCode) override;
     std::int32_t VM_CALL SavePreset(void* owner, IEffectLibrary* library, std::uint32_t effectIndex,
                                     PresetRecord* record, const char* languageCode) override;
-    // Behind SavePreset, so that the table holds it from slot 5 on.
+    // After SavePreset, so that it takes the table from slot 5 on.
     virtual ~CPresetSaver();
 
   private:
@@ -30,7 +30,7 @@ class CPresetSaver final : public IPresetSaver {
     TranslationHelper m_translation;
 };
 
-// A new saver with one reference; null when memory is short.
+// A new saver with one reference; null when there is not enough memory.
 [[nodiscard]] IPresetSaver* CreatePresetSaver() noexcept;
 
 }  // namespace velmora

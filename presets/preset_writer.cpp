@@ -13,7 +13,7 @@ namespace velmora {
 
 namespace {
 
-// Adds a new last child to a node, which then owns it. Returns the child.
+// Appends a new child to a node, which then owns it. Returns the child.
 template <typename Node, typename... Arguments>
 Node& Append(TiXmlNode& parent, const Arguments&... arguments) {
     auto child = std::make_unique<Node>(arguments...);
@@ -26,7 +26,7 @@ void SetName(TiXmlElement& preset, const char* attribute, const char (&field)[kP
     preset.SetAttribute(attribute, std::string(field, std::find(field, field + kPresetNameWidth, '\0')));
 }
 
-// Values are given to the XML library as text: its own conversion follows the locale.
+// Values are passed to the XML library as text: its own conversion follows the locale.
 void SetValue(TiXmlElement& parameter, const ValueCell& cell) {
     switch (cell.kind) {
         case kKindNone:
@@ -74,7 +74,7 @@ bool WritePreset(const char* fileName, const PresetRecord* record) noexcept {
     if (fileName == nullptr || record == nullptr) return false;
     try {
         return WriteDocument(fileName, *record);
-    } catch (const std::exception&) {  // memory is short
+    } catch (const std::exception&) {  // not enough memory
         return false;
     }
 }

@@ -6,8 +6,8 @@ namespace velmora {
 
 namespace {
 
-// These follow the "C" locale. A host's locale may count more bytes among the blanks; a document that is
-// read differently for that reason is refused rather than waved through (see Attribute).
+// These follow the "C" locale. A host's locale may treat more bytes as blanks; a document that would be read
+// differently because of that is refused rather than let through (see Attribute).
 bool IsBlank(char c) {
     return c == ' ' || (c >= '\t' && c <= '\r');
 }
@@ -50,7 +50,7 @@ class Scanner {
         while (IsBlank(*m_at)) ++m_at;
     }
 
-    // Up to the next markup. Outside the root element the parser stops, without complaint, at any text.
+    // Skips to the next markup. Outside the root element the parser stops at any text, without an error.
     bool SkipText() {
         SkipBlanks();
         if (*m_at == '<' || *m_at == '\0') return true;
@@ -62,9 +62,9 @@ class Scanner {
         return SkipCharacters("<&");
     }
 
-    // Up to the first of the two characters in `endAndAmpersand`. The parser looks for the end of a number
-    // reference first and then reads its digits backwards until the first "x" or "#", so that a malformed one
-    // swallows any text with the markup in it: refused.
+    // Skips to the first of the two characters in `endAndAmpersand`. The parser looks for the end of a numeric
+    // reference first and then reads its digits backwards until the first "x" or "#", so a malformed reference swallows
+    // any text, including markup. Such a document is refused.
     bool SkipCharacters(const char* endAndAmpersand) {
         for (;;) {
             m_at += std::strcspn(m_at, endAndAmpersand);
@@ -82,7 +82,7 @@ class Scanner {
         }
     }
 
-    // Behind the next occurrence of a text; at the end of the document when there is none.
+    // Moves past the next occurrence of a text; to the end of the document when there is none.
     bool SkipPast(const char* text) {
         const char* found = std::strstr(m_at, text);
         m_at = found != nullptr ? found + std::strlen(text) : m_at + std::strlen(m_at);
@@ -101,7 +101,7 @@ class Scanner {
         return Skip("<", ">");
     }
 
-    // What never ends is an error inside an element only.
+    // A missing end is an error only inside an element.
     bool Skip(const char* start, const char* end) {
         m_at += std::strlen(start);
         return SkipPast(end) || m_depth == 0;
@@ -141,7 +141,7 @@ class Scanner {
         }
     }
 
-    // An attribute that is cut by the end of the document, or that is none, is false.
+    // False for anything that is not an attribute or is cut off by the end of the document.
     bool Attribute() {
         if (!IsNameStart(*m_at)) return false;
         while (IsNameCharacter(*m_at)) ++m_at;
@@ -165,8 +165,8 @@ class Scanner {
     const char* m_at;
     int m_depth = 0;
     int m_nodes = 0;
-    bool m_isOver = false;    // the parser stops here without complaint
-    bool m_swallows = false;  // a malformed reference was met
+    bool m_isOver = false;    // the parser stops here without an error
+    bool m_swallows = false;  // a malformed reference was found
 };
 
 }  // namespace

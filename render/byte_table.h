@@ -1,4 +1,4 @@
-// What a channel's levels become.
+// A lookup table for one channel.
 #pragma once
 
 #include <array>

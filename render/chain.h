@@ -1,12 +1,12 @@
-// The chain of stages: which there are and in which order a picture passes through them.
+// The chain of stages: which stages exist and in which order a picture passes through them.
 //
-// Planning a frame, running it by rows, damage alone and the count of draws all go by this list. A stage says of itself
+// Planning a frame, running it row by row, rendering damage only and counting draws all use this list. A stage has
 //   IsActive()             whether it has something to do in this frame,
 //   kIsDamage              whether it is part of a film's damage rather than of its look,
-//   Draws(settings, width) how many numbers of the frame sequence it takes: the same in all frames of the same
+//   Draws(settings, width) how many numbers of the frame sequence it takes; the same in all frames with the same
 //                          settings and width.
-// To add one: a member and a line here, in its place; how it is prepared, in renderer.cpp; what it does to a row, in
-// row_program.h.
+// To add a stage, add a member and a line here in the right place, its preparation in renderer.cpp and its work on a
+// row in row_program.h.
 #pragma once
 
 #include "render/colour.h"

@@ -17,8 +17,8 @@ bool IsNearZero(float value) noexcept {
     return value > -kEpsilon && value < kEpsilon;
 }
 
-// The gain grows in steps with the contrast. The sliders reach 0.5 at most, so only the first step is in
-// use; the others are what the curve continues with.
+// The gain grows in steps with the contrast. The sliders reach 0.5 at most, so only the first step is used; the others
+// continue the curve.
 double ContrastGain(float contrast) noexcept {
     if (contrast < 0.0f) return 1.0 + contrast;
     struct Step {
@@ -41,9 +41,9 @@ std::uint8_t Saturate(std::int32_t value) noexcept {
 
 float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds,
                     std::uint32_t hostSeed) noexcept {
-    // So much less than a draw that only the error of the product is meant.
+    // Much less than one draw, so it only absorbs the rounding error of the product.
     constexpr double kTolerance = 1e-9;
-    constexpr double kPeriod = 4294967296.0;  // of the generator: only the count modulo that matters
+    constexpr double kPeriod = 4294967296.0;  // of the generator; only the count modulo this matters
     double draws = std::ceil(seconds * rate - kTolerance);
     draws = draws >= 1.0 ? std::min(draws, std::numeric_limits<double>::max()) : 1.0;
     const auto own = std::bit_cast<std::uint32_t>(Narrow(double{saturation} + flicker));

@@ -1,6 +1,6 @@
 // Colour, flicker, brightness and contrast.
 //
-// Every channel goes through one table, built for the frame:
+// Every channel goes through one table that is built for the frame:
 //   brightness and flicker: v = flicker offset + brightness / 2;
 //     table[i] = i + R(i v) for v <= 0 (toward black), i + R((255 - i) v) for v > 0 (toward white);
 //   contrast: ((i / 255 - 0.5) g + 0.5) 255, truncated and clamped, with the gain g from contrast / 2.
@@ -23,9 +23,9 @@
 
 namespace velmora::render {
 
-// The flicker's share of the brightness offset at a time: a value that changes `rate` times a second, the
-// k-th of a sequence that the settings and the host's seed give, so that it is the same on every run. Costs the
-// same at any time. Within +-0.5; single precision.
+// The flicker's share of the brightness offset at a given time. The value changes `rate` times a second. The k-th
+// value comes from a sequence seeded by the settings and the host's seed, so every run gives the same. The cost
+// does not depend on the time. Within +-0.5; single precision.
 [[nodiscard]] float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds,
                                   std::uint32_t hostSeed = 0) noexcept;
 
@@ -41,10 +41,10 @@ class ColourStage {
     static constexpr bool kIsDamage = false;
     static std::uint32_t Draws(const StageSettings&, std::int32_t) noexcept { return 0; }
     [[nodiscard]] bool IsActive() const noexcept { return m_active; }
-    // Pixels are mixed with their grey value: more than a table.
+    // Pixels are mixed with their grey value, so a table is not enough.
     [[nodiscard]] bool Mixes() const noexcept { return m_mixes; }
     [[nodiscard]] const ByteTable& Tone() const noexcept { return m_tone; }
-    // Lines that one after the other make that table; none where it is not made of lines.
+    // Lines that give that table when applied in order; empty if the table is not made of lines.
     [[nodiscard]] std::span<const ToneLine> Lines() const noexcept {
         return {m_lines.data(), m_isLines ? m_lineCount : 0};
     }

@@ -52,7 +52,7 @@ void FrameContext::Finish() noexcept {
         std::memmove(m_destination.Row(0), m_source.Row(0), rowBytes * static_cast<std::size_t>(m_height));
         return;
     }
-    // Rows that overlap the other picture's next ones must be copied away from them.
+    // If the pictures overlap, the order must not overwrite source rows that are still to be copied.
     const bool upward = m_destination.Row(0) > m_source.Row(0);
     for (std::int32_t i = 0; i < m_height; ++i) {
         const std::int32_t y = upward ? m_height - 1 - i : i;
@@ -60,7 +60,7 @@ void FrameContext::Finish() noexcept {
     }
 }
 
-// Copies the processed rectangle only: nothing of a stage looks beyond it.
+// Copies only the processed rectangle: no stage reads beyond it.
 bool FrameContext::Copy::Take(const ImageView& picture) noexcept {
     const std::size_t width = static_cast<std::size_t>(picture.Region().Width());
     const std::size_t height = static_cast<std::size_t>(picture.Region().Height());

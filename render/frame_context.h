@@ -1,6 +1,5 @@
-// One frame on its way through the stages: the source, the destination and what is known of the frame.
-//
-// Lives for one frame.
+// One frame on its way through the stages: the source, the destination and the frame's time and number. It lives for
+// one frame.
 #pragma once
 
 #include <cstddef>
@@ -18,7 +17,7 @@ class FrameContext {
     // Attaches the two frames; the processed size is the smaller of the two regions in each direction.
     FrameContext(const FrameDescription& source, const FrameDescription& destination) noexcept;
 
-    // Seconds from the start of the clip. Not a number counts as 0; the frame number saturates.
+    // Seconds from the start of the clip. NaN counts as 0; the frame number saturates.
     void SetTime(double seconds) noexcept;
 
     [[nodiscard]] double Time() const noexcept { return m_time; }
@@ -34,7 +33,7 @@ class FrameContext {
 
     // Marks the output as written and returns the destination.
     const ImageView& ClaimDestination() noexcept;
-    // Replaces the source by a private copy; false when it cannot be made.
+    // Replaces the source with a private copy. Returns false if there is not enough memory.
     [[nodiscard]] bool DetachSource() noexcept;
     // Copies the source through when no stage has written the destination.
     void Finish() noexcept;

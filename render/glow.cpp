@@ -18,7 +18,7 @@ constexpr double kMiddleShare = 0.36;
 constexpr double kWideShare = 0.44;
 constexpr double kStrongest = 0.72;  // of the glow layer at amount 1
 
-// Half the size, the last cell of an odd one counted whole.
+// Half the size, rounded up.
 constexpr std::int32_t Halved(std::int32_t size) noexcept {
     return size / 2 + size % 2;
 }
@@ -27,7 +27,7 @@ constexpr std::int32_t Reduced(std::int32_t size, int reduction) noexcept {
     return size;
 }
 
-// Continues a row by copies of its end cells.
+// Continues a row with copies of its end cells.
 void ContinueEnds(CellRow row, std::int32_t width) noexcept {
     for (std::int32_t i = 1; i <= kContinued; ++i) {
         std::copy_n(row, kCellLanes, row - i * kCellLanes);
@@ -91,7 +91,7 @@ bool GlowLayerMaker::Allocate(GlowMemory& memory) noexcept {
         m_halves[reduction] = {nullptr, Reduced(m_width, reduction), 2};
         lanes += m_halves[reduction].Lanes();
     }
-    // A doubled row may be a cell wider than what it is for.
+    // A doubled row may be one cell wider than needed.
     m_rows = {nullptr, Reduced(m_width, std::min(m_reduction, 2) == 2 ? 2 : 0) + 1, 2};
     lanes += m_rows.Lanes();
 
@@ -130,7 +130,7 @@ void GlowLayerMaker::ReadRow(int reduction, std::int32_t y, CellRow out) noexcep
     }
 }
 
-// Blocks of 4 × 4 pixels; those at the right and lower edges repeat the last pixels that there are.
+// Blocks of 4 × 4 pixels; those at the right and bottom edges repeat the last pixels.
 void GlowLayerMaker::ReadBlocks(std::int32_t y, CellRow out) noexcept {
     const Bgra* rows[4];
     for (std::int32_t i = 0; i < 4; ++i) {
@@ -148,7 +148,7 @@ void GlowLayerMaker::ReadBlocks(std::int32_t y, CellRow out) noexcept {
     m_kernels.averageBlocks(edges, out + whole * std::ptrdiff_t{kCellLanes}, 1);
 }
 
-// One pixel for a cell, or 2 × 2: in small pictures only.
+// One pixel per cell, or 2 × 2: in small pictures only.
 void GlowLayerMaker::ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept {
     const Bgra* rows[2];
     for (std::int32_t i = 0; i < 2; ++i) {
@@ -262,16 +262,17 @@ std::uint16_t* GlowMemory::Reserve(std::uint64_t lanes) noexcept {
 void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     const std::int32_t side = 1 << m_reduction;
     const std::int32_t cell = y >> m_reduction;
-    // How far the row lies from the middle of its cells, in half pixels, and so on the way to the next ones.
+    // The row's distance from the middle of its cells, in half pixels. It decides the share of the neighbouring cells.
     const std::int32_t away = 2 * (y & (side - 1)) + 1 - side;
     const std::int16_t share = static_cast<std::int16_t>(std::int64_t{std::abs(away)} * 32768 / side);
-    // A hash, so that rows make no pattern together; of the place alone, so that no division of work shows.
+    // A hash, so that rows form no pattern; it depends only on the row, so the result does not depend on how the work
+    // is divided.
     const auto dither = static_cast<std::uint16_t>(MixBits(static_cast<std::uint32_t>(y)));
     CellRow row = m_rows.Row(0), other = m_rows.Row(1);
     m_kernels->approach(m_layer.Row(cell), m_layer.Row(away < 0 ? cell - 1 : cell + 1), row, m_layer.width,
                         share);
     std::int32_t cells = m_layer.width;
-    const int wanted = m_reduction < 2 ? 0 : 2;  // one cell for each pixel or for four
+    const int wanted = m_reduction < 2 ? 0 : 2;  // one cell per pixel, or per four pixels
     for (int reduction = m_reduction; reduction > wanted; --reduction) {
         ContinueEnds(row, cells);
         m_kernels->doubleAlong(row, other, cells);

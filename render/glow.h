@@ -1,11 +1,11 @@
-// Glow ("Diffusion"): what a mist filter before the lens does. Highlights spread as a wide soft glow layer,
-// whose radius is proportional to the picture's height, and which is laid over the picture by screening: the
-// dark around a light gets most of it. A picture without lights stays as it is, no channel gets darker, alpha is
-// kept.
+// Glow ("Diffusion"): the effect of a mist filter in front of the lens. Highlights spread into a wide, soft glow
+// layer with a radius proportional to the picture's height. The layer is screened over the picture, so the dark
+// areas around a highlight get most of it. A picture without highlights is unchanged, no channel gets darker and
+// alpha is kept.
 //
-// The glow layer is made before the rows are worked on, from the whole picture: highlights of a reduced picture
-// (about 150 to 300 rows high) are blurred at three widths in a pyramid, integers all the way, so that the
-// cost depends neither on the radius nor much on the picture's contents.
+// The glow layer is made from the whole picture before any row is processed. The highlights of a reduced picture
+// (about 150 to 300 rows high) are blurred at three widths in a pyramid, in integers throughout. The cost does not
+// depend on the radius, and hardly on the picture's contents.
 #pragma once
 
 #include <cstddef>
@@ -22,7 +22,7 @@ namespace velmora::render {
 // Memory for the glow layer, kept so that frames of one size allocate once.
 class GlowMemory {
   public:
-    // At least `lanes` numbers of undefined value, or null when there is no memory. Ends what was there.
+    // At least `lanes` uninitialised numbers, or null if there is not enough memory. Invalidates the previous ones.
     [[nodiscard]] std::uint16_t* Reserve(std::uint64_t lanes) noexcept;
 
   private:
@@ -30,7 +30,7 @@ class GlowMemory {
     std::uint64_t m_size = 0;
 };
 
-// Rows of cells, `width` wide and with padding at either end.
+// Rows of cells, `width` wide, with padding at both ends.
 struct CellPlane {
     CellRow base = nullptr;
     std::int32_t width = 0;
@@ -43,7 +43,7 @@ struct CellPlane {
         return (static_cast<std::uint64_t>(width) + 2 * kCellPad) * kCellLanes *
                static_cast<std::uint64_t>(height);
     }
-    // The nearest row there is.
+    // `y` is clamped to the rows of the plane.
     [[nodiscard]] CellRow Row(std::int32_t y) const noexcept {
         const std::int32_t clamped = y < 0 ? 0 : y < height ? y : height - 1;
         return base + Step() * clamped + kCellPad * kCellLanes;
@@ -55,15 +55,15 @@ class GlowStage {
     static constexpr bool kIsDamage = false;
     static std::uint32_t Draws(const StageSettings&, std::int32_t) noexcept { return 0; }
     GlowStage() noexcept = default;
-    // A glow layer of one cell for 2^reduction × 2^reduction pixels; `rows` has two scratch rows, wide enough
-    // for one cell for each pixel when the reduction is below 2, else for each fourth.
+    // A glow layer with one cell for 2^reduction × 2^reduction pixels. `rows` has two scratch rows, wide enough for
+    // one cell per pixel if the reduction is below 2, else for one cell per four pixels.
     GlowStage(const CellPlane& layer, int reduction, const CellPlane& rows,
               const GlowKernels& kernels) noexcept
         : m_layer(layer), m_rows(rows), m_reduction(reduction), m_kernels(&kernels) {}
 
     [[nodiscard]] bool IsActive() const noexcept { return m_kernels != nullptr; }
-    // Row `y` of the processed rectangle; `in` may be `out`. Uses scratch rows in the memory that the stage was
-    // prepared with, so rows of one picture are worked on one at a time.
+    // Row `y` of the processed rectangle; `in` may be `out`. Uses scratch rows in the memory passed when the stage was
+    // prepared, so only one row of a picture can be processed at a time.
     void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
   private:
@@ -73,9 +73,9 @@ class GlowStage {
     const GlowKernels* m_kernels = nullptr;
 };
 
-// Reads the whole picture, `width` × `height` pixels, and makes its glow layer for an amount in 0..1. Without
-// anything to do or without memory the stage is not active. It points into `memory` and serves until the
-// memory's next use.
+// Reads the whole picture, `width` × `height` pixels, and makes its glow layer for an amount in 0..1. The stage is
+// inactive if there is nothing to do or not enough memory. It points into `memory` and is valid until the memory is
+// used again.
 [[nodiscard]] GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width,
                                     std::int32_t height, GlowMemory& memory,
                                     const GlowKernels& kernels) noexcept;

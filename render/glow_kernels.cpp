@@ -114,7 +114,7 @@ void Approach(ConstCellRow near, ConstCellRow far, CellRow out, std::int32_t cou
     }
 }
 
-// Adds at most the rest, as no layer is much above three quarters; where the layer is 0 the dither adds nothing.
+// Never overflows, since no layer is much above three quarters. Where the layer is 0 the dither adds nothing.
 std::uint8_t Screened(std::uint32_t channel, std::uint32_t layer, std::uint16_t dither) noexcept {
     const std::uint32_t added = ((255 - channel) * layer >> 8) + (dither >> kDitherShift);
     return static_cast<std::uint8_t>(channel + (added >> 7));

@@ -7,16 +7,16 @@
 namespace velmora::render {
 namespace {
 
-// The glow layer is the sum of three blurs: the first softens outlines, the second makes halos, the third is
-// the mist. Standard deviations are shares of the picture's height.
+// The glow layer is the sum of three blurs: the first softens outlines, the second makes halos, the third is the mist.
+// Standard deviations are relative to the picture's height.
 constexpr double kNarrowSigma = 0.004;
 constexpr double kMiddleSigma = 0.020;
 constexpr double kWideSigma = 0.090;
 
-// What two halvings, and two doublings as well, add to a blur's variance, in squares of the coarser cells.
+// The variance that two halvings, or two doublings, add to a blur, in squares of the coarser cells.
 constexpr double kResamplingVariance = 0.1875 + 0.1875 / 4;
 
-// A filter of about this variance: passes of (t, 1 − 2t, t) run into one.
+// A filter of about this variance: passes of (t, 1 − 2t, t) combined into one.
 GlowTaps MakeTaps(double variance, int passes) noexcept {
     const double t = std::max(variance, 0.0) / (2.0 * passes);
     double weights[GlowTaps::kMostPairs + 2] = {1.0};  // from the middle outward

@@ -10,8 +10,8 @@ struct GlowLayerTaps {
     GlowTaps narrow, middle, wide;
 };
 
-// For a glow layer whose cells are `cell` pixels wide. What reducing, halving and doubling blur by themselves
-// is left out of the filters.
+// For a glow layer whose cells are `cell` pixels wide. The filters leave out the blur that reducing, halving and
+// doubling add anyway.
 [[nodiscard]] GlowLayerTaps MakeGlowLayerTaps(double height, double cell) noexcept;
 
 }  // namespace velmora::render

@@ -17,7 +17,7 @@ ImageView ViewOf(const FrameDescription& frame, std::int32_t width, std::int32_t
     const std::int64_t bufferWidth = std::int64_t{frame.xOrigin} + frame.width;
     const std::int64_t bufferHeight = std::int64_t{frame.yOrigin} + frame.height;
     const std::int64_t step = std::abs(std::int64_t{frame.rowStep});
-    // The buffer must also lie within what a pointer can reach.
+    // The buffer must also fit in the address space.
     if (frame.pixels == nullptr || bufferWidth > kMost || bufferHeight > kMost || step > kMost ||
         frame.xOrigin < 0 || frame.yOrigin < 0 || frame.width < 1 || frame.height < 1 || width < 1 ||
         height < 1 || rowBytes(static_cast<std::int32_t>(bufferWidth)) > step ||

@@ -14,7 +14,7 @@ struct Bgra {
 };
 static_assert(sizeof(Bgra) == 4 && alignof(Bgra) == 1);
 
-// Bytes that a row of so many pixels takes: all that the judgement of a frame needs to know of its pixels.
+// Bytes in a row of `width` pixels.
 using RowBytesOf = std::int64_t (*)(std::int32_t width) noexcept;
 [[nodiscard]] constexpr std::int64_t BgraRowBytes(std::int32_t width) noexcept {
     return std::int64_t{width} * 4;
@@ -34,9 +34,9 @@ struct Rectangle {
     bool operator==(const Rectangle&) const = default;
 };
 
-// A picture as a caller hands it over. Not owned. The region to process is width x height pixels whose left
-// top corner lies at (xOrigin, yOrigin) of the buffer; a negative row step tells that the buffer's rows lie
-// bottom-up in memory, with `pixels` at the first stored one.
+// A picture as passed by the caller. Not owned. The region to process is width x height pixels with its top left
+// corner at (xOrigin, yOrigin) of the buffer. A negative row step means that the buffer is stored bottom-up, with
+// `pixels` at the first stored row.
 struct FrameDescription {
     void* pixels = nullptr;
     std::int32_t width = 0;
@@ -46,8 +46,8 @@ struct FrameDescription {
     std::int32_t yOrigin = 0;
 };
 
-// The descriptor that stages read and write through. Rows, origins and shifts count from the lowest address,
-// also for a buffer stored bottom-up. Does not own the pixels. Empty views are not valid.
+// The view through which stages read and write. Rows, origins and shifts count from the lowest address, also for a
+// buffer stored bottom-up. Does not own the pixels. Empty views are not valid.
 struct ImageView {
     std::int32_t bufferWidth = 0;
     std::int32_t bufferHeight = 0;
@@ -66,8 +66,8 @@ struct ImageView {
     [[nodiscard]] constexpr bool IsValid() const noexcept { return base != nullptr; }
 };
 
-// A view of a frame whose processed rectangle is width x height pixels. The one judgement of frames: a description whose
-// numbers overflow, whose rows do not fit their step or that has no pixels gives a view that is not valid.
+// A view of a frame whose processed rectangle is width x height pixels. All validation of frames is here: the view is
+// not valid if numbers overflow, rows do not fit their step or there are no pixels.
 [[nodiscard]] ImageView ViewOf(const FrameDescription& frame, std::int32_t width, std::int32_t height,
                                RowBytesOf rowBytes = BgraRowBytes) noexcept;
 

@@ -1,5 +1,5 @@
-// Jitter and border: shakes the whole picture by a random whole-pixel offset, as a film that does not sit
-// still in the gate, and fills the strip that the shift uncovers with the border colour.
+// Jitter and border: shakes the whole picture by a random whole-pixel offset, like film that does not sit still in the
+// gate, and fills the uncovered strip with the border colour.
 #pragma once
 
 #include <cstdint>
@@ -11,8 +11,8 @@
 
 namespace velmora::render {
 
-// A row of the shaken picture as pixels of the source and border: `count` pixels from `pixels` go to column
-// `start`, the border takes the columns beside them.
+// A row of the shaken picture: `count` source pixels from `pixels` start at column `start`, and the border fills the
+// other columns.
 struct ShiftedRow {
     const Bgra* pixels;
     std::int32_t start;
@@ -40,8 +40,8 @@ class JitterStage {
     // Row `y` of the shaken picture of `source`'s region.
     ShiftedRow Shifted(const ImageView& source, std::int32_t y) const noexcept;
 
-    // Row `y` of the shaken picture, width pixels of `source`'s region: written to `out`, or a pointer into
-    // the source where the row lies there as it is wanted.
+    // Row `y` of the shaken picture, as wide as `source`'s region. Either written to `out`, or a pointer into the
+    // source if the row is already there unchanged.
     const Bgra* Row(const ImageView& source, Bgra* out, std::int32_t y) const noexcept;
 
   private:
@@ -50,7 +50,7 @@ class JitterStage {
     std::uint32_t m_border = 0;
 };
 
-// Draws the offsets: none when both amplitudes are 0, else the vertical one first, then the horizontal one.
+// Draws the offsets: nothing if both amplitudes are 0, else the vertical offset and then the horizontal one.
 [[nodiscard]] JitterStage PrepareJitter(const StageSettings& settings, Random& random) noexcept;
 
 // The shaken picture of a frame, for stages that need their neighbours.

@@ -10,8 +10,8 @@ extern const Kernels kSsse3Kernels;
 extern const Kernels kAvx2Kernels;
 extern const Kernels kAvx512Kernels;
 
-// Kernels that the levels above share, since longer vectors would not speed them up: a scratch is a few pixels
-// wide, the glow layer a quarter of the picture.
+// Kernels that higher levels share, since longer vectors would not speed them up: a scratch is only a few pixels wide,
+// and the glow layer is a quarter of the picture.
 void DrawScratchesSse2(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
                        const ScratchRowPlace& place) noexcept;
 extern const GlowKernels kAvx2Glow;

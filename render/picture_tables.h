@@ -13,7 +13,7 @@ struct WearEntry {
     GreyPicture picture;
 };
 
-// In menu order, ended by an entry with the value 0.
+// In menu order; an entry with the value 0 ends the table.
 extern const WearEntry kWearTable[];
 
 extern const GreyPicture kSpotTable[kSpotCount];

@@ -1,5 +1,5 @@
-// Random numbers of the renderer: a linear congruential generator whose state is one 32-bit word that the
-// caller owns. Draws are integer arithmetic only, so that a state gives the same numbers on every build.
+// The renderer's random numbers: a linear congruential generator whose state is one 32-bit word owned by the caller.
+// Draws use integer arithmetic only, so a state gives the same numbers on every build.
 #pragma once
 
 #include <cstdint>
@@ -13,14 +13,14 @@ class Random {
 
     [[nodiscard]] constexpr std::uint32_t State() const noexcept { return m_state; }
 
-    // Advances once; 0..32767.
+    // Advances once and returns 0..32767.
     constexpr std::uint32_t Next() noexcept {
         m_state = m_state * kMultiplier + kIncrement;
         return (m_state >> 16) & 0x7FFFu;
     }
 
-    // A draw between two integers, ends included, given in either order. The upper end comes once in 32768
-    // draws, since the division truncates. The span must not exceed 131073 (the product is 32 bits wide).
+    // A draw between two integers in either order, ends included. The upper end comes up once in 32768 draws, since
+    // the division truncates. The span must not exceed 131073 (the product is 32 bits wide).
     constexpr std::int32_t Draw(std::int32_t a, std::int32_t b) noexcept {
         const std::uint32_t low = static_cast<std::uint32_t>(a < b ? a : b);
         const std::uint32_t high = static_cast<std::uint32_t>(a < b ? b : a);
@@ -30,7 +30,7 @@ class Random {
     // A draw between `low` and `high` with `decimals` digits after the point, clamped to the two.
     double DrawDecimal(float low, float high, int decimals) noexcept;
 
-    // As `count` draws would: the generator's step applied `count` times, in at most 32 rounds.
+    // Advances as `count` draws would, in at most 32 rounds.
     constexpr void Skip(std::uint32_t count) noexcept {
         std::uint32_t multiplier = kMultiplier, increment = kIncrement;
         for (; count != 0; count >>= 1) {

@@ -1,5 +1,5 @@
-// Everything of the renderer that outlives a frame. The caller owns it and passes it to every frame; frames
-// that are rendered at the same time need a state each.
+// Everything in the renderer that outlives a frame. The caller owns it and passes it to every frame. Frames rendered
+// at the same time need a state each.
 #pragma once
 
 #include <array>
@@ -14,13 +14,13 @@
 
 namespace velmora::render {
 
-// The random sequence of jitter, wear and spots. A frame that is rendered twice in a row replays its random
-// numbers; any other frame continues where the frame before left off.
+// The random sequence of jitter, wear and spots. A frame rendered twice in a row gets the same random numbers again;
+// any other frame continues where the previous one left off.
 class FrameRandom {
   public:
-    // Starts the sequence. The first frame goes on from here.
+    // Starts the sequence. The first frame continues from here.
     void Seed(std::uint32_t state) noexcept;
-    // Makes the next frame's numbers a function of `seed` and the number alone, whatever was rendered before.
+    // Makes the next frame's random numbers depend only on `seed` and the frame number, not on earlier frames.
     void Pin(std::uint32_t seed, std::int32_t frameNumber) noexcept;
     // Called once for each frame, before its first draw.
     void BeginFrame(std::int32_t frameNumber) noexcept;
@@ -36,7 +36,7 @@ class FrameRandom {
 
 // The contrast table and the value that it was built for.
 struct ContrastCache {
-    float contrast = -2.0f;  // no setting: the first contrast always builds
+    float contrast = -2.0f;  // outside the range, so the first contrast always builds the table
     std::array<std::uint8_t, 256> table{};
 };
 

@@ -10,7 +10,7 @@ struct Planning {
     const StageSettings& settings;
     RenderState& state;
     const Kernels& kernels;
-    const FramePlan& plan;  // as far as it is made
+    const FramePlan& plan;  // as far as it is prepared
 
     [[nodiscard]] Random& Numbers() const noexcept { return state.random.Numbers(); }
 };
@@ -35,7 +35,7 @@ void Prepare(SpotStage& stage, const Planning& p) noexcept {
     stage = PrepareSpots(p.settings, p.context.Destination().Region(), p.Numbers());
 }
 
-// In place, what was read is still in the caches when it is written.
+// Not when working in place: what was read is then still in the caches when it is written.
 bool IsStreamed(const FrameContext& context, const RenderOptions& options) noexcept {
     const std::int64_t bytes =
         std::int64_t{context.Width()} * context.Height() * static_cast<std::int64_t>(sizeof(Bgra));
@@ -60,7 +60,7 @@ void RenderByRows(FrameContext& context, const FramePlan& plan, const RenderOpti
     if (own != nullptr) program.EndStream();
 }
 
-// In place the rows can be worked on where they lie, unless the picture moves over itself.
+// Rows can be processed in place, unless the picture is shifted over itself.
 bool NeedsOwnSource(const FrameContext& context, const FramePlan& plan) noexcept {
     if (!context.FramesOverlap()) return false;
     const ImageView& source = context.Source();
@@ -87,7 +87,7 @@ void RenderStages(FrameContext& context, const StageSettings& settings, RenderSt
     ForEachStage(plan, [&isWanted](auto& stage) {
         if (!isWanted(stage)) stage = {};
     });
-    // Without memory for the copy the picture stays where it is; the other stages can still work.
+    // Without memory for the copy the picture is not shifted; the other stages can still work.
     if (NeedsOwnSource(context, plan) && !context.DetachSource()) plan.jitter = {};
     const ShakenRows shaken(context.Source(), plan.jitter);
     if (isWanted(plan.glow)) {

@@ -18,7 +18,7 @@ double NearestTiesToEven(double value) noexcept {
 std::int32_t TruncateTolerant(double value) noexcept {
     constexpr double kAlmostHalf = 0.499999999999;
     if (value != value) return 0;
-    // Beyond this a double has no room for the correction, and the result saturates anyway.
+    // Beyond this a double is too coarse for the correction, and the result saturates anyway.
     if (value > 4294967296.0 || value < -4294967296.0) return Truncate(value);
     return Truncate(NearestTiesToEven(value > 0.0 ? value - kAlmostHalf : value + kAlmostHalf));
 }

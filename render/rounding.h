@@ -12,7 +12,7 @@ constexpr float Narrow(double value) noexcept {
     return static_cast<float>(value);
 }
 
-// Toward zero. NaN gives 0; values beyond the 32-bit range give its ends.
+// Toward zero. NaN gives 0; values beyond the 32-bit range saturate.
 constexpr std::int32_t Truncate(double value) noexcept {
     if (value >= 2147483647.0) return std::numeric_limits<std::int32_t>::max();
     if (value <= -2147483648.0) return std::numeric_limits<std::int32_t>::min();
@@ -32,8 +32,8 @@ constexpr std::uint32_t RoundToUnsigned(double value) noexcept {
     return static_cast<std::uint32_t>(shifted);
 }
 
-// Toward zero with a tolerance of 1e-12: a product that misses a whole number by the error of its
-// arithmetic counts as that number. Saturates like Truncate.
+// Toward zero with a tolerance of 1e-12: a product that misses a whole number only by rounding error counts as that
+// number. Saturates like Truncate.
 std::int32_t TruncateTolerant(double value) noexcept;
 
 }  // namespace velmora::render

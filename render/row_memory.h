@@ -1,4 +1,4 @@
-// Room for one row of pixels between the stages and the frame.
+// A scratch row of pixels between the stages and the frame.
 #pragma once
 
 #include <cstdint>
@@ -10,8 +10,8 @@ namespace velmora::render {
 
 class RowMemory {
   public:
-    // `width` >= 0 pixels of undefined value that start a cache line, or null when there is no memory. Ends what
-    // was there.
+    // `width` >= 0 uninitialised pixels, aligned to a cache line, or null if there is not enough memory. Invalidates
+    // the previous row.
     [[nodiscard]] Bgra* Reserve(std::int32_t width) noexcept;
 
   private:

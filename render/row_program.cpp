@@ -19,12 +19,12 @@ ByteTable Joined(const ByteTable& first, const ByteTable& second) noexcept {
     return table;
 }
 
-// The weights that the kernels' 16-bit arithmetic holds; settings from a slider lie within.
+// The weights that fit the kernels' 16-bit arithmetic. Slider settings are always within this range.
 bool FitsKernel(std::int32_t weight) noexcept {
     return weight >= -127 && weight <= 127;
 }
 
-// For rows that are the source's but for a border, which is filled in where it goes to.
+// For rows that are source pixels plus a border. The border is filled in directly in the output, so in == out there.
 struct StreamOrCopy {
     const Kernels& kernels;
     void operator()(const Bgra* in, Bgra* out, std::int32_t count) const noexcept {
@@ -87,7 +87,7 @@ void RowProgram::Stream(const ShiftedRow& in, Bgra* scratch, Bgra* out, std::int
     m_kernels.stream(scratch, out, width);
 }
 
-// The first step takes the row from the source, if it can.
+// The first step reads directly from the source if it can.
 void RowProgram::Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     const bool isWhole = in.count == width;
     const Reads reads = IsEmpty() ? Reads::kInPlace : m_steps[0].reads;

@@ -1,5 +1,5 @@
-// What happens to a row of a frame, made from the frame's plan: the steps of the active stages in the chain's order.
-// Tables that follow each other are joined into one, and tables that change nothing are left out.
+// The steps for each row of a frame, made from the frame's plan: those of the active stages in the chain's order.
+// Successive tables are joined into one, and tables that change nothing are left out.
 #pragma once
 
 #include <array>
@@ -18,22 +18,22 @@ class RowProgram {
     RowProgram(const RowProgram&) = delete;
     RowProgram& operator=(const RowProgram&) = delete;
 
-    // True when a row leaves as it came in.
+    // True if rows are not changed.
     [[nodiscard]] bool IsEmpty() const noexcept { return m_count == 0; }
-    // Row `y`. The source pixels of the row may lie where they go to, but not overlap it otherwise.
+    // Row `y`. The source pixels may be exactly where the result goes but must not overlap it otherwise.
     void Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
-    // The same into a row that is not read again soon, by way of `scratch`, a row's memory, where there is work to do.
+    // The same for a result that will not be read again soon. `scratch` holds one row, used if there is work.
     void Stream(const ShiftedRow& in, Bgra* scratch, Bgra* out, std::int32_t width,
                 std::int32_t y) const noexcept;
     // After the last row that was streamed.
     void EndStream() const noexcept { m_kernels.endStream(); }
 
   private:
-    // What a step needs of the row that it reads.
+    // What a step needs from its input row.
     enum class Reads {
-        kPixels,   // any part of it, wherever it goes to
-        kRow,      // the whole row, with each pixel at its place
-        kInPlace,  // the whole row, where it goes to
+        kPixels,   // any part of the row, written to any place
+        kRow,      // the whole row, each pixel at its own column
+        kInPlace,  // the whole row, already in the output
     };
     struct Step {
         Reads reads;

@@ -9,8 +9,8 @@ namespace velmora::render {
 
 class RowReader {
   public:
-    // Row `y` of the processed rectangle, from 0: either a pointer into the picture, or `scratch` (room for
-    // a whole row) after the row was written there.
+    // Row `y` of the processed rectangle, from 0. Returns either a pointer into the picture, or `scratch` (a whole
+    // row) with the row written to it.
     virtual const Bgra* Read(std::int32_t y, Bgra* scratch) const noexcept = 0;
 
   protected:

@@ -9,7 +9,7 @@ namespace {
 
 constexpr std::int32_t kSegments = ScratchLine::kSegments;
 constexpr std::int32_t kOne = 65536;
-constexpr std::int32_t kMostLevel = 70000;  // hardly more than whole: the texture is seen there, too
+constexpr std::int32_t kMostLevel = 70000;  // barely above whole, so that the texture shows there too
 
 // Independent noises and draws of one scratch.
 enum Lane : std::uint32_t {
@@ -83,7 +83,7 @@ Noise AlongFilm(std::uint32_t look, Lane lane, std::int32_t age, std::int32_t ce
     return {look, lane, std::int64_t{age} * kSegments * step, step};
 }
 
-// The same in every row of a frame, in cells of 10 to 200 frames.
+// Constant within a frame, in cells of 10 to 200 frames.
 std::int32_t OverFrames(std::uint32_t look, Lane lane, std::int32_t age) noexcept {
     const std::int32_t draw = HashAt(look, kFadeLength, static_cast<std::int32_t>(lane));
     const std::int32_t frames =
@@ -93,9 +93,9 @@ std::int32_t OverFrames(std::uint32_t look, Lane lane, std::int32_t age) noexcep
 
 constexpr std::int32_t kQuantiles = 9;
 
-// Strengths, of 256, at eighths of all scratches: most are faint hairlines, one of eight stands out.
+// Strengths, of 256, at octiles of all scratches: most are faint hairlines, one in eight stands out.
 constexpr std::int32_t kStrengths[kQuantiles] = {44, 58, 70, 84, 100, 122, 156, 224, 300};
-// Levels at eighths of all scratches: a few hardly break, most do, a quarter comes only in short stretches.
+// Levels at octiles of all scratches: a few hardly break, most do, and a quarter appears only in short stretches.
 constexpr std::int32_t kLevels[kQuantiles] = {96000, 80000, 58000, 42000, 28000, 15000, 0, -20000, -44000};
 
 std::int32_t QuantileAt(const std::int32_t (&values)[kQuantiles], std::int32_t part) noexcept {
@@ -105,7 +105,7 @@ std::int32_t QuantileAt(const std::int32_t (&values)[kQuantiles], std::int32_t p
 }
 
 std::uint32_t StrengthOf(const ScratchState& scratch, const ScratchView& view) noexcept {
-    // Who asks for a single scratch wants to see one: the first is never one of the faint half.
+    // A user who asks for a single scratch wants to see it, so the first is never in the faint half.
     const std::int32_t drawn = HashAt(scratch.look, kStrength);
     const std::int32_t share = QuantileAt(kStrengths, view.isFirst ? (kOne + drawn) / 2 : drawn);
     const std::int32_t age = view.frame - scratch.firstFrame;
@@ -117,12 +117,12 @@ std::uint32_t StrengthOf(const ScratchState& scratch, const ScratchView& view) n
 void LayCourse(const ScratchState& scratch, std::int32_t age, const ScratchStray& stray,
                ScratchLine& line) noexcept {
     const std::uint32_t look = scratch.look;
-    // Most stand upright: the cube of an even draw.
+    // The cube of a uniform draw: most are nearly upright.
     const std::int64_t lean = HashAt(look, kTilt) - 32768;
     const std::int64_t tilt = stray.tilt * (lean * lean / 32768 * lean / 32768) / 32768;
     const std::int64_t sway = stray.sway * Between(kOne / 3, kOne, HashAt(look, kSwaySize)) >> 16;
     const std::int64_t column = (scratch.position % 1000 * 256) / 1000;
-    // The sway stays where it is and turns slowly into another one, or the line would seem to crawl.
+    // The sway stays in place and slowly changes shape; otherwise the line would seem to crawl.
     const std::int32_t turn = age * 256 / Between(8, 40, HashAt(look, kSwayTurn));
     const std::int32_t turned = Eased(turn & 255);
     const std::int32_t step = kOne / Between(14, 60, HashAt(look, kSwayLength));
@@ -139,8 +139,8 @@ void LayCourse(const ScratchState& scratch, std::int32_t age, const ScratchStray
     }
 }
 
-// What the level lacks at a knot: everything at the ends of the life, nothing some frames away from them. What
-// the clip starts with was there before it.
+// How much is taken off the level at a knot: everything at the ends of the life, nothing a few frames away from them.
+// Scratches present at the start of the clip have no onset.
 class Onset {
   public:
     Onset(const ScratchState& scratch, std::int32_t frame) noexcept
@@ -217,7 +217,7 @@ constexpr ScratchTexture MakeTexture(int softenings) {
     return texture;
 }
 
-// A fleck is about as long as it is wide: a row's break across a wide scratch would look like a bar code.
+// A fleck is about as long as it is wide: one-row breaks across a wide scratch would look like a bar code.
 constinit const ScratchTexture kThinTexture = MakeTexture(1);
 constinit const ScratchTexture kThickTexture = MakeTexture(8);
 constexpr std::int32_t kThickFrom = 5;  // pixels

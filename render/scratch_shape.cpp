@@ -5,10 +5,10 @@
 namespace velmora::render {
 namespace {
 
-// A scratch is one or two hairlines, about a pixel wide, in a faint graze as wide as the profile.
+// A scratch is one or two hairlines about a pixel wide, within a faint graze as wide as the profile.
 struct Hair {
-    std::int32_t place;     // of its middle, from its own half width at either side of the profile: 0..256
-    std::int32_t half;      // half its width at the foot, 1/64 pixels; cut to half the profile's
+    std::int32_t place;     // of its middle, 0..256; at 0 and 256 the hairline touches the profile's edge
+    std::int32_t half;      // half its width at the base, 1/64 pixels; at most half the profile's width
     std::int32_t strength;  // 0..256
 };
 
@@ -56,7 +56,7 @@ constexpr ScratchShape MakeShape(const ScratchProfile& profile, const Section& s
     ScratchShape shape;
     shape.pixels = (profile.width + 1 + 3) / 4 * 4;
     const std::int32_t width = profile.width * kUnits;
-    std::array<std::int32_t, kMostScratchPixels * kUnits + 1> sums{};  // of all units before
+    std::array<std::int32_t, kMostScratchPixels * kUnits + 1> sums{};  // of all preceding units
     for (std::int32_t unit = 0; unit < kMostScratchPixels * kUnits; ++unit) {
         const std::int32_t covered = unit < width ? SectionAt(section, unit, width) : 0;
         const auto index = static_cast<std::size_t>(unit);

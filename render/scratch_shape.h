@@ -9,18 +9,18 @@
 
 namespace velmora::render {
 
-inline constexpr std::int32_t kScratchPhases = 32;  // steps of a pixel in which a scratch's left edge may lie
+inline constexpr std::int32_t kScratchPhases = 32;  // positions of a scratch's left edge within a pixel
 inline constexpr std::int32_t kMostScratchPixels = 12;
 inline constexpr std::int32_t kScratchSections = 3;  // kinds of cross-section, for scratches of each width
 
-// For a left edge `phase` steps into a pixel: what share of that pixel and of those to its right the scratch
+// For a left edge `phase` steps into a pixel: the share of that pixel and of those to its right that the scratch
 // covers, 0..65280 (65536 would be all).
 struct ScratchShape {
     std::int32_t pixels = 0;  // how many a scratch can touch, rounded up to whole vectors of four
     std::array<std::array<std::uint16_t, kMostScratchPixels>, kScratchPhases> weights{};
 };
 
-// Where a scratch is about to break off it narrows, until only its finest part is left.
+// Before a scratch breaks off it narrows until only its finest part is left.
 enum ScratchWear : std::size_t { kScratchWhole, kScratchNarrow, kScratchWorn };
 using ScratchShapes = std::array<ScratchShape, 3>;
 

@@ -12,7 +12,7 @@ namespace {
 
 constexpr std::int32_t kLeastLife = static_cast<std::int32_t>(kFramesPerSecond / 2);
 constexpr std::int32_t kMostLife = static_cast<std::int32_t>(kFramesPerSecond * 3);
-constexpr std::int32_t kWhiteAbove = 700;     // of 1000, where both kinds may come
+constexpr std::int32_t kWhiteAbove = 700;     // of 1000, if both kinds are possible
 constexpr std::uint32_t kDrawsAfterLife = 3;  // column, wander, speed
 
 const ScratchProfile& ProfileOf(bool isWhite, std::int32_t index) noexcept {
@@ -78,7 +78,7 @@ const ScratchReplay& ScratchReplays::At(const ScratchReplayKey& key, std::int32_
         if (replay.Key() != key || replay.Frame() > frame) continue;
         if (best == m_replays.size() || replay.Frame() > m_replays[best].Frame()) best = i;
     }
-    // A replay that has not started yet has the empty key and no lives, so it may stand for that key.
+    // A replay that has not started has the empty key and no lives, so it is valid for that key.
     if (best == m_replays.size()) m_replays[best = oldest].Start(key);
     m_lastUse[best] = ++m_uses;
     m_replays[best].AdvanceTo(frame);
@@ -100,7 +100,7 @@ ScratchState ScratchStateAt(const ScratchReplay::Life& life, std::int32_t frame,
     scratch.firstFrame = life.firstFrame;
     scratch.endFrame = life.firstFrame + numbers.Draw(kLeastLife, kMostLife);
 
-    // A picture narrower than the scratch leaves it the columns from which it still covers the picture.
+    // In a picture narrower than the scratch, only columns from which it still covers the picture are allowed.
     const auto [leftmost, rightmost] = std::minmax({0, width - scratch.width});
     scratch.startColumn = numbers.Draw(leftmost, rightmost);
     scratch.wander = numbers.Draw(0, settings.scratchConstant);

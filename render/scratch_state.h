@@ -1,10 +1,9 @@
-// The lives of the scratches: where each one is in a frame, as a function of the settings and the frame
-// number alone.
+// The lives of the scratches: where each one is in a frame. This depends on the settings and the frame number only.
 //
-// A frame shows what a replay from frame 0 leads to. In the replay every scratch is started in frame 0 and
-// again in the frame in which its life ends; all of them, in order of their index, draw from one generator
-// that the scratch seed starts. Of a life that has passed only the number of its draws matters for those that
-// follow, so a replay steps from restart to restart and only the lives that a frame shows are drawn in full.
+// A frame shows the result of a replay from frame 0. In the replay every scratch starts in frame 0 and restarts in
+// the frame in which its life ends. All scratches, in order of their index, draw from one generator started with the
+// scratch seed. A past life affects later ones only through the number of its draws, so a replay steps from restart
+// to restart and draws in full only the lives that the frame shows.
 #pragma once
 
 #include <array>
@@ -24,8 +23,8 @@ struct ScratchProfile {
     std::int32_t width;    // pixels
 };
 
-// The first three entries are thin, the last two thick. An upper end is hardly ever drawn, so the entries
-// that are seen are the first two, and with thick ones the first four.
+// The first three entries are thin, the last two thick. The upper end of a range is hardly ever drawn, so in practice
+// only the first two appear, or the first four with thick scratches.
 inline constexpr ScratchProfile kBlackScratchProfiles[kScratchProfiles] = {
     {205, 2}, {235, 3}, {250, 4}, {235, 7}, {250, 10},
 };
@@ -33,8 +32,8 @@ inline constexpr ScratchProfile kWhiteScratchProfiles[kScratchProfiles] = {
     {195, 2}, {225, 3}, {245, 4}, {230, 6}, {245, 9},
 };
 
-// One scratch in one frame. Columns are counted from the left edge of the processed rectangle and name the
-// scratch's left edge; positions and speed are thousandths of a pixel, which makes the movement exact.
+// One scratch in one frame. Columns are those of the scratch's left edge, counted from the left edge of the processed
+// rectangle. Positions and speed are in thousandths of a pixel, which makes the movement exact.
 struct ScratchState {
     bool isWhite = false;
     std::int32_t profileIndex = 0;
@@ -52,17 +51,17 @@ struct ScratchState {
     std::int32_t tremble = 0;  // of the strength in this frame, 241..271 of 256
 };
 
-// What the draws of all lives depend on.
+// The values that the draws of all lives depend on.
 struct ScratchReplayKey {
     std::uint32_t seed = 0;
     std::uint32_t count = 0;
-    bool drawsKind = false;  // one more draw in each life, where both kinds may come
+    bool drawsKind = false;  // both kinds are possible, which takes one more draw per life
 
     bool operator==(const ScratchReplayKey&) const = default;
 };
 [[nodiscard]] ScratchReplayKey ReplayKeyOf(const StageSettings& settings) noexcept;
 
-// A replay that stands at some frame and can go on from there.
+// A replay that has reached some frame and can continue from there.
 class ScratchReplay {
   public:
     struct Life {
@@ -72,7 +71,7 @@ class ScratchReplay {
     };
 
     void Start(const ScratchReplayKey& key) noexcept;
-    // To `frame`, which must not lie before Frame(). About 5 ms for ten hours of frames.
+    // Advances to `frame`, which must not be before Frame(). Takes about 5 ms for ten hours of frames.
     void AdvanceTo(std::int32_t frame) noexcept;
 
     [[nodiscard]] const ScratchReplayKey& Key() const noexcept { return m_key; }
@@ -91,8 +90,8 @@ class ScratchReplay {
     std::array<std::uint16_t, kRingFrames> m_endings{};  // by frame modulo ring: a bit for each scratch
 };
 
-// A few replays, so that a frame goes on where one before it stopped, also when clips with different settings
-// are rendered by turns or a host goes back and forth. What is remembered never shows in a result.
+// A few replays, so that a frame can continue from an earlier one even if clips with different settings alternate or
+// a host jumps back and forth. Results never depend on what is cached here.
 class ScratchReplays {
   public:
     [[nodiscard]] const ScratchReplay& At(const ScratchReplayKey& key, std::int32_t frame) noexcept;
@@ -103,13 +102,13 @@ class ScratchReplays {
     std::uint32_t m_uses = 0;
 };
 
-// The frame whose scratches `frameNumber` shows: 0 before the clip starts; after 2^22 frames (38 hours) they
-// come again from the start, so that no frame number asks for an endless replay.
+// The frame whose scratches `frameNumber` shows: 0 before the clip starts. After 2^22 frames (38 hours) they repeat
+// from the start, which bounds the time of a replay.
 [[nodiscard]] constexpr std::int32_t ScratchFrame(std::int32_t frameNumber) noexcept {
     return frameNumber < 0 ? 0 : frameNumber & 0x3FFFFF;
 }
 
-// The state of a life in `frame`, one of the life's own frames, in a picture `width` pixels wide.
+// The state of a life in `frame`, which must be within the life, in a picture `width` pixels wide.
 [[nodiscard]] ScratchState ScratchStateAt(const ScratchReplay::Life& life, std::int32_t frame,
                                           const StageSettings& settings, std::int32_t width) noexcept;
 

@@ -1,5 +1,5 @@
-// Scratches: lines that run down the film, dark where its surface is grazed and bright where the emulsion is
-// gone. Their lives are settled by scratch_state.h; here they are drawn.
+// Scratches: lines that run down the film, dark where its surface is grazed and bright where the emulsion is gone.
+// scratch_state.h computes their lives; this draws them.
 //
 // A scratch runs the whole height of the picture, tilted and wavering a little, and breaks off here and there.
 // A black one never makes a channel brighter, a white one never darker; alpha is kept.
@@ -18,7 +18,7 @@ namespace velmora::render {
 
 struct Kernels;
 
-// What the stage keeps from frame to frame, and the room that it works in.
+// What the stage keeps from frame to frame, and its working memory.
 struct ScratchMemory {
     ScratchReplays replays;
     std::array<ScratchLine, kMostScratches> lines;
@@ -44,8 +44,8 @@ class ScratchStage {
     const Kernels* m_kernels = nullptr;
 };
 
-// The scratches of a frame whose picture was moved sideways by `xOffset`. The stage points into `memory` and
-// serves until the memory's next use.
+// The scratches of a frame whose picture was moved sideways by `xOffset`. The stage points into `memory` and is valid
+// until the memory is used again.
 [[nodiscard]] ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffset,
                                             const FrameContext& context, ScratchMemory& memory,
                                             const Kernels& kernels) noexcept;

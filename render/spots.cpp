@@ -19,9 +19,9 @@ PlacedSpot PlaceSpot(std::int32_t level, const Rectangle& region, Random& random
     spot.picture = &SpotPicture(random.Draw(0, kSpotCount - 1));
     spot.orientation = static_cast<SpotOrientation>(random.Draw(0, 5));
     spot.strength = Narrow(random.Draw(level / 8, std::min(2 * level, 100)) / 100.0);
-    random.Draw(level / 8, level);  // part of the random sequence only
+    random.Draw(level / 8, level);  // only to advance the random sequence
 
-    // The place is drawn by the stored size, whatever the orientation.
+    // The place is drawn using the stored size, whatever the orientation.
     const std::int32_t h = spot.picture->height, w = spot.picture->width;
     const std::int32_t y = random.Draw(region.top + 1 - (h - h / 2), region.bottom + 1 - h / 2);
     const std::int32_t x = random.Draw(region.left + 1 - (w - w / 2), region.right + 1 - w / 2);

@@ -24,8 +24,7 @@ enum class SpotOrientation : std::int32_t {
     kQuarterCounterClockwise = 5,
 };
 
-// A spot as it lies on the frame; positions count from the processed rectangle's left top corner and may lie
-// outside it.
+// A spot placed on the frame. Positions count from the processed rectangle's top left corner and may be outside it.
 struct PlacedSpot {
     const GreyPicture* picture;
     SpotOrientation orientation;

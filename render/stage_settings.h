@@ -1,5 +1,5 @@
-// What the stages of one frame are to do: plain values, read once per frame. The defaults make every stage
-// do nothing.
+// The settings of all stages for one frame: plain values, read once per frame. With the defaults no stage does
+// anything.
 #pragma once
 
 #include <cstdint>
@@ -33,7 +33,7 @@ struct StageSettings {
     std::int32_t wearPattern = 2000;  // menu value of the picture, 2000..2006
     std::int32_t wearChannels = kWearAllChannels;
 
-    std::uint32_t scratchKinds = 0;    // ScratchKinds together; 0: no scratches
+    std::uint32_t scratchKinds = 0;    // ScratchKinds combined; 0: no scratches
     std::uint32_t scratchCount = 0;    // 0..16
     std::int32_t scratchConstant = 0;  // bounds range and speed of a scratch's sideways movement, pixels
     float scratchDepth = 0.0f;         // 0..1
@@ -41,7 +41,7 @@ struct StageSettings {
 
     float spots = 0.0f;  // 0..100
 
-    // Moves scratches and flicker, whose seeds follow from the values above. 0 in hosts that give no seed.
+    // Varies scratches and flicker, whose own seeds come from the values above. 0 if the host gives no seed.
     std::uint32_t hostSeed = 0;
 };
 

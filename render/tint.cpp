@@ -31,7 +31,8 @@ std::int32_t TintOffset(float tint) noexcept {
     return static_cast<std::int32_t>(static_cast<std::uint32_t>(scaled) - 255u);
 }
 
-// The value moves by a step from entry to entry, in single precision: the sum, not a product, is the curve.
+// The value grows by a step from entry to entry, in single precision: the curve is defined by the running sum, not by
+// a product.
 ByteTable TintTable(std::int32_t offset) noexcept {
     ByteTable table{};
     const std::int32_t black = offset > 0 ? -1 : -offset;  // last entry that stays black

@@ -1,8 +1,8 @@
-// Tint and film gamma: a black-level shift for each channel and an S-shaped tone curve, through one table a
-// channel: G[T[G[channel]]].
+// Tint and film gamma: a black-level shift for each channel and an S-shaped tone curve, in one table per channel:
+// G[T[G[channel]]].
 //
 // T, from a channel's offset o (-255..255, 0 is neutral): a line from o at 0 to 255 at 255 for o > 0, else 0
-// up to |o| and a line from there to 255; with o = 0 it maps 255 to 254, which only shows with a gamma.
+// up to |o| and a line from there to 255. With o = 0 it maps 255 to 254, which is visible only with a gamma.
 // G, from the gamma g: g (1 - cos(pi x)) / 2 + (1 - g) x.
 #pragma once
 

@@ -5,7 +5,7 @@
 namespace velmora::render {
 namespace {
 
-// The line by these factors that lies between the bounds that each entry sets it; black and white have one only.
+// The line with these factors that satisfies the bounds set by each entry; black and white set only one bound.
 std::optional<ToneLine> LineBy(std::int32_t times, std::int32_t shift, const ByteTable& table) noexcept {
     std::int32_t least = -65535, most = 65535;
     for (std::size_t i = 0; i < table.size(); ++i) {

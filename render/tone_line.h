@@ -1,5 +1,5 @@
-// Tables that are a line, cut off at black and white: what brightness, flicker and contrast make. Kernels without
-// byte permutations compute them faster than they look them up.
+// Tables that are a line clamped at black and white, as brightness, flicker and contrast make them. Kernels without
+// byte permutations compute them faster than they can look them up.
 #pragma once
 
 #include <algorithm>
@@ -10,7 +10,7 @@
 
 namespace velmora::render {
 
-// The entry of i, in 16 bits without a sign: (i × 256 × times >> 16) + plus, at most 65535, less minus, at least 0;
+// The entry for i, in unsigned 16 bits: (i × 256 × times >> 16) + plus, at most 65535, less minus, at least 0;
 // shifted right by `shift` and at most 255.
 struct ToneLine {
     std::uint16_t times = 0;
@@ -26,8 +26,8 @@ struct ToneLine {
     return static_cast<std::uint8_t>(std::min(rest >> line.shift, 255u));
 }
 
-// The line that gives exactly this table, which rises by `slope` (0..8) from entry to entry where it is not cut off.
-// None when no numbers of 16 bits do.
+// The line that gives exactly this table, which rises by `slope` (0..8) from entry to entry where it is not clamped.
+// None if no 16-bit numbers give it.
 [[nodiscard]] std::optional<ToneLine> LineOf(const ByteTable& table, double slope) noexcept;
 
 }  // namespace velmora::render

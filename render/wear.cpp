@@ -13,7 +13,7 @@ std::uint32_t WearStripCount(const StageSettings& settings, std::int32_t width) 
 
 WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random& random, WearFactors& factors,
                       const Kernels& kernels) noexcept {
-    // An orientation that nothing uses: the draw is part of the random sequence.
+    // An unused orientation: the draw is part of the random sequence.
     random.Draw(0, 3);
     WearStage stage;
     stage.m_active = settings.wear != 0.0f;
@@ -41,7 +41,7 @@ void WearStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
     } else if (in != out) {
         std::copy(in, in + width, out);
     }
-    // The kernel has left pixels under odd bytes as they are.
+    // The kernel has left the pixels under odd bytes unchanged.
     ForEachByte(width, y, [&](std::int32_t x, std::uint8_t byte) {
         if (m_factors == nullptr || m_factors->IsOdd(byte)) ShadeUnder(byte, out[x]);
     });

@@ -1,5 +1,5 @@
-// Wear: lightens the picture through a grey picture of wear, tiled across the frame in vertical strips that
-// each start at a random row of it every frame, so that the wear crawls as on a worn film.
+// Wear: lightens the picture through a grey wear picture, tiled across the frame in vertical strips. In every frame
+// each strip starts at a random row of the wear picture, so that the wear crawls as on worn film.
 //
 // Fraction of a pixel under wear byte b: (b / 255) * wear, in single precision.
 #pragma once
@@ -21,8 +21,8 @@ namespace velmora::render {
 
 // The rows of the wear picture over one row of a frame: one for each strip, from the left.
 //
-// They are drawn anew for each row of the frame, from where the frame's draws began: a strip count that grows with
-// the width needs no room, and a draw costs next to nothing beside a strip's pixels.
+// They are drawn again for each row, starting from the frame's first draw. This needs no memory for a strip count that
+// grows with the width, and a draw costs next to nothing compared with a strip's pixels.
 class WearRows {
   public:
     // For row `y` of a frame, under a picture of `height` rows.
@@ -43,13 +43,13 @@ class WearRows {
 class WearFactors;
 struct Kernels;
 
-// The strips of a frame of this width, each of which takes one draw.
+// The number of strips in a frame of this width. Each takes one draw.
 [[nodiscard]] std::uint32_t WearStripCount(const StageSettings& settings, std::int32_t width) noexcept;
 
 class WearStage {
   public:
     static constexpr bool kIsDamage = true;
-    // One always, then one for each strip unless the wear is 0.
+    // Always one, plus one for each strip unless the wear is 0.
     static std::uint32_t Draws(const StageSettings& settings, std::int32_t width) noexcept {
         return 1 + (settings.wear != 0.0f ? WearStripCount(settings, width) : 0);
     }
@@ -85,11 +85,11 @@ class WearStage {
     const GreyPicture* m_picture = nullptr;
     Random m_starts;
     float m_amount = 0.0f;
-    const WearFactors* m_factors = nullptr;  // none for a picture that is too large for them
+    const WearFactors* m_factors = nullptr;  // null for a picture that is too large for them
     const Kernels* m_kernels = nullptr;
 };
 
-// Makes the frame's draws. The stage points into `factors` and serves until they are set anew.
+// Makes the frame's draws. The stage points into `factors` and is valid until they are set again.
 [[nodiscard]] WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random& random,
                                     WearFactors& factors, const Kernels& kernels) noexcept;
 

@@ -5,10 +5,10 @@
 namespace velmora::render {
 namespace {
 
-// By the room that a channel has.
+// Indexed by a channel's distance to white.
 using Numbers = std::array<std::int16_t, 256>;
 
-// What shading adds. The largest float below a half rounds halves up in every product that has a float's 24 bits.
+// What shading adds. Adding the largest float below a half rounds halves up in every single-precision product.
 Numbers WantedBy(float fraction) noexcept {
     constexpr float kBelowHalf = 0x1.fffffep-2f;
     Numbers wanted;
@@ -19,7 +19,7 @@ Numbers WantedBy(float fraction) noexcept {
     return wanted;
 }
 
-// The number to add behind a multiplication: for each room it must lie within 255 of what is missing.
+// The number to add after the multiplication: for each room it must be at most 255 above what is missing.
 std::optional<std::uint16_t> PlusFor(std::uint16_t times, const Numbers& wanted) noexcept {
     std::int16_t least = 32767, most = -32768;
     for (std::size_t room = 0; room < wanted.size(); ++room) {

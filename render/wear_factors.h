@@ -1,11 +1,11 @@
-// The numbers of a wear picture at one amount that the row kernels of wear multiply by.
+// The factors of a wear picture at one amount, for the row kernels of wear.
 //
-// A wear byte's fraction (render/wear.h) has a factor when for every room 0..255 that a channel may have to white
+// A wear byte's fraction (render/wear.h) has a factor if, for every distance 0..255 ("room") of a channel to white,
 //   ((room × 256 × times >> 16) + plus) >> 8
-// is what shading by the fraction adds: integers of 16 bits then give the bytes that are defined by products in
-// single precision. `times` lies within a few units of 65536 times the fraction, `plus` near a half of 256. One byte
-// in some thousands has no factor, as has every fraction outside 0..1: the pixels under such bytes are odd, and are
-// shaded one by one.
+// is what shading by the fraction adds. 16-bit integers then give the bytes that are defined by products in single
+// precision. `times` is within a few units of 65536 times the fraction, `plus` is near half of 256. About one byte in
+// several thousand has no factor, and no fraction outside 0..1 has one. Such bytes are called odd; the pixels under
+// them are shaded one by one.
 #pragma once
 
 #include <array>
@@ -29,11 +29,11 @@ struct WearFactor {
 // The factors over one row of a frame, strip by strip from the left.
 class WearStrips {
   public:
-    // A row kernel may read as many numbers before a strip's first one and behind its last one.
+    // A row kernel may read this many numbers before a strip's first one and after its last one.
     static constexpr std::int32_t kRoom = 16;
 
-    // `factors` is a picture of `width` >= kRoom columns, its rows lying one after the other, with room before the
-    // first and behind the last.
+    // `factors` is a picture of `width` >= kRoom columns, stored row after row without gaps, with padding before the
+    // first row and after the last.
     WearStrips(const WearRows& rows, const WearFactor* factors, std::int32_t width) noexcept
         : m_rows(rows), m_factors(factors), m_width(width) {}
 
@@ -49,17 +49,17 @@ class WearStrips {
 // Kept from frame to frame, since the amount seldom changes.
 class WearFactors {
   public:
-    // No wear picture that comes with the program has more pixels.
+    // No built-in wear picture has more pixels.
     static constexpr std::int32_t kMostPixels = 50 * 300;
 
-    // Serves `picture` at `amount` from now on. False, and nothing served, when the picture has more than kMostPixels
-    // or fewer than WearStrips::kRoom columns.
+    // Prepares the factors of `picture` at `amount`. Returns false, and leaves no factors, if the picture has more than
+    // kMostPixels pixels or fewer than WearStrips::kRoom columns.
     [[nodiscard]] bool Set(const GreyPicture& picture, float amount) noexcept;
 
     [[nodiscard]] WearStrips Over(const WearRows& rows) const noexcept {
         return {rows, m_factors.data() + WearStrips::kRoom, m_picture->width};
     }
-    // Whether the kernels leave pixels out: those under bytes that are odd.
+    // Whether the kernels leave out pixels: those under odd bytes.
     [[nodiscard]] bool HasOddBytes() const noexcept { return m_hasOddBytes; }
     [[nodiscard]] bool IsOdd(std::uint8_t byte) const noexcept { return m_isOdd[byte]; }
 

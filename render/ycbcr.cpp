@@ -73,7 +73,7 @@ bool PackedImage::Reserve(std::int32_t width, std::int32_t height, std::int32_t 
     if (m_pixels != nullptr && width <= m_width && height <= m_height) return true;
     width = std::max(width, m_width);
     height = std::max(height, m_height);
-    *this = {};  // the old image makes room before the new one is asked for
+    *this = {};  // free the old image before allocating the new one
     const std::uint64_t rowStep =
         std::uint64_t(static_cast<std::uint32_t>(width)) * static_cast<std::uint32_t>(channels);
     constexpr std::uint64_t kMost = std::numeric_limits<std::ptrdiff_t>::max();

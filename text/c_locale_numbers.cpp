@@ -26,9 +26,10 @@ bool IsDigit(char c) {
     return c >= '0' && c <= '9';
 }
 
-// Tells a number too large from one too small: both are out of a double's range by hundreds of decimal places.
+// Distinguishes numbers that are too large from ones that are too small: both are hundreds of decimal places away from
+// 1.
 bool IsLarge(const char* digits, const char* end, int digitBase) {
-    long long places = 0;  // of the first significant digit, above the point
+    long long places = 0;  // of the first significant digit, counted from the point
     bool hasPoint = false;
     bool isSignificant = false;
     const char* p = digits;
@@ -71,7 +72,7 @@ std::string FormatNumber(double value) {
 
 bool ParseInteger(const char* text, int* value) noexcept {
     const SignedText number = SkipBlanksAndSign(text);
-    if (!IsDigit(*number.digits)) return false;  // from_chars would take a second sign
+    if (!IsDigit(*number.digits)) return false;  // from_chars would accept a second sign
     const char* start = number.isNegative ? number.digits - 1 : number.digits;
     using Limits = std::numeric_limits<int>;
     if (std::from_chars(start, number.end, *value).ec == std::errc::result_out_of_range) {

@@ -11,7 +11,7 @@ std::u16string Widen(std::string_view text) {
 
 std::optional<std::string> NarrowExactly(std::u16string_view text) {
     if (text.empty()) return std::string();
-    constexpr std::uint32_t kMostBytes = 4;  // of a character, in any code page
+    constexpr std::uint32_t kMostBytes = 4;  // per character, in any code page
     const auto length = static_cast<std::uint32_t>(text.size());
     std::string narrow(std::size_t{length} * kMostBytes, '\0');
     narrow.resize(NarrowText(text.data(), length, narrow.data(), length * kMostBytes));

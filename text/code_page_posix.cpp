@@ -7,8 +7,8 @@ namespace velmora {
 
 namespace {
 
-// Windows-1252 is Latin-1 but for the bytes 0x80 to 0x9F. Five of them are unassigned and stand for the
-// control characters of the same number, as on Windows.
+// Windows-1252 is Latin-1 except for the bytes 0x80 to 0x9F. Five of them are unassigned and stand for the control
+// characters with the same number, as on Windows.
 constexpr char16_t kHighControls[32] = {
     0x20AC, 0x0081, 0x201A, 0x0192, 0x201E, 0x2026, 0x2020, 0x2021,  // 80
     0x02C6, 0x2030, 0x0160, 0x2039, 0x0152, 0x008D, 0x017D, 0x008F,  // 88

@@ -1,5 +1,5 @@
-// How names are matched that people type: of effects, presets, parameters and menu items. The same rule in every program
-// and plug-in.
+// How the names that people type are matched: effects, presets, parameters and menu items. All programs and plug-ins
+// use the same rule.
 #pragma once
 
 #include <algorithm>
@@ -17,8 +17,8 @@ namespace velmora {
     return std::ranges::equal(a, b, {}, ToLower, ToLower);
 }
 
-// Only letters and digits count and their case does not: "60s-memories" is "60's Memories", so that no quoting is needed
-// on command lines.
+// Only letters and digits count, in either case: "60s-memories" matches "60's Memories", so command lines need no
+// quoting.
 [[nodiscard]] inline bool IsSameName(std::string_view a, std::string_view b) {
     const auto essence = [](std::string_view text) {
         std::string kept;

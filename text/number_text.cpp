@@ -50,7 +50,7 @@ std::optional<FrameRate> ParseRate(std::string_view text) {
         const auto rate = ParseNumber(text);
         if (!rate || *rate < 0.001 || *rate > 10000.0) return std::nullopt;
         if (*rate == std::floor(*rate)) return FrameRate{static_cast<std::int32_t>(*rate), 1};
-        // 23.976, 29.97 and 59.94 are the usual way to write the rates of NTSC.
+        // NTSC rates are usually written 23.976, 29.97 and 59.94.
         const double ntsc = std::round(*rate * 1.001);
         if (std::abs(ntsc / 1.001 - *rate) < 0.005) {
             return FrameRate{static_cast<std::int32_t>(ntsc) * 1000, 1001};

@@ -1,4 +1,4 @@
-// Numbers, sizes and rates as they are typed on a command line, read and written without regard to locale.
+// Numbers, sizes and rates as typed on a command line, read and written independently of the locale.
 #pragma once
 
 #include <cstdint>
@@ -24,7 +24,7 @@ struct FrameRate {
     }
 };
 
-// Each reads the whole text or nothing.
+// Each parses the whole text or returns nothing.
 std::optional<double> ParseNumber(std::string_view text);          // finite
 std::optional<std::int64_t> ParseInteger(std::string_view text);   // decimal
 std::optional<std::uint32_t> ParseHexWord(std::string_view text);  // "0x1F" or "1F", at most 32 bits
@@ -32,7 +32,7 @@ std::optional<FrameSize> ParseSize(std::string_view text);         // "1920x1080
 std::optional<FrameRate> ParseRate(std::string_view text);         // "25", "29.97", "30000/1001"
 std::optional<double> ParseTime(std::string_view text);            // seconds, "MM:SS.s" or "HH:MM:SS.s", >= 0
 
-// The shortest of up to six significant digits: "4", "24.5", "0.2".
+// As short as possible, with up to six significant digits: "4", "24.5", "0.2".
 std::string NumberText(double value);
 
 // Eight digits after "0x".

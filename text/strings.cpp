@@ -12,14 +12,15 @@ namespace velmora {
 
 namespace {
 
-// Room for `length` characters and a terminator; null when there is none.
+// Memory for `length` characters and a terminator; null when there is not enough.
 template <typename Character>
 Character* Allocate(std::size_t length) noexcept {
     if (length >= PTRDIFF_MAX / sizeof(Character)) return nullptr;
     return new (std::nothrow) Character[length + 1];
 }
 
-// Gives the string (its data and its length) a copy of a text. The old data goes last: the text may be in it.
+// Sets the string (its data and its length) to a copy of a text. The old data is freed last: the text may be part of
+// it.
 template <typename Character>
 void Replace(Character*& data, std::uint32_t& length, const Character* text, std::uint32_t count) noexcept {
     if (text != nullptr && count == kMeasureText) {
@@ -46,7 +47,7 @@ VMUnicodeString::VMUnicodeString(const VMUnicodeString& other) noexcept {
     Assign(other);
 }
 
-// NOLINTNEXTLINE(bugprone-unhandled-self-assignment): the copy is made before the old text goes
+// NOLINTNEXTLINE(bugprone-unhandled-self-assignment): the copy is made before the old text is freed
 VMUnicodeString& VMUnicodeString::operator=(const VMUnicodeString& other) noexcept {
     Assign(other);
     return *this;
@@ -93,7 +94,7 @@ VMString::VMString(const VMString& other) noexcept {
     Assign(other.m_data, other.m_length);
 }
 
-// NOLINTNEXTLINE(bugprone-unhandled-self-assignment): the copy is made before the old text goes
+// NOLINTNEXTLINE(bugprone-unhandled-self-assignment): the copy is made before the old text is freed
 VMString& VMString::operator=(const VMString& other) noexcept {
     Assign(other.m_data, other.m_length);
     return *this;

@@ -1,32 +1,30 @@
-// Two small owning strings: `VMString` for 8-bit text in the system code page, `VMUnicodeString` for 16-bit
-// text.
+// Two small owning strings: `VMString` for 8-bit text in the system code page, `VMUnicodeString` for 16-bit text.
 //
-// The data pointer is null exactly when the length is 0; otherwise it owns length + 1 characters that end in
-// a zero. No operation reports an error: an allocation or a conversion that fails leaves an empty or
-// unchanged string, as each operation says, and callers ask IsNotEmpty where it matters.
+// The data pointer is null exactly when the length is 0; otherwise it owns length + 1 characters, the last of them a
+// zero. No operation reports an error: a failed allocation or conversion leaves the string empty or unchanged, as each
+// operation says, and callers check IsNotEmpty where it matters.
 #pragma once
 
 #include <cstdint>
 
 namespace velmora {
 
-// As a length: up to the terminating zero.
+// Passed as a length: measure up to the terminating zero.
 inline constexpr std::uint32_t kMeasureText = 0xFFFFFFFFu;
 
 class VMUnicodeString {
   public:
     VMUnicodeString() noexcept = default;
-    // Takes `length` characters as they are (kMeasureText: up to the zero). A null text or a length of 0
-    // gives an empty string.
+    // Copies `length` characters (kMeasureText: up to the zero). A null text or a length of 0 gives an empty string.
     VMUnicodeString(const char16_t* text, std::uint32_t length) noexcept;
     VMUnicodeString(const VMUnicodeString& other) noexcept;
     VMUnicodeString& operator=(const VMUnicodeString& other) noexcept;
     virtual ~VMUnicodeString();
 
-    // As construction. The text may be a part of this string. Empty when the allocation fails.
+    // Like construction. The text may be part of this string. Empty when the allocation fails.
     void Assign(const char16_t* text, std::uint32_t length) noexcept;
     void Assign(const VMUnicodeString& other) noexcept;
-    // Adds the other's characters at the end; unchanged when the allocation fails.
+    // Appends the other string; unchanged when the allocation fails.
     void Append(VMUnicodeString other) noexcept;
     void Clear() noexcept;
 
@@ -45,7 +43,7 @@ class VMUnicodeString {
 class VMString {
   public:
     VMString() noexcept = default;
-    // As VMUnicodeString's, with 8-bit text.
+    // Like VMUnicodeString's, with 8-bit text.
     VMString(const char* text, std::uint32_t length) noexcept;
     VMString(const VMString& other) noexcept;
     VMString& operator=(const VMString& other) noexcept;

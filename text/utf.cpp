@@ -6,7 +6,7 @@
 namespace velmora::language {
 namespace {
 
-// What a first byte promises. The lowest value that needs so many bytes tells overlong forms apart.
+// What a first byte implies. Overlong sequences are found by the lowest value that needs so many bytes.
 struct Sequence {
     std::size_t length;  // 0: no sequence begins with this byte
     std::uint32_t firstBits;
@@ -40,7 +40,7 @@ constexpr bool IsHighSurrogate(char16_t character) {
     return character >= 0xD800 && character <= 0xDBFF;
 }
 
-// Takes one character off the front of a text that is not empty; nothing when it is not well-formed.
+// Takes one character from the front of a text that is not empty; nothing when it is not well-formed.
 std::optional<std::uint32_t> TakeCharacter(std::string_view& text) {
     const Sequence sequence = SequenceOf(ByteAt(text, 0));
     if (sequence.length == 0 || sequence.length > text.size()) return std::nullopt;

@@ -1,4 +1,4 @@
-// Natively the library allocates by the operators that this program replaces for the whole process.
+// Natively the library allocates with the operators that this program replaces for the whole process.
 
 #include <cstdlib>
 #include <new>

@@ -1,5 +1,5 @@
-// On Windows modules that are loaded later get other functions for allocating than the system's. System modules get them
-// too; only what modules beside the library ask for counts.
+// On Windows, modules that are loaded later get replacements for the system's allocation functions. System modules
+// get them too, but only requests from modules next to the library count.
 
 #include <windows.h>
 
@@ -31,7 +31,7 @@ bool IsWatched(const void* caller) noexcept {
     return IsProductModule(static_cast<HMODULE>(region.AllocationBase));
 }
 
-// An allocation as the ledger sees it: refused, or made and noted.
+// An allocation as the ledger sees it: refused, or made and recorded.
 template <typename Allocate>
 void* Allocated(bool isWatched, const void* heap, void* old, Allocate&& allocate) noexcept {
     if (isWatched && ledger::Refuses()) return nullptr;
@@ -43,7 +43,7 @@ void* Allocated(bool isWatched, const void* heap, void* old, Allocate&& allocate
     return block;
 }
 
-// Of a module with a heap of its own.
+// For a module with its own heap.
 decltype(&HeapCreate) g_heapCreate;
 decltype(&HeapDestroy) g_heapDestroy;
 decltype(&HeapAlloc) g_heapAlloc;
@@ -75,7 +75,7 @@ BOOL WINAPI FreeInHeap(HANDLE heap, DWORD flags, void* block) {
     return g_heapFree(heap, flags, block);
 }
 
-// Of a module that uses the C library's.
+// For a module that uses the C library's heap.
 decltype(&std::malloc) g_malloc;
 decltype(&std::calloc) g_calloc;
 decltype(&std::realloc) g_realloc;

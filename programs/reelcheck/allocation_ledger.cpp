@@ -6,7 +6,7 @@
 namespace velmora::reelcheck {
 namespace {
 
-// A set of addresses that itself allocates nothing: open addressing, a removed place stays marked.
+// A set of addresses that itself allocates nothing: open addressing, with tombstones for removed entries.
 class AddressSet {
   public:
     void Add(void* block, const void* heap) noexcept {
@@ -25,7 +25,7 @@ class AddressSet {
         std::size_t at = Start(block);
         for (std::size_t i = 0; i < kCapacity && m_places[at] != nullptr; ++i, at = (at + 1) % kCapacity) {
             if (m_places[at] != block) continue;
-            // Behind the last of a run nothing needs the mark.
+            // The last entry of a run needs no tombstone.
             m_places[at] = m_places[(at + 1) % kCapacity] == nullptr ? nullptr : Removed();
             --m_count;
             return;

@@ -1,4 +1,4 @@
-// One check of the library, and what it is given.
+// One check of the library, and its context.
 #pragma once
 
 #include <cstdint>
@@ -16,23 +16,23 @@ namespace velmora::reelcheck {
 #define REELCHECK_PRINTF(text, first) __attribute__((format(printf, text, first)))
 #endif
 
-// A text with numbers in it.
+// Formatted text.
 [[nodiscard]] std::string Text(const char* format, ...) REELCHECK_PRINTF(1, 2);
 
 inline constexpr int kLowestLevel = 1;
 inline constexpr int kHighestLevel = 10;
 inline constexpr int kUsualLevel = 5;
 
-// The library does not keep a promise. The text says where and how.
+// The library breaks its contract. The text says where and how.
 class CheckFailed : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
 };
 
-// Where a check is, for the report of a crash or a hang. Cheap: it may be set for every frame.
+// Where a check is, for the report of a crash or a hang. Cheap enough to set for every frame.
 void SetPlace(const char* format, ...) REELCHECK_PRINTF(1, 2);
 [[nodiscard]] const char* Place() noexcept;
-// Fails with the place in front of the text.
+// Fails with the place prefixed to the text.
 [[noreturn]] void Fail(const std::string& text);
 
 inline void Require(bool holds, const char* text) {
@@ -40,11 +40,12 @@ inline void Require(bool holds, const char* text) {
 }
 
 struct CheckContext {
-    std::string libraryPath;  // empty: the usual one
+    std::string libraryPath;  // empty: the default
     int level = kUsualLevel;
     Dice dice;
 
-    // How often something is tried: `few` up to the usual level, `many` at the highest, a geometric way between.
+    // How many times to try something: `few` up to the default level, `many` at the highest, a geometric scale in
+    // between.
     [[nodiscard]] int Rounds(int few, int many) const;
 };
 
@@ -55,7 +56,7 @@ struct Check {
     const char* what;
 };
 
-// In the order in which they run: by level.
+// In the order in which they run, which is by level.
 [[nodiscard]] std::span<const Check> AllChecks();
 
 }  // namespace velmora::reelcheck

@@ -1,4 +1,4 @@
-// The checks, by the file that holds them. AllChecks() gives each its name and level.
+// The checks, grouped by source file. AllChecks() gives each its name and level.
 #pragma once
 
 #include "programs/reelcheck/check.h"

@@ -11,12 +11,12 @@
 namespace velmora::reelcheck {
 namespace {
 
-// A module gives back everything when it is unloaded, a linked library keeps the settings of each library object.
+// A module frees everything when it is unloaded; a linked library keeps the settings of each library object.
 std::uint64_t BlocksKept() noexcept {
     return IsModule() ? 0 : kBlocksOfSettings;
 }
 
-// A whole visit: loads, opens, renders a frame, closes and unloads, under a watch.
+// A whole session under a watch: loads, opens, renders a frame, closes and unloads.
 class Visit {
   public:
     Visit() : m_source(Layout{32, 24}), m_destination(Layout{32, 24}) {
@@ -27,7 +27,7 @@ class Visit {
     bool Pay(const std::string& path, std::uint64_t failing) {
         std::unique_ptr<Library> library;
         if (!IsModule())
-            library = Library::TryLoad(path);  // this program's own memory stays out of the watch
+            library = Library::TryLoad(path);  // outside the watch: this is the program's own memory
         const AllocationWatch watch(failing);
         if (library == nullptr) library = Library::TryLoad(path);
         const bool isOpened = library != nullptr && Use(library->getEffectsLibrary);
@@ -58,7 +58,7 @@ class Visit {
 
 void CheckLoading(CheckContext& context) {
     const int rounds = context.Rounds(200, 2000);
-    constexpr int kSettled = 10;  // rounds until the system has loaded what it keeps
+    constexpr int kSettled = 10;  // rounds until the system has loaded everything it keeps
     ProcessFigures settled;
     Visit visit;
     for (int round = 0; round < rounds; ++round) {
@@ -66,12 +66,12 @@ void CheckLoading(CheckContext& context) {
         const std::uint64_t before = LiveBlocks();
         Require(visit.Pay(context.libraryPath, 0), "there is no library");
         Require(visit.Count() > 0, "no allocation is seen: the check is blind");
-        // Buffers that a linked library keeps for its frames come in the first round.
+        // A linked library allocates the buffers that it keeps for its frames in the first round.
         if (round > 0) Require(LiveBlocks() <= before + BlocksKept(), "blocks are lost");
         if (round == kSettled) settled = FiguresNow();
     }
     SetPlace("%d rounds", rounds);
-    // Natively each library object leaves its settings.
+    // Natively the settings of each library object stay allocated.
     const std::int64_t perRound = IsModule() ? 0 : 8 * 1024;
     RequireNoGrowth(settled, FiguresNow(), 256 * 1024 + perRound * rounds);
 }
@@ -139,8 +139,8 @@ std::uint64_t CountFrame(IVideoEffect& effect, IVideoHost& host, const FrameReco
 
 }  // namespace
 
-// A frame works in buffers that the library keeps from frame to frame. Only a frame that is rendered in place takes a copy
-// of its source for itself, when the picture moves over itself.
+// A frame works in buffers that the library keeps between frames. Only a frame that is rendered in place allocates a
+// copy of its source, when the picture moves over itself.
 void CheckFrameAllocations(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
     for (const Layout& size : {Layout{320, 240}, Layout{1280, 720}, Layout{64, 64}}) {
@@ -152,7 +152,7 @@ void CheckFrameAllocations(CheckContext& context) {
             const FrameRecord from = source.Record(), to = destination.Record();
             PlayingHost host;
             ChooseFull(host, facts);
-            CountFrame(*effect, host, from, to, 0.0);  // takes the buffers
+            CountFrame(*effect, host, from, to, 0.0);  // allocates the buffers
             for (int i = 1; i < context.Rounds(12, 100); ++i) {
                 SetPlace("%s, %dx%d, frame %d", facts.name.c_str(), size.width, size.height, i);
                 ChooseFair(host, facts, context.dice);
@@ -169,7 +169,7 @@ void CheckFrameAllocations(CheckContext& context) {
     const FrameRecord pixels = bgra.Record(), groups = packed.Record();
     FrameRecord inPlace = pixels;
     inPlace.rowStep = groups.rowStep;
-    processor->ConvertBgraToYcbcr(&pixels, &inPlace, 0);  // takes its buffer
+    processor->ConvertBgraToYcbcr(&pixels, &inPlace, 0);  // allocates its buffer
     const AllocationWatch watch;
     processor->ConvertBgraToYcbcr(&pixels, &groups, 0);
     processor->ConvertYcbcrToBgra(&groups, &pixels, 0);
@@ -177,10 +177,10 @@ void CheckFrameAllocations(CheckContext& context) {
     if (watch.Count() != 0) Fail("converting allocates");
 }
 
-// Without memory a frame may lack a stage, but it stays within its rectangle, and with memory again it is whole.
+// Without memory a frame may lack a stage, but it stays within its rectangle. Once memory is back it is complete.
 void CheckFrameFailures(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
-    std::int32_t width = 1400;  // wider each time, so that kept buffers do not do
+    std::int32_t width = 1400;  // wider each time, so that the kept buffers are too small
     for (std::uint32_t index = 0; index < kEffectCount; ++index) {
         const Reference<IVideoEffect> effect = library.Effect(index);
         const EffectFacts facts = EffectFacts::Of(*effect);
@@ -211,7 +211,7 @@ void CheckFrameFailures(CheckContext& context) {
     }
 }
 
-// Frames for a long time, with everything changing: nothing grows.
+// Many frames with everything changing: nothing may grow.
 void CheckEndurance(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
     const Layout size{640, 360};

@@ -1,4 +1,4 @@
-// The objects: exports, counts, faces, null pointers, lifetime, threads.
+// The objects: exports, counts, interfaces, null pointers, lifetime, threads.
 
 #include <cstring>
 #include <thread>

@@ -47,7 +47,7 @@ Layout RandomLayout(Dice& dice) {
     return layout;
 }
 
-// Where 32-bit pixels become 4:2:2 in the memory they lie in.
+// For converting 32-bit pixels to 4:2:2 in place.
 void ConvertInPlace(IFrameProcessor& processor, const Layout& size, Dice& dice) {
     Frame source(size), apart(size, Packing::kYcbcr);
     source.Paint(dice);
@@ -59,7 +59,8 @@ void ConvertInPlace(IFrameProcessor& processor, const Layout& size, Dice& dice) 
     out = in;
     out.rowStep = apart.Record().rowStep;
     Require(processor.ConvertBgraToYcbcr(&in, &out, 0), "refuses the frame in place");
-    const std::size_t used = apart.Size() - (size.width % 2 != 0 ? 2 : 0);  // a lone last pixel has two bytes
+    const std::size_t used =
+        apart.Size() - (size.width % 2 != 0 ? 2 : 0);  // a single last pixel takes two bytes
     Require(
         std::equal(apart.Bytes(),
                    apart.Bytes() + std::min<std::size_t>(used, 4 * static_cast<std::size_t>(size.width) / 2),

@@ -14,7 +14,8 @@
 namespace velmora::reelcheck {
 namespace {
 
-// The XML library that native systems have forgets the tree that it is reading; the product has its own, mended.
+// The system's XML library on native systems can leak the tree that it is reading; the product has its own, fixed XML
+// code.
 std::uint64_t LostByParser() noexcept {
     return IsModule() ? 0 : 1000;
 }
@@ -61,8 +62,8 @@ struct Desk {
 
     explicit Desk(const CheckContext& context) : library(context.libraryPath), saver(library.Saver()) {}
 
-    // Tries to save or load with the dialog answered by `path`; fails unless it ends with `expected` and tells the user
-    // of a failure, once.
+    // Tries to save or load with the dialog answered by `path`. Fails unless the result is `expected` and the user is
+    // told of a failure exactly once.
     void Save(const char* path, std::uint32_t effect, PresetRecord* record, std::int32_t expected,
               const char* language = nullptr) const {
         const DialogAnswers answers(path);
@@ -120,7 +121,7 @@ void CheckPresetFiles(CheckContext& context) {
     SetPlace("hostile record");
     for (const std::int32_t count : {-1, 101, 0x7FFFFFFF, -0x7FFFFFFF - 1}) {
         PresetRecord record;
-        std::memset(&record, 0xEE, sizeof record);  // names without an end, values of no kind
+        std::memset(&record, 0xEE, sizeof record);  // unterminated names, values of no kind
         record.count = count;
         const std::string file = desk.folder.PathOf("hostile.preset");
         const DialogAnswers answers(file.c_str());
@@ -131,7 +132,7 @@ void CheckPresetFiles(CheckContext& context) {
     }
 }
 
-// A failed save says so and leaves the preset that was there; a failed load says so.
+// A failed save reports it and leaves the existing preset as it was; a failed load reports it.
 void CheckPresetFailures(CheckContext& context) {
     const Desk desk(context);
     const auto most = static_cast<std::uint64_t>(context.Rounds(150, 100000));
@@ -205,7 +206,7 @@ void CheckDialogFailures(CheckContext& context) {
     tryDialog("options", [&] { return services->ShowOptions(nullptr); });
 }
 
-// The system's own dialogs, which really appear.
+// Uses the system's own dialogs, which really appear.
 void CheckSystemDialogs(CheckContext& context) {
     if (!IsModule()) return;
     const Desk desk(context);

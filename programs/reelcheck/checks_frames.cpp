@@ -11,7 +11,7 @@
 namespace velmora::reelcheck {
 namespace {
 
-// Runs `check` for each effect with its host set to everything on.
+// Runs `check` for each effect, with everything turned on in its host.
 template <typename Visit>
 void ForEachEffect(CheckContext& context, Visit&& check) {
     const OpenLibrary library(context.libraryPath);
@@ -80,7 +80,7 @@ void CheckSmallSizes(CheckContext& context) {
                 }
             }
         }
-        // One is larger than the other.
+        // Source and destination of different sizes.
         for (const auto& [a, b] :
              {std::pair(Layout{1, 9}, Layout{33, 2}), std::pair(Layout{64, 1}, Layout{7, 20})}) {
             RenderShape(effect, facts, host, a, b, 1.0, context.dice);
@@ -123,7 +123,7 @@ void CheckRefusedFrames(CheckContext& context) {
             SetPlace("%s, %s", facts.name.c_str(), fault.name);
             FrameRecord bad = good;
             fault.spoil(bad);
-            // With a narrow counterpart the processed size stays small: the record itself must be judged.
+            // With a narrow counterpart the processed size stays small, so the record itself must be validated.
             Require(!Process(effect, &host, bad, good, 1.0), "is taken as a source");
             Require(!Process(effect, &host, good, bad, 1.0), "is taken as a destination");
             Require(!Process(effect, &host, bad, bad, 1.0), "is taken as both");

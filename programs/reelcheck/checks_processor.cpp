@@ -1,4 +1,4 @@
-// The processor as callers leave it: floating-point control, direction flag, stack.
+// Processor state as callers may leave it: floating-point control, direction flag, stack.
 
 #include <vector>
 
@@ -24,7 +24,7 @@ constexpr NamedState kStates[] = {
     {"all of it", {0x0C40, 0xE040, true}},
 };
 
-// What a caller can do with a library object and what it gives, by slot.
+// Every operation on a library object and on what it returns, called by slot.
 class Caller {
   public:
     Caller(const ProcessorState& state, std::uint32_t shift) : m_state(state), m_shift(shift) {}
@@ -86,7 +86,7 @@ struct Pictures {
     Frame source{Layout{61, 40}}, destination{Layout{61, 40}}, packed{Layout{61, 40}, Packing::kYcbcr};
 };
 
-// One effect from its making to its end. Returns the number of its picture.
+// One effect from creation to release. Returns the digest of its picture.
 std::uint64_t TryEffect(const Caller& caller, IEffectLibrary* library, std::uint32_t index,
                         Pictures& pictures) {
     auto* const effect = caller.Object<IVideoEffect>("CreateEffect", library, kCreate, {index});
@@ -136,7 +136,7 @@ void TryProcessor(const Caller& caller, IEffectLibrary* library, Pictures& pictu
     caller.Slot("Release", saver, kDrop, {});
 }
 
-// Everything but dialogs. The numbers of the pictures.
+// Everything but dialogs. Returns the digests of the pictures.
 std::vector<std::uint64_t> TryAll(const Library& library, const Caller& caller, Pictures& pictures) {
     const auto made = caller.Export("GetEffectsLibrary", reinterpret_cast<void*>(library.getEffectsLibrary));
     auto* const object = reinterpret_cast<IEffectLibrary*>(made);

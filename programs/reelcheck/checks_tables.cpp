@@ -1,4 +1,4 @@
-// What effects tell of themselves: descriptors, presets.
+// What effects report about themselves: descriptors and presets.
 
 #include <algorithm>
 #include <cmath>
@@ -25,7 +25,7 @@ void CheckMenuItems(const ParamDescriptor& param) {
     }
 }
 
-// The value belongs to the parameter: a default, or a preset's.
+// The value is valid for the parameter; a default, or a preset's.
 void RequireFits(const ParamDescriptor& param, ValueWord value) {
     switch (param.kind) {
         case kKindSlider:
@@ -59,7 +59,7 @@ void CheckParam(const ParamDescriptor& param) {
     RequireFits(param, param.defaultValue);
 }
 
-// Groups are balanced, whatever lies in between.
+// Groups are balanced, whatever they contain.
 void CheckGroups(const EffectFacts& facts) {
     int depth = 0;
     for (const ParamDescriptor& param : facts.params) {
@@ -69,7 +69,8 @@ void CheckGroups(const EffectFacts& facts) {
     Require(depth == 0, "a group does not end");
 }
 
-// A descriptor of its own size and no more, at either edge; what an effect does not write stays as it was.
+// A descriptor in exactly its own size of memory, at either edge; fields that an effect does not write keep their
+// value.
 void CheckRecordEdges(IVideoEffect& effect, std::uint32_t count) {
     for (const Edge edge : {Edge::kFront, Edge::kBack}) {
         const GuardedMemory memory(sizeof(ParamDescriptor), edge);

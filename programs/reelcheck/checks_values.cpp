@@ -16,7 +16,7 @@ using Limits = std::numeric_limits<float>;
 
 constexpr Layout kSmall{61, 47};
 
-// One effect at work on one small picture.
+// One effect rendering one small picture.
 struct Bench {
     Reference<IVideoEffect> effect;
     EffectFacts facts;
@@ -89,7 +89,7 @@ void CheckTimes(CheckContext& context) {
                                     -1e300,
                                     1e-300,
                                     1e6,
-                                    71582788.0,  // the frame number reaches its end
+                                    71582788.0,  // the frame number reaches its maximum
                                     71582789.0,
                                     1e18,
                                     1e300,
@@ -98,7 +98,7 @@ void CheckTimes(CheckContext& context) {
                                     std::numeric_limits<double>::infinity(),
                                     -std::numeric_limits<double>::infinity(),
                                     std::numeric_limits<double>::quiet_NaN()};
-    constexpr double kLongestFrame = 5.0;  // seconds: far beyond what a small frame takes on any machine
+    constexpr double kLongestFrame = 5.0;  // seconds: far more than a small frame takes on any machine
     ForEachBench(context, [&](Bench& bench) {
         ChooseFull(bench.host, bench.facts);
         for (const double time : kTimes) {
@@ -142,7 +142,7 @@ void CheckHostileValues(CheckContext& context) {
             SetPlace("%s, round %d", bench.facts.name.c_str(), i);
             ChooseHostile(bench.host, bench.facts, context.dice);
             bench.host.answers = !context.dice.OneIn(20);
-            // Any bits at all make a time now and then.
+            // Sometimes a time of any magnitude.
             const double time = context.dice.OneIn(3)
                                     ? std::ldexp(context.dice.Unit(), context.dice.Between(-900, 900))
                                     : context.dice.Between(-1000, 1000) / 30.0;
@@ -152,8 +152,8 @@ void CheckHostileValues(CheckContext& context) {
     });
 }
 
-// Renders with other effects, at other sizes and with other values, in between: with the same frame number all of them
-// draw from the same random state, so nothing of it may show.
+// Renders with other effects, sizes and values in between. Frames with the same number all start from the same random
+// state, so none of this may show.
 void CheckAlternating(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
     std::vector<std::unique_ptr<Bench>> benches;

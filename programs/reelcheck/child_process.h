@@ -1,4 +1,4 @@
-// This program once more, in a process that may crash or hang without taking the first with it.
+// Runs this program again in a child process, which may crash or hang without affecting the parent.
 #pragma once
 
 #include <memory>
@@ -11,30 +11,30 @@ class ChildProcess {
   public:
     enum class Read { kLine, kEnd, kTimeout };
 
-    // Starts it; its standard output is read here. Throws std::runtime_error when it cannot be started.
+    // Starts the child; its standard output is read here. Throws std::runtime_error when it cannot be started.
     explicit ChildProcess(const std::vector<std::string>& arguments);
     ~ChildProcess();
     ChildProcess(const ChildProcess&) = delete;
     ChildProcess& operator=(const ChildProcess&) = delete;
 
-    // Waits for the next line of output, its end or the time given.
+    // Waits for the next line of output, for the end of output or for the time limit.
     [[nodiscard]] Read ReadLine(std::string& line, double seconds);
     void Kill();
-    // Waits for its end. Empty when it ended in order, else how it ended.
+    // Waits for the child to end. Empty when it ended normally, else how it ended.
     [[nodiscard]] std::string HowItEnded();
 
   private:
     struct System;
-    // Appends what there is within a short while; false at the end of the output.
+    // Appends what arrives within a short while; false at the end of the output.
     bool ReadSome();
 
     std::unique_ptr<System> m_system;
     std::string m_read;
 };
 
-// In the child: crashes end the process with a line "crash TEXT" on standard output.
+// In the child: a crash ends the process with a line "crash TEXT" on standard output.
 void ReportCrashes();
-// In the child: writes a line to standard output at once, also from a crash.
+// In the child: writes a line to standard output at once, even while crashing.
 void WriteLine(const char* text) noexcept;
 // In the child: ends the process at once.
 [[noreturn]] void EndNow(int code) noexcept;

@@ -71,7 +71,7 @@ std::string ChildProcess::HowItEnded() {
 
 extern "C" void __sanitizer_set_death_callback(void (*callback)());
 
-// The sanitizer tells of the crash itself, on the standard error output.
+// The sanitizer reports the crash itself on standard error.
 void ReportCrashes() {
     __sanitizer_set_death_callback([] {
         char line[512];

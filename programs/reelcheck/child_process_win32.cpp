@@ -47,7 +47,7 @@ ChildProcess::~ChildProcess() {
     CloseHandle(m_system->output);
 }
 
-// A pipe cannot be waited for together with a time limit: it is looked into now and then.
+// A pipe cannot be waited for with a time limit, so it is polled.
 bool ChildProcess::ReadSome() {
     DWORD waiting = 0;
     if (!PeekNamedPipe(m_system->output, nullptr, 0, nullptr, &waiting, nullptr)) return false;
@@ -75,7 +75,7 @@ std::string ChildProcess::HowItEnded() {
 
 namespace {
 
-// "name.dll+0x1234": what a map of the module turns into a function.
+// "name.dll+0x1234", which can be looked up in the module's map file.
 void DescribeAddress(const void* address, char* text, std::size_t size) {
     HMODULE module = nullptr;
     char path[MAX_PATH] = "?";
@@ -104,7 +104,7 @@ LONG WINAPI OnException(EXCEPTION_POINTERS* pointers) {
     EndNow(3);
 }
 
-// A library that ends in std::terminate comes here: it shares the C library with this program.
+// A library that ends in std::terminate gets here, because it shares the C library with this program.
 void OnAbort(int) {
     char line[512];
     std::snprintf(line, sizeof line, "crash %s: aborted\n", Place());

@@ -20,14 +20,14 @@ double SecondsSince(Clock::time_point start) {
     return std::chrono::duration<double>(Clock::now() - start).count();
 }
 
-// The check's end that has not been reached, as seconds of the clock; 0 between checks.
+// The current check's deadline in seconds of the clock; 0 between checks.
 std::atomic<std::int64_t> g_deadline{0};
 
 std::int64_t Now() {
     return std::chrono::duration_cast<std::chrono::seconds>(Clock::now().time_since_epoch()).count();
 }
 
-// Says where a check hangs: the first process could only say that it does.
+// Reports where a check hangs; the parent could only report that it does.
 void WatchDeadline() {
     for (;;) {
         std::this_thread::sleep_for(std::chrono::milliseconds(200));

@@ -1,36 +1,36 @@
-// Answers the dialogs that the library shows, in place of a user.
+// Answers the library's dialogs in place of a user.
 //
-// By stand-ins: the library asks the system, and this program answers at once. Or in the system's own dialogs, which
-// then really appear and are cancelled (Windows only).
+// Either with stand-ins, where the library calls the system and this program answers at once, or in the system's own
+// dialogs, which really appear and are cancelled (Windows only).
 #pragma once
 
 #include <string>
 
 namespace velmora::reelcheck {
 
-// Once in a process, before the library is loaded.
+// Once per process, before the library is loaded.
 void InstallDialogHooks();
 
-// While it lives, stand-ins answer.
+// Stand-ins answer during its lifetime.
 class DialogAnswers {
   public:
-    // File dialogs are answered with this path (in the system's code page); null: cancelled.
+    // File dialogs are answered with this path (in the system's code page); null cancels them.
     explicit DialogAnswers(const char* path) noexcept;
     ~DialogAnswers();
     DialogAnswers(const DialogAnswers&) = delete;
     DialogAnswers& operator=(const DialogAnswers&) = delete;
 
-    // How often a file was asked for, a message shown, another program started.
+    // How many times a file was requested, a message shown, another program started.
     [[nodiscard]] int FileDialogs() const noexcept;
     [[nodiscard]] int Messages() const noexcept;
     [[nodiscard]] int Programs() const noexcept;
 };
 
-// While it lives, every dialog of this thread that becomes active is cancelled.
+// During its lifetime, every dialog of this thread that becomes active is cancelled.
 class DialogCanceller {
   public:
     DialogCanceller() noexcept;
-    ~DialogCanceller();  // NOLINT(performance-trivially-destructible): on Windows it has something to do
+    ~DialogCanceller();  // NOLINT(performance-trivially-destructible): not trivial on Windows
     DialogCanceller(const DialogCanceller&) = delete;
     DialogCanceller& operator=(const DialogCanceller&) = delete;
 
@@ -40,7 +40,7 @@ class DialogCanceller {
     [[maybe_unused]] void* m_hook;  // null where dialogs are linked in
 };
 
-// A folder for this process's files; removed with all that is in it.
+// A folder for this process's files; removed with its contents.
 class WorkFolder {
   public:
     WorkFolder();

@@ -1,4 +1,4 @@
-// Natively the library leaves its dialogs to the program: here they are always stand-ins.
+// Natively the library leaves dialogs to the program, so here they are always stand-ins.
 
 #include <algorithm>
 #include <cstring>

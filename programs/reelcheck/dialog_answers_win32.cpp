@@ -44,7 +44,7 @@ BOOL WINAPI Execute(SHELLEXECUTEINFOW* execution) {
     return TRUE;
 }
 
-// A dialog that becomes active is cancelled when it next takes messages.
+// A dialog that becomes active is cancelled when it next processes messages.
 LRESULT CALLBACK CancelDialog(int code, WPARAM window, LPARAM data) {
     wchar_t name[16] = L"";
     const HWND active = reinterpret_cast<HWND>(window);

@@ -1,4 +1,4 @@
-// Random numbers that a printed seed brings back, the same on every system.
+// Random numbers that can be repeated from a printed seed, the same on every system.
 #pragma once
 
 #include <cstdint>
@@ -8,7 +8,7 @@ namespace velmora::reelcheck {
 
 class Dice {
   public:
-    // A sequence of its own for each name: a check draws the same whether it runs alone or behind others.
+    // Each name has its own sequence, so a check draws the same numbers whether it runs alone or after others.
     Dice(std::uint64_t seed, std::string_view name) noexcept : m_state(seed) {
         for (const char letter : name)
             m_state = (m_state ^ static_cast<unsigned char>(letter)) * 0x100000001B3u;
@@ -22,7 +22,7 @@ class Dice {
         return x ^ x >> 31;
     }
     std::uint32_t Word() noexcept { return static_cast<std::uint32_t>(Bits() >> 32); }
-    // From `lowest` to `highest`, both included.
+    // From `lowest` to `highest` inclusive.
     std::int32_t Between(std::int32_t lowest, std::int32_t highest) noexcept {
         const auto count = static_cast<std::uint64_t>(std::int64_t{highest} - lowest + 1);
         return static_cast<std::int32_t>(lowest + static_cast<std::int64_t>(Bits() % count));

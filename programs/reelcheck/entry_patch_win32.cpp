@@ -9,7 +9,7 @@
 namespace velmora::reelcheck {
 namespace {
 
-// The place of an export's offset in the module's table; null when there is no such name.
+// Where the module's table holds an export's offset; null when there is no such name.
 DWORD* EntryOf(std::uint8_t* base, const char* wanted) {
     const auto* const dos = reinterpret_cast<const IMAGE_DOS_HEADER*>(base);
     const auto* const headers = reinterpret_cast<const IMAGE_NT_HEADERS32*>(base + dos->e_lfanew);
@@ -28,7 +28,7 @@ DWORD* EntryOf(std::uint8_t* base, const char* wanted) {
 
 void* ReplaceExport(const wchar_t* module, const char* name, void* replacement) {
     auto* const base =
-        reinterpret_cast<std::uint8_t*>(LoadLibraryW(module));  // kept: others hold its functions
+        reinterpret_cast<std::uint8_t*>(LoadLibraryW(module));  // never freed: others hold its functions
     DWORD* const entry = base != nullptr ? EntryOf(base, name) : nullptr;
     DWORD protection = 0;
     if (entry == nullptr || !VirtualProtect(entry, sizeof *entry, PAGE_READWRITE, &protection)) {

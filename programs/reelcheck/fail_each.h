@@ -1,4 +1,4 @@
-// Has every allocation of a piece of work fail once.
+// Makes every allocation of an operation fail once.
 #pragma once
 
 #include <algorithm>
@@ -9,11 +9,12 @@
 
 namespace velmora::reelcheck {
 
-// What GetEffectsLibrary makes for each library object and keeps for the process: a list and its 33 entries.
+// What GetEffectsLibrary allocates for each library object and keeps until the process ends: a list and its 33
+// entries.
 inline constexpr std::uint64_t kBlocksOfSettings = 34;
 
-// Runs twice, as the C++ runtime keeps some memory from the first time that it needs it: the second time no more than
-// `kept` blocks may stay. Returns what `run` does.
+// Runs twice, because the C++ runtime keeps some memory after its first use: the second run may leave at most `kept`
+// blocks. Returns the result of `run`.
 template <typename Run>
 std::uint64_t RunTwice(Run&& run, std::uint64_t failing, std::uint64_t kept) {
     run(failing);
@@ -26,9 +27,9 @@ std::uint64_t RunTwice(Run&& run, std::uint64_t failing, std::uint64_t kept) {
     return count;
 }
 
-// `run(failing)` does the work under an AllocationWatch(failing), judges what came of it and returns how many
-// allocations it saw. First it runs without a failure, then for each allocation: for the first ones and some of the others
-// when there are more than `most`.
+// `run(failing)` does the work under an AllocationWatch(failing), checks the result and returns how many allocations
+// it saw. It runs first without a failure, then once for each allocation: when there are more than `most`, for the
+// first ones and a sample of the rest.
 template <typename Run>
 void FailEach(CheckContext& context, const char* what, std::uint64_t most, std::uint64_t kept, Run&& run) {
     SetPlace("%s, with all memory", what);

@@ -26,7 +26,7 @@ bool AreAll(const std::uint8_t* begin, const std::uint8_t* end, std::uint8_t val
            (*begin == value && std::memcmp(begin, begin + 1, static_cast<std::size_t>(end - begin) - 1) == 0);
 }
 
-// One byte per column and row from a few kinds of stripes, so that neither every pixel is noise nor every one smooth.
+// One byte per column and row from a few kinds of stripes, so that the picture is neither all noise nor all smooth.
 void PaintRow(std::uint8_t* row, std::size_t bytes, std::size_t y, Dice& dice) noexcept {
     static constexpr std::uint8_t kExtremes[] = {0, 255, 1, 254, 128};
     for (std::size_t x = 0; x < bytes;) {

@@ -14,7 +14,7 @@ struct Layout {
     std::int32_t height = 1;
     std::int32_t xOrigin = 0;
     std::int32_t yOrigin = 0;
-    std::int32_t padding = 0;  // bytes behind each row but the last
+    std::int32_t padding = 0;  // bytes after each row but the last
     bool bottomUp = false;
     Edge edge = Edge::kBack;
 };
@@ -26,26 +26,26 @@ class Frame {
   public:
     explicit Frame(const Layout& layout, Packing packing = Packing::kBgra);
 
-    // Every byte of the buffer: a picture with edges, gradients, noise, and pixels that are black, white or full.
+    // Fills the whole buffer: a picture with edges, gradients, noise, and black, white and fully opaque pixels.
     void Paint(Dice& dice);
     void Fill(std::uint8_t value);
-    // For a source: a write ends the process.
+    // For a source: a write then ends the process.
     void ForbidWriting() noexcept { m_memory.ForbidWriting(); }
 
     [[nodiscard]] FrameRecord Record() const noexcept;
-    // A frame of another shape in this one's memory, `offset` bytes in.
+    // A frame of another shape in the same memory, `offset` bytes in.
     [[nodiscard]] FrameRecord RecordAt(std::int32_t offset, const Layout& layout) const noexcept;
     [[nodiscard]] const Layout& Shape() const noexcept { return m_layout; }
     [[nodiscard]] std::int32_t Step() const noexcept { return m_step; }
     [[nodiscard]] std::uint8_t* Bytes() const noexcept { return m_memory.Data(); }
     [[nodiscard]] std::size_t Size() const noexcept { return m_memory.Size(); }
 
-    // A number of the picture in the region's left top width x height pixels.
+    // A digest of the picture in the top left width x height pixels of the region.
     [[nodiscard]] std::uint64_t Digest(std::int32_t width, std::int32_t height) const noexcept;
     [[nodiscard]] std::uint64_t Digest() const noexcept { return Digest(m_layout.width, m_layout.height); }
-    // After Fill(value): whether everything outside those pixels still has it.
+    // After Fill(value): whether everything outside those pixels still has that value.
     [[nodiscard]] bool OnlyInside(std::int32_t width, std::int32_t height, std::uint8_t value) const noexcept;
-    // Takes another frame's region of the same size.
+    // Copies another frame's region of the same size.
     void CopyRegion(const Frame& from) noexcept;
 
   private:

@@ -1,4 +1,4 @@
-// Memory between two pages that nobody may touch: one byte too far ends the process, which is reported.
+// Memory between two inaccessible pages: an access one byte out of bounds ends the process, which is reported.
 #pragma once
 
 #include <cstddef>
@@ -6,7 +6,7 @@
 
 namespace velmora::reelcheck {
 
-// The side on which the memory ends exactly at its forbidden page; on the other side lies the rest of a page.
+// The side on which the memory ends exactly at its guard page; on the other side the rest of a page follows.
 enum class Edge { kFront, kBack };
 
 class GuardedMemory {
@@ -19,12 +19,12 @@ class GuardedMemory {
 
     [[nodiscard]] std::uint8_t* Data() const noexcept { return m_data; }
     [[nodiscard]] std::size_t Size() const noexcept { return m_size; }
-    // From now on a write ends the process as well.
+    // From now on a write ends the process too.
     void ForbidWriting() noexcept;
 
   private:
-    std::uint8_t* m_pages = nullptr;  // the first forbidden one
-    std::size_t m_inner = 0;          // bytes between the two
+    std::uint8_t* m_pages = nullptr;  // the first guard page
+    std::size_t m_inner = 0;          // bytes between the guard pages
     std::uint8_t* m_data = nullptr;
     std::size_t m_size;
 };

@@ -1,5 +1,5 @@
-// The library as a host has it: on Windows loaded from its file and used through its exports alone, natively linked
-// into this program.
+// The library as a host uses it: on Windows loaded from its file and called through its exports alone, natively
+// linked into this program.
 #pragma once
 
 #include <memory>
@@ -9,16 +9,16 @@
 
 namespace velmora::reelcheck {
 
-// Loaded once: unloads when it goes. Everything that came out of it must be released before.
+// Unloads the library in the destructor. Everything obtained from it must be released first.
 class Library {
   public:
-    // An empty path means the library beside this program. Throws CheckFailed when it cannot be loaded.
+    // An empty path means the library next to this program. Throws CheckFailed when it cannot be loaded.
     explicit Library(const std::string& path);
     ~Library();
     Library(const Library&) = delete;
     Library& operator=(const Library&) = delete;
 
-    // For a load that may fail: no library then, and nothing is thrown.
+    // For a load that may fail: returns null instead of throwing.
     [[nodiscard]] static std::unique_ptr<Library> TryLoad(const std::string& path);
 
     GetEffectsLibraryFunction getEffectsLibrary = nullptr;
@@ -33,17 +33,17 @@ class Library {
     void* m_module = nullptr;
 };
 
-// Loading and unloading is a matter of modules only where the library is one.
+// Whether the library is a module, which can be loaded and unloaded.
 [[nodiscard]] bool IsModule() noexcept;
 
-// A library object of a loaded library, for the checks that need no more.
+// A library object of a loaded library, for checks that need nothing else.
 class OpenLibrary {
   public:
     explicit OpenLibrary(const std::string& path) : m_library(path), m_object(m_library.Open()) {}
 
     IEffectLibrary* operator->() const noexcept { return m_object.Get(); }
     [[nodiscard]] IEffectLibrary* Get() const noexcept { return m_object.Get(); }
-    // Lets the library object go; what it created may stay.
+    // Releases the library object; objects it created may stay.
     void Close() noexcept { m_object.Reset(); }
     // Throws CheckFailed when there is none.
     [[nodiscard]] Reference<IVideoEffect> Effect(std::uint32_t index) const;

@@ -1,4 +1,4 @@
-// reelcheck: a host that does everything that a host may do to the library, and much that it should not.
+// reelcheck: a host that does everything a host may do to the library, and much that it should not.
 
 #include <cstdio>
 #include <exception>

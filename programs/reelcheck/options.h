@@ -19,18 +19,18 @@ struct Options {
     bool help = false;
     bool list = false;
     bool json = false;
-    std::optional<int> childFrom;  // set in a child: the position of its first check
+    std::optional<int> childFrom;  // set in a child: the index of its first check
 };
 
 extern const char* const kHelp;
 
 // Throws std::invalid_argument with a text for the user.
 [[nodiscard]] Options ReadOptions(int count, char** arguments);
-// The command line that makes a child of this run begin with the check at `position`.
+// The command line for a child of this run that begins with the check at `position`.
 [[nodiscard]] std::vector<std::string> ChildArguments(const Options& options, int position);
 
-// What this run does, in its order: the checks that are named, else those of its level and below. Throws
-// std::invalid_argument for a name that there is not.
+// The checks of this run, in order: those named, else those of its level and below. Throws std::invalid_argument for
+// an unknown name.
 [[nodiscard]] std::vector<const Check*> ChosenChecks(const Options& options);
 
 }  // namespace velmora::reelcheck

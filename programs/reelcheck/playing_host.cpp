@@ -9,9 +9,9 @@
 namespace velmora::reelcheck {
 namespace {
 
-constexpr std::uint32_t kMostParams = 1000;  // an effect that never says "no more" would keep us for ever
+constexpr std::uint32_t kMostParams = 1000;  // an effect that never says "no more" would never end
 
-// What a slider may be sent by a careless host.
+// What a careless host may send for a slider.
 constexpr float kHostileNumbers[] = {
     0.0f,
     -0.0f,

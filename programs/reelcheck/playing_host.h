@@ -1,4 +1,4 @@
-// The host's side of an effect at work: answers what the effect asks with values that a check chooses.
+// The host side of a running effect: answers the effect's requests with values that a check chooses.
 #pragma once
 
 #include <array>
@@ -17,38 +17,38 @@ class PlayingHost final : public PlainHost {
     static constexpr std::uint32_t kCapacity = 64;
 
     std::array<ValueWord, kCapacity> values = {};
-    bool answers = true;          // false: every question fails and no cell is written
-    bool spoilsRounding = false;  // every answer leaves other floating-point control words behind
+    bool answers = true;          // false: every request fails and no cell is written
+    bool spoilsRounding = false;  // every answer changes the floating-point control words
     std::uint32_t questions = 0;
 
     bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override;
 };
 
-// What an effect tells of itself.
+// What an effect reports about itself.
 struct EffectFacts {
     std::string name;
     std::vector<ParamDescriptor> params;
     std::vector<std::string> presets;
 
     [[nodiscard]] static EffectFacts Of(IVideoEffect& effect);
-    // The first preset of that name; throws CheckFailed when there is none.
+    // The first preset with that name; throws CheckFailed when there is none.
     [[nodiscard]] std::uint32_t Preset(const char* wanted) const;
 };
 
 [[nodiscard]] std::string ParamName(const ParamDescriptor& descriptor);
 
-// Sets of values. The effect's own preset; anything a control can show, with much of it on; anything at all.
+// Sets of values: one of the effect's own presets; values that a control can show, most of them on; arbitrary values.
 void ChoosePreset(PlayingHost& host, IVideoEffect& effect, std::uint32_t preset);
 void ChooseFair(PlayingHost& host, const EffectFacts& facts, Dice& dice);
 void ChooseHostile(PlayingHost& host, const EffectFacts& facts, Dice& dice);
-// Everything on, as far as it goes.
+// Everything on, as far as possible.
 void ChooseFull(PlayingHost& host, const EffectFacts& facts);
 
 [[nodiscard]] bool Process(IVideoEffect& effect, IVideoHost* host, const FrameRecord& source,
                            const FrameRecord& destination, double seconds);
 
-// Renders into a destination filled with a value, and fails when the effect refuses, or writes outside the smaller of
-// the two regions.
+// Renders into a destination filled with a value. Fails when the effect refuses, or writes outside the smaller of the
+// two regions.
 void RenderInside(IVideoEffect& effect, IVideoHost& host, const Frame& source, Frame& destination,
                   double seconds);
 

@@ -35,7 +35,7 @@ ProcessFigures FiguresNow() {
     PROCESS_MEMORY_COUNTERS counters = {};
     GetProcessMemoryInfo(process, &counters, sizeof counters);
     figures.memoryBytes = static_cast<std::int64_t>(counters.PagefileUsage);
-    const DWORD slot = TlsAlloc();  // the lowest that is free
+    const DWORD slot = TlsAlloc();  // the lowest free slot
     figures.threadSlots = slot;
     if (slot != TLS_OUT_OF_INDEXES) TlsFree(slot);
     figures.windowObjects = GetGuiResources(process, GR_USEROBJECTS);

@@ -10,10 +10,10 @@ constexpr std::uint32_t kExceptionBits = 0x3F;
 constexpr std::uint32_t kDirectionFlag = 0x400;
 constexpr std::size_t kMostWords = 6;
 
-// What the assembler code below reads and writes, by offset.
+// Read and written by the assembler code below, by offset.
 struct Block {
     void* function;
-    const std::uintptr_t* end;  // behind the last word
+    const std::uintptr_t* end;  // one past the last word
     std::uintptr_t count;
     std::uintptr_t adjust;
     std::uintptr_t value;
@@ -33,7 +33,7 @@ static_assert(offsetof(Block, value) == 16 && offsetof(Block, vectorControl) == 
               offsetof(Block, x87Control) == 36 && offsetof(Block, x87After) == 40 &&
               offsetof(Block, usualVector) == 68 && offsetof(Block, usualX87) == 72);
 
-// __stdcall: the words lie on the stack, the callee takes them away.
+// __stdcall: the words are passed on the stack and the callee removes them.
 void Run(Block& block) noexcept {
     __asm__ __volatile__(
         "movl %%esp, %%edi\n\t"
@@ -76,7 +76,7 @@ static_assert(offsetof(Block, value) == 32 && offsetof(Block, flags) == 40 &&
               offsetof(Block, x87Control) == 64 && offsetof(Block, x87After) == 68 &&
               offsetof(Block, usualVector) == 96 && offsetof(Block, usualX87) == 100);
 
-// The words go in registers; below the stack pointer lies what the compiler keeps there, hence the distance.
+// The words are passed in registers. The compiler may keep data below the stack pointer, hence the distance.
 void Run(Block& block) noexcept {
     __asm__ __volatile__(
         "movq %%rsp, %%r12\n\t"
@@ -118,7 +118,7 @@ RawResult Call(void* function, const std::uintptr_t (&words)[kMostWords], std::s
                const ProcessorState& state, std::uint32_t shift) {
     Block block = {};
     block.function = function;
-    // Registers are loaded from all six places, the stack from those that are words.
+    // Registers are always loaded from all six words; the stack only takes the words in use.
     block.end = words + (sizeof(void*) == 4 ? count : kMostWords);
     block.count = count;
     block.adjust = shift + 16 - 4 * count % 16;

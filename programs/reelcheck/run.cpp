@@ -17,7 +17,7 @@ struct Result {
     const Check* check;
     bool passed = false;
     double seconds = 0;
-    std::string text;  // of a failure
+    std::string text;  // for a failure
 };
 
 void PrintResult(const Result& result) {
@@ -47,7 +47,7 @@ void PrintJson(const Options& options, const std::vector<Result>& results, int f
     std::printf("  ],\n  \"failures\": %d,\n  \"seconds\": %.1f\n}\n", failures, seconds);
 }
 
-// Follows children through the checks: one that dies loses its check and leaves the rest to the next.
+// Follows children through the checks. A child that dies fails its check, and the next child runs the rest.
 class Follower {
   public:
     Follower(const Options& options, const std::vector<const Check*>& checks)
@@ -64,7 +64,7 @@ class Follower {
         ChildProcess child(ChildArguments(m_options, static_cast<int>(first)));
         std::string line, crash;
         auto read = ChildProcess::Read::kLine;
-        // The child watches the time by itself; this is for one that no longer can.
+        // The child has its own time limit; this one is for a child that can no longer enforce it.
         while ((read = child.ReadLine(line, m_options.timeoutSeconds + 10.0)) == ChildProcess::Read::kLine) {
             TakeLine(line, crash);
         }
@@ -77,7 +77,7 @@ class Follower {
         if (m_results.size() < m_checks.size()) {
             Add({m_checks[m_results.size()], false, 0.0, crash});
         } else if (!ended.empty()) {
-            // Behind the last check: a tool that looks for leaks speaks up then.
+            // After the last check: this is when a leak detector reports.
             m_results.back().passed = false;
             m_results.back().text = crash;
             if (!m_options.json) PrintResult(m_results.back());

@@ -1,16 +1,16 @@
-// The checks are run in children; the first process follows them and prints what they report.
+// The checks run in child processes; the parent follows them and prints what they report.
 #pragma once
 
 #include "programs/reelcheck/options.h"
 
 namespace velmora::reelcheck {
 
-// One line a check, then one for all; or all as JSON. True when every check passed.
+// Prints one line per check and a final one; or everything as JSON. True when every check passed.
 [[nodiscard]] bool RunChecks(const Options& options);
 
-// The child's part: runs checks and tells of each on standard output.
+// The child's part: runs checks and reports each one on standard output.
 //
-// Runs the chosen checks from options.childFrom on. Lines, one for each event:
+// Runs the selected checks from options.childFrom on. Lines, one per event:
 //
 //   begin
 //   ok SECONDS

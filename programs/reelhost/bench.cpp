@@ -52,7 +52,7 @@ PairedTimes MeasureJumps(EffectRun& run, FramePool& pool) {
     return times;
 }
 
-// The 4:2:2 frame lies in the first half of its buffer.
+// The 4:2:2 frame uses the first half of its buffer.
 PairedTimes MeasureConversion(IFrameProcessor& processor, FramePool& pool, bool toBgra) {
     constexpr int kFrames = 120;
     PairedTimes times;

@@ -1,5 +1,5 @@
-// Frames from one stream and to another: raw BGRA, or YUV4MPEG2 where no size is given. The streams are binary and
-// stay the caller's.
+// Reads frames from one stream and writes them to another: raw BGRA, or YUV4MPEG2 where no size is given. The streams
+// are binary and belong to the caller.
 #pragma once
 
 #include <cstdint>
@@ -15,7 +15,7 @@ namespace velmora::hosts {
 
 class FrameInput {
   public:
-    // `rawSize` none: reads a YUV4MPEG2 header, which tells size and rate. Throws UsageError when there is none.
+    // Without `rawSize`, reads a YUV4MPEG2 header for size and rate. Throws UsageError when there is none.
     FrameInput(std::FILE* file, std::optional<FrameSize> rawSize, std::optional<FrameRate> rate,
                std::optional<Y4mMatrix> matrix);
 
@@ -41,7 +41,7 @@ class FrameInput {
 class FrameOutput {
   public:
     FrameOutput(std::FILE* file, const FrameInput& input);
-    // Throws std::runtime_error when the stream does not take the frame.
+    // Throws std::runtime_error when the frame cannot be written.
     void Write(const std::vector<std::uint8_t>& bgra);
     void Finish();
 

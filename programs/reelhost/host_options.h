@@ -15,8 +15,8 @@ enum class HostMode { kRender, kList, kAllPresets, kBench, kSoak, kHelp };
 
 struct HostOptions {
     HostMode mode = HostMode::kRender;
-    std::string dll;     // empty: beside the program
-    std::string effect;  // kAllPresets: may be "all"
+    std::string dll;     // empty: next to the program
+    std::string effect;  // may be "all" for kAllPresets
     std::optional<std::string> preset;
     std::vector<std::string> settings;
     std::optional<FrameSize> size;  // raw BGRA

@@ -1,4 +1,4 @@
-// reelhost: a host of the library as small as one can be. It renders what it is given through the real DLL.
+// reelhost: a minimal host of the library. It renders its input through the real DLL.
 
 #include <cstdio>
 #include <exception>

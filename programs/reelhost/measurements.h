@@ -1,5 +1,5 @@
-// What a frame costs through the DLL, beside a memcpy of one (bench.cpp); and whether an hour of film through one loaded
-// library costs at the end what it cost at the beginning (soak.cpp).
+// What a frame costs through the DLL compared with a memcpy of it (bench.cpp), and whether an hour of film through
+// one loaded library costs as much at the end as at the beginning (soak.cpp).
 #pragma once
 
 #include <cstdint>
@@ -11,10 +11,10 @@ namespace velmora::hosts {
 // Prints a Markdown table to standard output. Throws std::runtime_error when an effect refuses a frame.
 void PrintBench(const EffectLibrary& library);
 
-// Renders at least `frames` frames of 1920x1080, 30 to the second of film, in rounds through every preset of every
-// effect, each with an effect object of its own. Prints what the process holds and what a frame costs after each
-// round, and a verdict in the last line. True when memory, handles and, in a run of 16 rounds and more, cost stayed
-// where they were. Throws std::runtime_error when an effect refuses a frame.
+// Renders at least `frames` frames of 1920x1080 at 30 frames per second, in rounds through every preset of every
+// effect, each with its own effect object. After each round, prints what the process holds and what a frame costs;
+// the last line is a verdict. True when memory and handles did not grow and, in a run of 16 or more rounds, neither
+// did the cost. Throws std::runtime_error when an effect refuses a frame.
 bool RunSoak(const EffectLibrary& library, std::int64_t frames);
 
 }  // namespace velmora::hosts

@@ -12,8 +12,8 @@ namespace {
 constexpr std::int32_t kSide = 64;  // of a probe frame; more than twice the jitter
 constexpr std::int32_t kLargestShift = 10;
 constexpr std::size_t kProbes = 6;                   // 21^12 combinations against 2^32 states
-constexpr std::int64_t kFirstProbeNumber = 1000000;  // repeats no number of a real frame
-// No frame draws as much; the search between two calls goes no further.
+constexpr std::int64_t kFirstProbeNumber = 1000000;  // never the number of a real frame
+// No frame draws this many; the search between two calls stops here.
 constexpr std::uint32_t kMostDraws = 20000000;
 
 std::vector<std::uint8_t> CoordinatePicture() {
@@ -60,12 +60,12 @@ std::uint32_t RandomStateFinder::Find() {
         for (const Shift& shift : seen) {
             if (random.Draw(-kLargestShift, kLargestShift) != shift.down) return std::nullopt;
             if (random.Draw(-kLargestShift, kLargestShift) != shift.right) return std::nullopt;
-            random.Next();  // every frame draws once for the wear, also without any
+            random.Next();  // every frame draws once for wear, even without any
         }
         return random.State();
     };
     render::Random past(m_lastState);
-    // One tick more on either side: the counter's steps are coarse. Unsigned, since it wraps.
+    // One tick more on either side, since the counter is coarse. Unsigned, since it wraps.
     const std::uint32_t first = m_tickBefore - 1, ticks = m_tickAfter - m_tickBefore + 3;
     const std::uint32_t candidates = m_isFound ? kMostDraws : ticks;
     for (std::uint32_t i = 0; i < candidates; ++i) {

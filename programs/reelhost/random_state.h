@@ -1,8 +1,8 @@
-// Finds out where the library's random sequence stands, so that another host can play the same damage.
+// Finds the current state of the library's random sequence, so that another host can render the same damage.
 //
-// The sequence begins with the system's tick count while the library is loaded; the library does not tell it.
-// A few frames with the strongest jitter show pairs of numbers drawn; of the states that are possible only
-// one draws them all.
+// The sequence is seeded with the system's tick count when the library is loaded, and the library does not expose it.
+// A few frames with the strongest jitter reveal pairs of drawn numbers; only one of the possible states draws them
+// all.
 #pragma once
 
 #include <cstdint>
@@ -16,8 +16,8 @@ class RandomStateFinder {
   public:
     explicit RandomStateFinder(const EffectLibrary& library);
 
-    // The state that the next frame starts from, provided its frame number is below a million. Moves the
-    // sequence on by a few draws. Throws std::runtime_error when no state fits.
+    // The state that the next frame starts from, provided its frame number is below a million. Advances the sequence
+    // by a few draws. Throws std::runtime_error when no state fits.
     std::uint32_t Find();
 
   private:

@@ -18,21 +18,21 @@ namespace {
 using Clock = std::chrono::steady_clock;
 
 constexpr FrameRate kRate = {30, 1};
-// Enough frames of a preset for a lower quartile, and enough rounds for a trend.
+// Enough frames of each preset for a lower quartile, and enough rounds for a trend.
 constexpr std::int64_t kMostFramesOfPreset = 40, kRounds = 32;
-// A leak of 16 bytes a frame, or of a handle a round, is far beyond these in an hour.
+// In an hour, a leak of 16 bytes a frame or of a handle a round goes far beyond these.
 constexpr std::size_t kMemoryTolerance = std::size_t{512} << 10;
 constexpr std::size_t kHandleTolerance = 1;
 constexpr std::size_t kLeastRoundsForCost = 16;
 constexpr double kCostTolerance = 1.2;
 
 struct Sample {
-    double frameMs = 0;      // the mean over the presets of each one's lower quartile
-    double processorMs = 0;  // the mean of what the frames took of a processor, whoever else wanted it
+    double frameMs = 0;      // the mean of the presets' lower quartiles
+    double processorMs = 0;  // mean processor time per frame, whatever else was running
     std::size_t workingSet = 0, privateBytes = 0, handles = 0, drawingObjects = 0;
 };
 
-// What is committed for this process alone. The system's own counter is not kept by all systems.
+// Memory committed for this process alone. Not every system maintains its own counter of this.
 std::size_t PrivateBytes() {
     std::size_t bytes = 0;
     MEMORY_BASIC_INFORMATION range = {};
@@ -43,7 +43,7 @@ std::size_t PrivateBytes() {
     return bytes;
 }
 
-// Counted one by one, each a multiple of 4, for the same reason.
+// Counted one by one for the same reason. Handles are multiples of 4.
 std::size_t Handles() {
     constexpr std::uintptr_t kMostHandles = 16384;
     std::size_t count = 0;
@@ -54,7 +54,7 @@ std::size_t Handles() {
     return count;
 }
 
-// The number of a new one: it grows when others stay.
+// The number of a new object; it grows when others leak.
 std::size_t DrawingObjects() {
     const HBRUSH brush = CreateSolidBrush(RGB(1, 2, 3));
     DeleteObject(brush);
@@ -92,7 +92,8 @@ class Soak {
   private:
     void Round();
     double FrameMs(std::uint32_t effect, std::uint32_t preset);
-    // The largest of a quarter of the run: the first one behind the round that fills the caches, or the last.
+    // The largest value in a quarter of the run: the first quarter after the round that fills the caches, or the
+    // last.
     template <typename Member>
     [[nodiscard]] Member Largest(Member Sample::*member, bool atEnd) const {
         const auto quarter = static_cast<std::ptrdiff_t>(std::max<std::size_t>(m_samples.size() / 4, 1));

@@ -1,4 +1,4 @@
-// reelview: the library's effects on a picture or a film, with all their knobs.
+// reelview: applies the library's effects to a picture or a film, with all their controls.
 
 #include <windows.h>
 #include <commctrl.h>
@@ -26,7 +26,7 @@ std::vector<std::u16string> Arguments() {
     return arguments;
 }
 
-// Without a library there are no texts but the English ones.
+// Without a library the only texts are the English ones.
 int Complain(const char* key) {
     const Texts texts(nullptr, "en");
     MessageBoxW(nullptr, texts(key).c_str(), kProgramName, MB_OK | MB_ICONERROR);
@@ -63,6 +63,6 @@ int Run(int show) {
 
 int WINAPI wWinMain(HINSTANCE, HINSTANCE, LPWSTR, int show) {
     const int result = velmora::reelview::Run(show);
-    // A library that failed may hold threads or locks; nothing of ours is left to do.
+    // A library that failed may hold threads or locks, and there is nothing left to clean up.
     ExitProcess(static_cast<UINT>(result));
 }

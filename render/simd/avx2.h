@@ -11,7 +11,7 @@ constexpr std::int32_t kPixels = 4 * kBlocks;
 #undef VM_MM
 #undef VM_WHOLE
 
-// By bytes: each one of the mask is 0 or 255.
+// Bytewise; each byte of the mask is 0 or 255.
 inline Vec Select(Vec mask, Vec a, Vec b) noexcept {
     return _mm256_blendv_epi8(b, a, mask);
 }

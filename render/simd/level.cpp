@@ -6,7 +6,7 @@ namespace velmora::render {
 
 SimdLevel BestSimdLevel() noexcept {
 #if VM_IS_X86
-    // Asks the processor and whether the operating system keeps the wide registers.
+    // Checks the processor and whether the operating system saves the wide registers.
     if (__builtin_cpu_supports("avx512f") && __builtin_cpu_supports("avx512bw") &&
         __builtin_cpu_supports("avx512vl") && __builtin_cpu_supports("avx512vbmi")) {
         return SimdLevel::kAvx512;
@@ -16,7 +16,7 @@ SimdLevel BestSimdLevel() noexcept {
     if (__builtin_cpu_supports("sse2")) return SimdLevel::kSse2;
     return SimdLevel::kPlain;
 #else
-    // What the compiler was asked for is there.
+    // The instructions that the compiler was set to use are present.
     return VM_HAS_SSSE3 ? SimdLevel::kSsse3 : VM_HAS_SSE2 ? SimdLevel::kSse2 : SimdLevel::kPlain;
 #endif
 }

@@ -1,9 +1,9 @@
-// The SIMD levels at which the pixel kernels exist. The plain level is the authority; the others give its bytes.
+// The SIMD levels of the pixel kernels. The plain level is the reference; the others give the same bytes.
 #pragma once
 
 namespace velmora::render {
 
-// A processor of a level also runs the levels before it.
+// A processor that supports a level also supports the levels before it.
 enum class SimdLevel {
     kPlain,
     kSse2,

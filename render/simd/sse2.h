@@ -11,7 +11,7 @@ constexpr std::int32_t kPixels = 4 * kBlocks;  // in a vector
 #undef VM_MM
 #undef VM_WHOLE
 
-// The bits of `a` where the mask's are set, else those of `b`.
+// The bits of `a` where those of the mask are set, else those of `b`.
 inline Vec Select(Vec mask, Vec a, Vec b) noexcept {
     return Or(And(mask, a), AndNot(mask, b));
 }
@@ -19,7 +19,7 @@ inline Vec Select(Vec mask, Vec a, Vec b) noexcept {
 inline Vec EachBlock(std::int64_t low, std::int64_t high) noexcept {
     return _mm_set_epi64x(high, low);
 }
-// The block's index in all its 16-bit numbers.
+// Each block's index in all of its 16-bit numbers.
 inline Vec BlockIndex16() noexcept {
     return Zero();
 }
@@ -29,7 +29,7 @@ template <int a, int b, int c, int d>
 inline Vec Shuffle16(Vec v) noexcept {
     return _mm_shufflehi_epi16(_mm_shufflelo_epi16(v, _MM_SHUFFLE(d, c, b, a)), _MM_SHUFFLE(d, c, b, a));
 }
-// Each two neighbours of 32 bits in turn.
+// Swaps the two 32-bit numbers of each pair.
 inline Vec SwapPairs32(Vec v) noexcept {
     return _mm_shuffle_epi32(v, _MM_SHUFFLE(2, 3, 0, 1));
 }
@@ -43,14 +43,14 @@ inline Vec Odd32(Vec a, Vec b) noexcept {
         _mm_shuffle_ps(_mm_castsi128_ps(a), _mm_castsi128_ps(b), _MM_SHUFFLE(3, 1, 3, 1)));
 }
 
-// Memory needs no alignment unless it is said.
+// Memory needs no alignment unless stated.
 inline Vec Load(const void* from) noexcept {
     return _mm_loadu_si128(static_cast<const __m128i*>(from));
 }
 inline void Store(void* to, Vec v) noexcept {
     _mm_storeu_si128(static_cast<__m128i*>(to), v);
 }
-// The first `count` pixels, fewer than a vector has; the others are black or stay as they are.
+// The first `count` pixels, fewer than a vector has. Loading sets the others to 0, storing leaves them unchanged.
 inline Vec LoadPart(const Bgra* from, std::int32_t count) noexcept {
     Bgra pixels[kPixels] = {};
     std::copy(from, from + count, pixels);
@@ -61,12 +61,12 @@ inline void StorePart(Bgra* to, std::int32_t count, Vec v) noexcept {
     Store(pixels, v);
     std::copy(pixels, pixels + count, to);
 }
-// The vector's 32-bit numbers before `place`, those from memory from there on.
+// The vector's 32-bit numbers before `place`, then those from memory.
 inline Vec LoadFrom(std::int32_t place, const void* from, Vec before) noexcept {
     const Vec theirs = _mm_cmplt_epi32(_mm_setr_epi32(0, 1, 2, 3), _mm_set1_epi32(place));
     return Select(theirs, before, Load(from));
 }
-// To a multiple of the vector's size, past the caches.
+// Stores to an address aligned to the vector's size, bypassing the caches.
 inline void Stream(void* to, Vec v) noexcept {
     _mm_stream_si128(static_cast<__m128i*>(to), v);
 }

@@ -1,8 +1,8 @@
 // Which SIMD levels this build has, and how the file of a level is compiled for its instructions.
 //
-// Such a file includes all its other headers first. Between VM_BEGIN_TARGET and VM_END_TARGET stand functions in an
-// unnamed namespace only: an inline function of a header that is compiled there could be the copy that the linker
-// takes for the whole program, which would then stop on processors without the instructions.
+// Such a file includes all its other headers first. Only functions in an unnamed namespace go between VM_BEGIN_TARGET
+// and VM_END_TARGET: the linker could pick the copy of a header's inline function compiled there for the whole program,
+// which would then crash on processors without the instructions.
 #pragma once
 
 #if defined(__i386__) || defined(__x86_64__)
@@ -10,7 +10,7 @@
 #include <immintrin.h>
 #else
 #define VM_IS_X86 0
-// WebAssembly's compiler maps these levels onto its own vectors, when it is asked to.
+// The WebAssembly compiler maps these levels onto its own vectors if enabled.
 #if defined(__SSSE3__)
 #include <tmmintrin.h>
 #elif defined(__SSE2__)
@@ -32,9 +32,9 @@
 #define VM_HAS_AVX512 VM_IS_X86
 
 #define VM_PRAGMA(text) _Pragma(#text)
-// For what keeps its state in registers only when it is inlined.
+// For functions that keep their state in registers only if inlined.
 #define VM_ALWAYS_INLINE __attribute__((always_inline)) inline
-// Before a loop whose steps depend on each other so that unrolling only costs registers.
+// For a loop whose steps depend on each other, so that unrolling only costs registers.
 #if defined(__clang__)
 #define VM_DO_NOT_UNROLL VM_PRAGMA(clang loop unroll(disable))
 #else
@@ -50,7 +50,7 @@
 #define VM_END_TARGET VM_PRAGMA(clang attribute pop)
 #else
 // To the end of the file, where templates of the level are instantiated. Those of the standard library are not
-// affected: a template is compiled for the target that stood where it was defined.
+// affected: a template is compiled for the target in effect where it was defined.
 #define VM_BEGIN_TARGET(instructions) VM_PRAGMA(GCC target(instructions))
 #define VM_END_TARGET
 #endif

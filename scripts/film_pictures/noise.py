@@ -1,7 +1,7 @@
-"""Noise of chosen size, and the small helpers that the pictures are drawn with.
+"""Noise of a chosen size, and small helper functions for drawing the pictures.
 
-A field is a list of rows of numbers. All noise wraps by height and by width, so whatever is built from it tiles by
-height without a seam, and no column is special.
+A field is a list of rows of numbers. All noise wraps vertically and horizontally, so anything built from it tiles
+vertically without a seam, and no column is special.
 """
 
 import math
@@ -40,7 +40,7 @@ def standardised(values):
 
 
 def noise(seed, width, height, across, along=None):
-    """Gaussian noise whose clumps have a deviation of `across` pixels by width and `along` by height (else as much).
+    """Gaussian noise whose clumps have a deviation of `across` pixels in width and `along` in height (else the same).
 
     0 gives white noise in that direction.
     """
@@ -62,10 +62,10 @@ def mixed(*layers):
 
 
 def faded_to_sides(values, margin):
-    """Comes in from 0 at the left and right edge over `margin` pixels.
+    """Fades in from 0 at the left and right edge over `margin` pixels.
 
-    Two strips that meet have nothing in common. Where a layer of large clumps broke off there, the seam would show as a
-    line; fine grain hides its own seam.
+    Adjacent strips are unrelated. If a layer of large clumps ended abruptly there, the seam would show as a line; fine
+    grain hides its own seam.
     """
     width = len(values[0])
     rise = [smoothstep(0.0, margin, min(x, width - 1 - x) + 0.5) for x in range(width)]
@@ -73,7 +73,7 @@ def faded_to_sides(values, margin):
 
 
 def evened(values, radius):
-    """Less the mean of the surroundings: no place stands out, which would show when the strips repeat it."""
+    """Subtracts the local mean: a place that stands out would show when the strips repeat it."""
     height, width = len(values), len(values[0])
     side = range(-radius, radius + 1)
     across = [[sum(row[(x + i) % width] for i in side) for x in range(width)] for row in values]

@@ -1,13 +1,13 @@
 """The eleven spots: specks, flakes and one hair on a background of the picture's key.
 
 Most dust is a speck of one to four pixels; flakes are rare and hairs rarer. The renderer shows each picture in six
-orientations, so none may read as a letter, a hook or a comma in any of them: specks have no tails, flakes are ragged all
-round, the hair is nearly straight. They differ in size, softness and contrast, since a set of equal marks is recognised
+orientations, so none may look like a letter, a hook or a comma in any of them: specks have no tails, flakes are ragged
+all round, the hair is nearly straight. They differ in size, softness and contrast, since identical marks are noticed
 at once.
 
-A spot is a list of shapes. A shape covers a point by 0..1 and draws it from the key towards `target`: 0 for dirt on
-the print, 255 for dust that lay on the negative. Points are in pixels, the middle of the top-left pixel at (0.5, 0.5).
-Every shape has faded out a pixel away from the border, which keeps the key, so that no rectangle shows.
+A spot is a list of shapes. A shape covers a point by 0..1 and draws it from the key towards `target`: 0 for dirt
+on the print, 255 for dust on the negative. Points are in pixels; the centre of the top-left pixel is (0.5, 0.5). Every
+shape fades out a pixel before the border, which keeps the key, so that no rectangle shows.
 """
 
 import math
@@ -20,14 +20,14 @@ DIRT, CLEAR = 0, 255
 
 
 def outline(source, raggedness):
-    """The radius by direction, about 1: slow waves make it lopsided, fast ones ragged."""
+    """The radius by direction, around 1: slow waves make the outline lopsided, fast ones make it ragged."""
     waves = [(n, source.uniform(-1.0, 1.0) * raggedness / n**0.6, source.uniform(0, 2 * math.pi))
              for n in (2, 3, 4, 5, 7, 9)]
     return lambda angle: max(0.3, 1 + sum(a * math.cos(n * angle + phase) for n, a, phase in waves))
 
 
 def speck(x, y, radius_x, radius_y, target, strength=1.0, turn=0.0, soft=1.0, ragged=0.16, seed=0):
-    """A compact particle, its edge soft over `soft` pixels."""
+    """A compact particle whose edge is soft over `soft` pixels."""
     edge = outline(random.Random(seed), ragged)
     c, s = math.cos(math.radians(turn)), math.sin(math.radians(turn))
 
@@ -41,7 +41,7 @@ def speck(x, y, radius_x, radius_y, target, strength=1.0, turn=0.0, soft=1.0, ra
 
 
 def flake(x, y, radius_x, radius_y, target, strength=1.0, turn=0.0, soft=0.9, ragged=0.26, seed=0):
-    """A larger piece, ragged all round and of uneven density."""
+    """A larger piece, ragged all round and uneven in density."""
     covers, _ = speck(x, y, radius_x, radius_y, target, strength, turn, soft, ragged, seed)
     source = random.Random(seed + 1000)
     bumps = [(x + source.uniform(-radius_x, radius_x), y + source.uniform(-radius_y, radius_y),
@@ -56,7 +56,7 @@ def flake(x, y, radius_x, radius_y, target, strength=1.0, turn=0.0, soft=0.9, ra
 
 
 def hair(points, thickness, target, strength=1.0):
-    """A fibre along the cubic curve of four points, thin and faint towards its ends."""
+    """A fibre along the cubic curve of four control points, thin and faint towards its ends."""
     steps = 64
     curve = []
     for i in range(steps + 1):
@@ -102,7 +102,7 @@ SPOTS = [
 
 
 def pixel(x, y, width, height, key, shapes):
-    """One byte: each shape in turn draws what is below towards its target, averaged over the pixel's area."""
+    """One byte: each shape in turn draws the value below it towards its target, averaged over the pixel's area."""
     if x in (0, width - 1) or y in (0, height - 1):
         return key
     total = 0.0

@@ -1,10 +1,10 @@
 """The seven wear pictures: 0 where the film is intact, 1 where it is worn down to the base.
 
-A picture stands about 140 times in a large frame, and each strip of it starts at another row in every frame. A texture
-without figures therefore becomes grain that lives; anything that can be told apart from its neighbours becomes a
-wallpaper. So every picture is grain, almost Gaussian, and has its character in the grain's size, strength and density.
+A picture appears about 140 times in a large frame, and each strip of it starts at a different row in every frame. A
+texture without distinct features therefore looks like live grain; any distinct feature becomes a wallpaper pattern. So
+every picture is almost Gaussian grain, and its character lies in the grain's size, strength and density.
 
-Wear lightens most where the picture is dark: means are low and upper tails short, else deep black turns to fog.
+Wear lightens dark areas most, so means are low and upper tails short, or deep black would turn to fog.
 """
 
 import math
@@ -14,7 +14,7 @@ from .noise import evened, faded_to_sides, field, mixed, noise, smoothstep, stan
 
 
 def toned(grain, mean, deviation, most=2.6, skew=0.06):
-    """Grain of deviation 1 as wear of about this mean and deviation.
+    """Grain of deviation 1 turned into wear of approximately this mean and deviation.
 
     The upper tail is a little heavier than a Gaussian's and ends softly at `most` deviations.
     """
@@ -28,7 +28,7 @@ def toned(grain, mean, deviation, most=2.6, skew=0.06):
 
 
 def with_density(grain, density, strength):
-    """Grain that is stronger where `density` (of deviation 1) is high, by `strength` for each deviation."""
+    """Grain that is stronger where `density` (of deviation 1) is high, by `strength` per deviation."""
     return [[g * max(0.2, 1.0 + strength * d) for g, d in zip(row, densities)]
             for row, densities in zip(grain, density)]
 
@@ -66,7 +66,7 @@ def grainy(width, height):
 
 
 def fine(width, height):
-    """The finest grain, and a few hair-thin faint rubs along the film's run."""
+    """The finest grain, with a few faint hair-thin rubs along the film's direction of travel."""
     source = random.Random(42)
     rubs = [[0.0] * width for _ in range(height)]
     for _ in range(26):
@@ -79,7 +79,7 @@ def fine(width, height):
 
 
 def splotchy(width, height):
-    """Grain on a mottle as strong as it may be without showing where it repeats."""
+    """Grain on a mottle as strong as possible without a visible repeat."""
     grain = mixed((1.0, noise(51, width, height, 0.62)), (0.4, faded_to_sides(noise(52, width, height, 1.1), 3)))
     mottle = faded_to_sides(evened(noise(53, width, height, 2.2), 7), 4)
     return toned(mixed((1.0, with_density(grain, mottle, 0.30)), (0.50, mottle)), 0.175, 0.096)
@@ -91,13 +91,13 @@ def lite(width, height):
 
 
 def sheared(values, slope):
-    """Each column moved down by `slope` pixels more than the one before; in a square it still wraps."""
+    """Each column moved down by `slope` pixels more than the one before; a square picture still wraps."""
     height, width = len(values), len(values[0])
     return field(width, height, lambda x, y: values[(y + slope * x) % height][x])
 
 
 def crackly(width, height):
-    """Crisp grain broken by short cracks, finer than the grain, that run every way."""
+    """Crisp grain broken by short cracks in all directions, finer than the grain."""
     grain = mixed((1.0, noise(71, width, height, 0.45)), (0.4, noise(72, width, height, 0.9)))
     long = [sheared(noise(73 + i, width, height, *size), slope) for i, (size, slope) in enumerate((
         ((1.3, 0.30), 1), ((1.3, 0.30), -1), ((0.9, 0.30), 2), ((0.9, 0.30), -2), ((1.5, 0.34), 0), ((0.34, 1.5), 0)))]

@@ -19,7 +19,7 @@ struct Host final : PlainHost {
 
 bool Use(::IUnknown* theSystems, IEffectLibrary& library);
 bool Use(::IUnknown* theSystems, IEffectLibrary& library) {
-    IUnknown* const same = theSystems;  // one name, though both are in sight
+    IUnknown* const same = theSystems;  // unambiguous, although both names are visible
     com::IUnknown& ours = library;
     Host host;
     const TimingRecord timing = {};

@@ -1,4 +1,4 @@
-"""What the tests of the command-line hosts share: programs, and small forms of the phone clip."""
+"""Shared by the tests of the command-line hosts: programs, and small versions of the phone clip."""
 
 import os
 import re
@@ -16,10 +16,10 @@ def run(*args, **options):
 
 
 def run_host(*args, **options):
-    """Runs a program that loads our plug-ins, a second and third time when it hangs.
+    """Runs a program that loads our plug-ins, up to three times if it hangs.
 
-    The preloaded sanitizer and the start-up of libraries that melt loads (translations, TLS) can wait for each other
-    for ever; our code has no part in that, and no lock to wait for.
+    The preloaded sanitizer and the start-up of libraries that melt loads (translations, TLS) can deadlock. Our code is
+    not involved and holds no locks.
     """
     for tries in range(3):
         try:
@@ -40,7 +40,7 @@ def reelfx(*args, **options):
 
 
 def probe(path, *entries):
-    """Values that ffprobe prints for the entries, one list of fields a line."""
+    """The values that ffprobe prints for the entries, one list of fields per line."""
     done = run("ffprobe", "-v", "error", *entries, "-of", "csv=p=0", path)
     assert done.returncode == 0, done.stderr.decode()
     return [line.rstrip(",").split(",") for line in done.stdout.decode().split()]
@@ -52,7 +52,7 @@ def frame_times(path):
 
 
 def frame_digests(path, *options):
-    """MD5 of each decoded frame, without its time."""
+    """MD5 of each decoded frame, without its timestamp."""
     text = ffmpeg("-i", path, "-map", "0:v", "-fps_mode", "passthrough", *options, "-f", "framemd5", "-").decode()
     return [line.split(",")[-1].strip() for line in text.splitlines() if not line.startswith("#")]
 
@@ -64,7 +64,7 @@ def luma_psnr(one, other):
 
 
 class Clips:
-    """Small forms of the clip in a folder of their own: the same 41 frames, times, sound and colours."""
+    """Small versions of the clip in a folder of their own: the same 41 frames, times, sound and colours."""
 
     def __init__(self):
         self.folder = tempfile.TemporaryDirectory(prefix="velmora-hosts-")

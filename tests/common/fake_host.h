@@ -17,12 +17,12 @@ class FakeHost final : public PlainHost {
         bool operator==(const Request&) const = default;
     };
 
-    // Values by parameter index; an index that is missing fails and leaves the cell alone.
+    // Values by parameter index; a missing index fails and leaves the cell alone.
     std::map<std::uint32_t, ValueWord> values;
     std::vector<Request> requests;
     std::vector<std::intptr_t> forwarded;  // arguments of operations 4 and 5
     const Guid* lastQueried = nullptr;
-    // Leaves the processor truncating, in 24 bits and without denormals when it answers.
+    // Every answer leaves the processor truncating, at 24 bits and without denormals.
     bool leavesFloatsStrange = false;
 
     void SetNumber(std::uint32_t index, float number) { values[index].number = number; }

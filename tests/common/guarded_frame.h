@@ -16,7 +16,7 @@ struct Geometry {
     std::int32_t height = 6;
     std::int32_t xOrigin = 0;
     std::int32_t yOrigin = 0;
-    std::int32_t padding = 0;  // bytes behind each row
+    std::int32_t padding = 0;  // bytes after each row
     bool bottomUp = false;
 };
 
@@ -54,7 +54,7 @@ class GuardedFrame {
         std::memcpy(m_bytes.data() + Offset(row, column), &pixel, sizeof pixel);
     }
 
-    // As the host would pass it: the region of the geometry.
+    // As a host would pass it: the region described by the geometry.
     [[nodiscard]] FrameRecord Record() {
         const std::int32_t rows = m_geometry.yOrigin + m_geometry.height;
         std::uint8_t* lowest = m_bytes.data() + kGuardBytes;
@@ -75,7 +75,7 @@ class GuardedFrame {
     [[nodiscard]] const std::vector<std::uint8_t>& Bytes() const { return m_bytes; }
     [[nodiscard]] const Geometry& Shape() const { return m_geometry; }
 
-    // Bytes outside the left top width x height pixels of the region equal those of `before`.
+    // Whether all bytes outside the top left width x height pixels of the region equal those of `before`.
     [[nodiscard]] bool OnlyRegionDiffers(const GuardedFrame& before, std::int32_t width,
                                          std::int32_t height) const {
         for (std::size_t i = 0; i < m_bytes.size(); ++i) {

@@ -1,5 +1,4 @@
-// The library as a host meets it: on Windows the DLL, through its exports only; natively the same code linked
-// in.
+// The library as a host uses it: on Windows the DLL, through its exports only; natively the same code linked in.
 #pragma once
 
 #include "api/host_api.h"

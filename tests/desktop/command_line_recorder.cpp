@@ -1,5 +1,5 @@
-// Stands in for a program that the library starts: writes its command line (16-bit text) to the file that the
-// environment variable VELMORA_RECORD names, under another name first, so that a reader never sees half of it.
+// Stands in for a program that the library starts. Writes its command line (16-bit text) to the file named by the
+// environment variable VELMORA_RECORD, under a temporary name first, so that a reader never sees half of it.
 #include <windows.h>
 
 #include <cstdio>

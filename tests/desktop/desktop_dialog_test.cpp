@@ -1,4 +1,4 @@
-// The options dialog as a user meets it: texts, keyboard, logo.
+// The options dialog as the user sees it: texts, keyboard, logo.
 #include <filesystem>
 
 #include "desktop_fixture.h"
@@ -45,7 +45,7 @@ TEST_F(DialogTest, SpeaksEnglishWithoutTranslations) {
         for (const auto& row : rows)
             EXPECT_EQ(TextOf(GetDlgItem(dialog, row.control)), row.text) << row.control;
     });
-    // The library was asked in the user's language: two letters.
+    // The library was asked for the user's language by its two-letter code.
     EXPECT_EQ(m_library.language.size(), 2u);
 }
 
@@ -113,7 +113,7 @@ TEST_F(DialogTest, SecondDialogIsNotShown) {
     });
 }
 
-// The colour of the pixel at a point of a window, as it is shown.
+// The colour of a pixel of a window, as displayed.
 COLORREF ShownColour(HWND window, int x, int y) {
     const HDC dc = GetDC(window);
     UpdateWindow(window);
@@ -156,7 +156,7 @@ TEST_F(DialogTest, WithoutResourcesTheLogoIsEmptyAndTheRestWorks) {
 }
 
 TEST_F(DialogTest, LogoOpensTheMakersPage) {
-    // What the system starts for such addresses while this test runs.
+    // What the system starts for such addresses during this test.
     const RegisteredText handler(L"Software\\Classes\\https\\shell\\open\\command",
                                  L"\"" + BesideProgram(L"command_line_recorder.exe") + L"\" \"%1\"");
     Show([](HWND dialog) { Click(GetDlgItem(dialog, VM_BUTTON_LOGO)); });
@@ -165,7 +165,7 @@ TEST_F(DialogTest, LogoOpensTheMakersPage) {
         << testing::PrintToString(line);
 }
 
-// A parent window on this thread that remembers the commands it gets.
+// A parent window on this thread that records the commands it receives.
 class CommandWindow {
   public:
     CommandWindow() {
@@ -186,7 +186,7 @@ class CommandWindow {
     CommandWindow& operator=(const CommandWindow&) = delete;
 
     [[nodiscard]] HWND Window() const { return m_window; }
-    // The commands that came, after everything posted so far has been worked on.
+    // The commands received once everything posted so far has been processed.
     int Commands(WORD id) const {
         MSG message;
         while (PeekMessageW(&message, nullptr, 0, 0, PM_REMOVE)) DispatchMessageW(&message);
@@ -250,12 +250,12 @@ TEST_F(ButtonTest, ShowsTheImageOfItsStateBlendedOverTheDialog) {
     const COLORREF face = GetSysColor(COLOR_3DFACE);
     EXPECT_EQ(ShownColour(button, 3, 1), face);
     SendMessageW(button, WM_MOUSEMOVE, 0, MAKELPARAM(3, 1));
-    // Half transparent black halves the colour; a rounding of one step is the system's own affair.
+    // Half transparent black halves the colour; the system may round by one step.
     EXPECT_NEAR(GetRValue(ShownColour(button, 3, 1)), GetRValue(face) * 127 / 255, 1);
     SendMessageW(button, WM_LBUTTONDOWN, MK_LBUTTON, MAKELPARAM(3, 1));
     EXPECT_EQ(ShownColour(button, 3, 1), RGB(255, 0, 0));
     SendMessageW(button, WM_LBUTTONUP, 0, MAKELPARAM(3, 1));
-    // Giving the capture back counts as losing it: at rest until the mouse moves again.
+    // Releasing the capture counts as losing it: the button returns to rest until the mouse moves again.
     EXPECT_EQ(ShownColour(button, 3, 1), face);
     EXPECT_EQ(m_parent->Commands(kId), 1);
     DestroyWindow(button);

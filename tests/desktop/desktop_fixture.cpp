@@ -44,7 +44,7 @@ HWND FocusOf(HWND dialog) {
     return info.hwndFocus;
 }
 
-// Posted messages are taken in their order, but a window may answer one with another posted one.
+// Posted messages are processed in order, but a window may post another message in response.
 void LetItWork(HWND dialog) {
     for (int i = 0; i < 3 && IsWindow(dialog); ++i) {
         SendMessageW(dialog, WM_NULL, 0, 0);
@@ -101,8 +101,8 @@ std::int32_t VM_CALL FakeLibrary::GetText(const char* languageCode, std::int32_t
     language = languageCode;
     const bool isKnobs = std::string(key) == "Up/Down Knobs Control";
     if (!isKnobs && std::string(key) != "Help") return 0;
-    lstrcpynW(reinterpret_cast<wchar_t*>(buffer), reinterpret_cast<const wchar_t*>(isKnobs ? m_knobs : m_help),
-              capacity);
+    lstrcpynW(reinterpret_cast<wchar_t*>(buffer),
+              reinterpret_cast<const wchar_t*>(isKnobs ? m_knobs : m_help), capacity);
     return lstrlenW(reinterpret_cast<wchar_t*>(buffer));
 }
 
@@ -197,7 +197,7 @@ void DesktopTest::ForgetSettings() {
 
 std::wstring DesktopTest::RecordedCommandLine() const {
     std::ifstream file;
-    // The recorder may still hold the file when it has its name already.
+    // The recorder may still have the file open when it already has its final name.
     const bool isOpen = WaitFor([&] {
         file.open(std::filesystem::path(m_recordPath), std::ios::binary);
         return file.is_open();

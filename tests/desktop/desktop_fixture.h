@@ -1,5 +1,5 @@
-// What the tests of the desktop share: the services' module in a folder with a name that no 8-bit text holds, the
-// registry around the settings, and a second thread that uses the options dialog as a user does.
+// Shared by the desktop tests: the services' module in a folder whose name no 8-bit text can hold, the registry
+// around the settings, and a second thread that uses the options dialog like a user.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -22,7 +22,7 @@ inline constexpr char kKnobs[] = "Knobs Drag Vertical";
 [[nodiscard]] Stored ReadStored(HKEY root, const char* key, const char* name);
 void Store(HKEY root, const char* key, const char* name, const std::string& bytes, DWORD type = REG_SZ);
 
-// A key's default text in the machine's registry while the object lives; afterwards what it was before.
+// Sets the default text of a key in the machine's registry for its lifetime, then restores the old one.
 class RegisteredText {
   public:
     RegisteredText(const wchar_t* key, const std::wstring& text);
@@ -38,7 +38,7 @@ class RegisteredText {
     bool m_hadOne;
 };
 
-// A library object as far as the services see it. Translates "Help" to its own name when it has texts.
+// A library object as the services see it. Translates "Help" to its own name when it has texts.
 class FakeLibrary final : public Uncounted<IMultiLingual> {
   public:
     explicit FakeLibrary(const char16_t* help, const char16_t* knobs = u"") noexcept
@@ -61,7 +61,7 @@ class FakeLibrary final : public Uncounted<IMultiLingual> {
     const char16_t* m_knobs;
 };
 
-// The services' module, loaded. Freed at the end.
+// Loads the services' module, and frees it at the end.
 class ServicesModule {
   public:
     explicit ServicesModule(const std::wstring& path);
@@ -85,15 +85,16 @@ class ServicesModule {
     LibraryFunction m_withdraw = nullptr;
 };
 
-// Shows the options dialog on this thread while `user` works with it on another; the dialog is cancelled when the
-// user leaves it open. The dialog's result.
+// Shows the options dialog on this thread while `user` works with it on another. Cancels the dialog if the user
+// leaves it open. Returns the dialog's result.
 std::int32_t ShowOptionsTo(IShellServices& services, const std::function<void(HWND dialog)>& user,
                            HWND owner = nullptr);
 
-// As a user types: through the dialog's message loop. Both return when the dialog has taken the key.
+// Keys sent through the dialog's message loop, as when a user types. Both return once the dialog has processed the
+// key.
 void Type(HWND dialog, WPARAM key);
 void TypeWithAlt(HWND dialog, wchar_t letter);
-// A press and a release of the left button at a point of a control.
+// Presses and releases the left button at a point of a control.
 void Click(HWND control, int x = 4, int y = 4);
 [[nodiscard]] int FocusedControl(HWND dialog);
 [[nodiscard]] std::wstring TextOf(HWND window);
@@ -103,19 +104,19 @@ class DesktopTest : public testing::Test {
     void SetUp() override;
     void TearDown() override;
 
-    // Waits for the command line that the recorder writes; empty when none comes.
+    // Waits for the command line that the recorder writes; empty when none arrives.
     [[nodiscard]] std::wstring RecordedCommandLine() const;
-    // Copies a file that lies beside this program into the library's folder.
+    // Copies a file from this program's folder to the library's folder.
     void CopyToFolder(const wchar_t* name, const wchar_t* as = nullptr) const;
     static void ForgetSettings();
     [[nodiscard]] static std::wstring BesideProgram(const wchar_t* name);
 
-    std::wstring m_folder;      // with its separator
-    std::wstring m_modulePath;  // in it
+    std::wstring m_folder;      // with a trailing separator
+    std::wstring m_modulePath;  // in m_folder
     std::wstring m_recordPath;
 
   private:
-    Stored m_userSetting;  // as the machine had them before the test
+    Stored m_userSetting;  // the machine's values before the test
     Stored m_machineSetting;
 };
 

@@ -1,4 +1,4 @@
-// The two ways to the help file, with stand-ins for the viewer and the control.
+// The two ways to open the help file, with stand-ins for the viewer and the control.
 #include <filesystem>
 
 #include "desktop_fixture.h"
@@ -20,7 +20,7 @@ HelpControlCall& Calls() {
 class HelpTest : public DesktopTest {};
 
 TEST_F(HelpTest, StartsTheViewerWithExactlyTheseArguments) {
-    // The viewer is looked for in the system's folder, which is a variable of the environment.
+    // The viewer is looked up in the system's folder, which is an environment variable.
     wchar_t systemRoot[MAX_PATH] = {};
     GetEnvironmentVariableW(L"SystemRoot", systemRoot, MAX_PATH);
     CopyToFolder(L"command_line_recorder.exe", L"hh.exe");
@@ -53,7 +53,7 @@ TEST_F(HelpTest, CallsTheControlThatTheRegistryNames) {
     EXPECT_EQ(Calls().owner, owner);
     EXPECT_EQ(Calls().command, 15u);
     EXPECT_EQ(Calls().data, 205u);
-    // The library's folder has no 8-bit name: the control gets one that leads to the same folder.
+    // The library's folder has no 8-bit name, so the control gets another path to the same folder.
     const std::string file = Calls().file;
     const std::size_t nameStart = file.find_last_of('\\') + 1;
     EXPECT_EQ(file.substr(nameStart), "VMReelEffects.chm");
@@ -62,7 +62,7 @@ TEST_F(HelpTest, CallsTheControlThatTheRegistryNames) {
     GetLongPathNameW(folder.c_str(), longFolder, MAX_PATH);
     EXPECT_EQ(lstrcmpiW(longFolder, m_folder.c_str()), 0) << file;
 
-    // The entry point is kept: another control in the registry is not even looked at.
+    // The entry point is cached, so another control in the registry is not even looked up.
     control.Set(L"C:\\no such control.ocx");
     const int before = Calls().calls;
     EXPECT_EQ(services->ShowHelp(owner, 0, 0), 0x1234);

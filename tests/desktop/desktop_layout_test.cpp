@@ -1,4 +1,4 @@
-// The options dialog in every language of the language file: nothing is cut and nothing lies on anything else.
+// The options dialog in every language of the language file: nothing is cut off and nothing overlaps.
 #include <filesystem>
 #include <fstream>
 #include <iterator>
@@ -16,7 +16,7 @@
 namespace velmora::support::test {
 namespace {
 
-// The texts of the real language module, as a library object gives them out.
+// The texts of the real language module, as a library object returns them.
 class RealTexts final : public Uncounted<IMultiLingual> {
   public:
     RealTexts() : m_module(LoadLibraryW(DesktopPath(L"VMLang.dll").c_str())) {
@@ -50,7 +50,7 @@ class RealTexts final : public Uncounted<IMultiLingual> {
         return std::wstring(L"" VELMORA_TEST_DIST) + L"/" + name;
     }
 
-    // The codes of all languages of the file.
+    // The codes of all languages in the file.
     static std::vector<std::string> Languages() {
         std::ifstream file{std::filesystem::path(DesktopPath(L"VMReelEffectsLang.xml"))};
         const std::string text((std::istreambuf_iterator<char>(file)), std::istreambuf_iterator<char>());
@@ -66,7 +66,7 @@ class RealTexts final : public Uncounted<IMultiLingual> {
     Reference<LangXMLParser> m_parser;
 };
 
-// The size of a window's text in its own font; `width`: of the lines that it may be broken into, 0: one line.
+// The size of a window's text in its own font, broken into lines of `width` pixels; 0 for one line.
 SIZE TextSize(HWND window, int width) {
     const HDC dc = GetDC(window);
     const HGDIOBJ before = SelectObject(dc, reinterpret_cast<HFONT>(SendMessageW(window, WM_GETFONT, 0, 0)));
@@ -124,7 +124,7 @@ void CheckLayout(HWND dialog) {
 
 int checkedDialogs = 0;
 
-// Checks a dialog as soon as it has set itself up, which is before it is seen, and cancels it.
+// Checks a dialog as soon as it is set up, which is before it is shown, and cancels it.
 LRESULT CALLBACK CheckDialog(int code, WPARAM wParam, LPARAM data) {
     const auto& call = *reinterpret_cast<const CWPRETSTRUCT*>(data);
     if (code == HC_ACTION && call.message == WM_INITDIALOG) {

@@ -48,7 +48,7 @@ TEST_F(LifetimeTest, ShutDownClosesADialogThatIsOpen) {
     FakeLibrary library(u"");
     const ServicesModule services(m_modulePath);
     services.Offer(library);
-    // The timer runs inside the dialog's message loop, on the thread that shows it, as a host's own code would.
+    // The timer runs inside the dialog's message loop, on the thread that shows it, like a host's own code.
     shownServices = &services;
     onlyLibrary = &library;
     const UINT_PTR timer = SetTimer(nullptr, 0, 100, WithdrawLibrary);
@@ -64,7 +64,8 @@ struct Usage {
     DWORD modules = 0;
     DWORD gdi = 0;
     DWORD user = 0;
-    // Numbers of new objects: they grow when objects stay, as numbers are used again. Some systems count nothing else.
+    // Numbers of new objects. Free numbers are reused, so they grow only when objects leak. Some systems count
+    // nothing else.
     UINT_PTR gdiNumber = 0;
     UINT_PTR handleNumber = 0;
     SIZE_T memory = 0;
@@ -92,13 +93,13 @@ Usage CurrentUsage() {
     return usage;
 }
 
-// Answers every dialog of this thread with OK as soon as it is active.
+// Answers every dialog of this thread with OK as soon as it becomes active.
 LRESULT CALLBACK AnswerDialogs(int code, WPARAM window, LPARAM data) {
     if (code == HCBT_ACTIVATE) PostMessageW(reinterpret_cast<HWND>(window), WM_COMMAND, IDOK, 0);
     return CallNextHookEx(nullptr, code, window, data);
 }
 
-// Runs a round again and again and expects the process to hold afterwards what it held before.
+// Repeats a round and expects the process to hold the same resources afterwards as before.
 void ExpectNothingStays(const std::function<void()>& round) {
     constexpr int kRounds = 200;
     constexpr int kWarmUp = 10;
@@ -108,7 +109,7 @@ void ExpectNothingStays(const std::function<void()>& round) {
     for (int i = 0; i < kRounds && !testing::Test::HasFatalFailure(); ++i) round();
     const Usage after = CurrentUsage();
     UnhookWindowsHookEx(hook);
-    // One forgotten handle or object a round would be 200; a few may come from the system's own caches.
+    // One leaked handle or object per round would be 200; a few may come from the system's own caches.
     constexpr DWORD kFew = 20;
     EXPECT_LE(after.handles, before.handles + kFew);
     EXPECT_EQ(after.modules, before.modules);

@@ -1,4 +1,4 @@
-// What the desktop side decides without a window.
+// The desktop code's decisions that need no window.
 #include <gtest/gtest.h>
 
 #include <functional>
@@ -22,7 +22,7 @@ void Press(BitButtonState& button) {
     button.OnButtonDown();
 }
 
-// A new button in the wanted state.
+// A new button in the given state.
 BitButtonState ButtonIn(Mouse state, bool notify = true) {
     BitButtonState button(notify);
     if (state == Mouse::kHover) MoveIn(button);

@@ -1,5 +1,5 @@
-// A module that holds the shell services alone, as the library holds them, so that tests can load it from folders of
-// their choice, play the library objects and unload it.
+// A module with nothing but the shell services, linked as in the library, so that tests can load it from any folder,
+// act as the library objects and unload it.
 #include "desktop/shell_services.h"
 #include "platform/platform.h"
 

@@ -1,4 +1,4 @@
-// The preference in the registry, read at start and written by the dialog.
+// The preference in the registry, which is read at start and written by the dialog.
 #include "desktop_fixture.h"
 #include "desktop/resource_ids.h"
 
@@ -62,7 +62,7 @@ TEST_F(SettingsTest, OkWritesTheUsersTextAndLeavesTheMachines) {
     services.Withdraw(library);
 }
 
-// The dialog that ends is still a window for a while: who waits for its end may look at what OK has done.
+// A closing dialog remains a window for a while, so a caller that waits for its end may check what OK has stored.
 TEST_F(SettingsTest, OkStoresBeforeTheDialogEnds) {
     FakeLibrary library(u"");
     const ServicesModule services(m_modulePath);
@@ -108,7 +108,7 @@ TEST_F(SettingsTest, CancelChangesNothing) {
 }
 
 TEST_F(SettingsTest, KeepsTheChoiceWhenTheRegistryRefuses) {
-    // A key that lives only until the system restarts refuses keys that would outlive it.
+    // A volatile key, which lives only until the system restarts, refuses permanent subkeys.
     HKEY refusing = nullptr;
     ASSERT_EQ(RegCreateKeyExA(HKEY_CURRENT_USER, "Software\\Velmora", 0, nullptr, REG_OPTION_VOLATILE,
                               KEY_ALL_ACCESS, nullptr, &refusing, nullptr),

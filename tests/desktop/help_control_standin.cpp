@@ -1,4 +1,4 @@
-// Stands in for the HTML help control: remembers what its entry point was called with.
+// Stands in for the HTML help control: records the arguments of its entry point.
 #include <windows.h>
 
 #include "help_control_standin.h"

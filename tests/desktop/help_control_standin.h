@@ -1,4 +1,4 @@
-// What the stand-in for the HTML help control remembers; its export "LastCall" gives the record.
+// The record kept by the stand-in for the HTML help control; its export "LastCall" returns it.
 #pragma once
 
 #include <windows.h>

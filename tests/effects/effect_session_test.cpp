@@ -1,4 +1,4 @@
-// Rendering through the effects: sessions against each other and against the effect objects.
+// Rendering through the effects: sessions compared with each other and with the effect objects.
 
 #include "effects/effect_session.h"
 
@@ -22,7 +22,7 @@ using namespace effects;
 constexpr std::int32_t kWidth = 61;
 constexpr std::int32_t kHeight = 44;
 
-// A picture with all kinds of bytes in it, alpha included.
+// A picture with all kinds of bytes, including alpha.
 struct Picture {
     explicit Picture(std::uint32_t seed = 0) : bytes(std::size_t{kWidth} * kHeight * 4) {
         for (std::uint8_t& byte : bytes)
@@ -46,7 +46,7 @@ Picture FrameOf(EffectSession& session, double seconds) {
     return result;
 }
 
-// Frame n in the middle of its time.
+// The middle of frame n's duration.
 double SecondsOf(int frame) {
     return (frame + 0.5) / 30.0;
 }
@@ -61,7 +61,7 @@ std::uint32_t Neutral(const EffectTable& effect) {
     return PresetNamed(effect, "Reset To None");
 }
 
-// The library's own state, as its entry point sets it up.
+// The library's own state, as set up by its entry point.
 class ProcessWide : public testing::Test {
   protected:
     void SetUp() override {
@@ -117,7 +117,7 @@ TEST(EffectSession, PinnedFramesDoNotDependOnTheirOrder) {
     }
 }
 
-// Of scratches alone and of flicker alone: what the library draws the same on every run.
+// Scratches alone and flicker alone, which the library draws the same on every run.
 std::unique_ptr<EffectSession> ScratchesAlone() {
     auto session = SessionWith(kFilmDamage, Neutral(kFilmDamage));
     session->SetValue(5, {.number = 1.0f});  // Density
@@ -172,8 +172,8 @@ TEST(EffectSession, TwoThreadsDoNotDisturbEachOther) {
     EXPECT_EQ(together[1], alone[1]);
 }
 
-// Frame k of a running sequence can be rendered alone: its state is the first one moved on by the draws of
-// the frames before it.
+// Any frame k of a running sequence can be rendered alone: its state is the initial one advanced by the draws of the
+// frames before it.
 TEST(EffectSession, ASequenceCanBeEnteredAnywhere) {
     constexpr std::uint32_t kStart = 0x1234ABCDu;
     for (const EffectTable* effect : {&kFilmCamera, &kFilmDamage, &kFilmPro, &kFilmExpress}) {

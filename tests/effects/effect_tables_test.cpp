@@ -1,5 +1,5 @@
-// What hosts are told of the effects, written out and held against effects.txt: every descriptor byte, every preset
-// cell and the answer to each of the renderer's settings.
+// Everything that effects report to hosts, written out and compared with effects.txt: every descriptor byte, every
+// preset cell and the answer to each of the renderer's settings.
 
 #include <gtest/gtest.h>
 
@@ -18,7 +18,7 @@ constexpr char kEffectsText[] =
 #include "effects_text.inc"
     ;
 
-// A value in the form of its kind; a number in as few digits as tell it from every other one.
+// A value formatted by its kind; numbers with the fewest digits that identify them.
 std::string Shown(std::uint32_t kind, ValueWord value) {
     char text[32] = "";
     switch (kind) {
@@ -33,7 +33,7 @@ std::string Shown(std::uint32_t kind, ValueWord value) {
     }
 }
 
-// The bytes that an effect writes, as ranges: those that come out the same whatever was there before.
+// The byte ranges that an effect writes: those that come out the same whatever was there before.
 std::string WrittenBytes(IVideoEffect& effect, std::uint32_t index) {
     std::uint8_t low[sizeof(ParamDescriptor) + 1], high[sizeof low];
     std::memset(low, 0x00, sizeof low);
@@ -68,7 +68,7 @@ void WriteParam(const ParamDescriptor& param, std::ostream& out) {
     out << " | " << param.x << ' ' << param.y << ' ' << param.width << ' ' << param.height << " |";
 }
 
-// How the effect's own host face answers a setting, whose kind the renderer names.
+// How the effect's host interface answers a setting, whose kind the renderer names.
 std::string Answer(IVideoEffect& effect, std::uint32_t setting, std::uint32_t kind) {
     static constexpr const char* kKinds[] = {"", "item ", "number ", "colour ", "flag "};
     RecordingHost host;
@@ -81,7 +81,7 @@ std::string Answer(IVideoEffect& effect, std::uint32_t setting, std::uint32_t ki
     if (!isAnswered || cell.kind != kind || cell.second != 0xCCCCCCCCu) return "none";
     if (host.calls.empty()) {
         if (kind == kKindCheckBox)
-            cell.value.bits ^= 0xCCCCCC00u;  // of a flag only the first byte is written
+            cell.value.bits ^= 0xCCCCCC00u;  // only the first byte of a flag is written
         return kKinds[kind] + Shown(kind, cell.value);
     }
     if (host.calls != std::vector<RecordingHost::Call>{{host.calls[0].index, kind}}) return "asks for more";

@@ -14,7 +14,7 @@ namespace {
 
 using effects::CreateEffectByIndex;
 
-// An effect with its host face, released at the end.
+// An effect with its host interface, released at the end.
 class Effect {
   public:
     explicit Effect(std::uint32_t index) : m_effect(CreateEffectByIndex(index)) {
@@ -42,7 +42,7 @@ class Effect {
 
 constexpr ValueCell kUntouchedCell = {{.bits = 0xCCCCCCCCu}, 0xCCCCCCCCu, 0xCCCCCCCCu};
 
-// The effect's own answers are reelcheck's; the host face of the same object gives the same.
+// reelcheck checks the effect's own answers; the host interface of the same object must give the same ones.
 TEST(FilmEffect, AnswersToItsThreeIdentifiersFromItsHostFaceToo) {
     Effect effect(2);
     struct {
@@ -72,10 +72,10 @@ TEST(FilmEffect, PassesUnknownIdentifiersToTheAttachedHost) {
     EXPECT_EQ(host.references, 2u);
     out = &host;
     EXPECT_EQ(effect.Face()->QueryInterface(&kIidEffectLibrary, &out), kStatusNoInterface);
-    EXPECT_EQ(host.outAsPassed, &host);  // the arguments as they are
+    EXPECT_EQ(host.outAsPassed, &host);  // arguments are passed on unchanged
     EXPECT_EQ(out, nullptr);
     EXPECT_EQ(effect->QueryInterface(&kIidPresetSaver, nullptr), kStatusFailure);
-    // Its own come first and the host is not counted.
+    // Its own interfaces come first, without counting a reference on the host.
     EXPECT_EQ(effect->QueryInterface(&kIidVideoHost, &out), kStatusOk);
     EXPECT_EQ(out, effect.Face());
     effect->Release();
@@ -95,7 +95,7 @@ TEST(FilmEffect, BothFacesShareOneCount) {
     EXPECT_EQ(face->Release(), 0u);
 }
 
-// Hosts see nothing of the layout, but an effect is to store no more than its five members.
+// Hosts never see the layout, but an effect must store no more than its five members.
 TEST(FilmEffect, StoresItsFiveMembersOnly) {
     constexpr std::size_t kPointer = sizeof(void*);
     const std::size_t renderer = sizeof(CRsVelmoraEffect);
@@ -176,7 +176,7 @@ TEST(FilmEffect, DerivesTheDepthOfScratches) {
         EXPECT_TRUE(effect.Face()->GetParamValue(17, &cell, 2));
         EXPECT_EQ(cell.value.number, row.depth) << "amount " << row.amount;
     }
-    // 0.2 is no exact number: 1 - s is narrowed before it is squared.
+    // 0.2 is not exact in binary: 1 - s is rounded to single precision before it is squared.
     host.amount = 0.2f;
     ValueCell cell = {};
     EXPECT_TRUE(effect.Face()->GetParamValue(17, &cell, 2));

@@ -1,4 +1,4 @@
-// The parameter objects, the master settings list and what becomes of its values.
+// The parameter objects, the master settings list and the use of its values.
 
 #include <gtest/gtest.h>
 
@@ -153,7 +153,7 @@ TEST(MasterSettings, GettersLeaveTheDestinationWhenTheKindIsWrong) {
     EXPECT_EQ(number, 0.0f);
 }
 
-// Settings from what a host holds, master index by master index.
+// Settings read from a host's values, one master index at a time.
 render::StageSettings Settings(FakeHost& host) {
     MasterSettingsList list;
     EXPECT_TRUE(list.Fill());
@@ -162,7 +162,8 @@ render::StageSettings Settings(FakeHost& host) {
     return ReadStageSettings(list);
 }
 
-// The other units show in the predicted frames; these are the halves between two steps and what is not predicted.
+// The other units are covered by the predicted frames; these are the midpoints between two steps, and the settings
+// that are not predicted.
 TEST(StageSettings, SlidersBecomeTheStagesUnits) {
     FakeHost host;
     host.SetNumber(1, 0.25f);  // 2.5 -> 3
@@ -178,7 +179,7 @@ TEST(StageSettings, SlidersBecomeTheStagesUnits) {
 TEST(StageSettings, ScratchesNeedAKindAnAmountAndADepth) {
     struct Row {
         const char* name;
-        float amount, depth;  // as the host holds them
+        float amount, depth;  // the host's values
         bool black, white, thick;
         std::uint32_t count;
         float seed;

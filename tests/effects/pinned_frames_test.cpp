@@ -1,4 +1,4 @@
-// Compares frames that the effects make with the digests of pinned_frames.txt and names every one that has changed.
+// Compares frames made by the effects with the digests of pinned_frames.txt and lists those that have changed.
 //
 //   pinned_frames_test           compares; exit code 1 when a frame has changed
 //   pinned_frames_test --write   prints the table with the digests of this build
@@ -67,7 +67,7 @@ void Set(EffectSession& session, std::string_view setting) {
     }
 }
 
-// A picture with all that effects react to: ramps of each channel, grain, lights on black, every alpha.
+// A picture with everything that effects react to: ramps of each channel, grain, lights on black, every alpha.
 std::vector<std::uint8_t> Painted(std::int32_t width, std::int32_t height) {
     std::vector<std::uint8_t> bytes;
     bytes.reserve(static_cast<std::size_t>(width) * static_cast<std::size_t>(height) * 4);
@@ -88,7 +88,7 @@ std::vector<std::uint8_t> Painted(std::int32_t width, std::int32_t height) {
     return bytes;
 }
 
-// FNV-1a of 64 bits.
+// 64-bit FNV-1a.
 std::string DigestOf(const std::vector<std::uint8_t>& bytes) {
     std::uint64_t hash = 0xCBF29CE484222325u;
     for (const std::uint8_t byte : bytes) hash = (hash ^ byte) * 0x100000001B3u;

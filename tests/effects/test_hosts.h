@@ -1,4 +1,4 @@
-// Hosts for tests: what an effect asks them and what they answer.
+// Hosts for tests: what effects ask and how the hosts answer.
 #pragma once
 
 #include <cstdint>
@@ -8,8 +8,8 @@
 
 namespace velmora::tests {
 
-// Counts references, and answers the identifier kIidPresetSaver as if it were its own. Its destructor lies
-// behind the interface's operations in the table.
+// Counts references, and answers the identifier kIidPresetSaver as if it were its own. Its destructor comes after the
+// interface's operations in the table.
 class TestHost : public PlainHost {
   public:
     virtual ~TestHost() = default;
@@ -37,11 +37,11 @@ class TestHost : public PlainHost {
     void VM_CALL HostOperation7(std::intptr_t, std::intptr_t) override { arguments = {7}; }
 
     std::uint32_t references = 1;
-    void* outAsPassed = nullptr;           // what lay in it at the last QueryInterface
+    void* outAsPassed = nullptr;           // the out pointer's value at the last QueryInterface
     std::vector<std::intptr_t> arguments;  // of the last operation
 };
 
-// Answers every parameter with a word of its own and notes the calls.
+// Answers each parameter with a different word and records the calls.
 class RecordingHost final : public TestHost {
   public:
     struct Call {
@@ -62,7 +62,7 @@ class RecordingHost final : public TestHost {
     bool answers = true;
 };
 
-// Has a preset of an effect applied.
+// Makes an effect apply a preset.
 class PresetHost final : public TestHost {
   public:
     PresetHost(IVideoEffect& effect, std::uint32_t preset) {

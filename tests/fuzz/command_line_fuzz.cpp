@@ -1,5 +1,5 @@
-// Lines of text as the arguments of reelfx or reelhost, the first one the program's name: refused with one line that
-// tells the user why, or read into options that keep their ranges. Nothing is opened or run.
+// Lines of text as the arguments of reelfx or reelhost; the first line is the program's name. They must be refused
+// with a one-line message for the user, or read into options that stay in range. Nothing is opened or run.
 
 #include <algorithm>
 #include <cstdint>
@@ -30,7 +30,7 @@ void CheckInput(const InputOptions& input) {
     Require(!input.rate || IsRate(*input.rate));
 }
 
-// What is left of an effect's options is read against the effect, preset files apart.
+// The remaining effect options are read against the effect, except for preset files.
 void CheckEffect(EffectOptions effect) {
     effect.presetFile.reset();
     try {
@@ -101,7 +101,7 @@ void ReadForReelhost(std::vector<char*>& arguments) {
 }
 
 std::vector<std::string> LinesOf(std::string text) {
-    std::replace(text.begin(), text.end(), '\0', ' ');  // ends an argument
+    std::replace(text.begin(), text.end(), '\0', ' ');  // a zero would end the argument
     std::vector<std::string> lines;
     for (std::size_t at = 0; at <= text.size() && lines.size() < 64;) {
         const std::size_t end = std::min(text.find('\n', at), text.size());
@@ -115,7 +115,7 @@ std::vector<std::string> LinesOf(std::string text) {
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     std::vector<std::string> lines = LinesOf(std::string(reinterpret_cast<const char*>(data), size));
-    if (lines.back().empty()) lines.pop_back();  // the line's own end
+    if (lines.back().empty()) lines.pop_back();  // after the final line break
     if (lines.empty()) return 0;
     std::vector<char*> arguments;
     arguments.reserve(lines.size());

@@ -1,6 +1,6 @@
-// Frames through the boundary: effects and conversions with any geometry, values and times, several in a row on the
-// state that the library keeps. Refused, or worked on so that nothing else is touched and the pixels are those of the
-// reference in frames with nothing around them.
+// Frames through the binary interface: effects and conversions with any geometry, values and times, several in a row
+// on the state that the library keeps. A frame must be refused, or processed so that nothing else is touched and its
+// pixels match those of the reference, which gets frames with nothing around them.
 
 #include <algorithm>
 #include <array>
@@ -27,12 +27,12 @@ using reelcheck::Layout;
 using reelcheck::Packing;
 using reelcheck::PlayingHost;
 
-// What runs on a pair of frames: the library, or one of the two references. False: the frames are refused.
+// What processes a pair of frames: the library, or one of the two references. False when the frames are refused.
 enum class Runner { kLibrary, kReference, kOtherLevel };
 constexpr Runner kRunners[] = {Runner::kLibrary, Runner::kReference, Runner::kOtherLevel};
 using Operation = std::function<bool(Runner, const FrameRecord& source, const FrameRecord& destination)>;
 
-// Mostly small: what matters at an edge matters there too, and takes less time.
+// Mostly small: the same edge cases occur there and take less time.
 Layout ReadLayout(FuzzInput& input) {
     const auto side = [&input](std::int32_t most) {
         const std::int32_t number = input.Byte();
@@ -50,11 +50,11 @@ Layout ReadLayout(FuzzInput& input) {
 double ReadTime(FuzzInput& input) {
     if (input.Below(8) != 0) return input.Byte() / 30.0;
     const double time = input.Double();
-    // Hours into a clip the scratches' lives up to there are found first: sound, but it takes the fuzzer's time.
+    // Hours into a clip the lives of all earlier scratches are computed first: correct, but it costs the fuzzer time.
     return std::abs(time) < 1e9 ? std::fmod(time, 4000.0) : time;
 }
 
-// The rule of the public header in 64 bits: is this a frame?
+// The public header's rule, in 64 bits: is this a valid frame?
 bool IsFrame(const FrameRecord& frame, Packing packing) {
     constexpr std::int64_t kMost = std::numeric_limits<std::int32_t>::max();
     const std::int64_t width = std::int64_t{frame.xOrigin} + frame.width, step = frame.rowStep,
@@ -64,7 +64,7 @@ bool IsFrame(const FrameRecord& frame, Packing packing) {
            pixels * 4 <= std::abs(step);
 }
 
-// Replaces one number of the record by any other, so that it is no frame.
+// Replaces one number of the record by an arbitrary one, so that the record becomes invalid.
 void Spoil(FuzzInput& input, Packing packing, FrameRecord& frame) {
     std::int32_t* const numbers[] = {&frame.width, &frame.height, &frame.rowStep, &frame.xOrigin,
                                      &frame.yOrigin};
@@ -72,8 +72,8 @@ void Spoil(FuzzInput& input, Packing packing, FrameRecord& frame) {
     if (IsFrame(frame, packing)) frame.pixels = nullptr;
 }
 
-// Runs the references on the pixels alone, as they were before, and compares all bytes of the memory that holds the
-// destination, `at` bytes in, with what they make of them. `before`: what it held.
+// Runs the references on the pixels alone, as they were before, and compares their result with all bytes of the
+// memory that holds the destination at offset `at`. `before` is that memory's previous content.
 void Compare(const Frame& source, Frame& destination, std::size_t at, const reelcheck::GuardedMemory& home,
              const std::vector<std::uint8_t>& before, Packing from, Packing to, const Operation& operation) {
     for (const Runner runner : {Runner::kReference, Runner::kOtherLevel}) {
@@ -90,7 +90,7 @@ void Compare(const Frame& source, Frame& destination, std::size_t at, const reel
     }
 }
 
-// Runs the operation on two frames apart, in the same memory or overlapping.
+// Runs the operation on two frames in separate memory, in the same memory or overlapping.
 void Try(FuzzInput& input, Packing from, Packing to, const Operation& operation) {
     enum Kind { kSame = 1, kSpoiltSource, kSpoiltDestination, kOverlapping };
     const std::int32_t kind = input.Below(8);
@@ -131,7 +131,7 @@ void Try(FuzzInput& input, Packing from, Packing to, const Operation& operation)
     Compare(source, destination, destinationAt, home, before, from, to, operation);
 }
 
-// The state that a reference renders on, beside the library's.
+// The state that a reference renders with, separate from the library's.
 struct ReferenceRun {
     render::RenderState state;
     render::RenderOptions options;
@@ -149,7 +149,7 @@ class Run {
             *state = {};
             state->random.Seed(seed);
         }
-        // What a menu keeps when it is told nonsense must not come from the input before.
+        // A menu that gets an invalid value keeps its last one, which must not come from the previous input.
         CurrentMasterSettings()->ReadFromHost(m_host);
     }
 
@@ -188,7 +188,8 @@ class Run {
         const auto owner = Reference<IVideoHost>::Adopt(static_cast<IVideoHost*>(face));
         const auto render = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
             if (runner == Runner::kLibrary) return Process(effect, &m_host, source, destination, seconds);
-            // The references read the values that the library's list has just read, and leave in it what they found.
+            // The references use the values that the library's list has just read, and leave the list as they found
+            // it.
             ReferenceRun& reference = runner == Runner::kReference ? m_plain : m_other;
             const TimingRecord timing = {0.0, 0.0, seconds};
             return RenderFrame({CurrentMasterSettings(), &reference.state, reference.options}, *owner,
@@ -202,7 +203,7 @@ class Run {
         const char* const level = kLevels[m_input.Below(5)];
         const std::uint8_t alpha = m_input.Byte();
         const auto convert = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
-            // A processor takes the SIMD level that the environment names when it is made.
+            // A processor takes the SIMD level named in the environment when it is created.
             setenv("VELMORA_FORM", runner == Runner::kLibrary ? level : kLevels[0], 1);
             const auto processor = Reference<IFrameProcessor>::Adopt(m_library.CreateFrameProcessor());
             unsetenv("VELMORA_FORM");
@@ -225,7 +226,7 @@ class Run {
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
     using namespace velmora;
-    // One for the process: each new one keeps a list of settings until the end.
+    // One per process: each new one keeps a list of settings until the process ends.
     static IEffectLibrary& library = *testing::LoadedLibrary().getEffectsLibrary();
     fuzz::FuzzInput input(data, size);
     fuzz::Run run(input, library);

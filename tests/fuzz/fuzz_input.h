@@ -1,4 +1,4 @@
-// What the fuzzing programs share: their demand, and the fuzzer's bytes read as numbers.
+// Shared by the fuzzing programs: their assertion, and the fuzzer's bytes read as numbers.
 #pragma once
 
 #include <cstddef>
@@ -8,12 +8,12 @@
 
 namespace velmora::fuzz {
 
-// A rule that was broken ends the program, so that the fuzzer keeps the input.
+// A violated rule ends the program, so that the fuzzer keeps the input.
 inline void Require(bool holds) {
     if (!holds) std::abort();
 }
 
-// Front to back; past the end everything is 0.
+// Read front to back; past the end everything is 0.
 class FuzzInput {
   public:
     FuzzInput(const std::uint8_t* data, std::size_t size) : m_next(data), m_end(data + size) {}

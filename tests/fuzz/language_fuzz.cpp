@@ -1,4 +1,4 @@
-// Any bytes as a language file: refused, or read so that what was read is well-formed and can be found again.
+// Arbitrary bytes as a language file: refused, or read so that the result is well-formed and can be looked up.
 
 #include <cstddef>
 #include <cstdint>
@@ -36,7 +36,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     const std::string_view file(reinterpret_cast<const char*>(data), size);
     const std::optional<LanguageTable> table = LanguageTable::Read(file);
     if (!table) return 0;
-    // The reader must not have taken bytes that are no text.
+    // The reader must not have accepted bytes that are not text.
     Require(file.find('\0') == std::string_view::npos);
     for (const char* language : {"en", "DE", "ja", "xx"}) {
         for (const std::int32_t category : {0, 4, 8}) {

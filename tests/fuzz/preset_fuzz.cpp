@@ -1,4 +1,4 @@
-// Feeds the preset reader with whatever the fuzzer finds: nothing may crash, hang or leave the record's rules.
+// Feeds arbitrary bytes to the preset reader: it must not crash, hang or break the rules of the record.
 #include <tinyxml.h>
 
 #include <algorithm>
@@ -36,14 +36,14 @@ bool HasManyAttributes(const TiXmlNode& node) {
     return hasMany;
 }
 
-// The scanner and the parser read the same structure. Small texts only: the parser recurses.
+// The scanner and the parser must read the same structure. Small texts only, because the parser recurses.
 void CompareWithParser(const std::string& text) {
     if (text.size() > 4096) return;
     TiXmlDocument document;
     document.Parse(text.c_str(), nullptr, TIXML_ENCODING_LEGACY);
     const bool isFine = !document.Error() && document.FirstChildElement() != nullptr;
     const bool isLarge = DepthOf(document) > velmora::kXmlDepthLimit || HasManyAttributes(document);
-    // References that swallow markup are refused on purpose, so a text with one tells nothing.
+    // References that swallow markup are refused on purpose, so a text with one proves nothing.
     const bool hasReference = text.find("&#") != std::string::npos;
     if (velmora::IsWithinXmlLimits(text.c_str())) {
         Require(!isLarge);
@@ -64,7 +64,7 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     std::memset(&record, 0x5A, sizeof record);
     const velmora::PresetRecord untouched = record;
     const bool isRead = velmora::ParsePreset(text.data(), text.size(), &record);
-    // Every byte counts here, whatever it stands for.
+    // Every byte is compared here, whatever it means.
     // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison)
     if (isRead || std::memcmp(&record, &untouched, sizeof record) != 0) {
         Require(record.count >= (isRead ? 1 : 0) && record.count <= velmora::kPresetCellCapacity);

@@ -1,5 +1,5 @@
-// Runs a fuzzing program's entry over the files of the folders that are named, where no fuzzer is at hand: whatever
-// has once been found stays found in every build.
+// Runs a fuzzing program's entry on the files of the given folders where no fuzzer is available, so that every build
+// tests the inputs found so far.
 
 #include <cstddef>
 #include <cstdint>

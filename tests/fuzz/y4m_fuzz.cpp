@@ -1,6 +1,6 @@
-// Any bytes as a YUV4MPEG2 stream on the two roads that streams come in: reelhost's own reader and writer, and reelfx's,
-// through the media libraries. Refused with one line that tells the user why, or read as frames that are all of one
-// size, in order.
+// Arbitrary bytes as a YUV4MPEG2 stream through both readers: reelhost's own reader and writer, and reelfx's, which
+// uses the media libraries. A stream must be refused with a one-line message for the user, or read in order as frames
+// of one size.
 
 #include <sys/mman.h>
 #include <unistd.h>
@@ -50,7 +50,7 @@ class MemoryFile {
     int m_descriptor;
 };
 
-// The header alone may promise gigabytes; that they are asked for is no fault.
+// The header alone may promise gigabytes; requesting them is not a fault.
 bool IsHandy(std::string_view stream) {
     try {
         return ParseY4mHeader(stream.substr(0, stream.find('\n'))).FrameBytes() <= std::size_t{1} << 18;

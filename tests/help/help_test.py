@@ -1,8 +1,8 @@
-"""Checks the compiled help as its viewers see it: unpacked from the finished file.
+"""Checks the compiled help as its viewers see it, unpacked from the finished file.
 
     help_test.py CHM TOPICS_H PAGES BUILD_SCRIPT [REELFX]
 
-With REELFX the pages are also held against the effects' tables.
+With REELFX the pages are also compared with the effects' tables.
 """
 
 import json
@@ -58,7 +58,7 @@ class Page(HTMLParser):
 
 
 def numbered_topics(folder):
-    """{number: page} as a viewer reads them: pairs of number and place of the page's name among the strings."""
+    """{number: page} as a viewer reads them: pairs of a number and the name's offset in the string table."""
     pairs = (folder / "#IVB").read_bytes()
     strings = (folder / "#STRINGS").read_bytes()
     size, = struct.unpack_from("<I", pairs)
@@ -133,7 +133,7 @@ class CompiledHelpTest(unittest.TestCase):
 
 
 class EditionTest(unittest.TestCase):
-    """The pages that each package holds. What one kind of user has must not be explained to the others."""
+    """The pages in each package. Features that only one group of users has must not be explained to the others."""
 
     EDITIONS = (
         (("library",), ("reelfx", "FFmpeg", "GStreamer", "seed")),
@@ -159,7 +159,7 @@ class EditionTest(unittest.TestCase):
 
 
 def documented(parameter):
-    """(name, range, start) of a parameter as an effect's page writes them."""
+    """(name, range, default) of a parameter as given on an effect's page."""
     ranges = {"slider": lambda: f"{parameter['minimum']:g} to {parameter['maximum']:g}".replace("-", "\u2212"),
               "colour": lambda: "any colour",
               "menu": lambda: {7: "seven patterns"}[len(parameter["items"])],

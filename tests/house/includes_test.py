@@ -1,4 +1,4 @@
-"""Nothing includes upward, and no two folders include each other; scripts/house.py has the floors."""
+"""Nothing includes upward, and no two folders include each other; scripts/house.py defines the levels."""
 
 import sys
 import tempfile

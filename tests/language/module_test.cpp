@@ -1,5 +1,5 @@
-// The module by its exports only, as the library loads it, with the file that is shipped. Both lie in the
-// current folder.
+// The module through its exports only, as the library loads it, with the shipped file. Both are in the current
+// folder.
 
 #include <cstdint>
 #include <filesystem>

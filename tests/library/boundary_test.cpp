@@ -1,4 +1,4 @@
-// The library through its binary boundary: the rules that reelcheck, a host for any library, cannot check.
+// The library through its binary interface: the rules that reelcheck, a host for any library, cannot check.
 
 #include <gtest/gtest.h>
 
@@ -35,7 +35,7 @@ TEST_F(Boundary, EffectsDoNotKeepTheLibraryLoaded) {
     EXPECT_STREQ(effect->GetName(), "Film Look");
 }
 
-// The tables of an interface, called by slot as a host of another compiler does.
+// The tables of an interface, called by slot as by a host built with another compiler.
 TEST_F(Boundary, KeepsItsSlots) {
     Reference<IVideoEffect> effect = Effect(2);
     void** table = *reinterpret_cast<void***>(effect.Get());
@@ -51,7 +51,8 @@ TEST_F(Boundary, KeepsItsSlots) {
     EXPECT_NE(saver.Get(), nullptr);
 }
 
-// That a frame repeated at once has the same bytes is reelcheck's; another frame in between draws other numbers.
+// reelcheck checks that a frame repeated at once has the same bytes; here another frame in between draws other
+// numbers.
 TEST_F(Boundary, ReplaysAFrameOnlyWhenItIsRepeatedAtOnce) {
     const Reference<IVideoEffect> effect = Effect(0);
     FakeHost host;
@@ -82,7 +83,7 @@ TEST_F(Boundary, ConvertsFramesBothWays) {
     FrameRecord source = {const_cast<std::uint8_t*>(packed), 3, 1, 8, 0, 0, 0};
     const FrameRecord destination = pixels.Record();
     ASSERT_TRUE(processor->ConvertYcbcrToBgra(&source, &destination, 77));
-    // Luma 50, Cb 100, Cr 200: the shifts of 65536 worked out by hand.
+    // Luma 50, Cb 100, Cr 200: worked out by hand with the coefficients scaled by 65536.
     EXPECT_EQ(pixels.At(0, 0).red, 154);
     EXPECT_EQ(pixels.At(0, 0).green, 0);
     EXPECT_EQ(pixels.At(0, 0).blue, 0);

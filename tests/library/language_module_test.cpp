@@ -1,5 +1,5 @@
-// How the library finds, loads, uses and gives back its language module, with a stand-in for it. The library lies
-// in a folder whose name no 8-bit code page can write.
+// How the library finds, loads, uses and releases its language module, with a stand-in for the module. The library is
+// in a folder whose name no 8-bit code page can represent.
 
 #include <gtest/gtest.h>
 
@@ -31,7 +31,7 @@ class LanguageModule : public ::testing::Test {
         fs::remove_all(m_root, ignored);
     }
 
-    // The module's C library reads the environment through its own copy, which both share here (msvcrt).
+    // The module reads its C library's copy of the environment, which test and module share here (msvcrt).
     static void Behave(const char* accept, const char* keep) {
         _putenv_s("VM_TEST_ACCEPT", accept == nullptr ? "" : accept);
         _putenv_s("VM_TEST_KEEP", keep == nullptr ? "" : keep);
@@ -90,7 +90,7 @@ TEST_F(LanguageModule, BesideTheLibraryGivesItsTexts) {
         char16_t buffer[8] = {};
         EXPECT_EQ(texts->GetText("xx", 4, "K", buffer, 8), 1);
         EXPECT_EQ(buffer[0], u'!');
-        // Any words: as hosts of the first version passed them, the library does not look at them.
+        // Arbitrary words, as hosts of the first version passed them; the library ignores them.
         const auto lookUp = reinterpret_cast<std::int32_t(VM_CALL*)(
             void*, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t,
             std::intptr_t)>((*reinterpret_cast<void***>(texts))[3]);

@@ -1,4 +1,4 @@
-// A native test has no file dialogs: every dialog is cancelled, messages are not shown.
+// Native tests have no file dialogs: every dialog is cancelled and messages are not shown.
 
 #include "presets/dialogs.h"
 

@@ -1,4 +1,4 @@
-// A language module for tests: says what it was asked and behaves as the environment tells it.
+// A language module for tests: records its requests and behaves as the environment says.
 //   VM_TEST_ACCEPT  the load request, from 1, that succeeds; others fail
 //   VM_TEST_KEEP    set: the module asks to be kept
 
@@ -12,7 +12,7 @@
 
 namespace {
 
-std::u16string g_log;  // one line a request
+std::u16string g_log;  // one line per request
 
 class Parser final : public velmora::LangXMLParser {
   public:

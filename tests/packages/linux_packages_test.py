@@ -1,6 +1,6 @@
 """The tarball and the Debian package: their bytes, their contents, and what a user does with them on this machine.
 
-Environment: VELMORA_DIST the results of the native build, WORK a folder of this test's own.
+Environment: VELMORA_DIST has the results of the native build, WORK is a folder for this test alone.
 """
 
 import gzip
@@ -53,7 +53,7 @@ def check_tarball(path, work, expected):
     assert digests(home / ".local/bin/reelfx") == expected
     page = run(home / ".local/bin/reelfx", "studio", "--path").strip()
     assert page == str(home / ".local/share/velmora-reel-effects/reel.html"), page
-    # FFmpeg finds the plug-in by itself: its frames are those of reelfx.
+    # FFmpeg finds the plug-in by itself, and its frames are those of reelfx.
     run("ffmpeg", "-nostdin", "-v", "error", "-i", CLIP, "-vf", "frei0r=velmora_film_pro:super8|7", "-frames:v", "2",
         "-f", "null", "-", env=environment)
     run(unpacked / "install.sh", "--remove", env=environment)
@@ -74,7 +74,7 @@ def check_deb(path, work, expected):
     owners = {line.split()[1] for line in run("dpkg-deb", "-c", path).splitlines()}
     assert owners == {"root/root"}, owners
     for name in files:
-        if name.endswith(".gz"):  # the time in a compressed file's head
+        if name.endswith(".gz"):  # the timestamp in a compressed file's header
             assert (unpacked / name).read_bytes()[4:8] == bytes(4), name
             gzip.decompress((unpacked / name).read_bytes())
     check_no_build_paths(unpacked)

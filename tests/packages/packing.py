@@ -1,4 +1,4 @@
-"""What the tests of the packages share: packing as two different users would, and looking into what came out."""
+"""Shared by the package tests: packs as two different users would, and looks into the results."""
 
 import hashlib
 import os
@@ -10,7 +10,7 @@ ROOT = Path(__file__).resolve().parents[2]
 DIST = Path(os.environ["VELMORA_DIST"])
 CLIP = Path("/usr/share/forensics-samples/original-files/movie1/VID_20191220_170832.mp4")
 
-# Packages must not depend on who packs them: another time zone, language and mask of new files.
+# Packages must not depend on who builds them: another time zone, language and umask.
 USERS = [
     {"TZ": "UTC", "LC_ALL": "C.UTF-8", "umask": "022"},
     {"TZ": "Asia/Tokyo", "LC_ALL": "de_DE.UTF-8", "umask": "077"},
@@ -18,7 +18,7 @@ USERS = [
 
 
 def run(*words, **options):
-    """Runs a program; its output as text. A failure shows what it said and ends the test."""
+    """Runs a program and returns its output as text. On failure, shows the output and ends the test."""
     done = subprocess.run([str(word) for word in words], capture_output=True, text=True, errors="replace", **options)
     if done.returncode != 0:
         sys.exit(f"{' '.join(map(str, words))}: exit code {done.returncode}\n{done.stdout}{done.stderr}")
@@ -26,7 +26,7 @@ def run(*words, **options):
 
 
 def pack_twice(work, *packers):
-    """Packs as two users into work/0 and work/1, checks that the bytes are the same, returns {file name: path}."""
+    """Packs as two users into work/0 and work/1, checks that the bytes are equal, returns {file name: path}."""
     packed = []
     for number, user in enumerate(USERS):
         folder = Path(work) / str(number)
@@ -59,8 +59,8 @@ def check_digest_list(folder):
 
 
 def check_no_build_paths(folder):
-    """No file may tell in which folder it was built: it would differ in another, and tells of the builder."""
-    # A folder right below the root may be called as parts of others' paths are, which runtimes mention.
+    """No file may contain the path of its build folder: builds elsewhere would differ, and it reveals the builder."""
+    # A folder right below the root may have a name that occurs in other paths, which runtime libraries mention.
     roots = [f"{root}/".encode() for root in (ROOT, DIST, Path.home()) if len(root.parts) > 2]
     for path in Path(folder).rglob("*"):
         if path.is_file():

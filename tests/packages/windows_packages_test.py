@@ -1,6 +1,6 @@
 """The zip and the installer for Windows: their bytes, their contents, and an installation's life in a fresh Wine prefix.
 
-Environment: VELMORA_DIST the results of the Windows build, WORK a folder of this test's own.
+Environment: VELMORA_DIST has the results of the Windows build, WORK is a folder for this test alone.
 """
 
 import hashlib
@@ -27,7 +27,7 @@ EXIT_IN_USE = 2
 
 
 class Prefix:
-    """A Windows of its own, with a Wine server of its own: neither sees anything of those that other tests use."""
+    """A separate Windows with its own Wine server, isolated from those that other tests use."""
 
     def __init__(self, folder):
         self.folder = folder
@@ -45,12 +45,12 @@ class Prefix:
         run(WINE, "--stop", env=self._environment)
 
     def files(self):
-        """Files and folders, but for what is inside folders for temporary ones: the system empties them when it likes."""
+        """Files and folders, except the contents of temporary folders, which the system may empty at any time."""
         names = {path.relative_to(self.drive).as_posix() for path in self.drive.rglob("*")}
         return {name for name in names if not re.search(r"(^|/)temp/", name, re.I)}
 
     def registry(self):
-        """{(key, value's line)} of what programs write to; a key without values has the line ""."""
+        """{(key, value's line)} where programs write; a key without values has the line ""."""
         lines = set()
         for number, root in enumerate(("HKCU", r"HKLM\Software")):
             file = self.drive / f"export{number}.reg"
@@ -60,7 +60,7 @@ class Prefix:
             for block in re.split(r"\n(?=\[)", text)[1:]:
                 key, *values = block.splitlines()
                 lines |= {(key.strip("[]"), value) for value in ["", *values]}
-        # Wine keeps notes of its own there, of colours and sizes.
+        # Wine stores its own settings there, such as colours and sizes.
         return {line for line in lines if "\\Software\\Wine\\" not in line[0]}
 
     def write_registry(self, key, name, value):
@@ -68,7 +68,7 @@ class Prefix:
 
 
 class Installation:
-    """One installation in a prefix: its folder, and the root of the registry that its entry is below."""
+    """One installation in a prefix: its folder, and the registry root that holds its entry."""
 
     def __init__(self, prefix, setup, folder, root, *switches):
         self.prefix, self.setup, self.root, self.switches = prefix, setup, root, switches
@@ -79,7 +79,7 @@ class Installation:
         return self.prefix.run(self.setup, "/S", *self.switches, *place)
 
     def uninstall(self):
-        """Ends when all is gone: the uninstaller leaves the work to a copy of itself, and its folder to the last."""
+        """Returns when all is gone: the uninstaller leaves the work to a copy of itself and removes its folder last."""
         assert self.prefix.run(self.folder / "uninstall.exe", "/S") == 0
         for _ in range(600):
             if not (self.folder / "uninstall.exe").exists() and not self.entry():
@@ -90,7 +90,7 @@ class Installation:
     def entry(self):
         """The uninstaller's entry {name: value}, or nothing."""
         query = self.prefix.start("reg", "query", f"{self.root}\\{OWN_KEY}", stdout=subprocess.PIPE, stderr=subprocess.DEVNULL)
-        # As the console writes it: letters that its code page has not are lost.
+        # As the console prints it: characters that its code page lacks are lost.
         text = query.communicate(timeout=120)[0].decode("cp437", "replace")
         return dict(re.findall(r"^ +(\S+) +REG_\w+ +(.*?)\r?$", text, re.M))
 
@@ -117,7 +117,7 @@ def check_zip(path, work):
 
 
 def digests(start, host):
-    """Frames of the clip through the library beside a host. Film Look draws no random numbers: runs are comparable."""
+    """The clip's frames through the library next to a host. Film Look draws no random numbers: runs can be compared."""
     frames = subprocess.run(["ffmpeg", "-nostdin", "-v", "error", "-i", CLIP, "-frames:v", "3", "-fps_mode",
                              "passthrough", "-pix_fmt", "bgra", "-s", "320x180", "-f", "rawvideo", "-"], capture_output=True, check=True).stdout
     process = start(host, "--effect", "Film Look", "--preset", "Sepia", "--size", "320x180", "--hash",
@@ -128,15 +128,15 @@ def digests(start, host):
 
 
 def check_in_use(installation):
-    """Neither setup nor uninstaller may change anything while a program has the library loaded."""
+    """Neither setup nor the uninstaller may change anything while a program has the library loaded."""
     before = files_below(installation.folder)
     user = installation.prefix.start(installation.folder / "reelhost.exe", "--effect", "Film Look", "--size", "64x48",
                                      "--hash", stdin=subprocess.PIPE, stdout=subprocess.PIPE, stderr=subprocess.DEVNULL)
     user.stdin.write(bytes(64 * 48 * 4))
     user.stdin.flush()
-    user.stdout.read(1)  # the first digest: the library is at work
+    user.stdout.read(1)  # the first digest: the library is in use
     assert installation.install() == EXIT_IN_USE
-    # "_?=" keeps the uninstaller where it is, so that its exit code can be seen.
+    # "_?=" keeps the uninstaller in its folder, so that its exit code is available.
     place = f"_?={installation.name}".split(" ")
     assert installation.prefix.run(installation.folder / "uninstall.exe", "/S", *place) == EXIT_IN_USE
     user.communicate(timeout=120)
@@ -144,10 +144,10 @@ def check_in_use(installation):
 
 
 def check_installation(installation, packed, expected, place=()):
-    """Installs, renders, installs once more over it, and finds what the package holds and an entry that fits."""
+    """Installs, renders, installs again over it, and finds the package's contents and a matching entry."""
     for _ in range(2):
         assert installation.install(*place) == 0
-        place = ()  # where it lies is known from its entry
+        place = ()  # its folder is known from its entry
         files = files_below(installation.folder)
         assert files.pop("uninstall.exe", None)
         assert files == packed, set(files.items()) ^ set(packed.items())
@@ -157,12 +157,12 @@ def check_installation(installation, packed, expected, place=()):
 
 
 def check_life(prefix, setup, packed, expected):
-    """One installation for the user, in a folder with spaces and letters of two scripts, and one for all, side by side."""
+    """One installation for the user, in a folder with spaces and letters of two scripts, beside one for all users."""
     user = Installation(prefix, setup, "\u00dcbung mit Film\\\u6620\u753b Effects", "HKCU", "/CurrentUser")
     everyone = Installation(prefix, setup, "Program Files\\Velmora\\Reel Effects", "HKLM", "/AllUsers")
     files, registry = prefix.files(), prefix.registry()
 
-    # A word each: the installer takes the rest of its line, which must not be quoted, for the folder.
+    # One word each: the installer takes the rest of its command line, which must not be quoted, as the folder.
     check_installation(user, packed, expected, place=f"/D={user.name}".split(" "))
     check_in_use(user)
     check_installation(everyone, packed, expected)

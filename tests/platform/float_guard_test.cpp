@@ -19,7 +19,7 @@ struct FloatState {
 
 TEST(FloatGuard, WorksInItsOwnStateAndGivesTheCallersBack) {
     const FloatState before = FloatState::Read();
-    // Truncating, single precision, denormals flushed; a division by zero that nobody masked.
+    // Truncating, single precision, denormals flushed, and an unmasked division by zero.
     const FloatState hostile = {0x0C7B, 0x9F80 | 0x6000 | 0x0040};
     hostile.Set();
     FloatState inside;

@@ -1,4 +1,4 @@
-// Reads and answers the system's dialogs from a second thread, as a user would.
+// Reads and answers the system's dialogs from a second thread, like a user.
 #pragma once
 
 #include <gtest/gtest.h>
@@ -21,8 +21,8 @@ inline HWND FileTypes(HWND dialog) {
     return GetDlgItem(dialog, cmb1);
 }
 
-// A file dialog or a message of this process; null when none comes within some seconds. Told apart by what is
-// in them: a new window may get the handle of one that has just closed.
+// A file dialog or a message of this process; null when none appears within some seconds. They are told apart by
+// their content, because a new window may reuse the handle of one that has just closed.
 inline HWND WaitForWindow(bool isFileDialog) {
     for (int tries = 0; tries < 400; ++tries) {
         HWND window = nullptr;
@@ -53,13 +53,13 @@ inline bool WaitForEnd(HWND window) {
     return !IsWindow(window);
 }
 
-// What a file dialog shows. The file-type list holds the label; its pattern decides which files are listed.
+// The contents of a file dialog. The file type list shows the label; its pattern decides which files are listed.
 struct SeenFileDialog {
     std::wstring title, label;
     int labels = 0;
 };
 
-// The name field is an edit, alone or inside a combination.
+// The name field is an edit control, alone or inside a combo box.
 inline HWND NameField(HWND dialog) {
     HWND field = GetDlgItem(dialog, edt1);
     if (field == nullptr) field = GetDlgItem(dialog, cmb13);
@@ -77,7 +77,7 @@ inline void Type(HWND dialog, const std::string& fileName) {
     SendMessageW(NameField(dialog), WM_SETTEXT, 0, reinterpret_cast<LPARAM>(wide.c_str()));
 }
 
-// Waits for a file dialog, looks at it, and answers it with a name, or cancels it when there is none.
+// Waits for a file dialog, reads it, and answers it with a name, or cancels it when there is none.
 inline HWND AnswerFileDialog(const std::string& fileName, SeenFileDialog* seen) {
     HWND dialog = WaitForFileDialog();
     if (dialog == nullptr) {

@@ -12,7 +12,7 @@
 
 namespace velmora::tests {
 
-// Answers one language; counts what is taken and given back.
+// Answers one language; counts what is acquired and released.
 class FakeTexts final : public Uncounted<IMultiLingual> {
   public:
     std::uint32_t VM_CALL AddRef() override { return static_cast<std::uint32_t>(++references); }
@@ -66,8 +66,8 @@ class FakeLibrary final : public Uncounted<IEffectLibrary> {
 inline constexpr std::uint32_t kIndexOfLook = 1;
 inline constexpr std::uint32_t kIndexOfDamage = 2;
 
-// What a host hands to the saver: the effect's built-in preset `preset` in value cells. Names are left to the
-// saver, but for the preset's own.
+// What a host passes to the saver: the effect's built-in preset `preset` in value cells. The saver fills in all names
+// but the preset's own.
 inline PresetRecord MakeRecord(std::uint32_t effectIndex, std::uint32_t preset) {
     PresetRecord record = {};
     const auto effect = Reference<IVideoEffect>::Adopt(effects::CreateEffectByIndex(effectIndex));

@@ -1,4 +1,4 @@
-// The saver with the system's real dialogs, which a second thread reads and answers as a user would.
+// The saver with the system's real dialogs, which a second thread reads and answers like a user.
 #include <gtest/gtest.h>
 
 #include <functional>
@@ -36,8 +36,8 @@ void ExpectMessage(const SeenMessage& seen, const wchar_t* caption, const wchar_
 
 class PresetDialogsTest : public testing::Test {
   protected:
-    // The host's window has the foreground: messages must not belong to a window of another program, which may
-    // close it and take them along.
+    // Brings the host's window to the foreground: messages must not belong to another program's window, which may
+    // close and take them along.
     PresetDialogsTest() { SetForegroundWindow(m_host); }
     ~PresetDialogsTest() override {
         m_saver->Release();
@@ -172,7 +172,7 @@ TEST_F(PresetDialogsTest, TellsOfFailuresInMessages) {
         L"again.");
 }
 
-// The message belongs to the window that the user works in, not to the file dialog's owner.
+// The message belongs to the window that the user is working in, not to the file dialog's owner.
 TEST_F(PresetDialogsTest, MessagesAreOwnedByTheForegroundWindow) {
     if (GetForegroundWindow() != m_host) GTEST_SKIP() << "the screen keeps its foreground window";
     HWND owner = nullptr;

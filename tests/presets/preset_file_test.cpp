@@ -58,7 +58,7 @@ PresetRecord Filled() {
 
 const char* const kCommaLocales[] = {"de_DE.UTF-8", "de_DE.utf8", "de_DE", "German_Germany.1252", "German"};
 
-// Switches to a locale with a decimal comma for its life.
+// Switches to a locale with a decimal comma for its lifetime.
 class CommaLocale {
   public:
     CommaLocale() {
@@ -238,7 +238,7 @@ std::string Repeat(const char* text, int count) {
 struct OddFile {
     const char* name;
     std::string text;
-    int values;  // -1: failure with the record untouched; 0: failure, names read; else success
+    int values;  // -1: failure, record untouched; 0: failure, names read; else success
 };
 
 TEST(ReadPreset, ReadsOddFiles) {
@@ -323,7 +323,7 @@ TEST(ReadPreset, CutsLongNames) {
     for (const char byte : record.libraryName) ASSERT_EQ(byte, 0);
 }
 
-// Sizes near the limit, of the shapes that cost the most for each byte.
+// Sizes near the limit, in the shapes that cost the most per byte.
 TEST(ReadPreset, EndsOnLargeFiles) {
     const std::string one = "<parameter type='2' value='0.5'/>";
     const TemporaryFolder folder;
@@ -353,7 +353,7 @@ TEST(ReadPreset, FailsOnWhatIsNoFile) {
 }
 
 #ifdef _WIN32
-// As "COM1" does in every folder, this pipe keeps its reader waiting.
+// This pipe blocks its reader, as "COM1" does in every folder.
 TEST(ReadPreset, DoesNotWaitForADevice) {
     const std::string name = "\\\\.\\pipe\\velmora-" + std::to_string(GetCurrentProcessId());
     const HANDLE pipe = CreateNamedPipeA(name.c_str(), PIPE_ACCESS_OUTBOUND, 0, 1, 0, 0, 0, nullptr);

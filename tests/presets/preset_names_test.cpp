@@ -53,7 +53,8 @@ TEST(PresetNames, FilterIsCutInTheWordOnly) {
     const std::u16string fits(76, u'x');
     EXPECT_EQ(FilterText(MakePresetFilter(kOwn, 0, fits.c_str()), 100), fits + tail);
     EXPECT_EQ(FilterText(MakePresetFilter(kOwn, 0, (fits + u"y").c_str()), 100), fits + tail);
-    const std::u16string half = std::u16string(75, u'x') + u"\xD83C\xDFAC";  // one character of two units
+    const std::u16string half =
+        std::u16string(75, u'x') + u"\xD83C\xDFAC";  // one character of two code units
     EXPECT_EQ(FilterText(MakePresetFilter(kOwn, 0, half.c_str()), 99), std::u16string(75, u'x') + tail);
 }
 

@@ -1,4 +1,4 @@
-// The saver's flows, with dialogs that a test answers.
+// The saver's flows, with dialogs answered by the test.
 #include "presets/preset_saver.h"
 
 #include <gtest/gtest.h>
@@ -21,7 +21,7 @@ using tests::kIndexOfDamage;
 using tests::kIndexOfLook;
 using tests::TemporaryFolder;
 
-// What the user does, and what was shown to the user.
+// The user's actions, and what the user was shown.
 struct User {
     bool choosesFile = false;
     std::u16string fileName;
@@ -132,10 +132,10 @@ TEST_F(PresetSaverTest, FailsWithoutADialogWhenThereIsNoRecord) {
 
 TEST_F(PresetSaverTest, TellsWhenAFileCannotBeUsed) {
     const std::u16string names[] = {
-        u"",                                          // the dialog gave none
+        u"",                                          // the dialog returned none
         Wide(m_folder.File("missing/a.fxprelb")),     // no such folder
         Wide(m_folder.File("")) + u"\u4E2D.fxprelb",  // not in the code page
-        Wide(m_folder.File("")) + u"\u0100.fxprelb",  // only a look-alike is
+        Wide(m_folder.File("")) + u"\u0100.fxprelb",  // only has a best-fit conversion
         Wide(m_folder.File("")) + u"a\u0301.fxprelb",
     };
     for (const std::u16string& name : names) {
@@ -179,7 +179,7 @@ TEST_F(PresetSaverTest, NamesTheSameEffectWhenAParameterDiffers) {
               u"Please try again.");
 }
 
-// The longest names that a record holds: 259 characters each.
+// The longest names that a record can hold: 259 characters each.
 TEST_F(PresetSaverTest, WarnsOfPresetsWithLongNames) {
     const std::string name(300, 'n');
     UserChooses(Wide(m_folder.Write("a", "<Preset EffectName='" + name + "'><parameter/></Preset>")));

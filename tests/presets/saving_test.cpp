@@ -1,4 +1,4 @@
-// A user's presets survive whatever goes wrong while a new one is written.
+// A user's presets survive any failure while a new one is written.
 #include <gtest/gtest.h>
 
 #include <filesystem>
@@ -97,7 +97,7 @@ TEST(ReplaceTextFile, KeepsAWriteProtectedFile) {
     EXPECT_EQ(folder.Count(), 1u);
 }
 #else
-// The administrator may write everywhere: for its life, the process is somebody else, who owns these.
+// Root may write everywhere, so for its lifetime the process becomes another user, who owns these files.
 class PlainUser {
   public:
     explicit PlainUser(std::initializer_list<std::string> owned) {

@@ -1,4 +1,4 @@
-// A folder for one test, gone with it. Files are bytes.
+// A folder for one test, removed with it. File contents are bytes.
 #pragma once
 
 #include <atomic>

@@ -1,5 +1,5 @@
-// A frame by rows, on every SIMD level, is what its stages give one after the other, whatever the settings and the
-// frames.
+// Rendering by rows, on every SIMD level, gives the same frame as applying the stages one after the other, for any
+// settings and frames.
 
 #include <gtest/gtest.h>
 
@@ -60,7 +60,7 @@ Geometry AnyGeometry(Dice& dice) {
             dice.Whole(0, 3),       dice.Whole(0, 5),       dice.Half()};
 }
 
-// The plain reference, or by rows as the options say.
+// The plain reference, or by rows with these options.
 struct How {
     bool isReference = false;
     RenderOptions options = {};
@@ -109,7 +109,7 @@ TEST(Chain, ByRowsGivesTheStagesBytes) {
     }
 }
 
-// Few amounts give bytes without a factor.
+// Few amounts have bytes without a factor.
 TEST(Chain, ByRowsGivesTheStagesBytesUnderOddWear) {
     int found = 0;
     for (int step = 1; step <= 2000; ++step) {
@@ -156,7 +156,7 @@ TEST(Chain, OverlappingFramesAreAsIfTheSourceHadBeenCopiedFirst) {
             StageSettings settings;
             settings.saturation = -0.5f;
             if (jitter) settings.yJitter = settings.xJitter = 5;
-            // One buffer of 20 rows; the destination lies `shift` rows below the source.
+            // One buffer of 20 rows; the destination is `shift` rows below the source.
             GuardedFrame buffer{Geometry{9, 20}};
             buffer.FillRandom(1);
             GuardedFrame apart = buffer, copy = buffer;

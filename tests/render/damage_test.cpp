@@ -39,7 +39,7 @@ TEST(Wear, TilesInStripsWithARandomStartEach) {
             Random random(5), plain(5);
             const WearStage stage = PrepareWear(settings, width, random, factors, kPlainKernels);
             const GreyPicture& picture = WearPicture(pattern == 2099 ? 2000 : pattern);
-            plain.Next();  // an orientation that nothing uses
+            plain.Next();  // unused orientation
             std::vector<std::int64_t> starts;
             for (std::int32_t x = 0; x < width; x += picture.width) {
                 starts.push_back(std::int64_t{plain.Next()} * (picture.height - 3) / 32767);

@@ -1,4 +1,4 @@
-"""The embedding refuses pictures that the renderer cannot use, and says which and why.
+"""The embedding script rejects pictures that the renderer cannot use, and says which and why.
 
 Called with the embedding script and the folder of the pictures.
 """

@@ -166,7 +166,7 @@ TEST(Random, DrawsBetweenIntegersInEitherOrder) {
     }
     Random random(1);
     EXPECT_EQ(random.Draw(5, 5), 5);
-    // The upper end comes with the largest number only: here from the state before the one that holds it.
+    // Only the largest number gives the upper end; this state comes just before it.
     Random last(0x7FFF0000u);
     last.Skip(0xFFFFFFFFu);
     EXPECT_EQ(last.Draw(-7, 12), 12);

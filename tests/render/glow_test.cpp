@@ -84,7 +84,7 @@ TEST(Glow, LeavesAPictureWithoutLightsAsItIs) {
     }
 }
 
-// But for the dither, which is below one level.
+// Apart from the dither, which is below one level.
 TEST(Glow, LeavesAnEvenPictureEvenUpToItsBorder) {
     for (const auto& size : kSizes) {
         for (const std::uint8_t level : std::initializer_list<std::uint8_t>{110, 140, 201, 255}) {
@@ -118,7 +118,7 @@ TEST(Glow, SpreadsALightEvenlyToAllSides) {
     EXPECT_EQ(at(2, 128), 25);    // not a wash
 }
 
-// A light of a tenth of the height, seen at shares of the height from its edge.
+// A light a tenth of the height in size, measured at distances relative to the height.
 TEST(Glow, ReachesAsFarAsThePictureIsHigh) {
     const auto halo = [](std::int32_t height, double distance) -> int {
         PlainPicture in(height, height, {40, 40, 40, 255});
@@ -135,7 +135,7 @@ TEST(Glow, ReachesAsFarAsThePictureIsHigh) {
     }
 }
 
-// The green of 16 × 16 pixels after each other to the right of a point, on average: without the dither.
+// The mean green of successive 16 × 16 blocks to the right of a point. Averaging removes the dither.
 std::vector<double> Profile(const PlainPicture& picture, std::int32_t left, std::int32_t top) {
     constexpr std::int32_t kSide = 16;
     std::vector<double> means;
@@ -149,8 +149,8 @@ std::vector<double> Profile(const PlainPicture& picture, std::int32_t left, std:
     return means;
 }
 
-// A white disc on black and on grey. The halo is grey, falls from step to step without a ring or a band, which
-// would be a stretch of one level, and is seen at an eighth of the height from the disc.
+// A white disc on black and on grey. The halo is grey, falls steadily without rings or bands (stretches of one level),
+// and is visible at an eighth of the height from the disc.
 TEST(Glow, MakesASmoothWideHalo) {
     for (const std::int32_t height : {288, 576, 1080}) {
         for (const std::uint8_t ground : std::initializer_list<std::uint8_t>{0, 60}) {
@@ -192,7 +192,7 @@ TEST(Glow, GrowsWithTheAmountAndKeepsTheLightsColour) {
     }
 }
 
-// A frame after another of any size is what it is alone, and its rows are the same in any order.
+// A frame does not depend on the one before it, of whatever size, and its rows can be processed in any order.
 TEST(Glow, RemembersNeitherTheFrameNorTheRowBefore) {
     GlowMemory memory;
     for (const auto& size : kSizes) {

@@ -1,5 +1,5 @@
-// Every kernel of every SIMD level gives the plain kernel's bytes: at all widths up to some vectors and at all
-// addresses, from random and from extreme numbers, with guard bytes around what may be written.
+// Every kernel of every SIMD level gives the plain kernel's bytes: for all widths up to a few vectors and all
+// alignments, with random and extreme numbers, and with guard bytes around what may be written.
 
 #include "render/kernels.h"
 
@@ -22,7 +22,7 @@ namespace velmora::render {
 namespace {
 
 constexpr std::int32_t kWidest = 140;
-constexpr std::size_t kGuard = 80;  // bytes before and behind a row
+constexpr std::size_t kGuard = 80;  // bytes before and after a row
 
 using Bytes = std::vector<std::uint8_t>;
 
@@ -34,7 +34,7 @@ std::vector<SimdLevel> FasterLevels() {
     return levels;
 }
 
-// Random bytes, black, white, and black and white by turns.
+// Random bytes, black, white, and alternating black and white.
 std::vector<Bytes> Inputs(std::size_t size) {
     std::mt19937 numbers(1);
     std::vector<Bytes> inputs(4, Bytes(size));
@@ -47,8 +47,8 @@ std::vector<Bytes> Inputs(std::size_t size) {
 template <typename In, typename Out>
 using Run = std::function<void(const Kernels&, const In*, Out*, std::int32_t width)>;
 
-// From a row at an address into another one, which starts out as guard bytes. The input ends where its last pixel
-// does, so that the address sanitizer sees what reads beyond it.
+// From a row at some alignment into another one that is filled with guard bytes first. The input's allocation ends with
+// its last pixel, so that the address sanitizer catches reads beyond it.
 template <typename In, typename Out>
 void ExpectEqualRows(const Run<In, Out>& run, std::size_t inBytes, std::size_t outBytes) {
     for (std::int32_t width = 0; width <= kWidest; ++width) {
@@ -100,7 +100,7 @@ TEST(Kernels, ToneIsThePlainOneOnEveryLevel) {
                                {&before, true, 127, nullptr}, {&before, false, 0, nullptr},
                                {nullptr, false, 0, &after},   {nullptr, true, -1, nullptr},
                                {nullptr, true, 0, nullptr}};
-    // Lines and the table that they make.
+    // Lines and the table they make.
     const std::vector<ToneLine> lines[] = {{up}, {cut}, {up, cut}};
     ChannelTables tables[std::size(lines)];
     for (std::size_t i = 0; i < std::size(lines); ++i) {
@@ -196,7 +196,7 @@ TEST(Kernels, ScratchesArePlainOnesOnEveryLevel) {
     }
 }
 
-// A row of cells with its padding, which may be read but not used; what lies behind it must stay as it is.
+// A row of cells with its padding, which may be read but must not matter; memory after it must stay unchanged.
 class CellsOf {
   public:
     enum class Fill { kRandom, kBlack, kWhite, kEither };
@@ -214,7 +214,7 @@ class CellsOf {
         }
     }
     CellRow Row() { return m_lanes.data() + kCellPad * kCellLanes; }
-    // All but the padding behind the row.
+    // Everything except the padding after the row.
     std::vector<std::uint16_t> Written() const {
         return {m_lanes.begin(), m_lanes.end() - kCellPad * kCellLanes};
     }
@@ -223,7 +223,7 @@ class CellsOf {
     std::vector<std::uint16_t> m_lanes;
 };
 
-// `run` may read `in`, rows of twice `count` cells, and writes `out`, which has as many.
+// `run` may read `in`, rows of twice `count` cells, and writes `out`, which is just as long.
 using RunCells =
     std::function<void(const GlowKernels&, std::vector<CellsOf>& in, CellRow out, std::int32_t count)>;
 

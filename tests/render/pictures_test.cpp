@@ -16,7 +16,7 @@ int At(const GreyPicture& picture, int x, int y) {
     return picture.pixels[y * picture.rowStep + x];
 }
 
-// A wear picture as numbers about its mean, wrapping by height as strips of it do in a frame.
+// A wear picture as deviations from its mean, wrapping vertically as its strips do in a frame.
 class Texture {
   public:
     explicit Texture(const GreyPicture& picture) : m_width(picture.width), m_height(picture.height) {
@@ -45,7 +45,7 @@ class Texture {
         m_values[static_cast<std::size_t>(y % m_height * m_width + x)] += amount;
     }
 
-    // How alike pixels are that lie (dx, dy) apart; dx stays inside a strip.
+    // The correlation of pixels (dx, dy) apart; dx stays inside a strip.
     double Correlation(int dx, int dy) const {
         double sum = 0;
         const int first = std::max(0, -dx), last = std::min(m_width, m_width - dx);
@@ -54,7 +54,7 @@ class Texture {
         }
         return sum / (m_height * (last - first)) / (m_deviation * m_deviation);
     }
-    // Beyond 4 pixels grain is independent, while a lattice or an edge repeats.
+    // Beyond 4 pixels grain is independent; a lattice or an edge repeats.
     double GreatestFarCorrelation() const {
         double greatest = 0;
         for (int dy = 0; dy <= std::min(60, m_height / 2); ++dy) {
@@ -64,7 +64,8 @@ class Texture {
         }
         return greatest;
     }
-    // How far the brightest or darkest square of `size` pixels stands out from all such squares, in deviations.
+    // How far the brightest or darkest square of `size` pixels is from the mean of all such squares, in standard
+    // deviations.
     double GreatestFigure(int size) const {
         std::vector<double> means;
         for (int y = 0; y < m_height; ++y) {
@@ -81,8 +82,8 @@ class Texture {
         }
         return most / std::sqrt(squares / static_cast<double>(means.size()));
     }
-    // The contrast between neighbouring columns where two strips meet, whose rows are independent, as a multiple of
-    // the contrast inside.
+    // The contrast between neighbouring columns where two strips with independent start rows meet, as a multiple of the
+    // contrast inside a strip.
     double SeamContrast() const {
         double inside = 0, seam = 0;
         for (int y = 0; y < m_height; ++y) {
@@ -98,7 +99,7 @@ class Texture {
         for (int x = 0; x < m_width; ++x) sum += std::abs(ValueAt(x, y) - ValueAt(x, y - 1));
         return sum;
     }
-    // The contrast of the first row against the last, in deviations of such contrasts inside.
+    // The contrast between the first and last row, in standard deviations of the contrasts between rows inside.
     double WrapContrast() const {
         double sum = 0, squares = 0;
         for (int y = 1; y < m_height; ++y) {
@@ -126,11 +127,12 @@ class Texture {
 struct WearCase {
     const char* name;
     int menuValue, width, height;
-    // Strength of the grain, and its size: the correlation of neighbours.
+    // The grain's strength, and its size as the correlation of neighbours.
     double leastMean, mostMean, leastDeviation, mostDeviation, leastClump, mostClump;
 };
 
-// Means stay low and about 1.7 deviations above 0: higher ones would fog deep black, lower ones would cut the grain off.
+// Means are low, about 1.7 standard deviations above 0: higher means would fog deep black, lower ones would clip the
+// grain.
 constexpr WearCase kWearCases[] = {
     {"Wavy", 2000, 50, 300, .12, .16, .07, .10, .35, .49},
     {"Blotchy", 2001, 50, 300, .18, .22, .10, .13, .46, .62},   // clumps
@@ -141,10 +143,10 @@ constexpr WearCase kWearCases[] = {
     {"Crackly", 2006, 64, 64, .14, .19, .085, .115, .13, .27},
 };
 
-// What gives a texture away once it stands a hundred times in a frame: empty when nothing does.
+// Lists the features that make a texture's repetition visible when a frame shows it a hundred times; empty if none.
 //
-// Grain of a few hundred to a few thousand independent clumps shows correlations and squares of up to four and a half
-// deviations by chance, a correlation's deviation being about 2.2 by the root of the pixels for clumps of this size.
+// Grain of a few hundred to a few thousand independent clumps shows correlations and squares of up to 4.5 standard
+// deviations by chance. For clumps of this size a correlation's standard deviation is about 2.2 / sqrt(pixels).
 std::string Flaw(const Texture& texture) {
     const double chance = 2.2 / std::sqrt(texture.Width() * texture.Height());
     std::ostringstream flaw;
@@ -158,7 +160,8 @@ std::string Flaw(const Texture& texture) {
     expect("share above half", texture.ShareAbove(0.5), 0, 0.04);  // nothing is worn through
     expect("far correlation", texture.GreatestFarCorrelation(), 0, 4.5 * chance);
     for (int size : {3, 7}) expect("figure", texture.GreatestFigure(size), 0, 4.6);
-    // Independent grain differs by the root of 1 / (1 - correlation of neighbours) times more: not seen up to half more.
+    // Across a seam of independent grain the contrast is sqrt(1 / (1 - correlation of neighbours)) times as high; up to
+    // 1.5 times is not visible.
     expect("seam of strips", texture.SeamContrast(), 0.7, 1.55);
     expect("seam of rows", texture.WrapContrast(), -3, 3);
     return flaw.str();
@@ -183,7 +186,7 @@ TEST(WearPictures, AreGrainOfTheirCharacter) {
     }
 }
 
-// Faults that an artist may put into any of the pictures.
+// Faults that an artist could introduce into any of the pictures.
 TEST(WearPictures, AreRefusedWithAFigureAnEdgeOrALattice) {
     for (const WearCase& drawn : kWearCases) {
         SCOPED_TRACE(drawn.name);
@@ -240,7 +243,7 @@ TEST(SpotPictures, LieOnTheirKeyWithoutARectangle) {
     }
 }
 
-// Mostly specks of a few pixels, of very different contrast: a set of equal marks is recognised at once.
+// Mostly specks of a few pixels with very different contrasts: a set of equal marks would be recognised at once.
 TEST(SpotPictures, AreMostlySmallAndOfUnequalContrast) {
     int dark = 0, bright = 0, small = 0, faint = 0, strong = 0;
     for (int index = 0; index < kSpotCount; ++index) {

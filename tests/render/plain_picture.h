@@ -1,4 +1,4 @@
-// A picture of a test of one stage: rows without gaps.
+// A picture for tests of single stages: rows without gaps.
 #pragma once
 
 #include <cstddef>

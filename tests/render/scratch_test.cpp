@@ -1,4 +1,4 @@
-// Scratches: the lives that they lead and the marks that they leave.
+// Scratches: their lives and the marks they leave.
 
 #include <gtest/gtest.h>
 
@@ -28,7 +28,7 @@ StageSettings Scratched(std::uint32_t kinds, std::uint32_t count, float depth, f
     return settings;
 }
 
-// The rules once more, frame by frame and in the plainest words. Columns in thousandths of a pixel.
+// The rules restated as simply as possible, frame by frame. Columns are in thousandths of a pixel.
 class PlainReplay {
   public:
     struct Scratch {
@@ -182,8 +182,8 @@ TEST(Scratches, DrawNothingWithoutDepthOrCount) {
     }
 }
 
-// Over pictures of any size, wherever the jitter moves them: guards at either end of the rows stay whole,
-// since the rows lie behind each other.
+// Pictures of any size, with any jitter. The rows are stored without gaps, so a write past the end of one lands in
+// the next.
 TEST(Scratches, BlackNeverLightensWhiteNeverDarkensAlphaStays) {
     std::mt19937 numbers(3);
     for (int round = 0; round < 300; ++round) {
@@ -211,7 +211,7 @@ TEST(Scratches, BlackNeverLightensWhiteNeverDarkensAlphaStays) {
     }
 }
 
-// How much the scratches change, and in how many pixels.
+// How much the scratches change the picture, and in how many pixels.
 struct Mark {
     std::int64_t amount = 0, pixels = 0;
 };
@@ -252,7 +252,7 @@ TEST(Scratches, MoveWithThePicture) {
     }
 }
 
-// What all scratches of a few clips look like in frame after frame, at full depth.
+// Calls check(line, frame, index) for all scratches of a few clips in successive frames, at full depth.
 template <typename Check>
 void ForEachLine(std::int32_t frames, const Check& check) {
     for (int clip = 0; clip < 6; ++clip) {
@@ -270,7 +270,7 @@ void ForEachLine(std::int32_t frames, const Check& check) {
     }
 }
 
-// Equal lines stand like a fence; on worn film one or two of ten stand out of many faint ones.
+// Equal lines look like a fence; on worn film one or two in ten stand out among many faint ones.
 TEST(Scratches, AreMostlyFaintWithAFewThatStandOut) {
     int faint = 0, strong = 0, all = 0;
     ForEachLine(200, [&](const ScratchLine& line, std::int32_t, std::uint32_t) {
@@ -283,7 +283,7 @@ TEST(Scratches, AreMostlyFaintWithAFewThatStandOut) {
     EXPECT_LT(strong, all / 5);
 }
 
-// A fade of at most 3/4 in ten frames or more, eased, and a tremble of a sixteenth either way.
+// An eased fade of at most 3/4 over ten frames or more, and a tremble of +-1/16.
 TEST(Scratches, FadeSlowly) {
     std::map<std::uint32_t, std::uint32_t> before;
     int jumps = 0, changes = 0;
@@ -323,7 +323,7 @@ TEST(Scratches, BreakOffRaggedly) {
     EXPECT_GT(breaks, 1000);
 }
 
-// As much of a scratch in whatever part of a pixel it lies: else one that drifts would shimmer.
+// A scratch has the same total weight at any position within a pixel; otherwise a drifting one would shimmer.
 TEST(Scratches, CoverAsMuchAtEveryPhaseWithinTheProfile) {
     for (int i = 0; i < 2 * kScratchProfiles * kScratchSections; ++i) {
         const bool isWhite = i % 2 != 0;
@@ -343,7 +343,8 @@ TEST(Scratches, CoverAsMuchAtEveryPhaseWithinTheProfile) {
     }
 }
 
-// A black scratch takes a smaller share of a shadow than of a middle grey, a white one of what a light lacks.
+// A black scratch darkens a shadow by a smaller share than a mid grey; likewise, a white one takes a smaller share of a
+// highlight's distance to white.
 TEST(Scratches, WeakenWhereThePictureIsLikeThem) {
     const auto changeOf = [](std::uint32_t kinds, std::uint8_t grey) {
         const PlainPicture in(640, 90, {grey, grey, grey, 255});

@@ -42,7 +42,7 @@ void Apply(const WearStage& stage, PlainPicture& picture) {
     for (std::int32_t y = 0; y < picture.Height(); ++y) WearRow(stage, picture.Row(y), picture.Width(), y);
 }
 
-// Those that have no rule but their own.
+// Stages without a rule of their own here.
 template <typename Stage>
 void Apply(const Stage& stage, PlainPicture& picture) {
     for (std::int32_t y = 0; y < picture.Height(); ++y) {

@@ -42,7 +42,7 @@ int CountOffLine(const ByteTable& table, const ToneLine& line) {
     return count;
 }
 
-// Some tables are missed by all numbers of 16 bits, which only costs time.
+// No 16-bit numbers give some of the tables; that only costs time.
 TEST(ToneLine, GivesNearlyAllTablesOfBrightnessAndContrast) {
     int tables = 0, missed = 0;
     const auto check = [&](const ByteTable& table, double slope) {
@@ -86,7 +86,7 @@ TEST(ContrastTable, MatchesWholeNumbers) {
 }
 
 TEST(ContrastTable, FollowsTheGainLadder) {
-    // The smallest input that reaches white tells the gain: 127.5 + 127.5 / g.
+    // The smallest input that reaches white shows the gain: 127.5 + 127.5 / g.
     struct Row {
         float contrast;
         double factor;
@@ -108,7 +108,7 @@ TEST(ContrastTable, FollowsTheGainLadder) {
     }
 }
 
-// The flicker as the description of a run tells it: one draw after the other from time 0.
+// The flicker computed directly: one draw after another from time 0.
 float PlainFlicker(float saturation, float flicker, std::uint32_t rate, double draws) {
     std::uint64_t state = std::bit_cast<std::uint32_t>(saturation + flicker);
     const auto span = static_cast<std::uint64_t>(std::floor(static_cast<double>(flicker * 100.0f) + 0.5));
@@ -257,7 +257,7 @@ TEST(FilmGammaTable, BendsTowardAnS) {
         for (int i = 0; i < 256; ++i) {
             const long double x = i / 256.0L, pi = 3.14159265358979323846264338327950288L;
             const long double y = (gamma * (1 - std::cos(pi * x)) / 2 + (1 - gamma) * x) * 256;
-            // Where the exact curve is not within rounding reach of a whole number its floor must stand.
+            // Unless the exact curve is within rounding error of a whole number, the result must be its floor.
             if (std::fabs(y - std::round(y)) > 1e-4L) {
                 ASSERT_EQ(table[static_cast<std::size_t>(i)], static_cast<int>(y)) << gamma << ' ' << i;
             }
@@ -278,7 +278,7 @@ TEST(Tint, ChainsGammaTintGamma) {
     const TintStage gammaOnly = PrepareTint(settings);
     const ByteTable g = FilmGammaTable(0.5f);
     for (std::size_t i = 0; i < 256; ++i) {
-        // Behind a gamma the neutral tint is i x 255 / 256, rounded.
+        // After a gamma the neutral tint is i x 255 / 256, rounded.
         const std::size_t tinted = (2 * g[i] * 255 + 256) / 512;
         ASSERT_EQ(gammaOnly.Red()[i], g[tinted]) << i;
         ASSERT_EQ(gammaOnly.Blue()[i], g[tinted]) << i;

@@ -29,7 +29,7 @@ TEST(Ycbcr, DecodesBlackWhiteAndEveryTriple) {
         for (std::int64_t cb = 0; cb < 256; cb += 17) {
             for (std::int64_t cr = 0; cr < 256; cr += 15) {
                 const auto channel = [](std::int64_t sum) {
-                    // Floor of a division by 65536, in whole numbers of either sign.
+                    // Integer floor division by 65536, for either sign.
                     const std::int64_t v = sum >= 0 ? sum / 65536 : -((-sum + 65535) / 65536);
                     return static_cast<std::uint8_t>(v < 0 ? 0 : v > 255 ? 255 : v);
                 };
@@ -73,7 +73,7 @@ TEST(Ycbcr, EncodesPairsAndALonePixel) {
     EXPECT_EQ(packed, expected);
 }
 
-// What the kernels must give: the rows by way of RGB.
+// The kernels' expected result: conversion of the rows through RGB.
 std::vector<Bgra> DecodedByRgb(const Bytes& row, std::int32_t sourceWidth, std::int32_t width) {
     Bytes rgb(static_cast<std::size_t>(sourceWidth) * 3);
     YcbcrRowToRgb(row.data(), rgb.data(), sourceWidth);

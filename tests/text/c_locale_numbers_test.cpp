@@ -98,7 +98,7 @@ TEST(NumberText, ReadsNumbersAsScanfDoes) {
     EXPECT_TRUE(std::isnan(value));
 }
 
-// The C library formats in the "C" locale here, and rounds exactly on this side of Windows.
+// The C library formats in the "C" locale here, and outside Windows it rounds exactly.
 #ifndef _WIN32
 TEST(NumberText, FormatsAsPrintfDoes) {
     for (const double value : {0.0, -0.0, 0.1, 0.25, 1.0, 1e-7, 5e-7, 0.0000005, 2.5e-6, 123456.7890125, 1e38,

@@ -18,7 +18,7 @@ namespace {
 using tests::FakeLibrary;
 using tests::FakeTexts;
 
-// Tests of single characters hold for the Western European code page only.
+// Tests of single characters are valid for the Western European code page only.
 bool IsWestern() {
 #ifdef _WIN32
     return GetACP() == 1252;
@@ -66,7 +66,7 @@ TEST(Strings, OwnTheirCharacters) {
     first.Clear();
     ExpectText(first, "");
     ExpectText(copy, "abc");
-    copy.Assign(copy.Text() + 1, 1);  // a part of itself
+    copy.Assign(copy.Text() + 1, 1);  // part of its own text
     ExpectText(copy, "b");
     first = copy;
     ExpectText(first, "b");
@@ -115,16 +115,16 @@ TEST(CodePage, NarrowsExactNamesOnly) {
     if (!IsWestern()) GTEST_SKIP() << "another code page";
     struct Case {
         const char16_t* name;
-        const char* expected;  // null: no exact form
+        const char* expected;  // null: cannot be converted exactly
     };
     const Case cases[] = {
         {u"a.fxprela", "a.fxprela"},
         {u"\u00E9t\u00E9\u20AC", "\xE9t\xE9\x80"},
         {u"", nullptr},
         {u"\u4E2D", nullptr},
-        {u"\u0100", nullptr},  // A with a line above: "A" would be the look-alike
-        {u"\u2215", nullptr},  // a slash of mathematics: a path separator would be
-        {u"\uFF21", nullptr},  // a wide A
+        {u"\u0100", nullptr},  // A with macron: best-fit conversion gives "A"
+        {u"\u2215", nullptr},  // division slash: best-fit conversion gives a path separator
+        {u"\uFF21", nullptr},  // full-width A
         {u"e\u0301", nullptr},
         {u"\xD83C\xDFAC", nullptr},
         {u"\xD83C", nullptr},

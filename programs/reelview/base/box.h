@@ -1,4 +1,4 @@
-// Places in pixels, and pixels of a dialog unit.
+// Rectangles in pixels, and the pixel size of a dialog unit.
 #pragma once
 
 #include <cstdint>

@@ -1,4 +1,4 @@
-// Owners of COM objects and of a thread's use of COM. Windows only.
+// Owners of COM objects and of a thread's COM initialisation. Windows only.
 #pragma once
 
 #include <windows.h>

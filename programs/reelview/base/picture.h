@@ -1,4 +1,4 @@
-// A frame in memory: rows from the top without padding, pixels of the bytes blue, green, red, alpha.
+// A frame in memory: top-down rows without padding, bytes in the order blue, green, red, alpha.
 #pragma once
 
 #include <cstddef>
@@ -21,7 +21,7 @@ struct Picture {
 
 using SharedPicture = std::shared_ptr<const Picture>;
 
-// The mean of the pixels behind each, for small pictures of presets; never larger than `picture`.
+// For thumbnails: each pixel is the mean of the source pixels that it covers. Never larger than `picture`.
 [[nodiscard]] Picture Reduced(const Picture& picture, hosts::FrameSize largest);
 
 }  // namespace velmora::reelview

@@ -1,5 +1,6 @@
-// All texts that the program shows. Each is its own key in category 11 of the language file, and what is shown where the
-// language file has none. Ampersands mark the letters of menus. One constant a line: a test reads this file.
+// All texts that the program shows. Each is its own key in category 11 of the language file, and is shown as it is
+// where the language file has no entry. Ampersands mark menu letters. One constant per line, because a test reads
+// this file.
 #pragma once
 
 #include <cstdint>
@@ -44,7 +45,7 @@ inline constexpr char kContents[] = "&Reel View Help";
 inline constexpr char kEffectHelp[] = "Help on This &Effect";
 inline constexpr char kAbout[] = "&About";
 
-// The window's parts
+// Parts of the window
 inline constexpr char kEffect[] = "Effect";
 inline constexpr char kPresets[] = "Presets";
 inline constexpr char kPicture[] = "Picture";
@@ -65,7 +66,7 @@ inline constexpr char kSaved[] = "Saved";
 inline constexpr char kCopied[] = "Copied";
 inline constexpr char kCancel[] = "Cancel";
 
-// Kinds of files
+// File types
 inline constexpr char kAllKinds[] = "Films and pictures";
 inline constexpr char kAllFiles[] = "All files";
 inline constexpr char kPngPicture[] = "PNG picture";
@@ -74,7 +75,7 @@ inline constexpr char kAviCodec[] = "AVI film, choose a codec";
 inline constexpr char kPngSequence[] = "PNG pictures, numbered";
 inline constexpr char kY4mFilm[] = "YUV4MPEG2 film";
 
-// What can go wrong
+// Errors
 inline constexpr char kCannotOpen[] = "The file cannot be opened.";
 inline constexpr char kCannotRead[] = "The file is damaged, or this system does not know its format.";
 inline constexpr char kNoFrames[] = "The file holds no pictures.";

@@ -39,7 +39,7 @@ std::wstring Texts::operator()(const char* key) const {
     return Converted(key, CP_UTF8);
 }
 
-// A menu letter in brackets behind the text, as languages without Latin letters have it, goes with its brackets.
+// In languages without Latin letters the menu letter follows the text in brackets, which are removed with it.
 std::wstring Texts::Plain(const char* key) const {
     std::wstring text = (*this)(key);
     const std::size_t mark = text.find(L'&');

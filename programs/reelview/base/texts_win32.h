@@ -1,4 +1,4 @@
-// The program's texts in the user's language, from the library's language file. Windows only, the window's thread.
+// The program's texts in the user's language, from the library's language file. Windows only; window's thread only.
 #pragma once
 
 #include <string>
@@ -10,13 +10,13 @@ namespace velmora::reelview {
 
 class Texts {
   public:
-    // `library` may be null and outlives the texts. `language` has two letters.
+    // `library` may be null and must outlive the texts. `language` is a two-letter code.
     Texts(IEffectLibrary* library, std::string language);
 
     [[nodiscard]] const std::string& Language() const { return m_language; }
-    // The text of a key of text_keys.h, in English where there is none.
+    // The text for a key of text_keys.h; the English one when there is no translation.
     [[nodiscard]] std::wstring operator()(const char* key) const;
-    // Without the mark of the menu letter.
+    // Without the ampersand of the menu letter.
     [[nodiscard]] std::wstring Plain(const char* key) const;
 
   private:
@@ -24,10 +24,10 @@ class Texts {
     std::string m_language;
 };
 
-// The two letters of the user's interface language.
+// The two-letter code of the user's interface language.
 [[nodiscard]] std::string SystemLanguage();
 
-// Texts of the library are in the system's code page.
+// The library's texts are in the system's code page.
 [[nodiscard]] std::wstring WideOf(const std::string& text);
 [[nodiscard]] std::string Utf8Of(const std::wstring& text);
 

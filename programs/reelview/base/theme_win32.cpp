@@ -75,7 +75,7 @@ Palette ContrastPalette() {
     return palette;
 }
 
-// Called where the system has it: the program runs on older ones too.
+// Only called where the system has it, because the program also runs on older ones.
 template <class Function>
 Function SystemFunction(const wchar_t* module, const char* name) {
     const HMODULE loaded = LoadLibraryW(module);
@@ -87,12 +87,12 @@ Font MessageFont(int dpi) {
     NONCLIENTMETRICSW metrics = {};
     metrics.cbSize = sizeof metrics;
     SystemParametersInfoW(SPI_GETNONCLIENTMETRICS, sizeof metrics, &metrics, 0);
-    // Nine points, whatever the resolution that the system was started with.
+    // Nine points, independent of the resolution at system start.
     metrics.lfMessageFont.lfHeight = -MulDiv(9, dpi, 72);
     return Font(CreateFontIndirectW(&metrics.lfMessageFont));
 }
 
-// The list box that drops down has its button and edge drawn again: not every system has dark ones.
+// Redraws the button and edge of the combo box, because not every system has dark ones.
 LRESULT CALLBACK DarkMenuProcedure(HWND menu, UINT message, WPARAM wParam, LPARAM lParam, UINT_PTR id,
                                    DWORD_PTR data) {
     const LRESULT result = DefSubclassProc(menu, message, wParam, lParam);
@@ -169,7 +169,7 @@ void Theme::DressFrame(HWND window) const {
     if (setAttribute != nullptr) setAttribute(window, kDarkFrame, &isDark, sizeof isDark);
 }
 
-// The themed check box writes black whatever colour it is given.
+// The themed check box draws black text, whatever colour is set.
 void Theme::DrawCheckBox(const NMCUSTOMDRAW& part) const {
     const HWND control = part.hdr.hwndFrom;
     RECT area = {};
@@ -220,7 +220,7 @@ std::optional<LRESULT> Theme::DrawPart(const NMCUSTOMDRAW& part) const {
     return CDRF_SKIPDEFAULT;
 }
 
-// In the window's own coordinates; a line below the bar is the frame's and light too.
+// In window coordinates. The line below the bar belongs to the frame and is light too.
 void Theme::PaintMenuRest(HWND window) const {
     MENUBARINFO bar = {};
     bar.cbSize = sizeof bar;

@@ -1,5 +1,5 @@
-// Colours and fonts of the window: the system's light colours, dark ones where the user chose a dark system, and the
-// user's own where contrast must be high. Windows only.
+// Colours and fonts of the window: the system's light colours, dark ones in dark mode, and the user's own in high
+// contrast mode. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -21,7 +21,8 @@ enum class Scheme { kLight, kDark, kHighContrast };
 [[nodiscard]] Scheme SystemScheme();
 
 struct Palette {
-    COLORREF window, text, dimText, edge, field, fieldText, accent, stage;  // stage: behind the picture
+    COLORREF window, text, dimText, edge, field, fieldText, accent,
+        stage;  // stage: the area behind the picture
     KnobColours knob;
 };
 
@@ -37,20 +38,20 @@ class Theme {
     [[nodiscard]] HBRUSH FieldBrush() const { return m_fieldBrush.get(); }
     [[nodiscard]] HFONT TextFont() const { return m_font.get(); }
     [[nodiscard]] int Dpi() const { return m_dpi; }
-    // Pixels of a length at 96 dots per inch.
+    // Converts a length at 96 dots per inch to pixels.
     [[nodiscard]] int Px(int length) const { return MulDiv(length, m_dpi, 96); }
     [[nodiscard]] UnitScale Units() const { return {1.5 * m_dpi / 96.0, 1.625 * m_dpi / 96.0}; }
 
-    // Gives a control the font and the system's dark parts where it has them.
+    // Gives a control the font, and the system's dark style where it has one.
     void Dress(HWND control) const;
     // The title bar.
     void DressFrame(HWND window) const;
-    // Draws what the system would leave light in a dark window: check boxes and the bar of a slider. Nothing: the
+    // Draws what the system would leave light in a dark window: check boxes and the track of a slider. Empty when the
     // system draws.
     [[nodiscard]] std::optional<LRESULT> DrawPart(const NMCUSTOMDRAW& part) const;
-    // The edge and the button of a combo box, in a dark window.
+    // Draws the edge and the button of a combo box in a dark window.
     void PaintMenuBox(HWND menu) const;
-    // What is left of the menu bar beside its menus, on a dark window.
+    // Fills the rest of the menu bar in a dark window.
     void PaintMenuRest(HWND window) const;
     // The answer to WM_CTLCOLOR...; `isField` for edits and lists.
     [[nodiscard]] HBRUSH ControlColours(HDC dc, bool isField) const;
@@ -65,7 +66,7 @@ class Theme {
     Font m_font;
 };
 
-// The dots per inch of a window's monitor, where the system knows them; else the system's.
+// The dots per inch of a window's monitor where the system provides them; else the system's.
 [[nodiscard]] int DpiOf(HWND window);
 
 }  // namespace velmora::reelview

@@ -1,4 +1,4 @@
-// The step from a window procedure to a C++ object, and from pixels to the screen. Windows only.
+// Connects window procedures to C++ objects, and pixels to the screen. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -7,7 +7,7 @@
 
 namespace velmora::reelview {
 
-// An object behind a window: created with the object as the creation parameter, forgotten when the window is gone.
+// Binds an object to a window: the object is the creation parameter and is unbound when the window is destroyed.
 // `Object` has LRESULT OnMessage(UINT, WPARAM, LPARAM) and HWND m_window.
 template <class Object>
 LRESULT CALLBACK ObjectProcedure(HWND window, UINT message, WPARAM wParam, LPARAM lParam) {
@@ -36,14 +36,14 @@ void RegisterObjectClass(const wchar_t* name, UINT style) {
     description.hInstance = GetModuleHandleW(nullptr);
     description.hCursor = LoadCursorW(nullptr, IDC_ARROW);
     description.lpszClassName = name;
-    RegisterClassExW(&description);  // again: refused, and already there
+    RegisterClassExW(&description);  // fails harmlessly when the class is already registered
 }
 
 inline BITMAPINFO BitmapInfoOf(hosts::FrameSize size) {
     BITMAPINFO info = {};
     info.bmiHeader.biSize = sizeof info.bmiHeader;
     info.bmiHeader.biWidth = size.width;
-    info.bmiHeader.biHeight = -size.height;  // from the top
+    info.bmiHeader.biHeight = -size.height;  // top-down
     info.bmiHeader.biPlanes = 1;
     info.bmiHeader.biBitCount = 32;
     info.bmiHeader.biCompression = BI_RGB;
@@ -57,7 +57,7 @@ inline void DrawPicture(HDC dc, const Picture& picture, int x, int y) {
                       static_cast<UINT>(picture.size.height), picture.pixels.data(), &info, DIB_RGB_COLORS);
 }
 
-// Painting into memory first, so that nothing flickers; what was painted appears when it ends.
+// Paints into memory first to avoid flicker; the result appears on destruction.
 class BufferedPaint {
   public:
     BufferedPaint(HDC target, const RECT& area)

@@ -5,7 +5,7 @@
 namespace velmora::reelview {
 namespace {
 
-// Quoted for the system's own shells: a quotation mark cannot stand in a file name there, nor in a parameter's.
+// Quoted for the Windows shells. Neither file names nor parameter names contain quotation marks.
 std::string Quoted(const std::string& text) {
     return '"' + text + '"';
 }

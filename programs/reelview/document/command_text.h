@@ -1,4 +1,4 @@
-// The command line of reelfx that renders what the window shows.
+// The reelfx command line that renders what the window shows.
 #pragma once
 
 #include <string>
@@ -8,8 +8,8 @@
 
 namespace velmora::reelview {
 
-// `input` is the clip's path in UTF-8. Values that equal the parameter's default are left out. Where two parameters
-// share a name, a value's kind tells which is meant, so each can be written.
+// `input` is the clip's path in UTF-8. Values equal to the parameter's default are left out. Where two parameters
+// share a name, the kind of the value shows which one is meant, so each can be written.
 [[nodiscard]] std::string CommandText(const std::string& input, const hosts::EffectInfo& effect,
                                       const Values& values);
 

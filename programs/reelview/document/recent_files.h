@@ -1,4 +1,4 @@
-// The files opened last, the newest first.
+// Recently opened files, newest first.
 #pragma once
 
 #include <algorithm>

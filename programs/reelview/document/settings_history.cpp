@@ -23,7 +23,7 @@ Values DefaultsOf(const hosts::EffectInfo& effect) {
     for (const hosts::ParamInfo& param : effect.params) {
         ValueWord word{};
         if (param.HoldsValue()) word = param.defaultValue;
-        // The other bytes of a flag do not count; equal settings shall compare equal.
+        // Only the first byte of a flag counts; clear the others so that equal settings compare equal.
         if (param.kind == kKindCheckBox) word.bits = word.flag != 0 ? 1 : 0;
         values.push_back(word);
     }

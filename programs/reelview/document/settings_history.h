@@ -1,4 +1,4 @@
-// What the user can undo: which effect is chosen and how the controls of every effect stand.
+// What the user can undo: the selected effect and the settings of every effect.
 #pragma once
 
 #include <cstdint>
@@ -25,14 +25,14 @@ struct Settings {
 
 class SettingsHistory {
   public:
-    // Every effect at its defaults; at least one effect.
+    // Every effect at its defaults; there must be at least one effect.
     explicit SettingsHistory(const std::vector<hosts::EffectInfo>& effects);
 
     [[nodiscard]] const Settings& Now() const { return m_states[m_now]; }
 
     void ChooseEffect(std::uint32_t effect);
     void SetAll(const Values& values);
-    // Changes of one parameter with the same non-zero gesture number become one step: a drag is undone at once.
+    // Changes of one parameter with the same non-zero gesture number form one step, so a drag is undone in one go.
     void Set(std::uint32_t parameter, ValueWord value, std::uint32_t gesture);
 
     [[nodiscard]] bool CanUndo() const { return m_now > 0; }

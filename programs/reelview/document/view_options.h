@@ -7,10 +7,10 @@
 namespace velmora::reelview {
 
 struct ViewOptions {
-    std::u16string library;  // empty: beside the program
+    std::u16string library;  // empty: next to the program
     std::u16string effect;
     std::u16string file;
-    bool isSequence = false;  // the file is one of numbered pictures
+    bool isSequence = false;  // the file is one of a numbered sequence
     bool isValid = true;
 };
 

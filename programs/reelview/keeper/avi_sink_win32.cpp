@@ -16,7 +16,7 @@ namespace {
 using Stream = support::win32::Owner<PAVISTREAM, &AVIStreamRelease>;
 using File = support::win32::Owner<PAVIFILE, &AVIFileRelease>;
 
-// The old file format counts bytes in 31 bits.
+// The old file format uses 31-bit byte counts.
 constexpr std::int64_t kMostBytes = 2'000'000'000;
 
 struct AviSystem {
@@ -55,7 +55,7 @@ class AviSink final : public FrameSink {
         if (codec.handler == 0 && facts.frames * std::int64_t{m_header.biSizeImage} > kMostBytes) {
             throw SourceError(text::kAviTooLarge);
         }
-        // A short path is that of a file that is there.
+        // Only an existing file has a short path.
         std::ofstream{m_safe.Place()};
         PAVIFILE created = nullptr;
         Check(
@@ -122,7 +122,7 @@ class AviSink final : public FrameSink {
     [[nodiscard]] PAVISTREAM Target() const { return m_compressed ? m_compressed.get() : m_stream.get(); }
 
     AviSystem m_system;
-    SafeFile m_safe;  // outlives the open file
+    SafeFile m_safe;  // must outlive the open file
     File m_file;
     Stream m_stream, m_compressed;
     BITMAPINFOHEADER m_header;

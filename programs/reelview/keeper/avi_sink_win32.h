@@ -1,4 +1,4 @@
-// AVI films through the system's own interface. Windows only.
+// Saves AVI films through the system's AVI interface. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -19,7 +19,7 @@ struct AviCodec {
     std::vector<std::uint8_t> state;  // the codec's own settings
 };
 
-// The system's dialog; nothing when the user cancelled it.
+// Shows the system's dialog; empty when the user cancelled it.
 [[nodiscard]] std::optional<AviCodec> ChooseAviCodec(HWND owner, hosts::FrameSize size);
 
 // Throws SourceError.

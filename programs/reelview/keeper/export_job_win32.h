@@ -1,4 +1,4 @@
-// Renders a whole clip into a file. Windows only; Run is called on the rendering thread.
+// Renders a whole clip to a file. Windows only; Run is called on the rendering thread.
 #pragma once
 
 #include <atomic>
@@ -24,10 +24,10 @@ struct ExportOrder {
 enum class ExportEnd { kDone, kCancelled, kFailed };
 struct ExportResult {
     ExportEnd end = ExportEnd::kDone;
-    std::string error;  // kFailed: a key of the texts
+    std::string error;  // for kFailed: a key of the user-visible texts
 };
 
-// `progress` is called after each frame with the number of frames done. Throws nothing.
+// `progress` is called after each frame with the number of finished frames. Does not throw.
 [[nodiscard]] ExportResult RunExport(Engine& engine, const ExportOrder& order,
                                      const std::atomic<bool>& isCancelled,
                                      const std::function<void(std::int64_t)>& progress);

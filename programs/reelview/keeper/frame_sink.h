@@ -1,4 +1,4 @@
-// Where a clip's frames go. Used on the rendering thread only.
+// Destination for a clip's frames. Used on the rendering thread only.
 #pragma once
 
 #include <filesystem>
@@ -10,21 +10,21 @@ namespace velmora::reelview {
 
 class FrameSink {
   public:
-    // What was not finished leaves nothing behind.
+    // An unfinished file leaves nothing behind.
     virtual ~FrameSink() = default;
     FrameSink(const FrameSink&) = delete;
     FrameSink& operator=(const FrameSink&) = delete;
 
-    // Frames in their order, all of the clip's size. Throws SourceError.
+    // Frames in order, all of the clip's size. Throws SourceError.
     virtual void Write(const Picture& picture) = 0;
-    // After the last frame: what was written stands under its name. Throws SourceError.
+    // Call after the last frame: the file then gets its final name. Throws SourceError.
     virtual void Finish() = 0;
 
   protected:
     FrameSink() = default;
 };
 
-// In the clip's own format when it was such a stream, else 4:4:4. Throws SourceError.
+// In the clip's own format if it was a YUV4MPEG2 stream, else in 4:4:4. Throws SourceError.
 [[nodiscard]] std::unique_ptr<FrameSink> MakeY4mSink(const std::filesystem::path& file,
                                                      const ClipFacts& facts);
 

@@ -14,7 +14,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-// The pictures lie in a folder of their own until the last is written.
+// The pictures stay in a separate folder until the last one is written.
 class PngSink final : public FrameSink {
   public:
     PngSink(const fs::path& file, const ClipFacts& facts)

@@ -1,4 +1,4 @@
-// A file that appears under its name only when it is whole.
+// A file that gets its final name only when it is complete.
 #pragma once
 
 #include <filesystem>
@@ -8,15 +8,15 @@ namespace velmora::reelview {
 class SafeFile {
   public:
     explicit SafeFile(std::filesystem::path target);
-    // Removes what is not finished.
+    // Removes an unfinished file.
     ~SafeFile();
     SafeFile(const SafeFile&) = delete;
     SafeFile& operator=(const SafeFile&) = delete;
 
-    // Where to write: beside the target, with the target's extension, so that formats chosen by name stay the same.
+    // The path to write to: next to the target and with its extension, because some formats are chosen by extension.
     [[nodiscard]] const std::filesystem::path& Place() const { return m_place; }
-    // Puts the file, closed by now, in the target's place. Throws SourceError (text::kCannotWrite); the target is then
-    // as it was.
+    // Moves the file, which must be closed, to the target. Throws SourceError (text::kCannotWrite) and then leaves
+    // the target unchanged.
     void Finish();
 
   private:

@@ -62,7 +62,7 @@ class Y4mSink final : public FrameSink {
         if (!m_stream) throw SourceError(text::kCannotWrite);
     }
 
-    SafeFile m_file;  // outlives the stream: an open file cannot be removed
+    SafeFile m_file;  // must outlive the stream: an open file cannot be removed
     hosts::Y4mFormat m_format;
     std::vector<std::uint8_t> m_planes;
     std::ofstream m_stream;

@@ -14,7 +14,7 @@
 
 namespace velmora::reelview {
 
-// Its text is a key of the texts shown to users.
+// Its text is a key of the user-visible texts.
 class EngineError : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
@@ -22,13 +22,13 @@ class EngineError : public std::runtime_error {
 
 class Engine {
   public:
-    // `library` outlives the engine.
+    // `library` must outlive the engine.
     explicit Engine(const hosts::EffectLibrary& library);
     ~Engine();
     Engine(const Engine&) = delete;
     Engine& operator=(const Engine&) = delete;
 
-    // What was open stays open when the new one cannot be. Throws SourceError.
+    // If the new clip cannot be opened, the current one stays open. Throws SourceError.
     const ClipFacts& Open(const ClipRequest& request);
     [[nodiscard]] const ClipFacts& Facts() const { return m_clip->Facts(); }
     // Throws SourceError.
@@ -41,7 +41,7 @@ class Engine {
     // Throws EngineError.
     [[nodiscard]] Rendered Render(std::uint32_t effect, const Values& values, const Picture& source,
                                   double seconds);
-    // The values that a built-in preset gives.
+    // The values of a built-in preset.
     [[nodiscard]] static Values PresetValues(IVideoEffect& effect, const hosts::EffectInfo& info,
                                              std::uint32_t preset);
 

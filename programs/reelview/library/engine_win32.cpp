@@ -9,7 +9,7 @@ namespace velmora::reelview {
 namespace {
 
 FrameRecord RecordOf(const Picture& picture) {
-    // The records are the host's; the effect does not write to the source.
+    // The records belong to the host; the effect does not write to the source.
     void* const pixels = const_cast<std::uint8_t*>(picture.pixels.data());
     return {pixels, picture.size.width, picture.size.height, picture.size.width * 4, 0, 0, 0};
 }
@@ -22,14 +22,14 @@ Engine::~Engine() {
     for (auto& run : m_runs) {
         hosts::EffectRun* const last = run.release();
         auto end = [last] { delete last; };
-        // What a failed library left behind is not touched again.
+        // Objects of a crashed library are not touched again.
         if (!m_isBroken) m_isBroken = !RunGuarded(end);
     }
 }
 
 const ClipFacts& Engine::Open(const ClipRequest& request) {
     std::unique_ptr<ClipSource> clip = OpenClip(request);
-    static_cast<void>(clip->Read(0));  // a clip whose first frame cannot be had is not open
+    static_cast<void>(clip->Read(0));  // a clip whose first frame cannot be read counts as unreadable
     m_clip = std::move(clip);
     m_lastFrame.reset();
     m_lastIndex = -1;

@@ -6,8 +6,8 @@ namespace velmora::reelview {
 namespace {
 
 struct Guard {
-    void* jump[5];   // as the compiler's own jumps want it
-    void* handlers;  // the thread's chain of exception handlers at that point
+    void* jump[5];   // in the layout of the compiler's own jumps
+    void* handlers;  // head of the thread's exception handler chain at that point
     unsigned short fpControl;
     unsigned vectorControl;
 };
@@ -62,12 +62,12 @@ LONG CALLBACK OnException(EXCEPTION_POINTERS* exception) {
         return EXCEPTION_CONTINUE_SEARCH;
     }
     exception->ContextRecord->Eip = reinterpret_cast<DWORD>(&Recover);
-    // Aligned as behind a call.
+    // The stack is aligned as after a call.
     exception->ContextRecord->Esp = (exception->ContextRecord->Esp & ~DWORD{15}) - 4;
     return EXCEPTION_CONTINUE_EXECUTION;
 }
 
-// The jump comes back to this frame; nothing else may be in it.
+// The jump returns to this frame, so nothing else may be in it.
 __attribute__((noinline)) bool RunIn(Guard& guard, void (*call)(void*), void* argument) {
     if (__builtin_setjmp(guard.jump) != 0) return false;
     call(argument);

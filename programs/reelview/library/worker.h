@@ -1,4 +1,4 @@
-// The one thread that reads clips and renders. Work comes as tasks; what they find goes back to the window's thread.
+// The only thread that reads clips and renders. It runs tasks, which post their results back to the window's thread.
 #pragma once
 
 #include <condition_variable>
@@ -14,21 +14,21 @@ class Worker {
   public:
     using Task = std::function<void()>;
 
-    // `start` and `end` run on the thread, first and last.
+    // `start` and `end` run on the thread, as its first and last calls.
     Worker(Task start, Task end);
-    // Finishes the task in hand and drops the others.
+    // Finishes the current task and drops the others.
     ~Worker();
     Worker(const Worker&) = delete;
     Worker& operator=(const Worker&) = delete;
 
-    // In their order, before anything else.
+    // Run in order, before anything else.
     void Post(Task task);
-    // What the user looks at: a newer one replaces one that has not begun.
+    // For what the user is looking at. A newer task replaces one that has not started.
     void PostPreview(Task task);
-    // Idle time: begun when there is nothing else.
+    // Runs when there is nothing else to do.
     void PostIdle(Task task);
     void DropIdle();
-    // False when the task in hand does not end within the time.
+    // False when the current task does not finish in time.
     [[nodiscard]] bool Stop(double seconds);
 
   private:
@@ -40,7 +40,7 @@ class Worker {
     std::deque<Task> m_tasks, m_idle;
     Task m_preview;
     bool m_isStopping = false, m_hasEnded = false;
-    std::thread m_thread;  // last: it uses what stands above
+    std::thread m_thread;  // last: it uses the members above
 };
 
 }  // namespace velmora::reelview

@@ -11,11 +11,11 @@ BSTR TextOf(const std::wstring& text) {
     return SysAllocStringLen(text.data(), static_cast<UINT>(text.size()));
 }
 
-// The system's interfaces have no destructors; objects end in their own Release.
+// COM interfaces have no virtual destructors; objects delete themselves in Release.
 #pragma GCC diagnostic push
 #pragma GCC diagnostic ignored "-Wnon-virtual-dtor"
 
-// The system's own object for the window answers everything but what a knob knows better.
+// The system's standard object for the window answers everything that a knob does not answer better.
 class KnobAccessible final : public IAccessible {
   public:
     KnobAccessible(HWND window, Com<IAccessible> standard)
@@ -125,7 +125,7 @@ class KnobAccessible final : public IAccessible {
     HRESULT STDMETHODCALLTYPE put_accName(VARIANT, BSTR) override { return DISP_E_MEMBERNOTFOUND; }
 
   private:
-    // A screen reader may hold this object for longer than the window lives.
+    // A screen reader may keep this object after the window is destroyed.
     [[nodiscard]] KnobWindow* Knob() const {
         if (!IsWindow(m_window)) return nullptr;
         return reinterpret_cast<KnobWindow*>(GetWindowLongPtrW(m_window, GWLP_USERDATA));

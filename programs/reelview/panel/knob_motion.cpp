@@ -8,7 +8,7 @@ namespace velmora::reelview {
 namespace {
 
 constexpr double kFine = 0.1, kStep = 0.01, kPage = 0.1;
-// Nearer to the centre the angle says nothing.
+// Closer to the centre the angle is meaningless.
 constexpr double kDeadRadius = 3.0;
 
 double Held(double value) {
@@ -37,7 +37,8 @@ double KnobDrag::Way(double x, double y) const {
     if (m_way == DragWay::kVertical) return (m_y - y) / m_travel;
     if (m_way == DragWay::kHorizontal) return (x - m_x) / m_travel;
     if (std::hypot(x, y) < kDeadRadius || std::hypot(m_x, m_y) < kDeadRadius) return 0.0;
-    // The shorter way round: a drag through the gap below does not jump from one end to the other.
+    // Takes the shorter way round, so that a drag through the gap at the bottom does not jump from one end to the
+    // other.
     return std::remainder(Degrees(x, y) - Degrees(m_x, m_y), 360.0) / kKnobSweepDegrees;
 }
 

@@ -1,4 +1,4 @@
-// How a knob's value follows the mouse and the keys. Values are normalised to 0..1; a round knob turns through 270
+// How a knob's value follows the mouse and the keys. Values are normalised to 0..1. A round knob turns through 270
 // degrees, from the lower left over the top to the lower right.
 #pragma once
 
@@ -15,10 +15,10 @@ enum class DragWay { kCircle, kVertical, kHorizontal };
 
 class KnobDrag {
   public:
-    // The mouse's place is in pixels, from the knob's centre, y down. `travel` is how many pixels of a straight drag
-    // are the whole range, at least 1.
+    // The mouse position is in pixels relative to the knob's centre, y down. `travel` is the length in pixels of a
+    // straight drag through the whole range, at least 1.
     void Begin(DragWay way, double value, double x, double y, double travel);
-    // The value for the mouse's new place; a fine drag moves a tenth as far.
+    // The value for the new mouse position; a fine drag moves a tenth as far.
     double Move(double x, double y, bool isFine);
 
   private:
@@ -30,7 +30,7 @@ class KnobDrag {
 
 enum class KnobKey { kUp, kDown, kPageUp, kPageDown, kHome, kEnd };
 
-// Steps of a hundredth of the range, fine ones of a thousandth, pages of a tenth.
+// Normal steps are a hundredth of the range, fine steps a thousandth, pages a tenth.
 [[nodiscard]] double AfterKey(double value, KnobKey key, bool isFine);
 // `notches` is positive away from the user.
 [[nodiscard]] double AfterWheel(double value, double notches, bool isFine);

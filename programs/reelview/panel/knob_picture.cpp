@@ -13,13 +13,13 @@ struct Point {
     double x, y;
 };
 
-// Clockwise from straight up, as KnobAngle.
+// Clockwise from straight up, like KnobAngle.
 Point OnCircle(double degrees, double radius) {
     const double radians = degrees * std::numbers::pi / 180.0;
     return {std::sin(radians) * radius, -std::cos(radians) * radius};
 }
 
-// The part of a pixel that lies inside a shape whose edge is `distance` away, positive outside.
+// The coverage of a pixel by a shape whose edge is `distance` away, positive outside.
 double Coverage(double distance) {
     return std::clamp(0.5 - distance, 0.0, 1.0);
 }
@@ -32,7 +32,7 @@ double DistanceToSegment(Point p, Point a, Point b) {
     return std::hypot(p.x - a.x - along * line.x, p.y - a.y - along * line.y);
 }
 
-// From the middle line of an arc with round ends.
+// Distance from the centre line of an arc with round ends.
 double DistanceToArc(Point p, double radius, double from, double to) {
     const double degrees = std::atan2(p.x, -p.y) * 180.0 / std::numbers::pi;
     if (degrees >= from && degrees <= to) return std::abs(std::hypot(p.x, p.y) - radius);

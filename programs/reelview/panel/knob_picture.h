@@ -1,4 +1,4 @@
-// A round knob as pixels, with smooth edges at any size.
+// A round knob as pixels, antialiased at any size.
 #pragma once
 
 #include <cstdint>
@@ -10,7 +10,7 @@ namespace velmora::reelview {
 
 struct KnobLook {
     double value = 0.0;   // 0..1
-    double origin = 0.0;  // where the coloured arc starts: 0, or where the shown value is 0
+    double origin = 0.0;  // where the coloured arc starts: 0, or where the displayed value is 0
     bool hasFocus = false, isEnabled = true;
 };
 

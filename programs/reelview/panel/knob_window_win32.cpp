@@ -11,7 +11,7 @@
 namespace velmora::reelview {
 namespace {
 
-// Pixels at 96 dots per inch that a straight drag needs for the whole range.
+// The length of a straight drag through the whole range, in pixels at 96 dots per inch.
 constexpr int kTravel = 200;
 
 std::uint32_t NewGesture() {

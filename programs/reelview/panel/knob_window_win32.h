@@ -1,4 +1,4 @@
-// A slider's control: a round knob or a lying bar. Windows only.
+// A slider's control: a round knob or a horizontal bar. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -14,10 +14,10 @@ namespace velmora::reelview {
 
 inline constexpr wchar_t kKnobClass[] = L"Velmora Reel Knob";
 
-// What a knob asks of its panel.
+// Notifications to the panel.
 class KnobOwner {
   public:
-    // `gesture` is the same for all steps of one drag, 0 for a step of its own.
+    // `gesture` is the same for all steps of one drag, and 0 for a separate step.
     virtual void OnKnobMoved(std::uint32_t parameter, double value, std::uint32_t gesture) = 0;
     [[nodiscard]] virtual bool KnobsDragVertical() = 0;
     [[nodiscard]] virtual std::wstring ShownText(std::uint32_t parameter) = 0;
@@ -45,7 +45,7 @@ class KnobWindow {
     [[nodiscard]] HWND Window() const { return m_window; }
     [[nodiscard]] const Facts& About() const { return m_facts; }
     [[nodiscard]] double Value() const { return m_value; }
-    // Without telling the owner.
+    // Does not notify the owner.
     void Show(double value);
     void Place(const Box& box);
     bool OnWheel(WPARAM wParam);
@@ -71,7 +71,7 @@ class KnobWindow {
     std::uint32_t m_gesture = 0;
 };
 
-// An object of IAccessible for WM_GETOBJECT; 0 when the system has no such interface.
+// An IAccessible object for WM_GETOBJECT; 0 when the system has no such interface.
 [[nodiscard]] LRESULT AccessibleKnob(KnobWindow& knob, WPARAM wParam);
 
 }  // namespace velmora::reelview

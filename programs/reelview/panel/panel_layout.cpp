@@ -13,7 +13,7 @@ constexpr std::int32_t kMargin = 6;
 constexpr std::int32_t kFurthest = 2000;
 constexpr std::int32_t kBoxWidth = 48;
 constexpr std::int32_t kCaptionHeight = 9, kFieldWidth = 38, kFieldHeight = 11;
-constexpr std::int32_t kCaptionOverhang = 7;  // on both sides: captions may be wider than knobs
+constexpr std::int32_t kCaptionOverhang = 7;  // on either side: captions may be wider than knobs
 constexpr std::int32_t kKnobTop = 11, kKnobSide = 48, kFieldTop = 61;
 constexpr std::int32_t kSwatchInset = 6;
 constexpr std::int32_t kMenuWidth = 95, kMenuHeight = 13;
@@ -140,7 +140,7 @@ class Scaler {
     UnitScale m_scale;
 };
 
-// Round is round: a knob is as wide as high, and so is a swatch.
+// Knobs and swatches are as wide as they are high.
 void MakeSquare(Box& box) {
     const std::int32_t side = std::min(box.Width(), box.Height());
     box.left += (box.Width() - side) / 2;
@@ -149,7 +149,7 @@ void MakeSquare(Box& box) {
     box.bottom = box.top + side;
 }
 
-// The library's own panels have check boxes that are stated wider than the frame around them.
+// The library's own panels have check boxes that are declared wider than the frame around them.
 void KeepInsideFrames(PanelLayout& layout, std::int32_t gap) {
     for (PanelItem& item : layout.items) {
         if (item.shape != PanelShape::kCheckBox) continue;

@@ -1,9 +1,9 @@
-// Where each control of an effect's panel stands, from the effect's descriptors alone.
+// The position of each control on an effect's panel, computed from the effect's descriptors alone.
 //
-// Descriptors place controls in dialog units and often give no size. A round knob with its caption and number takes a
-// box of 48 x 80 units then; rows and columns of such boxes are 66 and 90 units apart in the library's own panels. A
-// size of 198 x 30 is that of a lying bar: sliders are drawn as bars where all the panel's sliders have room for it, and
-// as knobs where bars would lie on one another.
+// Descriptors place controls in dialog units and often give no size. A round knob with its caption and number then
+// takes a box of 48 x 80 units; in the library's own panels, columns and rows of such boxes are 66 and 90 units
+// apart. A size of 198 x 30 means a horizontal bar. Sliders are drawn as bars if all the sliders of the panel have
+// space for one, and as knobs if bars would overlap.
 #pragma once
 
 #include <cstdint>
@@ -19,11 +19,11 @@ enum class PanelShape { kFrame, kKnob, kBar, kMenu, kColour, kCheckBox };
 
 struct PanelItem {
     PanelShape shape = PanelShape::kFrame;
-    std::uint32_t parameter = 0;  // frame: of the end marker
+    std::uint32_t parameter = 0;  // for a frame: that of the end marker
     std::string title;
-    std::string group;  // of the frame that holds it; empty outside of frames
-    Box caption;        // frame: of its title
-    Box control;        // frame: the frame itself
+    std::string group;  // title of the enclosing frame; empty outside frames
+    Box caption;        // for a frame: that of its title
+    Box control;        // for a frame: the frame itself
     Box field;          // the number or the colour's text; empty where there is none
 };
 
@@ -32,7 +32,7 @@ struct PanelLayout {
     std::int32_t width = 0, height = 0;
 };
 
-// In pixels. Places and sizes that a careless library gives are brought into a range that a window can show.
+// In pixels. Positions and sizes from a careless library are clamped to a range that a window can show.
 [[nodiscard]] PanelLayout LayOutPanel(const std::vector<hosts::ParamInfo>& params, UnitScale scale);
 
 }  // namespace velmora::reelview

@@ -35,7 +35,7 @@ double OriginOf(const ParamInfo& param) {
     return crossesZero ? -param.minimum / (double{param.maximum} - param.minimum) : 0.0;
 }
 
-// Ampersands in a library's names are not letters to press.
+// Ampersands in a library's names do not mark menu letters.
 std::wstring CaptionOf(const std::string& name) {
     std::wstring text = WideOf(name);
     for (std::size_t i = text.find(L'&'); i != std::wstring::npos; i = text.find(L'&', i + 2))
@@ -86,7 +86,7 @@ HWND PanelWindow::MakeWindow(const wchar_t* className, const std::wstring& text,
                            nullptr);
 }
 
-// A caption stands just before what it names: that is where screen readers look.
+// A caption comes just before its control in the window order, where screen readers look for it.
 void PanelWindow::MakeControl(Control& control) {
     const PanelItem& item = control.item;
     const ParamInfo& param = m_effect->params[item.parameter];
@@ -155,7 +155,7 @@ void PanelWindow::PlaceControls() {
     for (const Control& control : m_controls) {
         const bool isMenu = control.item.shape == PanelShape::kMenu;
         place(control.caption, control.item.caption, 0);
-        place(control.control, control.item.control, isMenu ? m_theme.Px(220) : 0);  // with its list
+        place(control.control, control.item.control, isMenu ? m_theme.Px(220) : 0);  // including its list
         place(control.field, control.item.field, 0);
     }
 }
@@ -246,7 +246,7 @@ void PanelWindow::CommitField(std::uint32_t parameter) {
     if (control == nullptr || control->field == nullptr) return;
     const std::wstring text = TextOf(control->field);
     if (text != ShownText(parameter)) OnTypedText(parameter, text);
-    ShowValue(*control);  // what was no value gives way to the one that holds
+    ShowValue(*control);  // replaces invalid text by the current value
 }
 
 bool PanelWindow::OnFieldKey(std::uint32_t parameter, WPARAM key) {

@@ -1,4 +1,4 @@
-// The panel of an effect: its controls as windows, at the places that LayOutPanel gives. Windows only.
+// The panel of an effect: its controls as windows, placed by LayOutPanel. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -17,7 +17,7 @@ namespace velmora::reelview {
 
 inline constexpr wchar_t kPanelClass[] = L"Velmora Reel Panel";
 
-// Identifiers of a parameter's windows.
+// Identifiers of the windows of a parameter.
 inline constexpr int kFirstControl = 1000, kFirstField = 1200, kFirstCaption = 1400;
 
 class PanelOwner {
@@ -37,13 +37,13 @@ class PanelWindow final : public KnobOwner {
     PanelWindow& operator=(const PanelWindow&) = delete;
 
     [[nodiscard]] HWND Window() const { return m_window; }
-    // Makes the controls anew. `effect` outlives them.
+    // Creates the controls again. `effect` must outlive them.
     void ShowEffect(const hosts::EffectInfo& effect, const Values& values);
-    // Without telling the owner.
+    // Does not notify the owner.
     void ShowValues(const Values& values);
     // After a change of colours, fonts or resolution.
     void Restyle();
-    // In pixels, without scroll bars.
+    // In pixels, not counting scroll bars.
     [[nodiscard]] SIZE NaturalSize() const { return {m_layout.width, m_layout.height}; }
     void ShowFocus();
     [[nodiscard]] int ParameterOf(HWND control) const;
@@ -91,7 +91,7 @@ class PanelWindow final : public KnobOwner {
     PanelLayout m_layout;
     std::vector<Control> m_controls;
     int m_scrollX = 0, m_scrollY = 0;
-    bool m_isShowing = false;  // controls are being set, not used
+    bool m_isShowing = false;  // controls are being set by the program, not by the user
 };
 
 }  // namespace velmora::reelview

@@ -30,7 +30,7 @@ const std::uint8_t* PixelsBehind(const BITMAPINFOHEADER& header) {
     return bytes + header.biSize + colours * sizeof(RGBQUAD);
 }
 
-// A packed bitmap of 8, 24 or 32 bits, stored from the bottom or from the top.
+// A packed bitmap of 8, 24 or 32 bits, stored bottom-up or top-down.
 Picture PictureOf(const BITMAPINFOHEADER& header) {
     const int bits = header.biBitCount;
     const bool isKnown = header.biCompression == BI_RGB && (bits == 8 || bits == 24 || bits == 32);
@@ -86,7 +86,7 @@ class AviClip final : public ClipSource {
     }
 
   private:
-    // 24 bits are what every decoder gives; without that, what this one likes.
+    // Every decoder can give 24 bits; if this one does not, take its preferred format.
     void OpenFrames() {
         LONG size = 0;
         if (AVIStreamReadFormat(m_stream.get(), m_start, nullptr, &size) != 0 || size < 16) {
@@ -110,7 +110,7 @@ class AviClip final : public ClipSource {
         if (!m_frames) throw SourceError(text::kNoDecoder);
     }
 
-    AviSystem m_system;  // outlives what is open
+    AviSystem m_system;  // must outlive the open file and stream
     Stream m_stream;
     Frames m_frames;
     LONG m_start = 0;

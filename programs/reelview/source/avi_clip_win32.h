@@ -1,4 +1,4 @@
-// AVI files through the system's own interface. Windows only.
+// AVI files through the system's AVI interface. Windows only.
 #pragma once
 
 #include <memory>
@@ -8,7 +8,7 @@
 
 namespace velmora::reelview {
 
-// Throws SourceError when the file is none or no installed codec decodes it.
+// Throws SourceError when the file is not an AVI file or no installed codec decodes it.
 [[nodiscard]] std::unique_ptr<ClipSource> OpenAviClip(const std::wstring& file);
 
 }  // namespace velmora::reelview

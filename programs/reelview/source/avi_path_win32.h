@@ -1,4 +1,4 @@
-// Paths for the system's AVI interface, which is older than file names in 16 bits. Windows only.
+// Paths for the system's AVI interface, which predates 16-bit file names. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -7,7 +7,7 @@
 
 namespace velmora::reelview {
 
-// The path of an existing file in letters of the system's code page: its short path where a letter has no place there.
+// The path of an existing file in the system's code page; its short path if the code page lacks a character.
 inline std::wstring AviPath(const std::wstring& file) {
     BOOL isReplaced = FALSE;
     const int length = static_cast<int>(file.size());

@@ -1,4 +1,4 @@
-// Something opened: a picture, or frames one after another. Used on the rendering thread only.
+// An open source: a picture, or a sequence of frames. Used on the rendering thread only.
 #pragma once
 
 #include <cstdint>
@@ -12,7 +12,7 @@
 
 namespace velmora::reelview {
 
-// Its text is a key of the texts shown to users (base/text_keys.h).
+// Its text is a key of the user-visible texts (base/text_keys.h).
 class SourceError : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
@@ -23,7 +23,7 @@ struct ClipFacts {
     hosts::FrameRate rate = {25, 1};
     std::int64_t frames = 1;  // may be an estimate: reading past the true end repeats the last frame
     std::optional<hosts::Y4mFormat>
-        y4m;  // of a YUV4MPEG2 stream, so that it can be written in its own format
+        y4m;  // set for a YUV4MPEG2 stream, so that it can be saved in the same format
 };
 
 class ClipSource {
@@ -42,7 +42,7 @@ class ClipSource {
     ClipFacts m_facts;
 };
 
-// A side of more pixels is refused: no buffer of it can be had in 32 bits.
+// Larger sides are refused, because no buffer for them fits into 32 bits.
 inline constexpr std::int32_t kLargestSide = 16384;
 // Throws SourceError when a frame of this size is empty or too large.
 void CheckSize(hosts::FrameSize size);

@@ -25,7 +25,7 @@ void Check(HRESULT result, const char* error) {
     if (FAILED(result)) throw SourceError(error);
 }
 
-// Looked up at run time: some editions of Windows come without these modules.
+// Loaded at run time: some editions of Windows lack these modules.
 class MediaSystem {
   public:
     MediaSystem() : m_platform(LoadLibraryW(L"mfplat.dll")), m_readers(LoadLibraryW(L"mfreadwrite.dll")) {
@@ -59,7 +59,7 @@ class MediaSystem {
     decltype(&MFShutdown) m_shutDown = nullptr;
 };
 
-// Rows of a locked buffer; `pitch` is negative where they are stored from the bottom.
+// Rows of a locked buffer; `pitch` is negative where they are stored bottom-up.
 void CopyRows(Picture& picture, const BYTE* first, LONG pitch) {
     const auto rowBytes = static_cast<std::size_t>(picture.size.width) * 4;
     std::uint8_t* out = picture.pixels.data();
@@ -140,7 +140,7 @@ class MediaClip final : public ClipSource {
         Check(m_reader->SetCurrentPosition(GUID_NULL, place), text::kCannotReadFrame);
     }
 
-    // Empty at the end.
+    // Empty at the end of the clip.
     Picture Next() {
         for (;;) {
             DWORD flags = 0;
@@ -175,7 +175,7 @@ class MediaClip final : public ClipSource {
         return picture;
     }
 
-    MediaSystem m_system;  // outlives the reader
+    MediaSystem m_system;  // must outlive the reader
     Com<IMFSourceReader> m_reader;
     LONG m_pitch = 0;
     Picture m_last;

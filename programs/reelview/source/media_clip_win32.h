@@ -1,5 +1,5 @@
-// Films through the system's media source reader, where it has one: MP4, MOV, WMV from Windows 7 on. Windows only; the
-// thread has COM.
+// Films through the system's Media Foundation source reader, where there is one: MP4, MOV, WMV from Windows 7 on.
+// Windows only; COM must be initialised on the thread.
 #pragma once
 
 #include <memory>

@@ -22,8 +22,8 @@ std::string FirstBytes(const std::wstring& file) {
     return bytes;
 }
 
-// The reader that knows the format tells best what is wrong; the system's media reader knows what codecs AVI's
-// interface does not have.
+// The reader that knows the format gives the best error message. The system's media reader has codecs that the AVI
+// interface lacks.
 std::unique_ptr<ClipSource> OpenAvi(const std::wstring& file) {
     try {
         return OpenAviClip(file);

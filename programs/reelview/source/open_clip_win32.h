@@ -1,4 +1,4 @@
-// Opens whatever the system reads. Windows only; the thread has COM.
+// Opens any file that the system can read. Windows only; COM must be initialised on the thread.
 #pragma once
 
 #include <memory>
@@ -10,11 +10,11 @@
 namespace velmora::reelview {
 
 struct ClipRequest {
-    std::vector<std::wstring> files;  // several: pictures one after another
-    bool isSequence = false;          // the first is one of a numbered sequence
+    std::vector<std::wstring> files;  // more than one: a sequence of pictures
+    bool isSequence = false;          // the first file belongs to a numbered sequence
 };
 
-// Throws SourceError; std::bad_alloc when memory is short.
+// Throws SourceError, or std::bad_alloc when there is not enough memory.
 [[nodiscard]] std::unique_ptr<ClipSource> OpenClip(const ClipRequest& request);
 
 }  // namespace velmora::reelview

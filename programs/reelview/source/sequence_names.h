@@ -1,4 +1,4 @@
-// Numbered pictures: which files of a folder belong to the one that was chosen.
+// Numbered pictures: which files of a folder belong to the selected one.
 #pragma once
 
 #include <string>
@@ -6,8 +6,8 @@
 
 namespace velmora::reelview {
 
-// `name` is a file's name, `names` those of its folder. The names that differ from it in the last run of digits only,
-// in the order of the numbers, as far as no number is missing; at least `name` itself.
+// `name` is a file's name, `names` lists its folder. Returns the names that differ from it only in the last run of
+// digits, in numerical order, up to the first missing number; at least `name` itself.
 [[nodiscard]] std::vector<std::u16string> SequenceOf(const std::u16string& name,
                                                      const std::vector<std::u16string>& names);
 

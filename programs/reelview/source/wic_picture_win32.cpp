@@ -24,7 +24,7 @@ void Check(HRESULT result, const char* error) {
     if (FAILED(result)) throw SourceError(error);
 }
 
-// Straight alpha: the effects treat it as a channel of its own.
+// Straight alpha: the effects treat it as an independent channel.
 Picture PixelsOf(IWICImagingFactory& factory, IWICBitmapSource& source) {
     UINT width = 0, height = 0;
     Check(source.GetSize(&width, &height), text::kCannotRead);

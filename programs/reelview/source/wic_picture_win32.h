@@ -1,4 +1,5 @@
-// Pictures through the system's imaging component. Windows only; the thread has COM.
+// Reads and writes pictures through the Windows Imaging Component. Windows only; COM must be initialised on the
+// thread.
 #pragma once
 
 #include <memory>
@@ -9,14 +10,14 @@
 
 namespace velmora::reelview {
 
-// PNG, JPEG, BMP, TIFF and whatever else the system reads. Throws SourceError.
+// PNG, JPEG, BMP, TIFF and any other format that the system reads. Throws SourceError.
 [[nodiscard]] Picture ReadPicture(const std::wstring& file);
 // Throws SourceError (text::kCannotWrite).
 void WritePng(const std::wstring& file, const Picture& picture);
 
-// One picture, or several of one size after another. Throws SourceError.
+// One picture, or a sequence of pictures of the same size. Throws SourceError.
 [[nodiscard]] std::unique_ptr<ClipSource> OpenPictures(std::vector<std::wstring> files);
-// A picture and those of its folder that continue its number.
+// A picture and the files in its folder that continue its numbering.
 [[nodiscard]] std::unique_ptr<ClipSource> OpenSequence(const std::wstring& file);
 
 }  // namespace velmora::reelview

@@ -54,7 +54,7 @@ class Y4mClip final : public ClipSource {
     }
 
   private:
-    // A frame's line may carry words of its own, so the places are not at equal distances.
+    // A frame header may carry parameters, so the offsets are not evenly spaced.
     void FindFrames() {
         const auto start = m_stream.tellg();
         m_stream.seekg(0, std::ios::end);
@@ -80,7 +80,7 @@ class Y4mClip final : public ClipSource {
 
 void CheckSize(hosts::FrameSize size) {
     if (size.width < 1 || size.height < 1) throw SourceError(text::kCannotRead);
-    // Source, result and what is shown are in memory at once.
+    // The source, the result and the displayed picture are in memory at the same time.
     constexpr std::int64_t kLargestArea = std::int64_t{1} << 27;
     const bool isTooLarge = size.width > kLargestSide || size.height > kLargestSide ||
                             std::int64_t{size.width} * size.height > kLargestArea;

@@ -1,4 +1,4 @@
-// YUV4MPEG2 files, any frame in any order.
+// YUV4MPEG2 files with random access to frames.
 #pragma once
 
 #include <filesystem>
@@ -8,7 +8,7 @@
 
 namespace velmora::reelview {
 
-// Throws SourceError. A file that was cut off gives the frames that are whole.
+// Throws SourceError. A truncated file gives its complete frames.
 [[nodiscard]] std::unique_ptr<ClipSource> OpenY4mClip(const std::filesystem::path& file);
 
 }  // namespace velmora::reelview

@@ -114,7 +114,7 @@ void PictureWindow::Paint(HDC dc, const RECT& area) const {
     const ViewPlaces places = Places();
     const Picture& after = m_after ? *m_after : *m_before;
     if (m_state.compare == Compare::kSideBySide) {
-        // Each keeps to its half of the window when it is larger.
+        // Each is clipped to its half of the window.
         const int middle = area.right / 2, gap = m_theme.Px(4);
         PaintClipped(dc, *m_before, places.before, {0, 0, middle - gap, area.bottom});
         PaintClipped(dc, after, places.after, {middle + gap, 0, area.right, area.bottom});
@@ -163,7 +163,7 @@ void PictureWindow::OnMouseMove(int x, int y) {
     InvalidateRect(m_window, nullptr, FALSE);
 }
 
-// Home and End belong to the clip; the divider moves with Ctrl and the arrows.
+// Home and End belong to the clip, so the divider moves with Ctrl and the arrow keys.
 bool PictureWindow::OnKey(WPARAM key) {
     const bool isArrow = key == VK_LEFT || key == VK_RIGHT;
     if (!isArrow || GetKeyState(VK_CONTROL) >= 0) return false;
@@ -207,7 +207,7 @@ LRESULT PictureWindow::OnMessage(UINT message, WPARAM wParam, LPARAM lParam) {
             return DLGC_WANTARROWS;
         case WM_KEYDOWN:
             if (OnKey(wParam)) return 0;
-            // The window around knows the other keys.
+            // The parent window handles the other keys.
             return SendMessageW(GetParent(m_window), message, wParam, lParam);
         case WM_SETFOCUS:
         case WM_KILLFOCUS:

@@ -28,7 +28,7 @@ class PictureWindow {
     [[nodiscard]] const ViewState& State() const { return m_state; }
     void SetZoom(Zoom zoom);
     void SetCompare(Compare compare);
-    // Both null: nothing is open. `after` null: not rendered yet. `isMoving` draws faster and coarser.
+    // Both null when nothing is open; `after` null when it is not rendered yet. `isMoving` draws faster and coarser.
     void Show(SharedPicture before, SharedPicture after, bool isMoving);
     [[nodiscard]] const SharedPicture& After() const { return m_after; }
 

@@ -42,7 +42,7 @@ int PresetList::NaturalHeight() const {
     return m_theme.Px(kPictureHeight + kTextHeight + 16) + GetSystemMetrics(SM_CYHSCROLL);
 }
 
-// A bitmap of the list's size with the picture in its middle, or an empty place.
+// A bitmap of the thumbnail size with the picture in its middle, or an empty one.
 HBITMAP PresetList::BitmapOf(const Picture* picture) const {
     const hosts::FrameSize size = PictureSize();
     const BITMAPINFO info = BitmapInfoOf(size);
@@ -124,7 +124,7 @@ void PresetList::Select(std::optional<std::uint32_t> preset) {
     m_isShowing = false;
 }
 
-// A click on the chosen preset chooses it again: the controls may have been moved since.
+// A click on the selected preset applies it again, because the controls may have been moved since.
 std::optional<std::uint32_t> PresetList::ChosenBy(const NMHDR& notification) const {
     if (m_isShowing || notification.hwndFrom != m_window) return std::nullopt;
     int item = -1;

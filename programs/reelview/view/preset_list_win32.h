@@ -1,4 +1,4 @@
-// The built-in presets of an effect, each with a small picture of what it does. Windows only.
+// The built-in presets of an effect, each with a thumbnail of its result. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -23,15 +23,15 @@ class PresetList {
     [[nodiscard]] HWND Window() const { return m_window; }
     [[nodiscard]] HWND Label() const { return m_label; }
     void ShowNames(const std::vector<std::string>& names);
-    // The largest size of a small picture.
+    // The largest thumbnail size.
     [[nodiscard]] hosts::FrameSize PictureSize() const;
     void ShowPicture(std::uint32_t preset, const Picture& picture);
-    // Nothing: none of them is what the controls show.
+    // Empty: the controls match no preset.
     void Select(std::optional<std::uint32_t> preset);
-    // The preset that a notification of the list asks for.
+    // The preset that a notification from the list selects.
     [[nodiscard]] std::optional<std::uint32_t> ChosenBy(const NMHDR& notification) const;
     void Restyle();
-    // The height that shows one row.
+    // The height needed to show one row.
     [[nodiscard]] int NaturalHeight() const;
 
   private:

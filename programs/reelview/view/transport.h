@@ -1,4 +1,4 @@
-// Which frame of a clip is due, and how it is written down.
+// Which frame of a clip is due, and how its time is displayed.
 #pragma once
 
 #include <cstdint>
@@ -21,13 +21,13 @@ class Transport {
     [[nodiscard]] double Seconds() const { return m_rate.SecondsAt(m_frame); }
 
     void SetLoop(bool loops) { m_loops = loops; }
-    // `now` is any steady clock in seconds. At the last frame playing starts over.
+    // `now` is any steady clock in seconds. Playing from the last frame starts over.
     void Play(double now);
     void Pause() { m_isPlaying = false; }
-    // Held to the clip; playing goes on from there.
+    // Clamped to the clip; playback continues from there.
     void GoTo(std::int64_t frame, double now);
     void Step(std::int64_t by);
-    // True when another frame is due. At the end it starts over or, without loop, stops at the last frame.
+    // True when another frame is due. At the end, playback starts over or, without loop, stops at the last frame.
     bool Advance(double now);
 
   private:

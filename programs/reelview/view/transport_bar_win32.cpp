@@ -9,7 +9,7 @@
 namespace velmora::reelview {
 namespace {
 
-// The bar counts in fewer steps than a very long clip has frames.
+// A very long clip has more frames than the bar has steps.
 constexpr std::int64_t kMostSteps = 1'000'000;
 
 std::int64_t StepsOf(const Transport& transport) {
@@ -23,7 +23,7 @@ void Fill(HDC dc, std::initializer_list<POINT> points, COLORREF colour) {
     Polygon(dc, points.begin(), static_cast<int>(points.size()));
 }
 
-// Symbols are drawn about the button's centre, `u` pixels to the unit.
+// Symbols are drawn around the button's centre, with `u` pixels per unit.
 void DrawTriangle(HDC dc, POINT c, int u, int way, COLORREF colour) {
     Fill(dc, {{c.x - way * 4 * u, c.y - 6 * u}, {c.x + way * 6 * u, c.y}, {c.x - way * 4 * u, c.y + 6 * u}},
          colour);
@@ -52,7 +52,7 @@ TransportBar::TransportBar(HWND parent, const Theme& theme, Labels labels)
     m_next = MakeButton(parent, m_labels.next, kTransportNext);
     m_loop = MakeButton(parent, m_labels.loop, kTransportLoop);
     const HINSTANCE instance = GetModuleHandleW(nullptr);
-    // Hidden, but it names the bar.
+    // Hidden, but it names the bar for screen readers.
     m_positionLabel = CreateWindowExW(0, WC_STATICW, m_labels.position.c_str(), WS_CHILD, 0, 0, 0, 0, parent,
                                       nullptr, instance, nullptr);
     m_scrub = CreateWindowExW(0, TRACKBAR_CLASSW, m_labels.position.c_str(),

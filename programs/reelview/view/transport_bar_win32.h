@@ -1,4 +1,4 @@
-// Buttons and bar that move through a clip. Windows only.
+// Buttons and a bar for moving through a clip. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -10,7 +10,7 @@
 
 namespace velmora::reelview {
 
-// Also the identifiers of the buttons.
+// Also used as button identifiers.
 enum TransportCommand : int {
     kTransportPrevious = 300,
     kTransportPlay,
@@ -29,12 +29,12 @@ class TransportBar {
 
     [[nodiscard]] HWND Scrub() const { return m_scrub; }
     void Show(const Transport& transport, bool isOpen);
-    // The frame where the user has dragged the bar.
+    // The frame to which the user has dragged the bar.
     [[nodiscard]] std::int64_t ScrubbedFrame(const Transport& transport) const;
     void Place(const RECT& area);
     [[nodiscard]] int NaturalHeight() const { return m_theme.Px(36); }
     void Restyle();
-    // Answers WM_DRAWITEM of its buttons; false for others.
+    // Handles WM_DRAWITEM for its buttons; false for other controls.
     bool Draw(const DRAWITEMSTRUCT& item) const;
 
   private:

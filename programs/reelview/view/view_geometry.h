@@ -14,22 +14,22 @@ enum class Compare { kAfter, kDivider, kSideBySide };
 struct ViewState {
     Zoom zoom = Zoom::kFit;
     Compare compare = Compare::kDivider;
-    double divider = 0.5;             // share of the picture's width that shows "before"
-    std::int32_t panX = 0, panY = 0;  // pixels by which an enlarged picture is moved
+    double divider = 0.5;             // fraction of the picture's width that shows "before"
+    std::int32_t panX = 0, panY = 0;  // offset of an enlarged picture in pixels
 };
 
 struct ViewPlaces {
-    Box before, after;                          // the whole picture's places; equal but side by side
+    Box before, after;                          // rectangles of the whole picture; equal unless side by side
     std::int32_t divider = 0;                   // x of the line; kDivider only
-    std::int32_t panRangeX = 0, panRangeY = 0;  // how far the picture can be moved to each side
+    std::int32_t panRangeX = 0, panRangeY = 0;  // how far the picture can be moved either way
 };
 
-// All in pixels of the window. `scale` is the window's dots per inch over 96: 100 % is one picture pixel for one
-// screen pixel whatever it is, the gap between two pictures grows with it.
+// All in window pixels. `scale` is the window's dots per inch over 96. At 100 % one picture pixel is one screen
+// pixel, whatever the scale; the gap between two pictures grows with it.
 [[nodiscard]] ViewPlaces PlacePicture(const ViewState& state, hosts::FrameSize picture, std::int32_t width,
                                       std::int32_t height, double scale);
 
-// The divider's share for a mouse at `x`.
+// The divider's position, as a fraction, for a mouse at `x`.
 [[nodiscard]] double DividerAt(const ViewPlaces& places, std::int32_t x);
 
 }  // namespace velmora::reelview

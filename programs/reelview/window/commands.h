@@ -1,4 +1,4 @@
-// Numbers of what menus and keys ask for.
+// Command numbers for menus and shortcuts.
 #pragma once
 
 namespace velmora::reelview {
@@ -32,7 +32,7 @@ enum Command : int {
     kCommandHelp,
     kCommandEffectHelp,
     kCommandAbout,
-    kCommandRecent = 160,  // and the next ones
+    kCommandRecent = 160,  // and the numbers after it
     kCommandRecentEnd = 170,
     kControlEffect = 200,
     kControlPresets,

@@ -11,7 +11,7 @@ namespace {
 
 constexpr DWORD kLongestPath = 32768;
 
-// "label (patterns)", patterns, each ended by a zero.
+// "label (patterns)", then the patterns, each terminated by a zero.
 void AddFilter(std::wstring& filter, const std::wstring& label, const std::wstring& patterns) {
     filter += label + L" (" + patterns + L')';
     filter += L'\0';
@@ -66,7 +66,7 @@ std::optional<std::wstring> AskPngFile(HWND owner, const Texts& texts) {
     return asked->file;
 }
 
-// The chosen kind counts, but a name with another kind's extension says what is wanted just as clearly.
+// The selected type counts, but a file name with another type's extension is just as clear.
 std::optional<ClipChoice> AskClipFile(HWND owner, const Texts& texts) {
     struct Row {
         const char* label;
@@ -81,7 +81,7 @@ std::optional<ClipChoice> AskClipFile(HWND owner, const Texts& texts) {
     };
     std::wstring filter;
     for (const Row& row : kRows) AddFilter(filter, texts(row.label), std::wstring(L"*") + row.extension);
-    // An extension lets the dialog add the chosen kind's.
+    // A default extension makes the dialog add that of the selected type.
     const auto asked = Ask(owner, filter, L"avi", true);
     if (!asked) return std::nullopt;
     const std::size_t index =

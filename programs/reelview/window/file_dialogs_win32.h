@@ -1,4 +1,4 @@
-// The system's dialogs for opening and saving. Windows only.
+// The system's open and save dialogs. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -11,7 +11,7 @@
 
 namespace velmora::reelview {
 
-// Nothing: cancelled.
+// Empty when cancelled.
 [[nodiscard]] std::optional<std::wstring> AskOpenFile(HWND owner, const Texts& texts);
 [[nodiscard]] std::optional<std::wstring> AskPngFile(HWND owner, const Texts& texts);
 

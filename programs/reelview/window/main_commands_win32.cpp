@@ -189,7 +189,7 @@ void MainWindow::LoadPreset() {
     PresetRecord record = {};
     const std::int32_t result = saver->LoadPreset(m_window, &m_library.Object(), m_history.Now().effect,
                                                   &record, m_texts.Language().c_str());
-    if (result != 0 || record.count == 0) return;  // cancelled, or the user knows
+    if (result != 0 || record.count == 0) return;  // cancelled, or the user has been told
     Values values = m_history.Now().Current();
     for (std::size_t i = 0; i < values.size() && std::cmp_less(i, record.count); ++i) {
         if (Effect().params[i].HoldsValue()) values[i] = record.values[i].value;
@@ -233,7 +233,7 @@ void MainWindow::CopyFrame() {
     BITMAPINFOHEADER header = {};
     header.biSize = sizeof header;
     header.biWidth = picture->size.width;
-    header.biHeight = picture->size.height;  // many programs read bitmaps from the bottom only
+    header.biHeight = picture->size.height;  // many programs only read bottom-up bitmaps
     header.biPlanes = 1;
     header.biBitCount = 32;
     header.biCompression = BI_RGB;

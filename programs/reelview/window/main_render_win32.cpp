@@ -11,7 +11,7 @@
 namespace velmora::reelview {
 namespace {
 
-constexpr double kSilence = 5.0;  // seconds without an answer that are worth a word
+constexpr double kSilence = 5.0;  // seconds without an answer before the user is told
 
 std::wstring NameOf(const std::wstring& file) {
     return file.substr(file.find_last_of(L"\\/") + 1);
@@ -64,7 +64,7 @@ void MainWindow::OnOpened(const ClipFacts& facts, const ClipRequest& request) {
     RequestPreview();
 }
 
-// One frame is rendered at a time; what is asked for meanwhile replaces what was waiting.
+// Only one frame is rendered at a time; a newer request replaces the waiting one.
 void MainWindow::RequestPreview() {
     m_bar->Show(m_transport, m_isOpen);
     if (!m_isOpen) {
@@ -124,7 +124,7 @@ void MainWindow::RequestThumbnails() {
     if (key == m_thumbnails) return;
     const std::uint32_t round = ++*m_thumbnailRound;
     const std::vector<Values>& presets = m_presets[key.effect];
-    // Remembered when the last is there: what was interrupted begins again.
+    // Stored only when the last one is done, so that an interrupted round starts again.
     const auto small = std::make_shared<Picture>();
     for (std::uint32_t i = 0; i < presets.size(); ++i) {
         m_worker->PostIdle([this, key, round, current = m_thumbnailRound, i, small,
@@ -140,7 +140,7 @@ void MainWindow::RequestThumbnails() {
                     if (isLast) m_thumbnails = key;
                 });
             } catch (const std::exception&) {
-                // The place stays empty: a small picture is not worth a message.
+                // The entry stays empty: a thumbnail is not worth a message.
             }
         });
     }

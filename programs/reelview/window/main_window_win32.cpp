@@ -18,7 +18,7 @@
 namespace velmora::reelview {
 namespace {
 
-constexpr double kPatience = 5.0;  // seconds for a frame that does not come when the window closes
+constexpr double kPatience = 5.0;  // seconds to wait for an unfinished frame when the window closes
 
 std::vector<std::vector<Values>> PresetsOf(const hosts::EffectLibrary& library) {
     std::vector<std::vector<Values>> presets;
@@ -31,7 +31,7 @@ std::vector<std::vector<Values>> PresetsOf(const hosts::EffectLibrary& library) 
                 presets.back().push_back(Engine::PresetValues(*effect, info, preset));
             }
         };
-        // A failed table leaves what was read of it.
+        // If reading fails, what was read so far stays.
         static_cast<void>(RunGuarded(read));
     }
     return presets;
@@ -80,7 +80,7 @@ MainWindow::MainWindow(const hosts::EffectLibrary& library, const ViewOptions& o
 MainWindow::~MainWindow() {
     m_worker.reset();
     if (m_window != nullptr) DestroyWindow(m_window);
-    // What the worker sent while the window went.
+    // Tasks that the worker posted while the window was closing.
     MSG message;
     while (PeekMessageW(&message, nullptr, kMessageRun, kMessageRun, PM_REMOVE)) {
         delete reinterpret_cast<std::function<void()>*>(message.lParam);
@@ -204,7 +204,7 @@ void MainWindow::OnDrop(HDROP drop) {
     if (!request.files.empty()) Open(std::move(request));
 }
 
-// Keys of menus; those that write and cut text stay with a field that has the focus.
+// Menu shortcuts. Those for typing and the clipboard go to an edit field that has the focus.
 bool MainWindow::Translate(MSG& message) {
     static const HACCEL keys =
         LoadAcceleratorsW(GetModuleHandleW(nullptr), MAKEINTRESOURCEW(VM_KEYS_REELVIEW));
@@ -261,7 +261,7 @@ void MainWindow::Close() {
     StorePlace(m_window);
     m_isCancelled = true;
     ++*m_thumbnailRound;
-    // A library that does not come back must not keep the program; nothing of the user's is at stake then.
+    // A library that never returns must not keep the program running; the user has nothing to lose at this point.
     if (!m_worker->Stop(kPatience)) TerminateProcess(GetCurrentProcess(), 2);
     m_progress.reset();
     DestroyWindow(m_window);
@@ -275,14 +275,14 @@ void MainWindow::OnDpiChanged(int dpi, const RECT& place) {
 }
 
 void MainWindow::OnLookChanged(UINT message) {
-    // Controls that are dressed anew send this too.
+    // Restyled controls send this too.
     const bool isOwn = message == WM_THEMECHANGED && SystemScheme() == m_theme.CurrentScheme();
     if (m_status == nullptr || isOwn) return;
     m_theme.Set(SystemScheme(), m_theme.Dpi());
     Restyle();
 }
 
-// What has to do with how the window looks.
+// Messages about the window's look.
 std::optional<LRESULT> MainWindow::OnLookMessage(UINT message, WPARAM wParam, LPARAM lParam) {
     switch (message) {
         case WM_DPICHANGED:
@@ -324,7 +324,7 @@ std::optional<LRESULT> MainWindow::OnLookMessage(UINT message, WPARAM wParam, LP
     }
 }
 
-// What the user does.
+// Messages about the user's actions.
 std::optional<LRESULT> MainWindow::OnInputMessage(UINT message, WPARAM wParam, LPARAM lParam) {
     switch (message) {
         case WM_COMMAND:

@@ -1,4 +1,4 @@
-// The program's window: what is open, how it is set, and all that the user can do with it. Windows only.
+// The main window: what is open, its settings, and everything the user can do with it. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -32,13 +32,13 @@ inline constexpr wchar_t kProgramName[] = L"Velmora Reel View";
 
 class MainWindow final : public PanelOwner {
   public:
-    // `library` outlives the window.
+    // `library` must outlive the window.
     MainWindow(const hosts::EffectLibrary& library, const ViewOptions& options);
     ~MainWindow();
     MainWindow(const MainWindow&) = delete;
     MainWindow& operator=(const MainWindow&) = delete;
 
-    // Until the window is closed.
+    // Returns when the window is closed.
     void Run(int show);
 
     void OnValueChosen(std::uint32_t parameter, ValueWord value, std::uint32_t gesture) override;
@@ -49,7 +49,7 @@ class MainWindow final : public PanelOwner {
 
   private:
     struct Preview {
-        std::uint32_t clip = 0;  // which opening of a clip it belongs to
+        std::uint32_t clip = 0;  // identifies the opening of the clip that it belongs to
         SharedPicture before, after;
         double milliseconds = 0.0;
         std::string error;
@@ -70,7 +70,7 @@ class MainWindow final : public PanelOwner {
     bool Translate(MSG& message);
     void Close();
 
-    // main_commands_win32.cpp: what the user asks for
+    // main_commands_win32.cpp: the user's commands
     void OnCommand(int command, int code);
     void OnFileCommand(int command);
     void OnViewCommand(int command);
@@ -88,8 +88,8 @@ class MainWindow final : public PanelOwner {
     void ShowAbout();
     void ApplyPreset(std::uint32_t preset);
 
-    // main_render_win32.cpp: what comes from the rendering thread
-    void OnWorker(std::function<void()> task);  // runs it here, from any thread
+    // main_render_win32.cpp: results from the rendering thread
+    void OnWorker(std::function<void()> task);  // runs it on the window's thread; callable from any thread
     void Open(ClipRequest request);
     void OnOpened(const ClipFacts& facts, const ClipRequest& request);
     void RequestPreview();
@@ -99,7 +99,7 @@ class MainWindow final : public PanelOwner {
     void Complain(const std::wstring& about, const std::string& key);
 
     void ShowSettings();     // after undo, presets and the like
-    void ShowEffectParts();  // another effect
+    void ShowEffectParts();  // after a change of effect
     void ShowMarks();
     [[nodiscard]] const hosts::EffectInfo& Effect() const {
         return m_library.Effects()[m_history.Now().effect];
@@ -129,9 +129,9 @@ class MainWindow final : public PanelOwner {
     std::uint32_t m_clip = 0, m_previewsAsked = 0;
     bool m_isRendering = false;
     double m_askedAt = 0.0, m_milliseconds = 0.0;
-    std::vector<double> m_shownAt;  // of the last second's frames
+    std::vector<double> m_shownAt;  // times of the last second's frames
     std::string m_error;
-    std::wstring m_note;  // what was done last
+    std::wstring m_note;  // the last action
     std::uint32_t m_shownEffect = 0xFFFFFFFFu;
     struct ThumbnailKey {
         std::uint32_t clip = 0, effect = 0;
@@ -142,7 +142,7 @@ class MainWindow final : public PanelOwner {
     std::shared_ptr<std::atomic<std::uint32_t>> m_thumbnailRound;
     std::atomic<bool> m_isCancelled = false;
 
-    std::unique_ptr<Engine> m_engine;  // the worker's
+    std::unique_ptr<Engine> m_engine;  // used on the worker's thread
     std::unique_ptr<Worker> m_worker;
 };
 

@@ -9,17 +9,17 @@
 
 namespace velmora::reelview {
 
-// What an item that is drawn here shows. Screen readers read the beginning.
+// Data of an owner-drawn item. Screen readers read the first members.
 struct MenuBar::Item {
     MSAAMENUINFO forReaders = {};
-    std::wstring text;  // with its keys behind a tab
+    std::wstring text;  // with its shortcut after a tab
     bool isTop = false;
 };
 
 namespace {
 
 struct Row {
-    int command;  // 0: a line
+    int command;  // 0: a separator
     const char* text;
     const wchar_t* keys;
 };
@@ -95,7 +95,7 @@ MenuBar::MenuBar(HWND window, const Texts& texts, const Theme& theme)
 }
 
 MenuBar::~MenuBar() {
-    if (!IsWindow(m_window)) return;  // it took the menu with it
+    if (!IsWindow(m_window)) return;  // the menu was destroyed with the window
     SetMenu(m_window, nullptr);
     DestroyMenu(m_bar);
 }
@@ -168,7 +168,7 @@ void MenuBar::ShowMarks(const MenuMarks& marks) {
 
 void MenuBar::Restyle() {
     const bool isOwn = m_theme.IsDark();
-    Own(m_bar, true, false);  // back to texts, then anew
+    Own(m_bar, true, false);  // back to text items, then rebuilt
     m_items.clear();
     m_background.reset(isOwn ? CreateSolidBrush(m_theme.Colours().window) : nullptr);
     if (isOwn) Own(m_bar, true, true);

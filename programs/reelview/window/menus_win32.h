@@ -1,4 +1,4 @@
-// The menu bar, in the system's look or, where that would be light on a dark window, drawn here. Windows only.
+// The menu bar, with the system's look, or drawn here where that would be light on a dark window. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -14,7 +14,7 @@ namespace velmora::reelview {
 
 struct MenuMarks {
     bool isOpen = false, isFilm = false, canUndo = false, canRedo = false, loops = true;
-    int zoom = 0, compare = 0;  // the commands that are chosen
+    int zoom = 0, compare = 0;  // the selected commands
 };
 
 class MenuBar {
@@ -29,7 +29,7 @@ class MenuBar {
     void Restyle();
     bool Measure(MEASUREITEMSTRUCT& item) const;
     bool Draw(const DRAWITEMSTRUCT& item) const;
-    // The answer to WM_MENUCHAR for items that are drawn here.
+    // The answer to WM_MENUCHAR for owner-drawn items.
     [[nodiscard]] LRESULT OnLetter(wchar_t letter, HMENU menu) const;
 
   private:

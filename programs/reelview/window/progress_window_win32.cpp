@@ -42,7 +42,7 @@ ProgressWindow::ProgressWindow(HWND owner, const Theme& theme, const Labels& lab
 }
 
 ProgressWindow::~ProgressWindow() {
-    // First the owner: else another program's window comes to the front.
+    // Enable the owner first, or another program's window comes to the front.
     EnableWindow(m_owner, TRUE);
     if (m_window != nullptr) DestroyWindow(m_window);
 }

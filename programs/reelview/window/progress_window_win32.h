@@ -1,4 +1,4 @@
-// How far saving is, and a button that ends it. Windows only.
+// Shows the progress of saving, with a button to cancel it. Windows only.
 #pragma once
 
 #include <windows.h>
@@ -19,7 +19,7 @@ class ProgressWindow {
         std::wstring title, cancel;
     };
 
-    // Takes the owner's place for the user until it goes.
+    // Disables the owner during its lifetime.
     ProgressWindow(HWND owner, const Theme& theme, const Labels& labels, std::int64_t frames,
                    std::atomic<bool>& isCancelled);
     ~ProgressWindow();

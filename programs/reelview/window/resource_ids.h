@@ -1,4 +1,4 @@
-// Numbers of the program's resources; the resource compiler reads this too.
+// Resource numbers of the program; the resource compiler reads this file too.
 #pragma once
 
 #define VM_ICON_REELVIEW 1

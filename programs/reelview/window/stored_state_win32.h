@@ -1,4 +1,4 @@
-// What the program remembers from one run to the next, in the user's part of the registry. Windows only.
+// What the program remembers between runs, in the user's part of the registry. Windows only.
 #pragma once
 
 #include <windows.h>

@@ -1,7 +1,7 @@
 #!/usr/bin/env python3
-"""The editors' files, read as the editors read them, and their way into a user's home and out again.
+"""The editors' files, read as the editors read them, and installed into and removed from a user's home.
 
-Environment: REELFX; VELMORA_DIST: what was built, plug-ins without sanitizers.
+Environment: REELFX; VELMORA_DIST: the build results, with plug-ins built without sanitizers.
 """
 
 import os
@@ -39,7 +39,7 @@ def melt_metadata(plugin, data=None):
 
 
 def parameters_of_plugin(plugin):
-    """What MLT reads from the plug-in itself, where no description of ours is installed."""
+    """What MLT reads from the plug-in itself when none of our descriptions is installed."""
     return re.findall(r"^  - identifier: (.+)$", melt_metadata(plugin), re.MULTILINE)
 
 
@@ -55,7 +55,7 @@ class EditorFiles(unittest.TestCase):
                 where = f"{plugin}: {parameter.findtext('name')}"
                 default = parameter.get("default")
                 if parameter.get("type") == "list":
-                    # Kdenlive splits the values at semicolons and what it shows at commas.
+                    # Kdenlive splits the values at semicolons and the displayed names at commas.
                     values = parameter.get("paramlist").split(";")
                     self.assertEqual(len(values), len(parameter.findtext("paramlistdisplay").split(",")), where)
                     self.assertIn(default, values, where)
@@ -73,7 +73,7 @@ class EditorFiles(unittest.TestCase):
         self.addCleanup(work.folder.cleanup)
         for effect in hosts.PRESETS:
             values = [f"{p.get('name')}={p.get('default')}" for p in kdenlive_parameters(hosts.plugin_name(effect))[4:]]
-            # An animated value carries the frame that it belongs to.
+            # An animated value includes its frame number.
             values = [re.sub(r"^(\d+)=([0-9.]+)$", r"\1=0=\2", v) for v in values]
             self.assertEqual(hosts.in_melt(work, effect, "25", more=values), work.expected(effect, "25"), effect)
 
@@ -113,7 +113,7 @@ class EditorFiles(unittest.TestCase):
             own.parent.mkdir(parents=True)
             own.touch()
             script = hosts.ROOT / "scripts/install-user"
-            for _ in range(2):  # also over itself
+            for _ in range(2):  # also over an existing installation
                 said = subprocess.run([script], env=environment, capture_output=True, check=True).stdout.decode()
             installed = [p for p in Path(home).rglob("*") if p.is_file() and p != own and p.name != "installed-files"]
             self.assertEqual(sorted(str(p) for p in installed), sorted(line.strip() for line in said.splitlines()))

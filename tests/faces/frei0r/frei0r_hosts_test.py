@@ -1,10 +1,10 @@
 #!/usr/bin/env python3
-"""The frei0r plug-ins in real hosts: each must make the very frames that reelfx makes.
+"""The frei0r plug-ins in real hosts: each must produce exactly the frames that reelfx produces.
 
-Fills the table of docs/hosts.md: compares it, or with --write replaces it.
+Compares its results with the table in docs/hosts.md, or replaces the table with --write.
 
-Environment: REELFX, FREI0R_PATH (the built plug-ins); PRELOAD: a library that the hosts must load first, as
-plug-ins with sanitizers need their runtime.
+Environment: REELFX, FREI0R_PATH (the built plug-ins); PRELOAD: a library that the hosts must load first,
+such as the runtime of plug-ins built with sanitizers.
 """
 
 import argparse
@@ -21,9 +21,9 @@ ROOT = Path(__file__).parents[3]
 TABLE_FILE = ROOT / "docs" / "hosts.md"
 TABLE_BEGIN, TABLE_END = "<!-- table: tests/faces/frei0r -->\n", "<!-- end of table -->\n"
 
-# Debian 12's FFmpeg pads rows to 64 bytes and does not tell plug-ins; of 320 pixels nothing is padded.
+# Debian 12's FFmpeg pads rows to 64 bytes without telling plug-ins; rows of 320 pixels need no padding.
 WIDTH, HEIGHT, FRAMES, SEED = 320, 180, 20, 7
-START = 8  # where parts begin
+START = 8  # first frame of a partial render
 
 PRESETS = {
     "Film Camera": "Earthquake!",
@@ -33,7 +33,7 @@ PRESETS = {
     "Film Pro": "Super 8",
 }
 
-# Constant rates, also one that is no whole number.
+# Constant rates, including one that is not a whole number.
 RATES = ["25", "30000/1001"]
 
 
@@ -51,14 +51,14 @@ def host(*args):
 
 
 def digests_of_rgba(path):
-    """MD5 of each frame as BGRA, which is what reelfx prints."""
+    """MD5 of each frame as BGRA, as reelfx prints it."""
     text = ffmpeg("-f", "rawvideo", "-pix_fmt", "rgba", "-s", f"{WIDTH}x{HEIGHT}", "-i", path, "-pix_fmt", "bgra",
                   "-f", "framemd5", "-").decode()
     return [line.split(",")[-1].strip() for line in text.splitlines() if not line.startswith("#")]
 
 
 class Work:
-    """The clip at each rate, lossless, and what reelfx makes of it."""
+    """The clip at each rate, lossless, and reelfx's result for it."""
 
     def __init__(self):
         self.folder = tempfile.TemporaryDirectory(prefix="velmora-frei0r-")
@@ -85,7 +85,7 @@ class Work:
 
 
 def in_ffmpeg(work, effect, rate, start=0, more=""):
-    # Nothing but a preset's letters and digits counts, so that its apostrophe needs no quoting.
+    # Only a preset's letters and digits count, so its apostrophe needs no quoting.
     preset = "".join(c for c in PRESETS[effect] if c.isalnum())
     graph = f"frei0r={plugin_name(effect)}:{preset}|{SEED}|{start}|{rate}{more}"
     seconds = start * eval_rate(rate)
@@ -95,7 +95,7 @@ def in_ffmpeg(work, effect, rate, start=0, more=""):
 
 
 def eval_rate(rate):
-    """Seconds of a frame."""
+    """The time of a frame in seconds."""
     numerator, _, denominator = rate.partition("/")
     return int(denominator or 1) / int(numerator)
 
@@ -111,7 +111,7 @@ def in_melt(work, effect, rate, real_time=-1, start=0, more=()):
                "-attach", f"frei0r.{plugin_name(effect)}", f"preset={PRESETS[effect]}", f"seed={SEED}",
                f"start frame={start}", f"frame rate={rate}", *more, "-consumer", f"avformat:{work.out}", "f=rawvideo",
                "vcodec=rawvideo", "pix_fmt=rgba", "mlt_image_format=rgba", "an=1", f"real_time={real_time}"]
-    # Seen once in some hundred runs: melt ended with success and had written nothing. Frames that are there count.
+    # Seen once in some hundred runs: melt reported success but had written nothing. Frames that exist are checked.
     for _ in range(3):
         host(*command)
         frames = digests_of_rgba(work.out)
@@ -174,7 +174,7 @@ class Hosts(unittest.TestCase):
         self.assertEqual(now, text if not self.write else now, f"{TABLE_FILE}: run this test with --write")
 
     def test_presets_give_way_to_what_stands_behind_them(self):
-        # Wear to its default and another pattern; by place, by name and by number.
+        # Wear at its default and another pattern; by position, by name and by number.
         wanted = self.work.expected("Film Damage", "25", "--set", "Wear=0", "--set", "Pattern=Fine")
         self.assertNotEqual(wanted, self.work.expected("Film Damage", "25"))
         self.assertEqual(in_ffmpeg(self.work, "Film Damage", "25", more="|0|fine"), wanted)
@@ -182,7 +182,7 @@ class Hosts(unittest.TestCase):
         self.assertEqual(in_melt(self.work, "Film Damage", "25", more=("4=0", "5=3")), wanted)
 
     def test_slices_of_melt_do_no_harm(self):
-        # A slice is a picture of its own to a plug-in, but it must come through whole.
+        # A slice is a separate picture to a plug-in, but it must come through whole.
         self.assertEqual(len(in_melt(self.work, "Film Pro", "25", more=("threads=4",))), FRAMES)
 
 

@@ -1,4 +1,4 @@
-// The frei0r adapter by itself, as a host calls it. That real hosts show the frames of reelfx is frei0r_hosts_test.
+// The frei0r adapter alone, called as by a host. frei0r_hosts_test checks that real hosts show the frames of reelfx.
 #include <frei0r.h>
 #include <gtest/gtest.h>
 
@@ -36,14 +36,14 @@ int IndexOf(const PluginDescription& plugin, std::string_view name) {
     return -1;
 }
 
-// An instance with a host's view of it.
+// An instance, used as by a host.
 class Host {
   public:
     Host(const effects::EffectTable& effect, std::uint32_t width, std::uint32_t height)
         : m_plugin(DescribePlugin(effect)), m_instance(m_plugin, width, height, TimeUnit::kSeconds) {}
     void Text(std::string_view name, const char* text) { m_instance.Set(IndexOf(m_plugin, name), &text); }
     void Number(std::string_view name, double number) { m_instance.Set(IndexOf(m_plugin, name), &number); }
-    // As hosts do that keep all values themselves and pass every one of them on.
+    // Like hosts that store all values themselves and pass every one of them on.
     void SetAllToDefaults() {
         for (std::size_t i = 4; i < m_plugin.params.size(); ++i) {
             union {
@@ -73,7 +73,7 @@ class Host {
     Instance m_instance;
 };
 
-// What the core makes of it, in a frei0r host's byte order.
+// The core's result, in a frei0r host's byte order.
 Pixels Expected(effects::EffectSession& session, std::int32_t width, std::int32_t height, Pixels in,
                 double seconds) {
     const auto swap = [](Pixels& pixels) {
@@ -140,7 +140,7 @@ TEST(Frei0rInstance, LetsValuesOverrideThePresetAlsoByTheirDefaults) {
     const Pixels sepia = Expected(*session, 40, 30, in, 0.0);
     EXPECT_EQ(host.Update(0.0, in), sepia);
 
-    // In a host that passes every value on, those that the user left alone are not meant.
+    // When a host passes every value on, those that the user left alone must not override the preset.
     host.SetAllToDefaults();
     EXPECT_EQ(host.Update(0.0, in), sepia);
     session->SetValue(2, {.number = 0.75f});  // Saturation
@@ -149,7 +149,7 @@ TEST(Frei0rInstance, LetsValuesOverrideThePresetAlsoByTheirDefaults) {
 
     Host sparing(effect, 40, 30);
     sparing.Text("preset", "sepia");
-    sparing.Number("Saturation", 0.5);  // the default, and not what the preset has
+    sparing.Number("Saturation", 0.5);  // the default, not the preset's value
     session->SetValue(2, {.number = 0.5f});
     EXPECT_EQ(sparing.Update(0.0, in), Expected(*session, 40, 30, in, 0.0));
 }
@@ -251,12 +251,12 @@ TEST(Frei0rClock, FindsTheNearestFrame) {
     } rows[] = {
         {TimeUnit::kSeconds, "25", 0, 40.0, 40.0},                         // frame 1000
         {TimeUnit::kMilliseconds, "25", 0, 40.0, 1.0 / 25},                // frame 1
-        {TimeUnit::kSeconds, "25", 100, 0.04, 101.0 / 25},                 // a part from frame 100 on
+        {TimeUnit::kSeconds, "25", 100, 0.04, 101.0 / 25},                 // a segment starting at frame 100
         {TimeUnit::kMilliseconds, "30000/1001", 0, 67.0, 2002.0 / 30000},  // rounded to milliseconds
         {TimeUnit::kSeconds, "29.97", 0, 0.0333, 1001.0 / 30000},
-        {TimeUnit::kMilliseconds, "24 s", 0, 1.0, 1.0},  // told by the user
+        {TimeUnit::kMilliseconds, "24 s", 0, 1.0, 1.0},  // set by the user
         {TimeUnit::kSeconds, "24ms", 0, 1000.0, 1.0},
-        {TimeUnit::kMilliseconds, "", 0, 1500.0, 1.5},  // no rate: as the host has it
+        {TimeUnit::kMilliseconds, "", 0, 1500.0, 1.5},  // no rate: the host's time is used
         {TimeUnit::kSeconds, "nonsense", 30, 1.01, 2.01},
         {TimeUnit::kSeconds, "25", 3, std::numeric_limits<double>::quiet_NaN(), 3.0 / 25},
     };
@@ -277,9 +277,9 @@ TEST(Frei0rClock, LearnsAnUnknownHostsUnitFromItsFirstStep) {
 
     FrameClock seconds(TimeUnit::kUnknown);
     seconds.SetFrameRate("25");
-    EXPECT_DOUBLE_EQ(seconds.ClipSeconds(40.0), 40.0);  // a render begun in the middle
+    EXPECT_DOUBLE_EQ(seconds.ClipSeconds(40.0), 40.0);  // a render that starts in the middle
     EXPECT_DOUBLE_EQ(seconds.ClipSeconds(40.04), 40.04);
-    EXPECT_DOUBLE_EQ(seconds.ClipSeconds(80.0), 80.0);  // a jump, when the unit is known
+    EXPECT_DOUBLE_EQ(seconds.ClipSeconds(80.0), 80.0);  // a jump once the unit is known
 }
 
 }  // namespace

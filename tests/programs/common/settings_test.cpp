@@ -14,7 +14,7 @@ ParamInfo Slider(const char* name, float minimum, float maximum) {
     return {name, kKindSlider, minimum, maximum, {}, {}, false};
 }
 
-// Every kind, a shared name, and a group of the same name as a parameter.
+// Every kind, a shared name, and a group with the same name as a parameter.
 EffectInfo TestEffect() {
     return {"Test",
             {{"Grain", kKindGroup, 0, 0, {}, {}, false},
@@ -93,7 +93,7 @@ TEST(Descriptors, FullFieldsNeedNoTerminator) {
 }
 
 TEST(Digest, LeavesPaddingOut) {
-    // The MD5 of "abcdefghijklmnop", by any md5sum.
+    // The MD5 of "abcdefghijklmnop", according to md5sum.
     const std::uint8_t rows[] = "abcdefgh....ijklmnop";
     EXPECT_EQ(FrameDigest(rows, 2, 2, 12), "1d64dce239c4437b7736041db089e1b9");
 }

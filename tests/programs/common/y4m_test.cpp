@@ -22,7 +22,7 @@ TEST(Y4m, ReadsHeaders) {
     }
 }
 
-// A saturated colour's code values are tabled in every text on video.
+// The code values of a saturated colour, as tabulated in the video literature.
 TEST(Y4m, KnowsTheColourBars) {
     constexpr Y4mMatrix kBt601 = Y4mMatrix::kBt601, kBt709 = Y4mMatrix::kBt709;
     struct Row {
@@ -66,7 +66,7 @@ TEST(Y4m, UntouchedFramesReturnButForRounding) {
     for (const char* chroma : {"C420jpeg", "C422", "C444", "Cmono"}) {
         const Y4mFormat format = ParseY4mHeader(std::string("YUV4MPEG2 W7 H5 F25:1 ") + chroma);
         std::vector<std::uint8_t> planes(format.FrameBytes()), back(planes.size());
-        // Soft colours: all of them exist in RGB.
+        // Muted colours: all of them exist in RGB.
         for (std::size_t i = 0; i < planes.size(); ++i) {
             planes[i] = static_cast<std::uint8_t>(i < 35 ? 80 + i * 3 : 120 + i % 16);
         }

@@ -1,4 +1,4 @@
-// On Windows the faulty library is a module of its own, which loads the true one.
+// On Windows the faulty library is a separate module, which loads the real one.
 
 #include <windows.h>
 
@@ -6,7 +6,7 @@
 
 namespace {
 
-// The true library, which lies beside the program that loads this one.
+// The real library, next to the program that loads this one.
 template <typename Function>
 Function TrueExport(const char* name) {
     static const HMODULE module = LoadLibraryW(L"VMReelEffects.dll");

@@ -10,7 +10,7 @@
 namespace velmora::testing {
 namespace {
 
-// A face of the true object was handed out: gives this one's instead.
+// The real object returned one of its interfaces; replaces it by this object's.
 template <typename Interface>
 Status Replace(Interface* real, Interface* faulty, void** out) {
     real->Release();
@@ -61,7 +61,7 @@ void SpoilState() {
     if (FaultIs("turns-direction")) __asm__ __volatile__("std" : : : "memory");
 }
 
-// Byte `offset` of the memory below or behind the first stored row.
+// Byte `offset` of the memory before or after the first stored row.
 std::uint8_t& ByteAt(const FrameRecord& frame, std::ptrdiff_t offset) {
     return static_cast<std::uint8_t*>(frame.pixels)[offset];
 }

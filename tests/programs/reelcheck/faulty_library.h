@@ -1,11 +1,11 @@
-// The library with one fault of choice: what reelcheck must find. The fault is named in REELCHECK_FAULT.
+// The library with one chosen fault that reelcheck must find. REELCHECK_FAULT names the fault.
 #pragma once
 
 #include "api/host_api.h"
 
 namespace velmora::testing {
 
-// Wraps a library object, whose reference it takes.
+// Wraps a library object and takes over its reference.
 [[nodiscard]] IEffectLibrary* MakeFaulty(IEffectLibrary* library);
 [[nodiscard]] bool FaultIs(const char* name);
 

@@ -1,4 +1,4 @@
-// Natively the faulty library takes the place of the linked one.
+// Natively the faulty library is linked in place of the real one.
 
 #include "programs/reelcheck/library.h"
 #include "tests/programs/reelcheck/faulty_library.h"

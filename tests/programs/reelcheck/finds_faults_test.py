@@ -1,6 +1,6 @@
-"""reelcheck finds each fault of a faulty library, by the check that is there for it, and none in the true one.
+"""reelcheck finds each fault of a faulty library with the check meant for it, and no fault in the real library.
 
-REELCHECK is the command that runs the program, its words apart by ";".
+REELCHECK is the command that runs the program, its words separated by ";".
 """
 
 import os
@@ -11,7 +11,7 @@ from pathlib import Path
 COMMAND = os.environ["REELCHECK"].split(";")
 PAGE = Path(__file__).resolve().parents[3] / "docs" / "reelcheck.md"
 
-# fault -> the check that must find it, and what its line says
+# fault -> the check that must find it, and what its line contains
 FAULTS = {
     "lets-go-early": ("exports", "may be unloaded while"),
     "counts-wrongly": ("references", "count"),

@@ -1,4 +1,4 @@
-"""A clip rendered in four parts, through GNU parallel and through a real scheduler, is the clip rendered whole."""
+"""A clip rendered in four parts, with GNU parallel and with a real scheduler, equals the clip rendered whole."""
 
 import os
 import shutil
@@ -45,7 +45,7 @@ class FarmTest(unittest.TestCase):
         self.assertEqual(frame_digests(joined), frame_digests(whole))
         self.assertEqual(sound_digest(joined), sound_digest(whole))
         pairs = zip(frame_times(joined), frame_times(whole), strict=True)
-        # Matroska counts milliseconds.
+        # Matroska timestamps are in milliseconds.
         self.assertLess(max(abs(one - other) for one, other in pairs), 0.0015)
 
 
@@ -60,7 +60,7 @@ class Parts(FarmTest):
                 self.assertEqual(b"".join(done), wanted)
 
     def test_parts_begin_inside_groups_of_pictures(self):
-        # Pictures that lean on later ones, groups that lean on each other, containers with and without an index.
+        # Frames that depend on later ones, groups that depend on each other, containers with and without an index.
         source = self.root / "source.mp4"
         ffmpeg("-f", "lavfi", "-i", "testsrc2=size=160x90:rate=25:duration=8", "-c:v", "libx264", "-x264-params",
                "keyint=9:min-keyint=3:bframes=4:open-gop=1:b-pyramid=normal", source)
@@ -143,7 +143,7 @@ def free_port():
 
 
 class Cluster:
-    """A Slurm cluster of this one machine, with all that it keeps in a folder of its own."""
+    """A Slurm cluster of this one machine, with all its files in its own folder."""
 
     def __init__(self, root):
         self.root, self.programs = root, []
@@ -231,7 +231,7 @@ class Scheduler(FarmTest):
         self.assertEqual((done.returncode, done.stderr), (0, b""), self.cluster.logs())
         self.assert_whole(joined)
         self.assertEqual(os.listdir(self.root), ["a film.mkv"])
-        # A wrong wish is told before anything is submitted, a part that fails when it has failed.
+        # An invalid request is reported before anything is submitted; a failing part when it has failed.
         done = self.farm(4, clips.small, self.root / "b.mkv", "-e", "Film Foo")
         self.assertEqual((done.returncode, done.stdout), (2, b""))
         self.assertIn(b"Film Foo", done.stderr)

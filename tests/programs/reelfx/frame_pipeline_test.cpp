@@ -23,7 +23,7 @@ FramePipeline::Source Counting(std::int64_t count) {
     };
 }
 
-// The earlier of two frames takes longer.
+// The first of two frames takes longer.
 void WorkUnevenly(PipelineItem& item) {
     std::this_thread::sleep_for(std::chrono::milliseconds(item.index % 2 == 0 ? 3 : 0));
     item.digest = std::to_string(item.index);
@@ -60,7 +60,7 @@ TEST(FramePipeline, ReadsOnlyALittleAhead) {
     {
         FramePipeline pipeline(endless, {WorkUnevenly});
         for (int i = 0; i < 10; ++i) EXPECT_TRUE(pipeline.Next());
-    }  // and an endless source can be left
+    }  // leaving an endless source must not hang
     EXPECT_LT(read, 20);
 }
 
@@ -84,14 +84,15 @@ TEST(Progress, TellsShareSpeedAndTimeLeft) {
     EXPECT_EQ(ProgressText(10, 40, 2.0), "frame 10/40  25%  5.0 fps  0:06 left");
     EXPECT_EQ(ProgressText(1, 7201, 1.0), "frame 1/7201  0%  1.0 fps  2:00:00 left");
     EXPECT_EQ(ProgressText(10, 0, 2.0), "frame 10  5.0 fps");
-    EXPECT_EQ(ProgressText(45, 40, 9.0), "frame 45/45  100%  5.0 fps  0:00 left");  // the count was a guess
+    EXPECT_EQ(ProgressText(45, 40, 9.0),
+              "frame 45/45  100%  5.0 fps  0:00 left");  // the count was an estimate
 }
 
 TEST(Progress, ProgramsGetALineOfJson) {
     EXPECT_EQ(ProgressJson(10, 40, 2.0, false),
               R"({"frame":10,"frames":40,"seconds":2.000,"fps":5.0,"progress":"continue"})");
     EXPECT_EQ(ProgressJson(45, 0, 9.0, true), R"({"frame":45,"seconds":9.000,"fps":5.0,"progress":"end"})");
-    // At the end the count is known.
+    // Once the source has ended, the count is known.
     EXPECT_EQ(ProgressJson(38, 40, 0.0, true),
               R"({"frame":38,"frames":38,"seconds":0.000,"fps":0.0,"progress":"end"})");
 }

@@ -7,7 +7,7 @@
 namespace velmora::hosts {
 namespace {
 
-// Damage as the effects do it, on one channel: `share` of the way to `target`.
+// Damage as the effects apply it, on one channel: `share` of the way to `target`.
 double Damaged(double value, double share, double target) {
     return value + (target - value) * share;
 }
@@ -25,7 +25,7 @@ TEST(Matte, HoldsWhatWasDoneToTheGround) {
             ReadMatte(picture);
             const double alpha = pixel[3] / 255.0;
             for (const double under : {0.0, 60.0, 128.0, 200.0, 255.0}) {
-                // A rounding on the ground, one of alpha and one of the grey.
+                // Three roundings: of the background, of alpha and of the grey.
                 EXPECT_NEAR(Damaged(under, alpha, pixel[0]), Damaged(under, share, target), 1.6)
                     << target << " " << percent << " " << under;
             }

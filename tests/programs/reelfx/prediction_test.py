@@ -1,8 +1,8 @@
 #!/usr/bin/env python3
-"""Frames of all effects without diffusion and scratches, told byte for byte by a second telling of the rules.
+"""Frames of all effects without diffusion and scratches, predicted byte for byte by a second implementation.
 
-Written apart from the renderer, pixel by pixel and with exact arithmetic: what the two agree on is the rules, not the
-code. Narrowing to single precision is done through packed bytes.
+Written independently of the renderer, pixel by pixel and with exact arithmetic: the two share the rules, not the code.
+Values are rounded to single precision through packed bytes.
 """
 
 import math
@@ -47,10 +47,10 @@ class Generator:
 
 
 class Settings:
-    """What the renderer reads from the controls of an effect that hold `shown` values."""
+    """What the renderer reads from an effect's controls that hold the values `shown`."""
 
     def __init__(self, effect, shown):
-        if effect == "Film Express":  # one jitter for both directions, a flicker rate of its own
+        if effect == "Film Express":  # one jitter for both directions, and its own flicker rate
             jitter = shown.get("Jitter", 0)
             shown = {"Y Jitter": jitter, "X Jitter": jitter, "Flicker Rate": 20, **shown}
 
@@ -58,7 +58,7 @@ class Settings:
             slider = single(100.0 * single(shown.get(name, 0) / 100))
             return single(slider / 100)
 
-        def centred(name):  # normalised: half to one, as the slider holds the host's value times its maximum
+        def centred(name):  # normalised: half to one, since the slider holds the host's value times its maximum
             slider = single(100.0 * single((shown.get(name, 0) + 100) / 200))
             return single((slider + 100) / 200)
 
@@ -231,7 +231,7 @@ CASES = [(name, "Film Pro", shown) for name, shown in PRO_CASES.items()] + [
 
 
 def control(key, value):
-    """A control's name and value as the command line takes them."""
+    """A control's name and value as written on the command line."""
     if key in ("Colour", "Border"):
         value = "#%02X%02X%02X" % value
     elif key == "Pattern":

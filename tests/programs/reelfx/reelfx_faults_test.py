@@ -1,9 +1,9 @@
 #!/usr/bin/env python3
-"""reelfx when disk, memory, input and patience run out: never a broken file under the final name, one line, its code.
+"""reelfx when disk, memory, input or patience runs out: no broken file under the final name, one line, the exit code.
 
     reelfx_faults_test.py [--rounds N] [--seed N]
 
-The rounds are those of the signals at random moments. Environment: REELFX.
+The rounds send signals at random moments. Environment: REELFX.
 """
 
 import argparse
@@ -47,7 +47,7 @@ class Commands(unittest.TestCase):
             (self.out / name).write_text("older")
 
     def rows(self, folder=None, name="new", extra=()):
-        """The commands that write files: (final name or the first one of a pattern, arguments)."""
+        """The commands that write files: (final name or first name of a pattern, arguments)."""
         folder = folder or self.out
         table = [(".mp4", "render", ()), (".mkv", "render", ("--codec", "ffv1")), ("-%03d.png", "render", ()),
                  (".png", "frame", ()), (".png", "sheet", ("--width", 64)), (".fxp", "preset", ())]
@@ -58,7 +58,7 @@ class Commands(unittest.TestCase):
             yield target, (*args, *extra)
 
     def check_failed(self, done, codes, *words):
-        """One line of ours; the codec's library may add its own when it has no memory."""
+        """One line of ours; the codec's library may add its own when it is out of memory."""
         text = done.stderr.decode()
         ours = [line for line in text.splitlines() if not line.startswith("x264 [")]
         self.assertIn(done.returncode, codes, text)
@@ -77,7 +77,7 @@ class Commands(unittest.TestCase):
 
 class Places(Commands):
     def test_file_size_limit(self):
-        # Smaller than any result, and than the older files it must not touch.
+        # Smaller than any result, and than the older files, which must stay untouched.
         def limit():
             resource.setrlimit(resource.RLIMIT_FSIZE, (600, 600))
 
@@ -92,7 +92,7 @@ class Places(Commands):
         self.check_older()
 
     def test_full_disk(self):
-        # A small file system of this test's own, in a mount name space that ends with it.
+        # A small file system in a mount namespace of the test's own, which ends with it.
         disk = self.out / "disk"
         disk.mkdir()
         script = ('mount -t tmpfs -o size=64k none "$1" && cd "$1" && shift && head -c 57344 /dev/zero > full; '
@@ -101,7 +101,7 @@ class Places(Commands):
             self.skipTest("no right to mount")
         for target, args in self.rows(folder=disk):
             if args[0] == "preset":
-                continue  # fits into the block that is left
+                continue  # fits into the remaining block
             with self.subTest(args=args):
                 done = run("unshare", "--mount", "sh", "-c", script, "sh", disk, REELFX, *args)
                 self.check_failed(done, [4], "cannot be written")
@@ -122,7 +122,7 @@ class Places(Commands):
             run(REELFX, "--version", **NOBODY)
             places.append((locked, NOBODY))
         except PermissionError:
-            pass  # for root every folder is open, and nobody else may run what lies here
+            pass  # root can open every folder, and no other user can run the programs here
         for folder, who in places:
             for _, args in self.rows(folder=folder):
                 with self.subTest(args=args):
@@ -153,7 +153,7 @@ class Places(Commands):
 
 class Input(Commands):
     def test_cut_off(self):
-        """The frames that are there are rendered, and a file that stood there before stays."""
+        """The readable frames are rendered, and an existing file stays."""
         front, raw = self.out / "front.mp4", self.out / "small.bgra"
         ffmpeg("-i", clips.small, "-c", "copy", "-movflags", "+faststart", front)
         ffmpeg("-i", clips.small, "-pix_fmt", "bgra", "-f", "rawvideo", raw)
@@ -176,14 +176,14 @@ class Input(Commands):
         for source in ("-", self.out / "cut.y4m"):
             done = reelfx("frame", source, self.out / "x.png", *DAMAGE, "--frame", 40, input=y4m[:len(y4m) // 2])
             self.check_failed(done, [3], "inside a frame")
-        # This container tells its length, and not where its last frame lies.
+        # This container stores its length, but not where its last frame is.
         film = self.out / "film.mkv"
         ffmpeg("-i", clips.small, "-c", "copy", film)
         (self.out / "cut.mkv").write_bytes(film.read_bytes()[:film.stat().st_size * 4 // 10])
         self.check_failed(reelfx("render", self.out / "cut.mkv", self.out / "x.mp4", *DAMAGE), [0], "s early")
 
     def while_it_runs(self, args, action):
-        """Runs a render and lets `action` happen when it has begun to write, while it stands still."""
+        """Runs a render and lets `action` happen once it has begun to write, while it is paused."""
         program = subprocess.Popen([REELFX, "render", *map(str, args), "-j", "1"], stderr=subprocess.PIPE)
         while program.poll() is None and not any(name.startswith(".reelfx-") for name in os.listdir(self.out)):
             time.sleep(0.001)
@@ -199,7 +199,7 @@ class Input(Commands):
         reelfx("render", clips.small, whole, *lossless)
         source.write_bytes(clips.small.read_bytes())
         done = self.while_it_runs((source, out, *lossless), source.unlink)
-        self.assertEqual((done.returncode, done.stderr), (0, b""))  # what is open stays open
+        self.assertEqual((done.returncode, done.stderr), (0, b""))  # files that are open stay open
         self.assertEqual(frame_digests(out), frame_digests(whole))
         pictures = clips.root / "pictures"
         pictures.mkdir()
@@ -213,7 +213,7 @@ class Input(Commands):
 
 class Signals(Commands):
     def test_waiting_for_input_ends(self):
-        """What is finished stays and can be played, but does not replace an older file."""
+        """The finished part stays and can be played, but does not replace an older file."""
         for name, data, left in (("none.mp4", b"", []), ("new.mp4", y4m, ["new.mp4"]), ("older.mp4", y4m, ["new.mp4"])):
             with self.subTest(name=name, frames=bool(data)):
                 program = subprocess.Popen([REELFX, "render", "-", str(self.out / name), *DAMAGE, "--overwrite"],
@@ -234,7 +234,7 @@ class Signals(Commands):
                     self.assertIn(f"first {frames} frames".encode(), text)
 
     def references(self):
-        """For each command: how long it takes, and what its files are when whole."""
+        """For each command: how long it takes, and its files when complete."""
         for target, args in list(self.rows(name="whole")):
             begin = time.monotonic()
             self.assertEqual(reelfx(*args).returncode, 0)
@@ -260,7 +260,7 @@ class Signals(Commands):
                 self.assertIn(f"first {len(frame_digests(target))} frames", text, about)
                 files = {}
         else:
-            # A signal may come before the program has begun to watch for it.
+            # A signal may arrive before the program handles it.
             self.assertIn(code, (0, -sent), about)
             self.assertEqual(lines, 0, about)
         for name, data in files.items():
@@ -286,7 +286,7 @@ class Signals(Commands):
             for name in self.left_over():
                 if not name.startswith("."):
                     (self.out / name).unlink()
-        # Whatever the killed ones left goes with the next command.
+        # The next command removes whatever the killed ones left behind.
         self.assertEqual(reelfx("preset", "save", self.out / "next.fxp", *DAMAGE).returncode, 0)
         self.assertEqual(self.left_over(), ["next.fxp"])
         print(f"figure: reelfx under faults = {OPTIONS.rounds} signals at random moments, {left} folders left and "

@@ -1,4 +1,4 @@
-"""The man page and the shells' completion of reelfx, judged by the programs that read them."""
+"""The man page and the shell completion of reelfx, checked by the programs that read them."""
 
 import os
 import pty
@@ -14,7 +14,7 @@ from pathlib import Path
 SHARE = Path(os.environ["REELFX_SHARE"])
 MAN_PAGE = SHARE / "man/man1/reelfx.1"
 
-# What is typed, where "\t" is the Tab key, and the arguments that reelfx then gets.
+# What is typed, where "\t" is the Tab key, and the arguments that reelfx then receives.
 TYPED = (
     ("ren\tin.mp4 out.mp4 --overw\t-e Film\\ C\t--preset Tr\t",
      "render in.mp4 out.mp4 --overwrite -e 'Film Camera' --preset 'Train Ride'"),
@@ -27,7 +27,7 @@ TYPED = (
 
 
 class Terminal:
-    """A shell at a terminal of its own, in which reelfx is a function that shows its arguments."""
+    """A shell on its own terminal, in which reelfx is a function that shows its arguments."""
 
     def __init__(self, command, start, folder):
         environment = {"PATH": os.environ["PATH"], "TERM": "dumb", "HOME": str(folder), "LC_ALL": "C.UTF-8"}
@@ -55,7 +55,7 @@ class Terminal:
         for part in re.split("(\t)", typed):
             self.send(part)
             if part == "\t":
-                time.sleep(0.7)  # as a person does; more typing ends a completion
+                time.sleep(0.7)  # like a user; further typing would cancel a completion
         self.send("\n")
         return re.search(r"<<(.*)>>", self.read_to(r"<<.*>>")).group(1)
 

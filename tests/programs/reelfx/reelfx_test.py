@@ -1,4 +1,4 @@
-"""The command-line host with real footage, judged by the media tools' own programs."""
+"""The command-line host with real footage, checked with the media tools' own programs."""
 
 import json
 import math
@@ -183,21 +183,21 @@ class SameBytes(ReelfxTest):
 
 
 class Matte(ReelfxTest):
-    """The damage alone, laid over the picture by a real compositor, is the damaged picture."""
+    """The damage matte, composited over the picture by a real compositor, gives the damaged picture."""
 
     DAMAGE = ("-e", "Film Damage", "-p", "Aged")
-    # Four roundings apart wherever there is damage: the wanted picture's, the ground's, alpha's, the composition's. Each
-    # adds a twelfth to the mean square.
+    # Up to four roundings apart wherever there is damage: of the wanted picture, the background, alpha and the
+    # composition. Each adds a twelfth to the mean square.
     ROUNDED = 10 * math.log10(255**2 / (4 / 12))  # 52.9 dB
 
     @classmethod
     def setUpClass(cls):
-        # RGB on both sides, so that nothing but the matte's own rounding is measured.
+        # RGB on both sides, so that only the matte's own rounding is measured.
         cls.source = clips.root / "rgb.mkv"
         ffmpeg("-i", clips.small, "-fps_mode", "passthrough", "-an", "-pix_fmt", "bgr0", "-c:v", "ffv1", cls.source)
 
     def laid_over(self, under, matte, wanted):
-        """PSNR of the composition against the damaged picture."""
+        """PSNR of the composition compared with the damaged picture."""
         graph = ("[0:v]settb=1/25,setpts=N,format=gbrp[u];[1:v]settb=1/25,setpts=N,format=gbrap[m];"
                  "[u][m]overlay=format=gbrp,format=gbrp[c];[2:v]settb=1/25,setpts=N,format=gbrp[w];[c][w]psnr")
         done = run("ffmpeg", "-nostdin", "-i", under, "-i", matte, "-i", wanted, "-lavfi", graph, "-f", "null", "-")
@@ -206,10 +206,10 @@ class Matte(ReelfxTest):
     def test_laid_over_it_is_the_damaged_picture(self):
         lossless = ("--codec", "ffv1", "--pix-fmt", "bgr0", "--seed", 3)
         pro = ("-e", "Film Pro", "-p", "Worn Color Print")
-        # Whatever else the effect does lies under the matte.
+        # Everything else that the effect does lies under the matte.
         clean = (*pro, "-s", "Wear=0", "-s", "Spots=0", "-s", "Density=0")
-        # Sixteen scratches on so small a picture cross each other and the brightest and darkest pixels, which they
-        # leave alone and a matte does not.
+        # On such a small picture, sixteen scratches cross each other and the brightest and darkest pixels. The
+        # scratches leave those pixels alone, but a matte does not.
         rows = (("aged", self.DAMAGE, self.source, self.ROUNDED),
                 ("shredded", ("-e", "Film Damage", "-p", "Shredded"), self.source, 52),
                 ("pro", pro, self.render(self.source, "clean.mkv", *clean, *lossless), self.ROUNDED))
@@ -239,7 +239,7 @@ class Matte(ReelfxTest):
         lying = self.render(turned, "m.bgra", "-e", "Film Damage", "-s", "Density=100", "-s", "Depth=100", "-s",
                             "Thick=on", "--matte", "--raw-bgra", "--frames", "4:5").read_bytes()
         alpha = [lying[y * 1280 + 3:(y + 1) * 1280:4] for y in range(180)]
-        # Scratches run down the upright picture: along the rows of the lying one.
+        # Scratches run down the upright picture, which is along the rows of the rotated one.
         rows = max(sum(value > 60 for value in row) for row in alpha)
         columns = max(sum(row[x] > 60 for row in alpha) for x in range(320))
         self.assertGreater(rows, 150)
@@ -277,7 +277,7 @@ class Keeping(ReelfxTest):
         self.assertEqual(frame_digests(out), frame_digests(clips.small))
 
     def test_the_road_through_bgra_and_back_is_true(self):
-        # Another pixel format makes every frame go both ways. Only black below black is lost.
+        # With another pixel format every frame is converted both ways. Only values below black are lost.
         source = self.out / "source.mkv"
         ffmpeg("-i", clips.small, "-fps_mode", "passthrough", "-pix_fmt", "yuv444p", "-c:v", "ffv1", source)
         for matrix in ("bt709", "smpte170m", "bt2020nc"):
@@ -294,7 +294,7 @@ class Keeping(ReelfxTest):
         out = self.render(turned, "out.mp4", *TRAIN)
         wanted = ("-select_streams", "v", "-show_entries", "stream_side_data=rotation")
         self.assertEqual(probe(out, *wanted), probe(turned, *wanted))
-        # A vertical shake of the upright picture leaves a band at a side of the lying one.
+        # A vertical shake of the upright picture leaves a band at the side of the rotated one.
         raw = self.render(turned, "raw.bgra", *CAMERA, "--set", "Y Jitter=10", "--set", "Border=#00ff00",
                           "--raw-bgra", "--frames", "0:20").read_bytes()
         size = 320 * 180 * 4
@@ -384,7 +384,7 @@ class Kinds(ReelfxTest):
 
 
 class Refusing(ReelfxTest):
-    """Each wrong wish ends in its exit code and one line, and leaves nothing behind."""
+    """Each invalid request ends with its exit code and one line, and leaves nothing behind."""
 
     def check(self, code, words, *args, **options):
         done = reelfx(*args, **options)

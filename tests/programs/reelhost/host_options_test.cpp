@@ -1,4 +1,4 @@
-// What reelhost takes from its command line and its input: the parts that need no library.
+// How reelhost reads its command line and its input: the parts that need no library.
 
 #include <gtest/gtest.h>
 
@@ -36,7 +36,7 @@ TEST(ReelhostOptions, AreReadOrRefused) {
     for (const auto& words : wrong) EXPECT_THROW(Read(words), UsageError) << words.size();
 }
 
-// The frames that a stream gives before it ends or is refused.
+// The frames that a stream yields before it ends or is rejected.
 struct Outcome {
     int frames = 0;
     std::string refusal;

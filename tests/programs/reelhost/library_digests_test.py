@@ -1,6 +1,6 @@
-"""The DLL under Wine and the native core make the same bytes: every preset of every effect, 20 frames each.
+"""The DLL under Wine and the native core produce the same bytes: every preset of every effect, 20 frames each.
 
-Environment: REELHOST the Windows host, beside the DLL; WINE32 the program that runs it; REELFX the native host.
+Environment: REELHOST is the Windows host, next to the DLL; WINE32 the program that runs it; REELFX the native host.
 """
 
 import os

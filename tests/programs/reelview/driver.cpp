@@ -138,7 +138,7 @@ std::wstring Program::CloseDialogs() const {
     return texts;
 }
 
-// The name's field is the dialog's only one that can be edited.
+// The name field is the dialog's only editable one.
 bool Program::ChooseFile(int command, const std::wstring& file) const {
     Command(command);
     const HWND dialog = Dialog();

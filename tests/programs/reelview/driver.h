@@ -1,4 +1,4 @@
-// reelview.exe in a process of its own, used through its windows as a person does.
+// Runs reelview.exe in a separate process and drives it through its windows like a user.
 #pragma once
 
 #include <windows.h>
@@ -9,11 +9,11 @@
 
 namespace velmora::reelview::test {
 
-// True when the condition holds within a generous time.
+// True if the condition becomes true within a generous time limit.
 bool WaitFor(const std::function<bool()>& condition, double seconds = 20.0);
 
 std::wstring TextOf(HWND window);
-// The folder that the test's files are in, and one of them.
+// The folder with the test's files, and one of the files.
 std::wstring Media(const std::wstring& name = L"");
 
 class Program {
@@ -27,18 +27,18 @@ class Program {
     [[nodiscard]] HWND Window() const { return m_window; }
     [[nodiscard]] HANDLE Process() const { return m_process.hProcess; }
     [[nodiscard]] bool Lives() const { return WaitForSingleObject(m_process.hProcess, 0) == WAIT_TIMEOUT; }
-    // Its window answers.
+    // Whether its window responds.
     [[nodiscard]] bool Answers() const;
     [[nodiscard]] HWND Control(int id) const;
     [[nodiscard]] std::wstring Status() const;
-    // A dialog or message box that it shows; null after the time.
+    // A dialog or message box that the program shows; null after the time limit.
     [[nodiscard]] HWND Dialog(double seconds = 10.0) const;
     void Command(int command) const { PostMessageW(m_window, WM_COMMAND, static_cast<WPARAM>(command), 0); }
-    // Presses the default button of each dialog until there is none; their texts.
+    // Presses the default button of each dialog until none is left, and returns their texts.
     std::wstring CloseDialogs() const;
-    // Chooses a file in the dialog that a command opens.
+    // Selects a file in the dialog that a command opens.
     bool ChooseFile(int command, const std::wstring& file) const;
-    // Closes the window; the exit code, or 999 when it does not end.
+    // Closes the window and returns the exit code, or 999 when the program does not end.
     DWORD Close();
 
   private:
@@ -46,7 +46,7 @@ class Program {
     HWND m_window = nullptr;
 };
 
-// Mouse and keys as messages to a window; places in its pixels.
+// Mouse and keyboard messages to a window; positions in its pixels.
 void Press(HWND window, int x, int y);
 void Drag(HWND window, const std::vector<POINT>& way);
 void Key(HWND window, WPARAM key);

@@ -1,4 +1,4 @@
-// Films and pictures in files, and files that appear only when they are whole.
+// Films and pictures in files, and files that get their name only when they are complete.
 
 #include <gtest/gtest.h>
 

@@ -1,5 +1,5 @@
-// Random use: mouse, keys, commands and files of all kinds, sound and broken. MONKEY_SECONDS says how long (5 without it),
-// MONKEY_SEED which course.
+// Random use: mouse, keys, commands and all kinds of files, valid and broken. MONKEY_SECONDS sets the duration
+// (default 5), MONKEY_SEED the sequence.
 
 #include <windows.h>
 #include <psapi.h>
@@ -95,7 +95,7 @@ class Monkey {
         return windows;
     }
 
-    // Everything but the end, and help, which is another program.
+    // All commands but Exit, and Help, which opens another program.
     void Order() {
         if (Roll(3) == 0) {
             SendMessageW(m_program.Control(kControlEffect), CB_SETCURSEL, static_cast<WPARAM>(Roll(5)), 0);
@@ -106,7 +106,7 @@ class Monkey {
         if (command != kCommandExit) m_program.Command(command);
     }
 
-    // The memory of a drop is the receiver's to free.
+    // The receiver frees the memory of a drop.
     void Drop() {
         static const wchar_t* const kFiles[] = {L"small.y4m",   L"picture.png", L"cut.png",    L"empty.png",
                                                 L"plain.avi",   L"cut.avi",     L"text.mp4",   L"huge.y4m",

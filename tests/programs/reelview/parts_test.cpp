@@ -1,4 +1,4 @@
-// What needs no window and no file: panels, knobs, values, settings, time and place of the picture.
+// Parts that need no window and no file: panels, knobs, values, settings, time and the picture's position.
 
 #include <gtest/gtest.h>
 
@@ -232,7 +232,7 @@ TEST(Worker, NewerPreviewsReplaceWaitingOnes) {
     EXPECT_EQ(done, (std::vector<int>{1, 2, 3, 9}));
 }
 
-// Every text in every language, and menu letters that differ within their menu.
+// Every text exists in every language, and menu letters are unique within their menu.
 TEST(Texts, AreInTheLanguageFile) {
     const auto read = [](const char* name) {
         std::ifstream file(std::string(VELMORA_SOURCE) + name, std::ios::binary);

@@ -1,5 +1,5 @@
-// The real library behind a thin one that writes down what the host gives it. For each frame REELVIEW_RECORD becomes a
-// file of the effect's name and, line by line, the bits of each parameter's value. REELVIEW_FAULT makes it fail.
+// Wraps the real library and records what the host passes to it. For each frame it writes the file REELVIEW_RECORD
+// with the effect's name and, line by line, the bits of each parameter's value. REELVIEW_FAULT makes it fail.
 
 #include <windows.h>
 
@@ -19,7 +19,7 @@ bool FaultIs(const char* name) {
 }
 
 void Crash() {
-    // Of the system's own half; page 0 is there under Wine.
+    // An address in the system's half of memory; page 0 is mapped under Wine.
     int* volatile nowhere = reinterpret_cast<int*>(std::uintptr_t{0xFFFFFF00u});
     *nowhere = 1;
 }
@@ -38,8 +38,9 @@ void Record(IVideoEffect& effect, IVideoHost& host) {
         std::fprintf(file, "%08X\n", static_cast<unsigned>(cell.value.bits));
     }
     std::fclose(file);
-    // The test may be reading the one before.
-    for (int i = 0; i < 500 && !MoveFileExW(unfinished.c_str(), name, MOVEFILE_REPLACE_EXISTING); ++i) Sleep(2);
+    // The test may be reading the previous record.
+    for (int i = 0; i < 500 && !MoveFileExW(unfinished.c_str(), name, MOVEFILE_REPLACE_EXISTING); ++i)
+        Sleep(2);
 }
 
 class RecordingEffect final : public IVideoEffect {
@@ -66,7 +67,7 @@ class RecordingEffect final : public IVideoEffect {
         if (FaultIs("crashes")) Crash();
         if (FaultIs("refuses")) return false;
         if (FaultIs("hangs")) Sleep(INFINITE);
-        // Small pictures of presets have values of their own.
+        // Thumbnails of presets have values of their own, so they are not recorded.
         if (source->width > 200) Record(*m_effect, *host);
         return m_effect->Process(host, source, argument, destination, timing);
     }
@@ -113,7 +114,7 @@ class RecordingLibrary final : public IEffectLibrary {
 
 extern "C" velmora::IEffectLibrary* VM_CALL GetEffectsLibrary() {
     if (velmora::FaultIs("crashes-at-once")) velmora::Crash();
-    // The real one lies beside the program.
+    // The real library is next to the program.
     static const HMODULE module = LoadLibraryA("VMReelEffects.dll");
     void* const entry = reinterpret_cast<void*>(GetProcAddress(module, "GetEffectsLibrary"));
     return new velmora::RecordingLibrary(reinterpret_cast<velmora::GetEffectsLibraryFunction>(entry)());

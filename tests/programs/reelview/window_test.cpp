@@ -1,5 +1,5 @@
-// The program through its windows. REELVIEW names it, REELVIEW_MEDIA a folder of films and pictures, REELVIEW_RECORDER
-// the library that writes down what it is given.
+// The program driven through its windows. REELVIEW is the program, REELVIEW_MEDIA a folder of films and pictures,
+// REELVIEW_RECORDER the library that records its input.
 
 #include <windows.h>
 #include <commctrl.h>
@@ -45,7 +45,7 @@ std::wstring RecordFile() {
     return Media(L"record.txt");
 }
 
-// What the library was given last, after the effect's name.
+// The values last passed to the library, after the effect's name.
 struct Recorded {
     std::string effect;
     std::vector<std::uint32_t> values;
@@ -62,14 +62,13 @@ std::optional<Recorded> LastRecorded() {
 }
 
 bool Becomes(std::uint32_t parameter, const std::function<bool(ValueWord)>& isRight) {
-    return WaitFor(
-        [&] {
-            const auto recorded = LastRecorded();
-            if (!recorded || recorded->values.size() <= parameter) return false;
-            ValueWord word{};
-            word.bits = recorded->values[parameter];
-            return isRight(word);
-        });
+    return WaitFor([&] {
+        const auto recorded = LastRecorded();
+        if (!recorded || recorded->values.size() <= parameter) return false;
+        ValueWord word{};
+        word.bits = recorded->values[parameter];
+        return isRight(word);
+    });
 }
 
 bool BecomesNumber(std::uint32_t parameter, double value) {
@@ -210,7 +209,7 @@ TEST(ReelView, PresetsUndoAndFiles) {
     EXPECT_TRUE(tint(0.5));
     program.Command(kCommandRedo);
     EXPECT_TRUE(tint(0.745));
-    // The library takes names of the system's code page only.
+    // The library only accepts names in the system's code page.
     const std::filesystem::path folder = std::filesystem::temp_directory_path() / L"reelview-presets";
     std::filesystem::remove_all(folder);
     std::filesystem::create_directories(folder);
@@ -258,7 +257,7 @@ TEST(ReelView, OptionsChangeHowKnobsTurn) {
         ASSERT_TRUE(WaitFor([&] { return !IsWindow(dialog) && IsWindowEnabled(program.Window()) != FALSE; }));
         ASSERT_TRUE(program.Answers());
         ASSERT_TRUE(DoubleClickGivesZero(program, 5));
-        // Straight up through the centre: half the range at 200 pixels for all of it, or no turn at all.
+        // Straight up through the centre: half the range for a 200-pixel travel, or no turn at all.
         RECT area = {};
         GetClientRect(knob, &area);
         const LONG c = area.right / 2;
@@ -306,7 +305,7 @@ TEST(ReelView, DividerShowsMoreOfBefore) {
     RECT area = {};
     GetClientRect(picture, &area);
     const auto isWhite = [&](int percent) {
-        // Another process's window is seen on the screen only.
+        // Another process's window can only be read from the screen.
         POINT place = {area.right * percent / 100, area.bottom / 2 + 40};
         ClientToScreen(picture, &place);
         const HDC dc = GetDC(nullptr);
@@ -330,7 +329,7 @@ TEST(ReelView, SavesFramesAndClips) {
     }
     ASSERT_TRUE(program.ChooseFile(kCommandSaveFrame, Media(L"frame.png")));
     EXPECT_TRUE(WaitFor([&] { return program.Status().find(L"frame.png") != std::wstring::npos; }));
-    // The same pictures again would overwrite others.
+    // Saving the same pictures again would overwrite existing ones.
     ASSERT_TRUE(program.ChooseFile(kCommandSaveClip, Media(L"saved.png")));
     EXPECT_NE(program.CloseDialogs().find(L"already"), std::wstring::npos);
     EXPECT_EQ(program.Close(), 0u);
@@ -362,7 +361,7 @@ TEST(ReelView, GrowsWithTheResolution) {
     const HWND knob = program.Control(kFirstControl);
     RECT before = {}, after = {}, place = {0, 0, 1600, 1100};
     GetClientRect(knob, &before);
-    // The structure is the sender's: it has to lie in the program's own memory.
+    // The structure is read from the program's own memory, so it must be allocated there.
     void* const remote = VirtualAllocEx(program.Process(), nullptr, sizeof place, MEM_COMMIT, PAGE_READWRITE);
     WriteProcessMemory(program.Process(), remote, &place, sizeof place, nullptr);
     SendMessageW(program.Window(), WM_DPICHANGED, MAKEWPARAM(192, 192), reinterpret_cast<LPARAM>(remote));
@@ -397,7 +396,7 @@ TEST(ReelView, ScreenReadersSeeKnobs) {
 TEST(ReelView, SurvivesLibrariesThatFail) {
     struct Row {
         const wchar_t* fault;
-        const wchar_t* message;  // in a box or, when none comes, in the status line
+        const wchar_t* message;  // in a box or, if there is no box, in the status line
     };
     for (const Row& row : {Row{L"crashes", L"failed"}, Row{L"refuses", L"does not render"},
                            Row{L"describes-for-ever", L"Frame"}, Row{L"hangs", L"does not answer"},

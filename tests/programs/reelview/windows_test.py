@@ -1,7 +1,7 @@
-"""reelview through its windows, then what it saved: frames equal to those of reelhost.
+"""Drives reelview through its windows, then compares the frames that it saved with those of reelhost.
 
-Environment: WINE32 the script that runs Windows programs, WINDOW_TEST, REELVIEW, RECORDER and REELHOST what the build made.
-FILTER limits the window tests; MONKEY_SECONDS and MONKEY_SEED are the monkey's.
+Environment: WINE32 is the script that runs Windows programs; WINDOW_TEST, REELVIEW, RECORDER and REELHOST are build
+results. FILTER limits the window tests; MONKEY_SECONDS and MONKEY_SEED are for the monkey test.
 """
 
 import os
@@ -52,7 +52,7 @@ def pixels(path, *options):
 
 
 def check_saved(folder):
-    """Film Look's first preset draws no random numbers: both programs give the same bytes."""
+    """Film Look's first preset draws no random numbers, so both programs give the same bytes."""
     with open(folder / "small.y4m", "rb") as clip:
         rendered = subprocess.run([WINE32, REELHOST, "--effect", "Film Look", "--preset", "Black N White"], stdin=clip,
                                   stdout=subprocess.PIPE, stderr=subprocess.DEVNULL, check=True).stdout
@@ -67,7 +67,7 @@ def check_saved(folder):
 
 def main():
     filter_ = os.environ.get("FILTER", "*")
-    # A folder whose name has no form in 8 bits, as users have them.
+    # A folder whose name has no 8-bit form, as users have them.
     with tempfile.TemporaryDirectory(prefix="reelview-\u6620\u753b-") as name:
         folder = Path(name)
         make_media(folder)
