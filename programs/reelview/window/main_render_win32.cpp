@@ -11,7 +11,7 @@
 namespace velmora::reelview {
 namespace {
 
-constexpr double kSilence = 5.0;  // seconds without an answer before the user is told
+constexpr double kSilence = 5.0;  // seconds without an answer before a message appears
 
 std::wstring NameOf(const std::wstring& file) {
     return file.substr(file.find_last_of(L"\\/") + 1);
