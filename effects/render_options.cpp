@@ -26,7 +26,7 @@ std::string_view Variable(const char* name) noexcept {
 
 render::RenderOptions ReadRenderOptions() noexcept {
     render::RenderOptions options;
-    const std::string_view wanted = Variable("VELMORA_FORM");
+    const std::string_view wanted = Variable("VELMORA_SIMD");
     for (const NamedLevel& named : kLevels) {
         if (named.name == wanted) options.level = std::min(options.level, named.level);
     }

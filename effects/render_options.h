@@ -1,7 +1,7 @@
 // Chooses how pixels are processed. The fastest level is used unless the environment asks for another one, for tests or
 // to track down a fault. The output bytes are the same.
 //
-//   VELMORA_FORM=plain, sse2, ssse3, avx2 or avx512   no faster SIMD level of the pixel kernels than this
+//   VELMORA_SIMD=plain, sse2, ssse3, avx2 or avx512   no faster SIMD level of the pixel kernels than this
 #pragma once
 
 #include "render/renderer.h"

@@ -204,9 +204,9 @@ class Run {
         const std::uint8_t alpha = m_input.Byte();
         const auto convert = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
             // A processor takes the SIMD level named in the environment when it is created.
-            setenv("VELMORA_FORM", runner == Runner::kLibrary ? level : kLevels[0], 1);
+            setenv("VELMORA_SIMD", runner == Runner::kLibrary ? level : kLevels[0], 1);
             const auto processor = Reference<IFrameProcessor>::Adopt(m_library.CreateFrameProcessor());
-            unsetenv("VELMORA_FORM");
+            unsetenv("VELMORA_SIMD");
             return isToBgra ? processor->ConvertYcbcrToBgra(&source, &destination, alpha)
                             : processor->ConvertBgraToYcbcr(&source, &destination, alpha);
         };
