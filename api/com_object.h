@@ -14,25 +14,26 @@ namespace velmora {
 }
 
 // One identifier that an object answers to, with the interface that it stands for.
-struct Face {
+struct Interface {
     const Guid* iid;
     void* pointer;
 };
 
 // The first interface whose identifier matches; null when none does.
 template <std::size_t kCount>
-[[nodiscard]] void* FaceOf(const Face (&faces)[kCount], const Guid* iid) noexcept {
-    for (const Face& face : faces) {
-        if (SameId(iid, *face.iid)) return face.pointer;
+[[nodiscard]] void* InterfaceOf(const Interface (&interfaces)[kCount], const Guid* iid) noexcept {
+    for (const Interface& entry : interfaces) {
+        if (SameId(iid, *entry.iid)) return entry.pointer;
     }
     return nullptr;
 }
 
 // Stores that interface, or null. Does not count: the caller adds the reference when the result is kStatusOk.
 template <std::size_t kCount>
-[[nodiscard]] Status FindFace(const Face (&faces)[kCount], const Guid* iid, void** out) noexcept {
+[[nodiscard]] Status FindInterface(const Interface (&interfaces)[kCount], const Guid* iid,
+                                   void** out) noexcept {
     if (out == nullptr) return kStatusFailure;
-    *out = FaceOf(faces, iid);
+    *out = InterfaceOf(interfaces, iid);
     return *out != nullptr ? kStatusOk : kStatusNoInterface;
 }
 

@@ -28,9 +28,9 @@ class OwnValues final : public PlainHost {
 };
 
 // Serves the master settings to the renderer, as an effect object's host interface does.
-class MasterFace final : public PlainHost {
+class MasterHost final : public PlainHost {
   public:
-    MasterFace(const EffectTable& effect, std::span<const ValueWord> values) noexcept
+    MasterHost(const EffectTable& effect, std::span<const ValueWord> values) noexcept
         : m_effect(effect), m_own(values) {}
     bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override {
         return AnswerMaster(m_effect, &m_own, index, cell, kind);
@@ -79,8 +79,8 @@ void EffectSession::StartRandom(std::uint32_t state) noexcept {
 
 std::uint32_t EffectSession::DrawsPerFrame(std::int32_t width) noexcept {
     const FloatGuard guard;
-    MasterFace face(m_effect, m_values);
-    m_settings.ReadFromHost(face);
+    MasterHost host(m_effect, m_values);
+    m_settings.ReadFromHost(host);
     return render::DrawsPerFrame(ReadStageSettings(m_settings), width);
 }
 
@@ -88,10 +88,10 @@ bool EffectSession::Render(const FrameRecord& source, const FrameRecord& destina
                            double seconds) noexcept {
     const FloatGuard guard;
     if (m_isPinned) m_state.random.Pin(m_seed, render::TruncateTolerant(seconds * render::kFramesPerSecond));
-    MasterFace face(m_effect, m_values);
+    MasterHost host(m_effect, m_values);
     const TimingRecord timing = {0.0, 0.0, seconds};
     const std::uint32_t hostSeed = m_isPinned ? m_seed : 0;
-    return RenderFrame({&m_settings, &m_state, m_options, hostSeed}, face, &source, &destination, &timing);
+    return RenderFrame({&m_settings, &m_state, m_options, hostSeed}, host, &source, &destination, &timing);
 }
 
 }  // namespace velmora::effects

@@ -10,13 +10,14 @@ namespace velmora::effects {
 template <const EffectTable& kTable>
 Status VM_CALL FilmEffect<kTable>::QueryInterface(const Guid* iid, void** out) {
     IVideoEffect* const effect = this;
-    IVideoHost* const hostFace = this;
-    const Face faces[] = {{&kIidUnknown, effect}, {&kIidVideoEffect, effect}, {&kIidVideoHost, hostFace}};
+    IVideoHost* const asHost = this;
+    const Interface interfaces[] = {
+        {&kIidUnknown, effect}, {&kIidVideoEffect, effect}, {&kIidVideoHost, asHost}};
     // The host decides what `out` then holds.
-    if (m_host != nullptr && out != nullptr && FaceOf(faces, iid) == nullptr) {
+    if (m_host != nullptr && out != nullptr && InterfaceOf(interfaces, iid) == nullptr) {
         return m_host->QueryInterface(iid, out);
     }
-    const Status status = FindFace(faces, iid, out);
+    const Status status = FindInterface(interfaces, iid, out);
     if (status == kStatusOk) AddRef();
     return status;
 }

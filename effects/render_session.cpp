@@ -4,7 +4,7 @@
 #include "render/renderer.h"
 
 namespace velmora {
-bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameRecord* source,
+bool RenderFrame(const RenderSession& session, IVideoHost& host, const FrameRecord* source,
                  const FrameRecord* destination, const TimingRecord* timing) noexcept {
     if (source == nullptr || destination == nullptr || timing == nullptr) return false;
     render::FrameContext context(DescriptionOf(*source), DescriptionOf(*destination));
@@ -12,7 +12,7 @@ bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameReco
     // An invalid frame still counts as the last one.
     session.state->random.BeginFrame(context.FrameNumber());
     if (!context.IsValid(render::Slot::kSource) || !context.IsValid(render::Slot::kDestination)) return false;
-    session.settings->ReadFromHost(face);
+    session.settings->ReadFromHost(host);
     render::StageSettings settings = ReadStageSettings(*session.settings);
     settings.hostSeed = session.hostSeed;
     render::RenderStages(context, settings, *session.state, session.options);

@@ -23,10 +23,10 @@ struct RenderSession {
     return {frame.pixels, frame.width, frame.height, frame.rowStep, frame.xOrigin, frame.yOrigin};
 }
 
-// Renders one frame: builds the views, advances the random state, reads every exposed setting through `face` (an
+// Renders one frame: builds the views, advances the random state, reads every exposed setting through `host` (an
 // effect's host interface) and runs the stages. False when a frame or `timing` is missing or invalid; then nothing is
 // written and no parameter is read.
-bool RenderFrame(const RenderSession& session, IVideoHost& face, const FrameRecord* source,
+bool RenderFrame(const RenderSession& session, IVideoHost& host, const FrameRecord* source,
                  const FrameRecord* destination, const TimingRecord* timing) noexcept;
 
 }  // namespace velmora

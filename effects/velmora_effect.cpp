@@ -6,8 +6,8 @@
 namespace velmora {
 
 Status VM_CALL CRsVelmoraEffect::QueryInterface(const Guid* iid, void** out) {
-    const Face faces[] = {{&kIidUnknown, this}, {&kIidVideoEffect, this}};
-    const Status status = FindFace(faces, iid, out);
+    const Interface interfaces[] = {{&kIidUnknown, this}, {&kIidVideoEffect, this}};
+    const Status status = FindInterface(interfaces, iid, out);
     if (status == kStatusOk) AddRef();
     return status;
 }

@@ -45,7 +45,7 @@ class Parser final : public LangXMLParser {
     Parser& operator=(const Parser&) = delete;
 
     Status VM_CALL QueryInterface(const Guid* iid, void** out) override {
-        const Status status = FindFace({{&kIidUnknown, static_cast<LangXMLParser*>(this)}}, iid, out);
+        const Status status = FindInterface({{&kIidUnknown, static_cast<LangXMLParser*>(this)}}, iid, out);
         if (status == kStatusOk) m_references.Add();
         return status;
     }

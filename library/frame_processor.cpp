@@ -89,8 +89,8 @@ bool ConvertThrough(render::PackedImage& scratch, std::int32_t width, std::int32
 }  // namespace
 
 Status VM_CALL FrameProcessor::QueryInterface(const Guid* iid, void** out) {
-    const Face faces[] = {{&kIidUnknown, static_cast<IFrameProcessor*>(this)}};
-    const Status status = FindFace(faces, iid, out);
+    const Interface interfaces[] = {{&kIidUnknown, static_cast<IFrameProcessor*>(this)}};
+    const Status status = FindInterface(interfaces, iid, out);
     if (status == kStatusOk) AddRef();
     return status;
 }

@@ -82,11 +82,11 @@ bool CRsVelmoraLib::LoadLanguage(const char16_t* moduleName, const char16_t* fil
 // IMultiLingual is available only when there are texts.
 Status VM_CALL CRsVelmoraLib::QueryInterface(const Guid* iid, void** out) {
     IEffectLibrary* const library = this;
-    const Face faces[] = {{&kIidUnknown, library}, {&kIidEffectLibrary, library}};
-    Status status = FindFace(faces, iid, out);
+    const Interface interfaces[] = {{&kIidUnknown, library}, {&kIidEffectLibrary, library}};
+    Status status = FindInterface(interfaces, iid, out);
     if (status == kStatusNoInterface && m_hasLanguage) {
-        const Face textFaces[] = {{&kIidMultiLingual, static_cast<IMultiLingual*>(this)}};
-        status = FindFace(textFaces, iid, out);
+        const Interface texts[] = {{&kIidMultiLingual, static_cast<IMultiLingual*>(this)}};
+        status = FindInterface(texts, iid, out);
     }
     if (status == kStatusOk) AddRef();
     return status;

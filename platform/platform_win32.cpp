@@ -40,12 +40,12 @@ void* FindExport(ModuleHandle module, const char* name) noexcept {
 
 std::u16string ModuleFolder(ModuleHandle module) noexcept try {
     std::u16string path;
-    for (DWORD room = MAX_PATH; room <= kLongestPath; room *= 2) {
-        path.resize(room);
-        const DWORD length =
-            GetModuleFileNameW(static_cast<HMODULE>(module), reinterpret_cast<wchar_t*>(path.data()), room);
+    for (DWORD capacity = MAX_PATH; capacity <= kLongestPath; capacity *= 2) {
+        path.resize(capacity);
+        const DWORD length = GetModuleFileNameW(static_cast<HMODULE>(module),
+                                                reinterpret_cast<wchar_t*>(path.data()), capacity);
         if (length == 0) return {};
-        if (length == room) continue;  // truncated
+        if (length == capacity) continue;  // truncated
         path.resize(length);
         path.resize(path.find_last_of(u"/\\") + 1);
         return path;

@@ -105,8 +105,8 @@ IPresetSaver* CreatePresetSaver() noexcept {
 CPresetSaver::~CPresetSaver() = default;
 
 Status VM_CALL CPresetSaver::QueryInterface(const Guid* iid, void** out) {
-    auto* face = static_cast<IPresetSaver*>(this);
-    const Status status = FindFace({{&kIidUnknown, face}, {&kIidPresetSaver, face}}, iid, out);
+    auto* saver = static_cast<IPresetSaver*>(this);
+    const Status status = FindInterface({{&kIidUnknown, saver}, {&kIidPresetSaver, saver}}, iid, out);
     if (status == kStatusOk) m_references.Add();
     return status;
 }

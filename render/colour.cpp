@@ -55,9 +55,9 @@ float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double 
 ByteTable BrightnessTable(float offset) noexcept {
     ByteTable table;
     for (std::int32_t i = 0; i < 256; ++i) {
-        const double room = offset > 0.0f ? 255 - i : i;
+        const double distance = offset > 0.0f ? 255 - i : i;
         table[static_cast<std::size_t>(i)] =
-            static_cast<std::uint8_t>(i + RoundHalfAway(Narrow(room * offset)));
+            static_cast<std::uint8_t>(i + RoundHalfAway(Narrow(distance * offset)));
     }
     return table;
 }

@@ -11,8 +11,8 @@ namespace velmora::render {
 // One channel by `fraction` (-1..1): above 0 toward white, below 0 toward black, 0 leaves it. The product is
 // single precision, rounded half away from zero; the result keeps its low 8 bits.
 [[nodiscard]] inline std::uint8_t ShadeChannel(std::uint8_t channel, float fraction) noexcept {
-    const double room = fraction > 0.0f ? 255 - channel : channel;
-    return static_cast<std::uint8_t>(channel + RoundHalfAway(Narrow(fraction * room)));
+    const double distance = fraction > 0.0f ? 255 - channel : channel;
+    return static_cast<std::uint8_t>(channel + RoundHalfAway(Narrow(fraction * distance)));
 }
 
 // Alpha is kept.

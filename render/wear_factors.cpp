@@ -12,20 +12,20 @@ using Numbers = std::array<std::int16_t, 256>;
 Numbers WantedBy(float fraction) noexcept {
     constexpr float kBelowHalf = 0x1.fffffep-2f;
     Numbers wanted;
-    for (std::size_t room = 0; room < wanted.size(); ++room) {
-        const float product = fraction * static_cast<float>(static_cast<std::int32_t>(room));
-        wanted[room] = static_cast<std::int16_t>(static_cast<std::int32_t>(product + kBelowHalf));
+    for (std::size_t distance = 0; distance < wanted.size(); ++distance) {
+        const float product = fraction * static_cast<float>(static_cast<std::int32_t>(distance));
+        wanted[distance] = static_cast<std::int16_t>(static_cast<std::int32_t>(product + kBelowHalf));
     }
     return wanted;
 }
 
-// The number to add after the multiplication: for each room it must be at most 255 above what is missing.
+// The number to add after the multiplication: for each distance it must be at most 255 above what is missing.
 std::optional<std::uint16_t> PlusFor(std::uint16_t times, const Numbers& wanted) noexcept {
     std::int16_t least = 32767, most = -32768;
-    for (std::size_t room = 0; room < wanted.size(); ++room) {
+    for (std::size_t distance = 0; distance < wanted.size(); ++distance) {
         const auto product =
-            static_cast<std::uint16_t>((static_cast<std::uint32_t>(room) << 8) * times >> 16);
-        const auto missing = static_cast<std::int16_t>(wanted[room] * 256 - product);
+            static_cast<std::uint16_t>((static_cast<std::uint32_t>(distance) << 8) * times >> 16);
+        const auto missing = static_cast<std::int16_t>(wanted[distance] * 256 - product);
         least = std::min(least, missing);
         most = std::max(most, missing);
     }
@@ -53,7 +53,7 @@ std::optional<WearFactor> WearFactorOf(float fraction) noexcept {
 bool WearFactors::Set(const GreyPicture& picture, float amount) noexcept {
     if (m_picture == &picture && m_amount == amount) return true;
     m_picture = nullptr;
-    if (picture.width < WearStrips::kRoom || picture.height > kMostPixels / picture.width) return false;
+    if (picture.width < WearStrips::kPadding || picture.height > kMostPixels / picture.width) return false;
     m_picture = &picture;
     m_amount = amount;
     std::array<bool, 256> isUsed{};
@@ -71,7 +71,7 @@ bool WearFactors::Set(const GreyPicture& picture, float amount) noexcept {
         m_isOdd[b] = !factor;
         m_hasOddBytes |= !factor;
     }
-    WearFactor* next = m_factors.data() + WearStrips::kRoom;
+    WearFactor* next = m_factors.data() + WearStrips::kPadding;
     for (std::int32_t y = 0; y < picture.height; ++y) {
         const std::uint8_t* row = picture.pixels + y * picture.rowStep;
         next = std::transform(row, row + picture.width, next, [&](std::uint8_t b) { return byByte[b]; });

@@ -1,7 +1,7 @@
 // The factors of a wear picture at one amount, for the row kernels of wear.
 //
-// A wear byte's fraction (render/wear.h) has a factor if, for every distance 0..255 ("room") of a channel to white,
-//   ((room × 256 × times >> 16) + plus) >> 8
+// A wear byte's fraction (render/wear.h) has a factor if, for every distance 0..255 of a channel to white,
+//   ((distance × 256 × times >> 16) + plus) >> 8
 // is what shading by the fraction adds. 16-bit integers then give the bytes that are defined by products in single
 // precision. `times` is within a few units of 65536 times the fraction, `plus` is near half of 256. About one byte in
 // several thousand has no factor, and no fraction outside 0..1 has one. Such bytes are called odd; the pixels under
@@ -30,9 +30,9 @@ struct WearFactor {
 class WearStrips {
   public:
     // A row kernel may read this many numbers before a strip's first one and after its last one.
-    static constexpr std::int32_t kRoom = 16;
+    static constexpr std::int32_t kPadding = 16;
 
-    // `factors` is a picture of `width` >= kRoom columns, stored row after row without gaps, with padding before the
+    // `factors` is a picture of `width` >= kPadding columns, stored row after row without gaps, with padding before the
     // first row and after the last.
     WearStrips(const WearRows& rows, const WearFactor* factors, std::int32_t width) noexcept
         : m_rows(rows), m_factors(factors), m_width(width) {}
@@ -53,11 +53,11 @@ class WearFactors {
     static constexpr std::int32_t kMostPixels = 50 * 300;
 
     // Prepares the factors of `picture` at `amount`. Returns false, and leaves no factors, if the picture has more than
-    // kMostPixels pixels or fewer than WearStrips::kRoom columns.
+    // kMostPixels pixels or fewer than WearStrips::kPadding columns.
     [[nodiscard]] bool Set(const GreyPicture& picture, float amount) noexcept;
 
     [[nodiscard]] WearStrips Over(const WearRows& rows) const noexcept {
-        return {rows, m_factors.data() + WearStrips::kRoom, m_picture->width};
+        return {rows, m_factors.data() + WearStrips::kPadding, m_picture->width};
     }
     // Whether the kernels leave out pixels: those under odd bytes.
     [[nodiscard]] bool HasOddBytes() const noexcept { return m_hasOddBytes; }
@@ -68,7 +68,7 @@ class WearFactors {
     float m_amount = 0.0f;
     bool m_hasOddBytes = false;
     std::array<bool, 256> m_isOdd{};
-    std::array<WearFactor, kMostPixels + 2 * WearStrips::kRoom> m_factors{};
+    std::array<WearFactor, kMostPixels + 2 * WearStrips::kPadding> m_factors{};
 };
 
 }  // namespace velmora::render

@@ -6,7 +6,7 @@ namespace {
 // clang-format off
 constexpr Check kChecks[] = {
     {"exports",           1, CheckExports,        "the two exports, and when the library may be unloaded"},
-    {"references",        1, CheckReferences,     "counts and faces of every object"},
+    {"references",        1, CheckReferences,     "counts and interfaces of every object"},
     {"descriptions",      1, CheckDescriptions,   "every parameter of every effect describes itself within its record"},
     {"presets",           1, CheckPresets,        "every preset has a name and a fitting value for every parameter"},
     {"first-frames",      1, CheckFirstFrames,    "every effect renders a frame"},

@@ -35,21 +35,21 @@ namespace {
 constexpr Guid kStranger = {1, 2, 3, {4, 5, 6, 7, 8, 9, 10, 11}};
 
 // Every object answers to IUnknown and to its own identifier, if it has one, and to no other.
-void CheckFaces(com::IUnknown& object, const Guid* own) {
-    void* face = nullptr;
-    Require(object.QueryInterface(&kIidUnknown, &face) == kStatusOk && face == &object,
+void CheckInterfaces(com::IUnknown& object, const Guid* own) {
+    void* found = nullptr;
+    Require(object.QueryInterface(&kIidUnknown, &found) == kStatusOk && found == &object,
             "does not answer to IUnknown with itself");
     Require(object.Release() == 1, "QueryInterface does not count");
     if (own != nullptr) {
-        Require(object.QueryInterface(own, &face) == kStatusOk && face == &object,
+        Require(object.QueryInterface(own, &found) == kStatusOk && found == &object,
                 "does not answer to its own identifier");
         Require(object.Release() == 1, "QueryInterface does not count");
     }
-    face = &object;
-    Require(object.QueryInterface(&kStranger, &face) == kStatusNoInterface && face == nullptr,
+    found = &object;
+    Require(object.QueryInterface(&kStranger, &found) == kStatusNoInterface && found == nullptr,
             "does not refuse a stranger's identifier");
-    face = &object;
-    Require(object.QueryInterface(nullptr, &face) == kStatusNoInterface && face == nullptr,
+    found = &object;
+    Require(object.QueryInterface(nullptr, &found) == kStatusNoInterface && found == nullptr,
             "does not refuse a null identifier");
     Require(object.QueryInterface(&kIidUnknown, nullptr) == kStatusFailure, "does not refuse a null place");
 }
@@ -62,7 +62,7 @@ void CheckCounts(com::IUnknown& object) {
 
 void CheckObject(const char* name, com::IUnknown& object, const Guid* own) {
     SetPlace("%s", name);
-    CheckFaces(object, own);
+    CheckInterfaces(object, own);
     CheckCounts(object);
 }
 
@@ -76,7 +76,7 @@ void CheckReferences(CheckContext& context) {
     for (std::uint32_t i = 0; i < kEffectCount; ++i) {
         const Reference<IVideoEffect> effect = library.Effect(i);
         CheckObject(effect->GetName(), *effect, &kIidVideoEffect);
-        Require(bool{QueryFor<IVideoHost>(*effect, kIidVideoHost)}, "an effect has no host's face");
+        Require(bool{QueryFor<IVideoHost>(*effect, kIidVideoHost)}, "an effect has no host's interface");
     }
 }
 
@@ -97,8 +97,8 @@ void CheckNullArguments(CheckContext& context) {
         Require(!effect->Process(nullptr, nullptr, nullptr, nullptr, nullptr), "renders without anything");
         Require(effect->Process(nullptr, &record, nullptr, &record, &timing),
                 "does not render without a host");
-        void* face = nullptr;
-        Require(effect->QueryInterface(&kStranger, &face) == kStatusNoInterface,
+        void* found = nullptr;
+        Require(effect->QueryInterface(&kStranger, &found) == kStatusNoInterface,
                 "asks a host that there is not about a stranger");
     }
     SetPlace("frame processor");

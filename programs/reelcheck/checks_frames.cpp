@@ -185,13 +185,13 @@ void CheckOverlaps(CheckContext& context) {
         for (int i = 0; i < context.Rounds(20, 400); ++i) {
             Dice& dice = context.dice;
             const Layout size{dice.Between(1, 60), dice.Between(1, 40)};
-            Layout room = size;
-            room.height += 6;
+            Layout whole = size;
+            whole.height += 6;
             const std::int32_t offsets[] = {0, dice.Between(1, 16), dice.Between(1, 6) * size.width * 4};
             const std::int32_t from = offsets[dice.Between(0, 2)], to = offsets[dice.Between(0, 2)];
             ChooseFair(host, facts, dice);
             SetPlace("%s, %dx%d from %d to %d", facts.name.c_str(), size.width, size.height, from, to);
-            Frame shared(room), source(size), apart(size), result(size);
+            Frame shared(whole), source(size), apart(size), result(size);
             shared.Paint(dice);
             std::memcpy(source.Bytes(), shared.Bytes() + from, source.Size());
             RenderInside(effect, host, source, apart, i / 30.0);

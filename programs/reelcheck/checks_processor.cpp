@@ -103,8 +103,8 @@ std::uint64_t TryEffect(const Caller& caller, IEffectLibrary* library, std::uint
     PresetCell cell = {};
     caller.Slot("GetPresetName", effect, kPresetName, {1});
     caller.Slot("GetPresetValue", effect, kPresetValue, {1, 0, WordOf(&cell)});
-    void* face = nullptr;
-    caller.Slot("QueryInterface", effect, kQuery, {WordOf(&kIidVideoEffect), WordOf(&face)});
+    void* found = nullptr;
+    caller.Slot("QueryInterface", effect, kQuery, {WordOf(&kIidVideoEffect), WordOf(&found)});
     caller.Slot("AddRef", effect, kAdd, {});
     const FrameRecord from = pictures.source.Record(), to = pictures.destination.Record();
     const TimingRecord timing = {0, 0, 3.0};
@@ -149,11 +149,11 @@ std::vector<std::uint64_t> TryAll(const Library& library, const Caller& caller, 
     for (std::uint32_t i = 0; i < kEffectCount; ++i)
         digests.push_back(TryEffect(caller, object, i, pictures));
     TryProcessor(caller, object, pictures);
-    void* face = nullptr;
-    if (caller.Slot("QueryInterface", object, kQuery, {WordOf(&kIidMultiLingual), WordOf(&face)}) == 0) {
+    void* found = nullptr;
+    if (caller.Slot("QueryInterface", object, kQuery, {WordOf(&kIidMultiLingual), WordOf(&found)}) == 0) {
         char16_t text[64];
-        caller.Slot("GetText", face, 4, {WordOf("de"), 4, WordOf("Open Preset"), WordOf(text), 64});
-        caller.Slot("Release", face, kDrop, {});
+        caller.Slot("GetText", found, 4, {WordOf("de"), 4, WordOf("Open Preset"), WordOf(text), 64});
+        caller.Slot("Release", found, kDrop, {});
     }
     caller.Slot("Release", object, kDrop, {});
     return digests;

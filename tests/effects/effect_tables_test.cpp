@@ -73,10 +73,10 @@ std::string Answer(IVideoEffect& effect, std::uint32_t setting, std::uint32_t ki
     static constexpr const char* kKinds[] = {"", "item ", "number ", "colour ", "flag "};
     RecordingHost host;
     effect.Process(&host, nullptr, nullptr, nullptr, nullptr);
-    void* face = nullptr;
-    effect.QueryInterface(&kIidVideoHost, &face);
+    void* found = nullptr;
+    effect.QueryInterface(&kIidVideoHost, &found);
     ValueCell cell = {{.bits = 0xCCCCCCCCu}, 0xCCCCCCCCu, 0xCCCCCCCCu};
-    const bool isAnswered = static_cast<IVideoHost*>(face)->GetParamValue(setting, &cell, kind);
+    const bool isAnswered = static_cast<IVideoHost*>(found)->GetParamValue(setting, &cell, kind);
     effect.Release();
     if (!isAnswered || cell.kind != kind || cell.second != 0xCCCCCCCCu) return "none";
     if (host.calls.empty()) {

@@ -18,10 +18,10 @@ using effects::CreateEffectByIndex;
 class Effect {
   public:
     explicit Effect(std::uint32_t index) : m_effect(CreateEffectByIndex(index)) {
-        void* face = nullptr;
-        if (m_effect->QueryInterface(&kIidVideoHost, &face) == kStatusOk) {
-            m_face = static_cast<IVideoHost*>(face);
-            m_face->Release();
+        void* found = nullptr;
+        if (m_effect->QueryInterface(&kIidVideoHost, &found) == kStatusOk) {
+            m_asHost = static_cast<IVideoHost*>(found);
+            m_asHost->Release();
         }
     }
     ~Effect() { m_effect->Release(); }
@@ -29,7 +29,7 @@ class Effect {
     Effect& operator=(const Effect&) = delete;
 
     IVideoEffect* operator->() const { return m_effect; }
-    IVideoHost* Face() const { return m_face; }
+    IVideoHost* AsHost() const { return m_asHost; }
     // Without frames there is nothing to render, but the host is attached.
     void Attach(IVideoHost* host) {
         EXPECT_FALSE(m_effect->Process(host, nullptr, nullptr, nullptr, nullptr));
@@ -37,7 +37,7 @@ class Effect {
 
   private:
     IVideoEffect* m_effect;
-    IVideoHost* m_face = nullptr;
+    IVideoHost* m_asHost = nullptr;
 };
 
 constexpr ValueCell kUntouchedCell = {{.bits = 0xCCCCCCCCu}, 0xCCCCCCCCu, 0xCCCCCCCCu};
@@ -50,16 +50,16 @@ TEST(FilmEffect, AnswersToItsThreeIdentifiersFromItsHostFaceToo) {
         void* pointer;
     } const rows[] = {{&kIidUnknown, effect.operator->()},
                       {&kIidVideoEffect, effect.operator->()},
-                      {&kIidVideoHost, effect.Face()},
+                      {&kIidVideoHost, effect.AsHost()},
                       {&kIidPresetSaver, nullptr}};
     for (const auto& row : rows) {
         void* out = &effect;
-        EXPECT_EQ(effect.Face()->QueryInterface(row.iid, &out),
+        EXPECT_EQ(effect.AsHost()->QueryInterface(row.iid, &out),
                   row.pointer != nullptr ? kStatusOk : kStatusNoInterface);
         EXPECT_EQ(out, row.pointer);
         if (row.pointer != nullptr) effect->Release();
     }
-    EXPECT_EQ(effect.Face()->QueryInterface(&kIidUnknown, nullptr), kStatusFailure);
+    EXPECT_EQ(effect.AsHost()->QueryInterface(&kIidUnknown, nullptr), kStatusFailure);
 }
 
 TEST(FilmEffect, PassesUnknownIdentifiersToTheAttachedHost) {
@@ -71,13 +71,13 @@ TEST(FilmEffect, PassesUnknownIdentifiersToTheAttachedHost) {
     EXPECT_EQ(out, &host);
     EXPECT_EQ(host.references, 2u);
     out = &host;
-    EXPECT_EQ(effect.Face()->QueryInterface(&kIidEffectLibrary, &out), kStatusNoInterface);
+    EXPECT_EQ(effect.AsHost()->QueryInterface(&kIidEffectLibrary, &out), kStatusNoInterface);
     EXPECT_EQ(host.outAsPassed, &host);  // arguments are passed on unchanged
     EXPECT_EQ(out, nullptr);
     EXPECT_EQ(effect->QueryInterface(&kIidPresetSaver, nullptr), kStatusFailure);
     // Its own interfaces come first, without counting a reference on the host.
     EXPECT_EQ(effect->QueryInterface(&kIidVideoHost, &out), kStatusOk);
-    EXPECT_EQ(out, effect.Face());
+    EXPECT_EQ(out, effect.AsHost());
     effect->Release();
     EXPECT_EQ(host.references, 2u);
 }
@@ -86,13 +86,13 @@ TEST(FilmEffect, BothFacesShareOneCount) {
     IVideoEffect* effect = CreateEffectByIndex(0);
     void* out = nullptr;
     ASSERT_EQ(effect->QueryInterface(&kIidVideoHost, &out), kStatusOk);
-    IVideoHost* face = static_cast<IVideoHost*>(out);
+    IVideoHost* found = static_cast<IVideoHost*>(out);
     EXPECT_EQ(effect->AddRef(), 3u);
-    EXPECT_EQ(face->AddRef(), 4u);
+    EXPECT_EQ(found->AddRef(), 4u);
     EXPECT_EQ(effect->Release(), 3u);
     EXPECT_EQ(effect->Release(), 2u);
     EXPECT_EQ(effect->Release(), 1u);
-    EXPECT_EQ(face->Release(), 0u);
+    EXPECT_EQ(found->Release(), 0u);
 }
 
 // Hosts never see the layout, but an effect must store no more than its five members.
@@ -109,12 +109,12 @@ TEST(FilmEffect, AnswersNothingWithoutAHost) {
         for (int round = 0; round < 2; ++round) {
             for (std::uint32_t index = 0; index <= 21; ++index) {
                 ValueCell cell = kUntouchedCell;
-                EXPECT_FALSE(effect.Face()->GetParamValue(index, &cell, 2));
+                EXPECT_FALSE(effect.AsHost()->GetParamValue(index, &cell, 2));
                 EXPECT_EQ(cell.value.bits, kUntouchedCell.value.bits);
                 EXPECT_EQ(cell.kind, kUntouchedCell.kind);
             }
-            EXPECT_FALSE(effect.Face()->HostOperation4(1, 2, 3));
-            EXPECT_EQ(effect.Face()->HostOperation5(1, 2), 0u);
+            EXPECT_FALSE(effect.AsHost()->HostOperation4(1, 2, 3));
+            EXPECT_EQ(effect.AsHost()->HostOperation5(1, 2), 0u);
             effect.Attach(nullptr);
         }
     }
@@ -124,12 +124,12 @@ TEST(FilmEffect, ForwardsTwoOperationsToTheHost) {
     Effect effect(1);
     TestHost host;
     effect.Attach(&host);
-    EXPECT_TRUE(effect.Face()->HostOperation4(11, 12, 13));
+    EXPECT_TRUE(effect.AsHost()->HostOperation4(11, 12, 13));
     EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{11, 12, 13}));
-    EXPECT_EQ(effect.Face()->HostOperation5(21, 22), 0x12345678u);
+    EXPECT_EQ(effect.AsHost()->HostOperation5(21, 22), 0x12345678u);
     EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{21, 22}));
-    EXPECT_FALSE(effect.Face()->HostOperation6(31, 32));
-    effect.Face()->HostOperation7(41, 42);
+    EXPECT_FALSE(effect.AsHost()->HostOperation6(31, 32));
+    effect.AsHost()->HostOperation7(41, 42);
     EXPECT_EQ(host.arguments, (std::vector<std::intptr_t>{21, 22}));
 }
 
@@ -139,15 +139,15 @@ TEST(FilmEffect, FailsPastTheLastSettingAndWithoutACell) {
     effect.Attach(&host);
     for (const std::uint32_t index : {21u, 0xFFFFFFFFu}) {
         ValueCell cell = kUntouchedCell;
-        EXPECT_FALSE(effect.Face()->GetParamValue(index, &cell, 2));
+        EXPECT_FALSE(effect.AsHost()->GetParamValue(index, &cell, 2));
         EXPECT_EQ(cell.value.bits, kUntouchedCell.value.bits);
         EXPECT_EQ(cell.kind, 2u);
     }
-    EXPECT_FALSE(effect.Face()->GetParamValue(0, nullptr, 2));
+    EXPECT_FALSE(effect.AsHost()->GetParamValue(0, nullptr, 2));
     EXPECT_TRUE(host.calls.empty());
     host.answers = false;
     ValueCell cell = kUntouchedCell;
-    EXPECT_FALSE(effect.Face()->GetParamValue(0, &cell, 2));
+    EXPECT_FALSE(effect.AsHost()->GetParamValue(0, &cell, 2));
 }
 
 // "Film Express" has one slider for the amount of scratches and derives their depth: 1 - (1 - s)^2.
@@ -173,19 +173,19 @@ TEST(FilmEffect, DerivesTheDepthOfScratches) {
     for (const auto& row : rows) {
         host.amount = row.amount;
         ValueCell cell = {};
-        EXPECT_TRUE(effect.Face()->GetParamValue(17, &cell, 2));
+        EXPECT_TRUE(effect.AsHost()->GetParamValue(17, &cell, 2));
         EXPECT_EQ(cell.value.number, row.depth) << "amount " << row.amount;
     }
     // 0.2 is not exact in binary: 1 - s is rounded to single precision before it is squared.
     host.amount = 0.2f;
     ValueCell cell = {};
-    EXPECT_TRUE(effect.Face()->GetParamValue(17, &cell, 2));
+    EXPECT_TRUE(effect.AsHost()->GetParamValue(17, &cell, 2));
     EXPECT_EQ(cell.value.number,
               static_cast<float>(1.0L - 0.800000011920928955078125L * 0.800000011920928955078125L));
 
     host.answers = false;
     cell.value.number = 0.5f;
-    EXPECT_TRUE(effect.Face()->GetParamValue(17, &cell, 2));
+    EXPECT_TRUE(effect.AsHost()->GetParamValue(17, &cell, 2));
     EXPECT_EQ(cell.value.number, 0.75f);
 }
 

@@ -183,9 +183,9 @@ class Run {
         IVideoEffect& effect = *m_effects[index];
         ReadValues(effect);
         const double seconds = ReadTime(m_input);
-        void* face = nullptr;
-        Require(effect.QueryInterface(&kIidVideoHost, &face) == kStatusOk);
-        const auto owner = Reference<IVideoHost>::Adopt(static_cast<IVideoHost*>(face));
+        void* found = nullptr;
+        Require(effect.QueryInterface(&kIidVideoHost, &found) == kStatusOk);
+        const auto owner = Reference<IVideoHost>::Adopt(static_cast<IVideoHost*>(found));
         const auto render = [&](Runner runner, const FrameRecord& source, const FrameRecord& destination) {
             if (runner == Runner::kLibrary) return Process(effect, &m_host, source, destination, seconds);
             // The references use the values that the library's list has just read, and leave the list as they found

@@ -95,13 +95,13 @@ class LanguageModule : public testing::Test {
 TEST_F(LanguageModule, CountsReferencesAndParsers) {
     EXPECT_EQ(m_parser->AddRef(), 2u);
     EXPECT_EQ(m_parser->Release(), 1u);
-    void* face = nullptr;
-    EXPECT_EQ(m_parser->QueryInterface(&kIidUnknown, &face), kStatusOk);
-    EXPECT_EQ(face, m_parser);
+    void* found = nullptr;
+    EXPECT_EQ(m_parser->QueryInterface(&kIidUnknown, &found), kStatusOk);
+    EXPECT_EQ(found, m_parser);
     EXPECT_EQ(m_parser->Release(), 1u);
-    face = m_parser;
-    EXPECT_EQ(m_parser->QueryInterface(&kIidMultiLingual, &face), kStatusNoInterface);
-    EXPECT_EQ(face, nullptr);
+    found = m_parser;
+    EXPECT_EQ(m_parser->QueryInterface(&kIidMultiLingual, &found), kStatusNoInterface);
+    EXPECT_EQ(found, nullptr);
     EXPECT_EQ(m_parser->QueryInterface(&kIidUnknown, nullptr), kStatusFailure);
     EXPECT_EQ(m_parser->Reserved3(), 0);
 

@@ -73,9 +73,9 @@ constexpr wchar_t kLanguageFile[] = L"VMReelEffectsLang.xml";
 TEST_F(LanguageModule, MissingGivesNoTexts) {
     Opened opened(m_folder);
     EXPECT_EQ(opened.Texts(), nullptr);
-    void* face = nullptr;
-    EXPECT_EQ(opened.library->QueryInterface(&kIidMultiLingual, &face), kStatusNoInterface);
-    EXPECT_EQ(opened.library->QueryInterface(&kIidEffectLibrary, &face), kStatusOk);
+    void* found = nullptr;
+    EXPECT_EQ(opened.library->QueryInterface(&kIidMultiLingual, &found), kStatusNoInterface);
+    EXPECT_EQ(opened.library->QueryInterface(&kIidEffectLibrary, &found), kStatusOk);
     opened.library->Release();
     EXPECT_EQ(opened.library->Release(), 0u);
 }
@@ -95,7 +95,7 @@ TEST_F(LanguageModule, BesideTheLibraryGivesItsTexts) {
             void*, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t, std::intptr_t,
             std::intptr_t)>((*reinterpret_cast<void***>(texts))[3]);
         EXPECT_EQ(lookUp(texts, 1, 2, 3, 4, 5, 6, 7), 7654321) << "seven words in their order";
-        EXPECT_EQ(texts->Release(), 1u) << "the face shares the library's count";
+        EXPECT_EQ(texts->Release(), 1u) << "the interface shares the library's count";
         opened.library->Release();
         EXPECT_EQ(Log(), L"(not loaded)") << "freed with the library object";
     }

@@ -80,7 +80,7 @@ TEST(WearFactors, TakeThePicturesThatThereAreAndRefuseTooLargeOnes) {
     }
     const GreyPicture tooLarge = {WearFactors::kMostPixels + 1, 1, WearFactors::kMostPixels + 1, nullptr};
     EXPECT_FALSE(factors.Set(tooLarge, 0.5f));
-    const GreyPicture tooNarrow = {WearStrips::kRoom - 1, 9, WearStrips::kRoom - 1, nullptr};
+    const GreyPicture tooNarrow = {WearStrips::kPadding - 1, 9, WearStrips::kPadding - 1, nullptr};
     EXPECT_FALSE(factors.Set(tooNarrow, 0.5f));
 }
 

@@ -125,12 +125,12 @@ TEST(Kernels, WearIsThePlainOneOnEveryLevel) {
     std::mt19937 numbers(3);
     for (const std::int32_t stripWidth : {16, 25, 50, 64}) {
         std::vector<WearFactor> factors(static_cast<std::size_t>(kHeight * stripWidth) +
-                                        2 * WearStrips::kRoom);
+                                        2 * WearStrips::kPadding);
         for (WearFactor& f : factors) {
             f = {static_cast<std::uint16_t>(numbers()), static_cast<std::uint16_t>(numbers() % 256)};
         }
         for (const std::uint32_t channels : {kColourChannels, kBlueChannel}) {
-            const WearStrips strips(WearRows(Random(7), kHeight, 5), factors.data() + WearStrips::kRoom,
+            const WearStrips strips(WearRows(Random(7), kHeight, 5), factors.data() + WearStrips::kPadding,
                                     stripWidth);
             ExpectEqualPixels([&](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
                 kernels.wear(in, out, width, strips, channels);

@@ -25,10 +25,10 @@ Texts::Texts(IEffectLibrary* library, std::string language)
     : m_library(library), m_language(std::move(language)) {}
 
 std::wstring Texts::operator()(const char* key) const {
-    void* face = nullptr;
-    if (m_library != nullptr && m_library->QueryInterface(&kIidMultiLingual, &face) == kStatusOk &&
-        face != nullptr) {
-        auto* const texts = static_cast<IMultiLingual*>(face);
+    void* found = nullptr;
+    if (m_library != nullptr && m_library->QueryInterface(&kIidMultiLingual, &found) == kStatusOk &&
+        found != nullptr) {
+        auto* const texts = static_cast<IMultiLingual*>(found);
         char16_t buffer[kLongest] = {};
         const std::int32_t length =
             texts->GetText(m_language.c_str(), text::kCategory, key, buffer, kLongest);
