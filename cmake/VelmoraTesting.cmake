@@ -39,7 +39,11 @@ endfunction()
 # Windows' own modules.
 function(velmora_check_module target)
   if(WIN32 AND BUILD_TESTING)
+    set(kind)
+    if(CMAKE_SIZEOF_VOID_P EQUAL 8)
+      set(kind --64)
+    endif()
     add_test(NAME ${target}_imports
-      COMMAND ${PROJECT_SOURCE_DIR}/scripts/check-imports $<TARGET_FILE:${target}> ${ARGN})
+      COMMAND ${PROJECT_SOURCE_DIR}/scripts/check-imports ${kind} $<TARGET_FILE:${target}> ${ARGN})
   endif()
 endfunction()

@@ -119,7 +119,11 @@ void operator delete[](void* block, const std::nothrow_t&) noexcept { Free(block
 extern "C" {
 
 // The thread library's import of TlsAlloc.
+#ifdef _WIN64
+extern DWORD(WINAPI* const importedTlsAlloc)() __asm__("__imp_TlsAlloc");
+#else
 extern DWORD(WINAPI* const importedTlsAlloc)() __asm__("__imp__TlsAlloc@0");
+#endif
 DWORD(WINAPI* const importedTlsAlloc)() = TakeSlot;
 
 BOOL WINAPI DllMainCRTStartup(HINSTANCE module, DWORD reason, LPVOID reserved);
