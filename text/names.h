@@ -3,6 +3,8 @@
 #pragma once
 
 #include <algorithm>
+#include <optional>
+#include <span>
 #include <string>
 #include <string_view>
 
@@ -18,17 +20,12 @@ namespace velmora {
 }
 
 // Only letters and digits count, in either case: "60s-memories" matches "60's Memories", so command lines need no
-// quoting.
-[[nodiscard]] inline bool IsSameName(std::string_view a, std::string_view b) {
-    const auto essence = [](std::string_view text) {
-        std::string kept;
-        for (const char c : text) {
-            const char lower = ToLower(c);
-            if ((lower >= 'a' && lower <= 'z') || (lower >= '0' && lower <= '9')) kept += lower;
-        }
-        return kept;
-    };
-    return essence(a) == essence(b);
-}
+// quoting. The dictionary's spelling of a preset whose own name is misspelt matches too.
+[[nodiscard]] bool IsSameName(std::string_view a, std::string_view b);
+
+// The one of the names that was probably meant: it differs by a few letters or begins as `name` does. Nothing when
+// none is near, or when two are equally near.
+[[nodiscard]] std::optional<std::string> NearestName(std::string_view name,
+                                                     std::span<const std::string> names);
 
 }  // namespace velmora

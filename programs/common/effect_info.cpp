@@ -48,21 +48,31 @@ std::string QuotedList(std::span<const std::string> names) {
     return list;
 }
 
+std::string InsteadOf(std::string_view name, std::span<const std::string> names, std::string listing) {
+    std::string text = "; ";
+    if (const auto nearest = NearestName(name, names)) {
+        text += "did you mean \"" + *nearest + "\"? ";
+        listing.front() = static_cast<char>(listing.front() - 'a' + 'A');
+    }
+    return text + listing + ' ' + QuotedList(names);
+}
+
 std::size_t FindEffect(std::span<const EffectInfo> effects, std::string_view name) {
     std::vector<std::string> names;
     for (std::size_t i = 0; i < effects.size(); ++i) {
         if (IsSameName(effects[i].name, name)) return i;
         names.push_back(effects[i].name);
     }
-    throw UsageError("there is no effect \"" + std::string(name) + "\"; there are " + QuotedList(names));
+    throw UsageError("there is no effect \"" + std::string(name) + "\"" +
+                     InsteadOf(name, names, "there are"));
 }
 
 std::uint32_t FindPreset(const EffectInfo& effect, std::string_view name) {
     for (std::size_t i = 0; i < effect.presets.size(); ++i) {
         if (IsSameName(effect.presets[i], name)) return static_cast<std::uint32_t>(i);
     }
-    throw UsageError('"' + effect.name + "\" has no preset \"" + std::string(name) + "\"; it has " +
-                     QuotedList(effect.presets));
+    throw UsageError('"' + effect.name + "\" has no preset \"" + std::string(name) + "\"" +
+                     InsteadOf(name, effect.presets, "it has"));
 }
 
 const char* KindName(std::uint32_t kind) {

@@ -35,7 +35,7 @@ struct EffectInfo {
 ParamInfo ReadDescriptor(const ParamDescriptor& descriptor);
 
 // The index of the effect or preset with that name (text/names.h). If there is none, throws a UsageError that lists
-// those that exist.
+// those that exist and says which one was probably meant.
 std::size_t FindEffect(std::span<const EffectInfo> effects, std::string_view name);
 std::uint32_t FindPreset(const EffectInfo& effect, std::string_view name);
 
@@ -44,5 +44,9 @@ const char* KindName(std::uint32_t kind);
 
 // `"A", "B", "C"`
 std::string QuotedList(std::span<const std::string> names);
+
+// How a message about an unknown name ends: `; did you mean "A"? It has "A", "B"`, or `; it has "A", "B"` if none of the
+// names is near. `listing` is "it has" or the like.
+std::string InsteadOf(std::string_view name, std::span<const std::string> names, std::string listing);
 
 }  // namespace velmora::hosts

@@ -93,8 +93,8 @@ std::string Expected(const ParamInfo& param) {
     for (const ParamInfo& param : effect.params) {
         if (param.HoldsValue() && (names.empty() || names.back() != param.name)) names.push_back(param.name);
     }
-    throw UsageError('"' + effect.name + "\" has no parameter \"" + std::string(name) + "\"; it has " +
-                     QuotedList(names));
+    throw UsageError('"' + effect.name + "\" has no parameter \"" + std::string(name) + "\"" +
+                     InsteadOf(name, names, "it has"));
 }
 
 }  // namespace
