@@ -31,11 +31,16 @@ void CheckInput(const InputOptions& input) {
 }
 
 // The remaining effect options are read against the effect, except for preset files.
-void CheckEffect(EffectOptions effect) {
-    effect.presetFile.reset();
+void CheckEffects(std::vector<EffectOptions> effects) {
+    Require(!effects.empty());
+    for (EffectOptions& effect : effects) effect.presetFile.reset();
     try {
-        const EffectChoice choice(effect);
-        Require(choice.NewSession() != nullptr);
+        const EffectList list(effects);
+        EffectListSession session = list.NewSession();
+        for (const EffectChoice& choice : list.Choices()) {
+            const double mix = choice.MixAt({.frame = 1000, .seconds = 33.4});
+            Require(mix >= 0.0 && mix <= 1.0);
+        }
     } catch (const UsageError& error) {
         Require(*error.what() != '\0');
     }
@@ -43,7 +48,7 @@ void CheckEffect(EffectOptions effect) {
 
 void CheckPicture(const PictureOptions& picture) {
     CheckInput(picture.input);
-    CheckEffect(picture.effect);
+    CheckEffects(picture.effects);
     Require(picture.place.frame.value_or(0) >= 0 && picture.place.start.value_or(0.0) >= 0.0);
     Require(!picture.place.frame || !picture.place.start);
     Require(picture.columns >= 0 && picture.columns <= 32);
@@ -65,13 +70,13 @@ void Check(const PresetShowOptions& options) {
     Require(!options.file.empty());
 }
 void Check(const PresetSaveOptions& options) {
-    CheckEffect(options.effect);
+    CheckEffects({options.effect});
 }
-void Check(const FrameCommand& command) {
-    CheckPicture(command.options);
+void Check(const FrameOptions& options) {
+    CheckPicture(options.picture);
 }
-void Check(const SheetCommand& command) {
-    CheckPicture(command.options);
+void Check(const SheetOptions& options) {
+    CheckPicture(options.picture);
 }
 void Check(const StripOptions& options) {
     CheckPicture(options.picture);
@@ -82,7 +87,7 @@ void Check(const StripOptions& options) {
 }
 void Check(const velmora::hosts::RenderOptions& options) {
     CheckInput(options.input);
-    CheckEffect(options.effect);
+    CheckEffects(options.effects);
     const SectionOptions& section = options.section;
     Require(section.firstFrame >= 0 && (!section.endFrame || *section.endFrame > section.firstFrame));
     Require(!section.start || *section.start >= 0.0);

@@ -2,14 +2,19 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
+#include <map>
+#include <set>
 #include <sstream>
 
+#include "text/names.h"
 #include "text/number_text.h"
 #include "programs/common/effect_info.h"
 #include "programs/common/usage_error.h"
 #include "programs/reelfx/commands/command_options.h"
+#include "programs/reelfx/common/output_place.h"
 
 namespace velmora::hosts {
 namespace {
@@ -73,6 +78,7 @@ SectionOptions ReadSection(const TypedOptions& typed) {
 
 InputOptions ReadInput(const TypedOptions& typed) {
     InputOptions input = typed.input;
+    input.path = LocalPath(input.path);
     if (!typed.size.empty()) {
         input.rawSize = Parsed("--size", typed.size, ParseSize, "a size like 1920x1080");
     }
@@ -81,17 +87,76 @@ InputOptions ReadInput(const TypedOptions& typed) {
     return input;
 }
 
-EffectOptions ReadEffect(const TypedOptions& typed) {
-    EffectOptions effect = typed.effect;
-    effect.preset = Given(typed.preset);
-    effect.presetFile = Given(typed.presetFile);
-    const auto seed = Parsed("--seed", typed.seed, ParseInteger, "a whole number");
+std::uint32_t ReadSeed(const std::string& text) {
+    const auto seed = Parsed("--seed", text, ParseInteger, "a whole number");
     if (seed < 0 || seed > 0xFFFFFFFFll) throw UsageError("--seed takes a number from 0 to 4294967295");
-    effect.seed = static_cast<std::uint32_t>(seed);
-    if (!typed.randomState.empty()) {
-        effect.randomState = Parsed("--random-state", typed.randomState, ParseHexWord, "up to 8 hex digits");
+    return static_cast<std::uint32_t>(seed);
+}
+
+std::string FromEnvironment(const char* name) {
+    const char* const value = std::getenv(name);
+    return value == nullptr ? "" : value;
+}
+
+// The effects of a command, told apart by the order in which the options were typed.
+class EffectReader {
+  public:
+    EffectReader(const CLI::App& command, const TypedOptions& typed) : m_typed(typed) {
+        if (const std::string seed = FromEnvironment("REELFX_SEED"); !seed.empty())
+            m_list.front().seed = ReadSeed(seed);
+        for (const CLI::Option* option : command.parse_order()) Take(option->get_name());
+        EffectOptions& first = m_list.front();
+        if (first.effect.empty() && !first.presetFile) first.effect = FromEnvironment("REELFX_EFFECT");
+        if (typed.randomState.empty()) return;
+        for (EffectOptions& effect : m_list) {
+            effect.randomState =
+                Parsed("--random-state", typed.randomState, ParseHexWord, "up to 8 hex digits");
+        }
     }
-    return effect;
+
+    [[nodiscard]] const std::vector<EffectOptions>& List() const { return m_list; }
+
+  private:
+    void Take(const std::string& option) {
+        EffectOptions& effect = m_list.back();
+        if (option == "--then") {
+            m_list.push_back({.seed = effect.seed});
+            m_given.clear();
+        } else if (option == "--set") {
+            effect.settings.push_back(NextOf(option, m_typed.settings));
+        } else if (option == "--effect") {
+            effect.effect = OnlyOf(option, m_typed.effects);
+        } else if (option == "--preset") {
+            effect.preset = OnlyOf(option, m_typed.presets);
+        } else if (option == "--preset-file") {
+            effect.presetFile = OnlyOf(option, m_typed.presetFiles);
+        } else if (option == "--mix") {
+            effect.mix = OnlyOf(option, m_typed.mixes);
+        } else if (option == "--seed") {
+            effect.seed = ReadSeed(OnlyOf(option, m_typed.seeds));
+        }
+    }
+
+    // `values` are all that were typed for the option.
+    std::string NextOf(const std::string& option, const std::vector<std::string>& values) {
+        return values.at(m_taken[option]++);
+    }
+
+    std::string OnlyOf(const std::string& option, const std::vector<std::string>& values) {
+        if (!m_given.insert(option).second) {
+            throw UsageError(option + " is given twice for one effect; --then begins another effect");
+        }
+        return NextOf(option, values);
+    }
+
+    const TypedOptions& m_typed;
+    std::vector<EffectOptions> m_list = std::vector<EffectOptions>(1);
+    std::map<std::string, std::size_t> m_taken;
+    std::set<std::string> m_given;  // for the last effect
+};
+
+std::vector<EffectOptions> ReadEffects(const CLI::App& command, const TypedOptions& typed) {
+    return EffectReader(command, typed).List();
 }
 
 ProgressKind ReadProgress(const TypedOptions& typed) {
@@ -102,14 +167,14 @@ ProgressKind ReadProgress(const TypedOptions& typed) {
     throw UsageError("--progress takes auto, none, text or json, not \"" + typed.progress + '"');
 }
 
-RenderOptions ReadRender(const TypedOptions& typed) {
+RenderOptions ReadRender(const CLI::App& command, const TypedOptions& typed) {
     RenderOptions options;
     options.input = ReadInput(typed);
-    options.effect = ReadEffect(typed);
+    options.effects = ReadEffects(command, typed);
     options.section = ReadSection(typed);
     if (!typed.outPath.empty()) {
         OutputOptions output = typed.output;
-        output.path = typed.outPath;
+        output.path = LocalPath(typed.outPath);
         output.format = Given(typed.format);
         output.codec = Given(typed.codec);
         output.pixelFormat = Given(typed.pixelFormat);
@@ -131,63 +196,117 @@ RenderOptions ReadRender(const TypedOptions& typed) {
     return options;
 }
 
-PictureOptions ReadPicture(const TypedOptions& typed) {
+PictureOptions ReadPicture(const CLI::App& command, const TypedOptions& typed) {
     PictureOptions options = typed.picture;
     options.input = ReadInput(typed);
-    options.effect = ReadEffect(typed);
+    options.out = LocalPath(options.out);
+    options.effects = ReadEffects(command, typed);
     options.mayOverwrite = typed.overwrite;
     if (!typed.start.empty()) options.place.start = Parsed("--start", typed.start, ParseTime, kTimeText);
     return options;
 }
 
-// An effect from the environment is only a default, which --all ignores.
-bool NamesEffect(const EffectOptions& effect) {
-    const char* const fallback = std::getenv("REELFX_EFFECT");
-    return (!effect.effect.empty() && (fallback == nullptr || effect.effect != fallback)) || effect.preset ||
-           effect.presetFile || !effect.settings.empty();
-}
-
-PictureOptions ReadSheet(const TypedOptions& typed) {
-    PictureOptions options = ReadPicture(typed);
-    if (options.allEffects && NamesEffect(options.effect)) {
-        throw UsageError(
-            "--all renders all presets of all effects: leave out --effect, --preset, --preset-file and "
-            "--set");
+SheetOptions ReadSheet(const CLI::App& command, const TypedOptions& typed) {
+    // An effect from the environment is only a default, which --all ignores.
+    const bool isOfOne = std::ranges::any_of(command.parse_order(), [](const CLI::Option* option) {
+        const std::string name = option->get_name();
+        return name == "--effect" || name == "--set" || name == "--mix";
+    });
+    if (typed.allSheets && isOfOne) {
+        throw UsageError("--all renders all presets of all effects: leave out --effect, --set and --mix");
     }
-    return options;
+    return {.picture = ReadPicture(command, typed), .allEffects = typed.allSheets};
 }
 
-StripOptions ReadStrip(const TypedOptions& typed) {
-    StripOptions options = {.picture = ReadPicture(typed), .frames = typed.stripFrames, .crop = {}};
+StripOptions ReadStrip(const CLI::App& command, const TypedOptions& typed) {
+    StripOptions options = {.picture = ReadPicture(command, typed), .frames = typed.stripFrames, .crop = {}};
     if (!typed.crop.empty())
         options.crop = Parsed("--crop", typed.crop, ParseCrop, "a part like 160x540+880+270");
     return options;
 }
 
-PresetSaveOptions ReadPresetSave(const TypedOptions& typed) {
+PresetSaveOptions ReadPresetSave(const CLI::App& command, const TypedOptions& typed) {
     PresetSaveOptions options = typed.presetSave;
-    options.effect = ReadEffect(typed);
+    options.effect = ReadEffects(command, typed).front();
     options.mayOverwrite = typed.overwrite;
     return options;
 }
 
-}  // namespace
+ListOptions ReadList(const TypedOptions& typed) {
+    return {.effect = Given(typed.listEffect), .asJson = typed.list.asJson};
+}
 
-namespace {
+struct CommandReader {
+    const char* command;  // the last word of it
+    Command (*read)(const CLI::App& command, const TypedOptions& typed);
+};
+constexpr CommandReader kCommands[] = {
+    {"list", [](const CLI::App&, const TypedOptions& typed) -> Command { return ReadList(typed); }},
+    {"presets", [](const CLI::App&, const TypedOptions& typed) -> Command { return typed.presetsOf; }},
+    {"render", [](const CLI::App& c, const TypedOptions& typed) -> Command { return ReadRender(c, typed); }},
+    {"frame",
+     [](const CLI::App& c, const TypedOptions& typed) -> Command {
+         return FrameOptions{ReadPicture(c, typed)};
+     }},
+    {"sheet", [](const CLI::App& c, const TypedOptions& typed) -> Command { return ReadSheet(c, typed); }},
+    {"strip", [](const CLI::App& c, const TypedOptions& typed) -> Command { return ReadStrip(c, typed); }},
+    {"show", [](const CLI::App&, const TypedOptions& typed) -> Command { return typed.presetShow; }},
+    {"save",
+     [](const CLI::App& c, const TypedOptions& typed) -> Command { return ReadPresetSave(c, typed); }},
+    {"info",
+     [](const CLI::App&, const TypedOptions& typed) -> Command {
+         return InfoOptions{ReadInput(typed), typed.info.asJson};
+     }},
+    {"studio", [](const CLI::App&, const TypedOptions& typed) -> Command { return typed.studio; }},
+};
 
-// The parser asks for a command before it looks at what was typed in its place.
-std::string Explain(const CLI::App& app, const CLI::ParseError& error) {
-    const CLI::App* group = &app;
-    while (!group->get_subcommands().empty()) group = group->get_subcommands().front();
-    const auto commands = group->get_subcommands([](const CLI::App*) { return true; });
-    if (dynamic_cast<const CLI::RequiredError*>(&error) == nullptr || commands.empty()) return error.what();
+// The command that was typed, the inner one of "preset show".
+const CLI::App& CommandOf(const CLI::App& app) {
+    const CLI::App* command = &app;
+    while (!command->get_subcommands().empty()) command = command->get_subcommands().front();
+    return *command;
+}
+
+std::vector<std::string> OptionsOf(const CLI::App& command) {
     std::vector<std::string> names;
-    names.reserve(commands.size());
-    for (const CLI::App* command : commands) names.push_back(command->get_name());
-    const std::vector<std::string> typed = group->remaining();
+    for (const CLI::Option* option : command.get_options()) {
+        if (option->get_name().starts_with("--")) names.push_back(option->get_name());
+    }
+    return names;
+}
+
+std::string CommandMissing(const CLI::App& group) {
+    std::vector<std::string> names;
+    for (const CLI::App* command : group.get_subcommands([](const CLI::App*) { return true; }))
+        names.push_back(command->get_name());
+    const std::vector<std::string> typed = group.remaining();
     if (typed.empty()) return "a command is missing; there are " + QuotedList(names);
     return std::string(typed.front().starts_with('-') ? "there is no option \"" : "there is no command \"") +
-           typed.front() + "\"; there are the commands " + QuotedList(names);
+           typed.front() + '"' + InsteadOf(typed.front(), names, "there are the commands");
+}
+
+// In the order typed.
+std::string Unexpected(const CLI::App& command, const std::string& otherwise) {
+    const std::vector<std::string> typed = command.remaining();
+    const auto option =
+        std::ranges::find_if(typed, [](const std::string& word) { return word.starts_with('-'); });
+    if (option != typed.end()) {
+        const std::string name = option->substr(0, option->find('='));
+        const auto nearest = NearestName(name, OptionsOf(command));
+        return command.get_name() + " has no option \"" + name + '"' +
+               (nearest ? "; did you mean \"" + *nearest + "\"?" : "");
+    }
+    return typed.empty() ? otherwise : "not expected: " + QuotedList(typed);
+}
+
+// What is wrong with a command line, for its user.
+std::string Explain(const CLI::App& app, const CLI::ParseError& error) {
+    const CLI::App& command = CommandOf(app);
+    if (dynamic_cast<const CLI::ExtrasError*>(&error) != nullptr) return Unexpected(command, error.what());
+    // The parser asks for a command before it looks at what was typed in its place.
+    const bool isGroup = !command.get_subcommands([](const CLI::App*) { return true; }).empty();
+    return dynamic_cast<const CLI::RequiredError*>(&error) != nullptr && isGroup ? CommandMissing(command)
+                                                                                 : error.what();
 }
 
 }  // namespace
@@ -203,23 +322,12 @@ Command ReadCommandLine(int count, const char* const* arguments) {
         app.exit(wish, text, text);  // writes the help or the version
         return TextCommand{text.str()};
     } catch (const CLI::ParseError& error) {
-        throw UsageError(Explain(app, error) + "; see reelfx --help");
+        const std::string what = Explain(app, error);
+        throw UsageError(what + (what.ends_with('?') ? " See" : "; see") + " reelfx --help");
     }
-    if (app.got_subcommand("list")) {
-        typed.list.effect = Given(typed.listEffect);
-        return typed.list;
-    }
-    if (app.got_subcommand("presets")) return typed.presets;
-    if (app.got_subcommand("studio")) return typed.studio;
-    if (app.got_subcommand("info")) return InfoOptions{ReadInput(typed), typed.info.asJson};
-    if (app.got_subcommand("frame")) return FrameCommand{ReadPicture(typed)};
-    if (app.got_subcommand("sheet")) return SheetCommand{ReadSheet(typed)};
-    if (app.got_subcommand("strip")) return ReadStrip(typed);
-    if (const CLI::App* preset = app.get_subcommand("preset"); preset->parsed()) {
-        if (preset->got_subcommand("show")) return typed.presetShow;
-        return ReadPresetSave(typed);
-    }
-    return ReadRender(typed);
+    const CLI::App& command = CommandOf(app);
+    const auto* const reader = std::ranges::find(kCommands, command.get_name(), &CommandReader::command);
+    return reader->read(command, typed);
 }
 
 namespace {
@@ -227,36 +335,6 @@ namespace {
 ExitCode Run(const TextCommand& command) {
     std::fputs(command.text.c_str(), stdout);
     return kExitDone;
-}
-ExitCode Run(const ListOptions& options) {
-    return RunList(options);
-}
-ExitCode Run(const PresetsOptions& options) {
-    return RunPresets(options);
-}
-ExitCode Run(const InfoOptions& options) {
-    return RunInfo(options);
-}
-ExitCode Run(const StudioOptions& options) {
-    return RunStudio(options);
-}
-ExitCode Run(const RenderOptions& options) {
-    return RunRender(options);
-}
-ExitCode Run(const FrameCommand& command) {
-    return RunFrame(command.options);
-}
-ExitCode Run(const SheetCommand& command) {
-    return RunSheet(command.options);
-}
-ExitCode Run(const StripOptions& options) {
-    return RunStrip(options);
-}
-ExitCode Run(const PresetShowOptions& options) {
-    return RunPresetShow(options);
-}
-ExitCode Run(const PresetSaveOptions& options) {
-    return RunPresetSave(options);
 }
 
 }  // namespace

@@ -20,14 +20,8 @@ namespace velmora::hosts {
 struct TextCommand {
     std::string text;
 };
-struct FrameCommand {
-    PictureOptions options;
-};
-struct SheetCommand {
-    PictureOptions options;
-};
 using Command =
-    std::variant<TextCommand, ListOptions, RenderOptions, FrameCommand, SheetCommand, StripOptions,
+    std::variant<TextCommand, ListOptions, RenderOptions, FrameOptions, SheetOptions, StripOptions,
                  PresetShowOptions, PresetSaveOptions, PresetsOptions, InfoOptions, StudioOptions>;
 
 // Parses the arguments; opens and writes nothing. Throws UsageError.

@@ -2,6 +2,8 @@
 
 #include <CLI/CLI.hpp>
 
+#include "text/number_text.h"
+
 namespace velmora::hosts {
 namespace {
 
@@ -15,29 +17,48 @@ void AddInput(CLI::App& command, TypedOptions& typed) {
     command.add_option("--rate", typed.rate, "Frame rate of raw BGRA and image sequences")->type_name("FPS");
 }
 
+// An option of one value that each effect of a list can have.
+CLI::Option& AddOfEach(CLI::App& command, const char* names, std::vector<std::string>& values,
+                       const char* help) {
+    return *command.add_option(names, values, help)->allow_extra_args(false);
+}
+
 void AddEffect(CLI::App& command, TypedOptions& typed) {
-    command.add_option("--effect,-e", typed.effect.effect, "Effect; reelfx list shows all")
-        ->type_name("EFFECT")
+    AddOfEach(command, "--effect,-e", typed.effects, "Effect; reelfx list shows all")
+        .type_name("EFFECT")
         ->envname("REELFX_EFFECT");
-    command.add_option("--preset,-p", typed.preset, "Preset of the effect")->type_name("PRESET");
-    command
-        .add_option("--preset-file", typed.presetFile,
-                    "Preset file as saved by editors or reelfx preset save")
-        ->type_name("FILE");
-    command
-        .add_option("--set,-s", typed.effect.settings,
-                    "Set one parameter, overriding the preset; may be repeated")
-        ->type_name("NAME=VALUE")
-        ->allow_extra_args(false);
+}
+
+void AddPresetOf(CLI::App& command, TypedOptions& typed) {
+    AddOfEach(command, "--preset,-p", typed.presets, "Preset of the effect").type_name("PRESET");
+    AddOfEach(command, "--preset-file", typed.presetFiles,
+              "Preset file as saved by editors or reelfx preset save")
+        .type_name("FILE");
+}
+
+void AddSettings(CLI::App& command, TypedOptions& typed) {
+    AddOfEach(command, "--set,-s", typed.settings,
+              "Set one parameter, overriding the preset; may be repeated. NAME=\"V@T V@T\" changes it evenly "
+              "from one "
+              "value to the next; T is a frame of the clip, counted from 0, or with an s a time of the clip "
+              "in seconds: "
+              "Wear=\"10@0 60@5s\"")
+        .type_name("NAME=VALUE");
+}
+
+void AddMix(CLI::App& command, TypedOptions& typed) {
+    AddOfEach(command, "--mix", typed.mixes,
+              "How much of the effect is mixed into the picture, 0 to 100; may change over time as --set may")
+        .type_name("N")
+        ->default_str("100");
 }
 
 void AddRandom(CLI::App& command, TypedOptions& typed) {
-    command
-        .add_option("--seed", typed.seed,
-                    "Another seed gives other shake, flicker and damage; with 0, flicker and scratches are "
-                    "those of the Windows library")
-        ->type_name("N")
-        ->capture_default_str()
+    AddOfEach(command, "--seed", typed.seeds,
+              "Another seed gives other shake, flicker and damage; with 0, flicker and scratches are "
+              "those of the Windows library")
+        .type_name("N")
+        ->default_str("0")
         ->envname("REELFX_SEED");
     command
         .add_option("--random-state", typed.randomState,
@@ -45,12 +66,23 @@ void AddRandom(CLI::App& command, TypedOptions& typed) {
         ->type_name("HEX");
 }
 
+void AddEffectList(CLI::App& command, TypedOptions& typed) {
+    AddEffect(command, typed);
+    AddPresetOf(command, typed);
+    AddSettings(command, typed);
+    AddMix(command, typed);
+    AddRandom(command, typed);
+    command.add_flag(
+        "--then", typed.thens,
+        "Another effect follows, applied to the result of those before: -e A -p B --then -e C. Without a "
+        "--seed of its own it has that of the effect before");
+}
+
 void AddRender(CLI::App& app, TypedOptions& typed) {
-    CLI::App& render = *app.add_subcommand("render", "Render a clip through an effect");
+    CLI::App& render = *app.add_subcommand("render", "Render a clip through one or several effects");
     AddInput(render, typed);
     render.add_option("OUT", typed.outPath, "File, image pattern, or - (YUV4MPEG2)")->type_name("FILE");
-    AddEffect(render, typed);
-    AddRandom(render, typed);
+    AddEffectList(render, typed);
     render
         .add_option("--frames", typed.frames,
                     "Frames from A up to but not including B; either may be omitted")
@@ -74,7 +106,7 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         ->type_name("N")
         ->envname("REELFX_CRF");
     render.add_option("--pix-fmt", typed.pixelFormat, "Pixel format; default: the source's")
-        ->type_name("NAME")
+        ->type_name("PIXELS")
         ->envname("REELFX_PIX_FMT");
     render.add_flag(
         "--matte", typed.matte,
@@ -104,15 +136,18 @@ struct PictureTexts {
     const char* frame;
 };
 
+std::string CountedFromZero(const std::string& text) {
+    const auto number = ParseInteger(text);
+    return number && *number >= 0 ? "" : "takes the number of a frame, counted from 0, not \"" + text + '"';
+}
+
 CLI::App& AddPicture(CLI::App& app, TypedOptions& typed, const char* name, const PictureTexts& texts) {
     CLI::App& command = *app.add_subcommand(name, texts.what);
     AddInput(command, typed);
     command.add_option("OUT", typed.picture.out, texts.out)->type_name("FILE")->required();
-    AddEffect(command, typed);
-    AddRandom(command, typed);
     CLI::Option* const frame = command.add_option("--frame,-n", typed.picture.place.frame, texts.frame)
                                    ->type_name("N")
-                                   ->check(CLI::NonNegativeNumber);
+                                   ->check(CountedFromZero);
     command
         .add_option("--start", typed.start,
                     "Instead of --frame: the first frame at or after this time of the clip")
@@ -137,16 +172,20 @@ void AddPictures(CLI::App& app, TypedOptions& typed) {
                                  {.what = "Write one frame before and after, side by side",
                                   .out = "PNG or JPEG",
                                   .frame = "Frame of the clip, counted from 0; default: the first"});
+    AddEffectList(frame, typed);
     AddWidth(frame, typed);
     CLI::App& sheet = AddPicture(
         app, typed, "sheet",
         {.what = "Write one frame through all presets of an effect",
          .out = "PNG or JPEG; with --all a folder, or a name with %s for the effect's name: sheets/%s.jpg",
          .frame = "Frame of the clip, counted from 0; default: the middle one, or the first of a pipe"});
+    AddEffect(sheet, typed);
+    AddSettings(sheet, typed);
+    AddMix(sheet, typed);
+    AddRandom(sheet, typed);
     AddWidth(sheet, typed);
     AddColumns(sheet, typed, "Pictures per row; default: 4");
-    sheet.add_flag("--all", typed.picture.allEffects,
-                   "Write a sheet for each effect: film-camera.png and so on");
+    sheet.add_flag("--all", typed.allSheets, "Write a sheet for each effect: film-camera.png and so on");
     CLI::App& strip = AddPicture(
         app, typed, "strip",
         {.what = "Write successive frames through an effect side by side at 100 %, to judge motion",
@@ -154,6 +193,7 @@ void AddPictures(CLI::App& app, TypedOptions& typed) {
          .frame = "First frame, counted from 0; default: the frames in the middle of the clip, or the first "
                   "ones of "
                   "a pipe"});
+    AddEffectList(strip, typed);
     strip.add_option("--frames", typed.stripFrames, "Number of frames; fewer if the clip ends earlier")
         ->type_name("N")
         ->capture_default_str()
@@ -176,6 +216,8 @@ void AddPreset(CLI::App& app, TypedOptions& typed) {
     CLI::App& save = *preset.add_subcommand("save", "Write settings as a preset file");
     save.add_option("FILE", typed.presetSave.file, "Preset file")->type_name("FILE")->required();
     AddEffect(save, typed);
+    AddPresetOf(save, typed);
+    AddSettings(save, typed);
     save.add_option("--name", typed.presetSave.name, "Name of the preset; default: the file name")
         ->type_name("TEXT");
     save.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing FILE");
@@ -186,8 +228,8 @@ void AddList(CLI::App& app, TypedOptions& typed) {
     list.add_option("EFFECT", typed.listEffect, "Only this effect")->type_name("EFFECT");
     list.add_flag("--json", typed.list.asJson, "Print as JSON");
     CLI::App& presets = *app.add_subcommand("presets", "List the presets of an effect with their settings");
-    presets.add_option("EFFECT", typed.presets.effect, "The effect")->type_name("EFFECT")->required();
-    presets.add_flag("--json", typed.presets.asJson, "Print as JSON");
+    presets.add_option("EFFECT", typed.presetsOf.effect, "The effect")->type_name("EFFECT")->required();
+    presets.add_flag("--json", typed.presetsOf.asJson, "Print as JSON");
 }
 
 void AddInfo(CLI::App& app, TypedOptions& typed) {

@@ -3,6 +3,7 @@
 
 #include <array>
 #include <string>
+#include <vector>
 
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/commands/info_command.h"
@@ -44,19 +45,21 @@ inline constexpr char kOnInterrupt[] =
 // Options as typed, before they are parsed.
 struct TypedOptions {
     InputOptions input;
-    EffectOptions effect;
+    // Those of all effects of a list; the parser's order says which belongs to which.
+    std::vector<std::string> effects, presets, presetFiles, settings, mixes, seeds;
+    int thens = 0;
     OutputOptions output;
-    std::string outPath, size, rate, seed = "0", randomState, preset, presetFile, frames, farm, start,
-                                     duration;
+    std::string outPath, size, rate, randomState, frames, farm, start, duration;
     std::string format, codec, crf, pixelFormat, progress = "auto";
     int threads = 0;
     bool overwrite = false, noSound = false, digests = false, quiet = false, dryRun = false, matte = false;
     ListOptions list;
     std::string listEffect;
-    PresetsOptions presets;
+    PresetsOptions presetsOf;
     InfoOptions info;
     StudioOptions studio;
     PictureOptions picture;
+    bool allSheets = false;
     int stripFrames = 12;
     std::string crop;
     PresetShowOptions presetShow;
@@ -64,7 +67,7 @@ struct TypedOptions {
 };
 
 // Adds the commands to `app`; their options fill `typed`. An option's type name says how the shell completes
-// it: EFFECT, PRESET, NAME=VALUE, FILE, CODEC, or the choices themselves, "one|other".
+// it: EFFECT, PRESET, NAME=VALUE, FILE, CODEC, FORMAT, PIXELS, or the choices themselves, "one|other".
 void AddCommands(CLI::App& app, TypedOptions& typed);
 
 }  // namespace velmora::hosts

@@ -77,7 +77,7 @@ void Print(const std::string& name, const MediaFacts& facts) {
 
 }  // namespace
 
-ExitCode RunInfo(const InfoOptions& options) {
+ExitCode Run(const InfoOptions& options) {
     const MediaReader reader(options.input);
     const MediaFacts facts = FactsOf(reader);
     if (options.asJson) {

@@ -12,6 +12,6 @@ struct InfoOptions {
 };
 
 // Throws Failure.
-ExitCode RunInfo(const InfoOptions& options);
+ExitCode Run(const InfoOptions& options);
 
 }  // namespace velmora::hosts

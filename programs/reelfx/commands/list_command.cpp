@@ -59,7 +59,7 @@ void Print(const EffectInfo& effect) {
 
 }  // namespace
 
-ExitCode RunList(const ListOptions& options) {
+ExitCode Run(const ListOptions& options) {
     std::vector<EffectInfo> effects = CoreEffects();
     if (options.effect) effects = {effects[FindEffect(effects, *options.effect)]};
     if (options.asJson) {

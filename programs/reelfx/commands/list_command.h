@@ -14,6 +14,6 @@ struct ListOptions {
 };
 
 // Throws UsageError when there is no such effect.
-ExitCode RunList(const ListOptions& options);
+ExitCode Run(const ListOptions& options);
 
 }  // namespace velmora::hosts

@@ -23,7 +23,9 @@ BgraPicture DrawSheet(const EffectChoice& choice, ClipPicture& source, const Pic
     std::vector<GridCell> cells;
     cells.push_back({"Source", source.picture});
     for (std::uint32_t preset = 0; preset < choice.Info().presets.size(); ++preset) {
-        cells.push_back({choice.Info().presets[preset], Rendered(*choice.NewSession(preset), source)});
+        const EffectList effects(choice.WithPreset(preset));
+        EffectListSession session = effects.NewSession();
+        cells.push_back({choice.Info().presets[preset], Rendered(session, source)});
     }
     const std::int32_t width = options.width > 0 ? options.width : kSheetCellWidth;
     return DrawGrid(cells,
@@ -90,11 +92,14 @@ class SheetPlaces {
 // All are drawn before the first is written, so that a failure does not leave some of the five.
 ExitCode RunAllSheets(const PictureOptions& options) {
     const SheetPlaces places(options.out);
-    for (const EffectInfo& info : CoreEffects()) CheckOutputPlace(places.Of(info.name), options.mayOverwrite);
+    for (const EffectInfo& info : CoreEffects()) {
+        CheckIsNotInput(places.Of(info.name), options.input.path);
+        CheckOutputPlace(places.Of(info.name), options.mayOverwrite);
+    }
     ClipPicture source = *ClipPictures(options.input, options.place, 1).Next();
     std::vector<BgraPicture> sheets;
     for (const EffectInfo& info : CoreEffects()) {
-        EffectOptions effect = options.effect;
+        EffectOptions effect = options.effects.front();
         effect.effect = info.name;
         sheets.push_back(DrawSheet(EffectChoice(effect), source, options));
     }
@@ -105,27 +110,30 @@ ExitCode RunAllSheets(const PictureOptions& options) {
 
 }  // namespace
 
-ExitCode RunFrame(const PictureOptions& options) {
+ExitCode Run(const FrameOptions& command) {
+    const PictureOptions& options = command.picture;
     CheckStillName(options.out);
-    const EffectChoice choice(options.effect);
+    const EffectList effects(options.effects);
+    CheckIsNotInput(options.out, options.input.path);
     CheckOutputPlace(options.out, options.mayOverwrite);
     FramePlace place = options.place;
     if (!place.start && !place.frame) place.frame = 0;
     ClipPicture source = *ClipPictures(options.input, place, 1).Next();
-    std::string label = choice.Info().name;
-    if (options.effect.preset) label += ": " + *options.effect.preset;
     std::vector<GridCell> cells;
     cells.push_back({"Source", source.picture});
-    cells.push_back({label, Rendered(*choice.NewSession(), source)});
+    EffectListSession session = effects.NewSession();
+    cells.push_back({effects.Title(), Rendered(session, source)});
     const std::int32_t width = options.width > 0 ? options.width : source.picture.Width();
     WriteStill(DrawGrid(cells, {"", 2, width}), options.out, options.mayOverwrite);
     return kExitDone;
 }
 
-ExitCode RunSheet(const PictureOptions& options) {
-    if (options.allEffects) return RunAllSheets(options);
+ExitCode Run(const SheetOptions& command) {
+    const PictureOptions& options = command.picture;
+    if (command.allEffects) return RunAllSheets(options);
     CheckStillName(options.out);
-    const EffectChoice choice(options.effect);
+    const EffectChoice choice(options.effects.front());
+    CheckIsNotInput(options.out, options.input.path);
     CheckOutputPlace(options.out, options.mayOverwrite);
     ClipPicture source = *ClipPictures(options.input, options.place, 1).Next();
     WriteStill(DrawSheet(choice, source, options), options.out, options.mayOverwrite);

@@ -4,6 +4,7 @@
 #include <filesystem>
 #include <nlohmann/json.hpp>
 
+#include "programs/common/usage_error.h"
 #include "programs/reelfx/common/preset_io.h"
 
 namespace velmora::hosts {
@@ -24,7 +25,7 @@ Json JsonOf(const PresetRecord& record, const EffectInfo& effect, const std::vec
 
 }  // namespace
 
-ExitCode RunPresetShow(const PresetShowOptions& options) {
+ExitCode Run(const PresetShowOptions& options) {
     const PresetRecord record = LoadPresetFile(options.file);
     const EffectChoice choice({.presetFile = options.file});
     const EffectInfo& effect = choice.Info();
@@ -43,8 +44,9 @@ ExitCode RunPresetShow(const PresetShowOptions& options) {
     return kExitDone;
 }
 
-ExitCode RunPresetSave(const PresetSaveOptions& options) {
+ExitCode Run(const PresetSaveOptions& options) {
     const EffectChoice choice(options.effect);
+    if (choice.Fades()) throw UsageError("a preset file cannot hold values that change over time");
     const auto session = choice.NewSession();
     std::vector<ValueWord> values;
     for (std::uint32_t i = 0; i < choice.Info().params.size(); ++i) values.push_back(session->Value(i));

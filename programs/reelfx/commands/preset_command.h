@@ -21,7 +21,7 @@ struct PresetSaveOptions {
 };
 
 // Throw Failure or UsageError.
-ExitCode RunPresetShow(const PresetShowOptions& options);
-ExitCode RunPresetSave(const PresetSaveOptions& options);
+ExitCode Run(const PresetShowOptions& options);
+ExitCode Run(const PresetSaveOptions& options);
 
 }  // namespace velmora::hosts

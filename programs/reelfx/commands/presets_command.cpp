@@ -34,12 +34,12 @@ void Print(const EffectInfo& effect, const std::string& preset, const effects::E
 
 }  // namespace
 
-ExitCode RunPresets(const PresetsOptions& options) {
+ExitCode Run(const PresetsOptions& options) {
     const EffectChoice choice({.effect = options.effect});
     const EffectInfo& effect = choice.Info();
     Json list = Json::array();
     for (std::uint32_t i = 0; i < effect.presets.size(); ++i) {
-        const auto session = choice.NewSession(i);
+        const auto session = choice.WithPreset(i).NewSession();
         if (options.asJson) {
             list.push_back(JsonOf(effect, effect.presets[i], *session));
         } else {

@@ -13,6 +13,6 @@ struct PresetsOptions {
 };
 
 // Throws UsageError when there is no such effect.
-ExitCode RunPresets(const PresetsOptions& options);
+ExitCode Run(const PresetsOptions& options);
 
 }  // namespace velmora::hosts

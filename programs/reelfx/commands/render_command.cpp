@@ -19,14 +19,15 @@ class RenderRun {
   public:
     explicit RenderRun(const RenderOptions& options)
         : m_options(options),
-          m_choice(options.effect),
+          m_effects(options.effects),
           m_section(options.section.farm
                         ? ResolveFarm(*options.section.farm, MediaReader::FrameTimes(options.input))
                         : options.section),
           m_reader(options.input) {
-        if (options.isMatte) CheckMatte(m_choice);
+        if (options.isMatte) CheckMatte(m_effects.Choices());
         if (!options.output) return;
         const std::int64_t firstImage = m_section.firstFrame + 1;
+        CheckIsNotInput(options.output->path, options.input.path, firstImage);
         if (options.isDryRun) {
             CheckOutputPlace(options.output->path, options.mayOverwrite, firstImage);
         } else {
@@ -42,7 +43,7 @@ class RenderRun {
         const std::int64_t frames = ClipSection::FrameCountGuess(m_reader, m_section);
         if (frames == 0 && m_reader.FrameCountGuess() > 0) FailEmpty();
         if (m_writer) m_writer->Rehearse(frames);
-        const std::string text = PlanText(m_options, m_section, m_choice, m_reader,
+        const std::string text = PlanText(m_options, m_section, m_effects, m_reader,
                                           m_writer ? &*m_writer : nullptr, ThreadCount());
         std::fputs(text.c_str(), stdout);
         return kExitDone;
@@ -78,7 +79,7 @@ class RenderRun {
 
     [[nodiscard]] unsigned ThreadCount() const {
         // A continuous random sequence needs the frames in order.
-        if (m_choice.IsSequence()) return 1;
+        if (m_effects.IsSequence()) return 1;
         return m_options.threads > 0 ? static_cast<unsigned>(m_options.threads)
                                      : std::max(1u, std::thread::hardware_concurrency());
     }
@@ -93,7 +94,7 @@ class RenderRun {
                                       .isMatte = m_options.isMatte};
         std::vector<FramePipeline::Worker> workers;
         for (unsigned i = 0; i < count; ++i) {
-            auto worker = std::make_shared<FrameWorker>(m_choice.NewSession(), job);
+            auto worker = std::make_shared<FrameWorker>(m_effects.NewSession(), job);
             workers.emplace_back([worker](PipelineItem& item) { worker->Work(item); });
         }
         return workers;
@@ -142,7 +143,7 @@ class RenderRun {
     }
 
     const RenderOptions& m_options;
-    EffectChoice m_choice;
+    EffectList m_effects;
     SectionOptions m_section;
     MediaReader m_reader;
     std::optional<OutputPlace> m_place;
@@ -152,7 +153,7 @@ class RenderRun {
 
 }  // namespace
 
-ExitCode RunRender(const RenderOptions& options) {
+ExitCode Run(const RenderOptions& options) {
     RenderRun run(options);
     return options.isDryRun ? run.Rehearse() : run.Run();
 }

@@ -1,7 +1,8 @@
-// `reelfx render`: a clip through an effect.
+// `reelfx render`: a clip through one or several effects.
 #pragma once
 
 #include <optional>
+#include <vector>
 
 #include "programs/reelfx/pipeline/clip_section.h"
 #include "programs/reelfx/common/effect_choice.h"
@@ -14,7 +15,7 @@ namespace velmora::hosts {
 
 struct RenderOptions {
     InputOptions input;
-    EffectOptions effect;
+    std::vector<EffectOptions> effects;  // in order, one at least
     SectionOptions section;
     std::optional<OutputOptions> output;  // none: digests only
     int threads = 0;                      // 0: one per processor
@@ -27,6 +28,6 @@ struct RenderOptions {
 };
 
 // Throws Failure or UsageError.
-ExitCode RunRender(const RenderOptions& options);
+ExitCode Run(const RenderOptions& options);
 
 }  // namespace velmora::hosts

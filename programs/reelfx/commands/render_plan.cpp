@@ -25,12 +25,11 @@ std::string SectionText(const SectionOptions& options, std::int64_t frames) {
 }
 
 std::string SettingsText(const EffectChoice& choice) {
-    const auto session = choice.NewSession();
     std::string text;
     for (std::uint32_t i = 0; i < choice.Info().params.size(); ++i) {
         const ParamInfo& param = choice.Info().params[i];
         if (!param.HoldsValue()) continue;
-        text += (text.empty() ? "" : ", ") + param.name + "=" + ShownValue(param, session->Value(i));
+        text += (text.empty() ? "" : ", ") + param.name + "=" + choice.ShownSetting(i);
     }
     return text;
 }
@@ -40,21 +39,25 @@ std::string RandomText(const EffectOptions& options) {
     return "seed " + std::to_string(options.seed);
 }
 
-}  // namespace
-
-std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectChoice& choice,
-                     const MediaReader& reader, const MediaWriter* writer, unsigned threads) {
-    const MediaFacts facts = FactsOf(reader);
+std::string EffectText(const EffectChoice& choice) {
     std::string effect = choice.Info().name;
     if (choice.Preset()) effect += ", preset " + choice.Info().presets[*choice.Preset()];
-    if (options.effect.presetFile) effect += ", preset file " + *options.effect.presetFile;
+    if (choice.Options().presetFile) effect += ", preset file " + *choice.Options().presetFile;
+    if (choice.MixText() != "100") effect += ", mix " + choice.MixText();
+    return Line("effect", effect) + Line("settings", SettingsText(choice)) +
+           Line("random", RandomText(choice.Options()));
+}
+
+}  // namespace
+
+std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectList& effects,
+                     const MediaReader& reader, const MediaWriter* writer, unsigned threads) {
+    const MediaFacts facts = FactsOf(reader);
     std::string text = Line("input", reader.Name() + ": " + ShortText(facts));
     for (const std::string& note : NotesOn(facts)) text += Line("note", note);
     text += Line("part", SectionText(section, ClipSection::FrameCountGuess(reader, section)));
-    text += Line("effect", effect);
+    for (const EffectChoice& choice : effects.Choices()) text += EffectText(choice);
     if (options.isMatte) text += Line("matte", "only the damage, with straight alpha");
-    text += Line("settings", SettingsText(choice));
-    text += Line("random", RandomText(options.effect));
     text += Line("threads", std::to_string(threads));
     text += Line("output", writer ? writer->Description() : "digests on standard output");
     return text;

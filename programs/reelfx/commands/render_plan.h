@@ -4,6 +4,7 @@
 #include <string>
 
 #include "programs/reelfx/pipeline/clip_section.h"
+#include "programs/reelfx/pipeline/effect_list.h"
 #include "programs/reelfx/media/media_writer.h"
 #include "programs/reelfx/commands/render_command.h"
 
@@ -11,7 +12,7 @@ namespace velmora::hosts {
 
 // Returns lines of text with line ends. `section` has the farm part resolved. A null `writer` means digests
 // only.
-std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectChoice& choice,
+std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectList& effects,
                      const MediaReader& reader, const MediaWriter* writer, unsigned threads);
 
 }  // namespace velmora::hosts

@@ -56,12 +56,14 @@ BgraPicture Cut(const BgraPicture& picture, const Rectangle& part) {
     return result;
 }
 
-std::string TitleOf(const StripOptions& options, const EffectChoice& choice, const Rectangle& part) {
-    const EffectOptions& effect = options.picture.effect;
-    std::string title = choice.Info().name;
-    if (effect.preset) title += ": " + *effect.preset;
-    for (const std::string& setting : effect.settings) title += ", " + setting;
-    if (!effect.randomState) title += ", seed " + std::to_string(effect.seed);
+std::string TitleOf(const EffectList& effects, const Rectangle& part) {
+    std::string title;
+    for (const EffectChoice& choice : effects.Choices()) {
+        const EffectOptions& effect = choice.Options();
+        title += (title.empty() ? "" : " + ") + choice.Title();
+        for (const std::string& setting : effect.settings) title += ", " + setting;
+        if (!effect.randomState) title += ", seed " + std::to_string(effect.seed);
+    }
     return title + ", " + TextOf(part);
 }
 
@@ -81,13 +83,14 @@ std::optional<Crop> ParseCrop(const std::string& text) {
     return Crop{*size, std::pair(static_cast<std::int32_t>(*left), static_cast<std::int32_t>(*top))};
 }
 
-ExitCode RunStrip(const StripOptions& options) {
+ExitCode Run(const StripOptions& options) {
     const PictureOptions& picture = options.picture;
     CheckStillName(picture.out);
-    const EffectChoice choice(picture.effect);
+    const EffectList effects(picture.effects);
+    CheckIsNotInput(picture.out, picture.input.path);
     CheckOutputPlace(picture.out, picture.mayOverwrite);
     const int columns = picture.columns > 0 ? picture.columns : options.frames;
-    const auto session = choice.NewSession();
+    EffectListSession session = effects.NewSession();
     ClipPictures frames(picture.input, picture.place, options.frames);
     std::optional<Rectangle> part;
     std::vector<GridCell> cells;
@@ -95,9 +98,9 @@ ExitCode RunStrip(const StripOptions& options) {
         std::optional<ClipPicture> frame = frames.Next();
         if (!frame) break;
         if (!part) part = PartOf(frame->picture, options.crop, columns);
-        cells.push_back({std::to_string(frame->index), Cut(Rendered(*session, *frame), *part)});
+        cells.push_back({std::to_string(frame->index), Cut(Rendered(session, *frame), *part)});
     }
-    const GridOptions grid = {TitleOf(options, choice, *part), columns, part->width};
+    const GridOptions grid = {TitleOf(effects, *part), columns, part->width};
     WriteStill(DrawGrid(cells, grid), picture.out, picture.mayOverwrite);
     return kExitDone;
 }

@@ -30,6 +30,6 @@ struct StripOptions {
 };
 
 // Throws Failure or UsageError.
-ExitCode RunStrip(const StripOptions& options);
+ExitCode Run(const StripOptions& options);
 
 }  // namespace velmora::hosts

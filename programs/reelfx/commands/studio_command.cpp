@@ -33,7 +33,7 @@ std::filesystem::path StudioPage(const std::filesystem::path& program) {
     return {};
 }
 
-ExitCode RunStudio(const StudioOptions& options) {
+ExitCode Run(const StudioOptions& options) {
     std::error_code error;
     const std::filesystem::path page = StudioPage(std::filesystem::read_symlink("/proc/self/exe", error));
     if (page.empty()) throw Failure(kExitInput, "the page reel.html is not installed beside reelfx");

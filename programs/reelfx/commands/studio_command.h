@@ -16,6 +16,6 @@ struct StudioOptions {
 [[nodiscard]] std::filesystem::path StudioPage(const std::filesystem::path& program);
 
 // Asks the desktop to open the page. Throws Failure when there is no page or no desktop that opens it.
-ExitCode RunStudio(const StudioOptions& options);
+ExitCode Run(const StudioOptions& options);
 
 }  // namespace velmora::hosts

@@ -1,5 +1,6 @@
 #include "programs/reelfx/common/effect_choice.h"
 
+#include <algorithm>
 #include <new>
 
 #include "effects/effect_queries.h"
@@ -24,6 +25,18 @@ EffectInfo Describe(const effects::EffectTable& table) {
     return info;
 }
 
+// --mix is read as if it were a parameter.
+const EffectInfo& MixInfo() {
+    static const EffectInfo info = [] {
+        ParamInfo mix;
+        mix.name = "--mix";
+        mix.kind = kKindSlider;
+        mix.maximum = 100.0f;
+        return EffectInfo{.name = "", .params = {mix}, .presets = {}};
+    }();
+    return info;
+}
+
 }  // namespace
 
 const std::vector<EffectInfo>& CoreEffects() {
@@ -36,7 +49,8 @@ const std::vector<EffectInfo>& CoreEffects() {
     return all;
 }
 
-EffectChoice::EffectChoice(const EffectOptions& options) : m_options(options) {
+EffectChoice::EffectChoice(const EffectOptions& options)
+    : m_options(options), m_mix(MixInfo(), "--mix=" + options.mix) {
     std::optional<PresetRecord> record;
     if (options.presetFile) record = LoadPresetFile(*options.presetFile);
     std::string effect = options.effect;
@@ -45,25 +59,64 @@ EffectChoice::EffectChoice(const EffectOptions& options) : m_options(options) {
     m_index = FindEffect(CoreEffects(), effect);
     m_info = &CoreEffects()[m_index];
     if (options.preset) m_preset = FindPreset(*m_info, *options.preset);
-    if (record) m_settings = PresetSettings(*record, *m_info, *options.presetFile);
-    for (const std::string& text : options.settings) m_settings.push_back(ParseSetting(*m_info, text));
+    if (record) m_fileSettings = PresetSettings(*record, *m_info, *options.presetFile);
+    for (const std::string& text : options.settings) m_settings.emplace_back(*m_info, text);
 }
 
-std::unique_ptr<effects::EffectSession> EffectChoice::NewSession(std::optional<std::uint32_t> preset) const {
+std::string EffectChoice::Title() const {
+    return m_info->name + (m_preset ? ": " + m_info->presets[*m_preset] : "");
+}
+
+EffectChoice EffectChoice::WithPreset(std::uint32_t preset) const {
+    EffectChoice choice = *this;
+    choice.m_preset = preset;
+    choice.m_fileSettings.clear();
+    return choice;
+}
+
+std::unique_ptr<effects::EffectSession> EffectChoice::NewSession() const {
     auto session = effects::EffectSession::Create(*effects::kAllEffects[m_index]);
     if (!session) throw std::bad_alloc();
-    if (preset) {
-        session->ApplyPreset(*preset);
-    } else {
-        if (m_preset) session->ApplyPreset(*m_preset);
-        for (const Setting& setting : m_settings) session->SetValue(setting.parameter, setting.value);
-    }
+    if (m_preset) session->ApplyPreset(*m_preset);
+    for (const Setting& setting : m_fileSettings) session->SetValue(setting.parameter, setting.value);
+    MoveTo({}, *session);
     if (m_options.randomState) {
         session->StartRandom(*m_options.randomState);
     } else {
         session->PinRandom(m_options.seed);
     }
     return session;
+}
+
+bool EffectChoice::Fades() const {
+    return std::ranges::any_of(m_settings, &TimedSetting::Fades);
+}
+
+void EffectChoice::MoveTo(const ClipPlace& place, effects::EffectSession& session) const {
+    for (const TimedSetting& setting : m_settings) session.SetValue(setting.Parameter(), setting.At(place));
+}
+
+std::string EffectChoice::MixText() const {
+    return m_mix.Text(MixInfo().params.front());
+}
+
+const TimedSetting* EffectChoice::TimedSettingOf(std::uint32_t parameter) const {
+    // The last one counts.
+    const auto found =
+        std::find_if(m_settings.rbegin(), m_settings.rend(),
+                     [parameter](const TimedSetting& setting) { return setting.Parameter() == parameter; });
+    return found == m_settings.rend() ? nullptr : &*found;
+}
+
+std::string EffectChoice::ShownSetting(std::uint32_t parameter) const {
+    const ParamInfo& param = m_info->params[parameter];
+    const TimedSetting* setting = TimedSettingOf(parameter);
+    return setting ? setting->Text(param) : ShownValue(param, NewSession()->Value(parameter));
+}
+
+std::vector<ValueWord> EffectChoice::ValuesOf(std::uint32_t parameter) const {
+    const TimedSetting* setting = TimedSettingOf(parameter);
+    return setting ? setting->Values() : std::vector{NewSession()->Value(parameter)};
 }
 
 }  // namespace velmora::hosts

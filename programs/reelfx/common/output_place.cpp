@@ -4,6 +4,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <fcntl.h>
+#include <string_view>
 #include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -33,6 +34,19 @@ bool SomethingStandsAt(const std::string& path, std::int64_t firstImage) {
     }
     return fs::exists(path, ignored);
 }
+
+// The file that stands for a path: of a pattern, the first one with a number from `first` to `last`.
+fs::path FileOf(const std::string& path, std::int64_t first, std::int64_t last) {
+    std::error_code ignored;
+    char name[4096];
+    for (std::int64_t number = first; number <= last; ++number) {
+        if (av_get_frame_filename(name, sizeof name, path.c_str(), static_cast<int>(number)) < 0) break;
+        if (fs::exists(name, ignored)) return name;
+    }
+    return path;
+}
+
+constexpr std::int64_t kLastStart = 4;  // where the numbers of a sequence may begin at most
 
 constexpr char kHiddenFolder[] = ".reelfx-XXXXXX";
 constexpr std::size_t kPrefixLength = sizeof kHiddenFolder - 1 - 6;
@@ -86,6 +100,25 @@ fs::path MakeHiddenFolder(const fs::path& beside, const std::string& name, int& 
 }
 
 }  // namespace
+
+std::string LocalPath(const std::string& path) {
+    constexpr std::string_view kProtocol = "file:";
+    return path.starts_with(kProtocol) ? path.substr(kProtocol.size()) : path;
+}
+
+void CheckIsNotInput(const std::string& path, const std::string& input, std::int64_t firstImage) {
+    std::error_code ignored;
+    const fs::path out(path), in(input);
+    const bool isSamePattern =
+        out.filename() == in.filename() &&
+        fs::equivalent(fs::absolute(out).parent_path(), fs::absolute(in).parent_path(), ignored);
+    const fs::path file = FileOf(path, firstImage, firstImage);
+    const bool isSameFile =
+        fs::is_regular_file(file, ignored) && fs::equivalent(file, FileOf(input, 0, kLastStart), ignored);
+    if (path == "-" || (!isSamePattern && !isSameFile)) return;
+    throw Failure(kExitUsage,
+                  path + ": is the input, which would be lost; choose another name for the output");
+}
 
 void CheckOutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage) {
     if (path == "-") {

@@ -12,6 +12,13 @@ namespace velmora::hosts {
 // Throws what the constructor of OutputPlace would throw, as far as can be known without writing.
 void CheckOutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage = 1);
 
+// "file:a.mp4" names a.mp4, as for FFmpeg; every other path stands for itself.
+std::string LocalPath(const std::string& path);
+
+// Throws Failure (kExitUsage) if writing to `path` would replace `input`, also under another name or through a link.
+// Both may be patterns of image files.
+void CheckIsNotInput(const std::string& path, const std::string& input, std::int64_t firstImage = 1);
+
 class OutputPlace {
   public:
     // `path` is a file's name, a pattern of image files ("frames-%04d.png"), or "-" for standard output.

@@ -2,7 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
-#include <string_view>
+#include <string>
 
 #include "programs/common/usage_error.h"
 
@@ -32,19 +32,36 @@ void ReadPixel(std::uint8_t* pixel) {
     pixel[3] = alpha;
 }
 
-}  // namespace
+bool HasDamage(const EffectInfo& info) {
+    return std::ranges::any_of(info.params, [](const ParamInfo& param) { return param.name == "Wear"; });
+}
 
-void CheckMatte(const EffectChoice& choice) {
-    const auto session = choice.NewSession();
-    bool hasDamage = false;
+// Wear in one channel only would need an opacity for each channel.
+void CheckChannels(const EffectChoice& choice) {
     for (std::uint32_t i = 0; i < choice.Info().params.size(); ++i) {
         const ParamInfo& param = choice.Info().params[i];
-        hasDamage = hasDamage || param.name == std::string_view("Wear");
-        if (param.name == std::string_view("Blue Channel Only") && session->Value(i).flag != 0) {
-            throw UsageError("--matte cannot show wear in one channel only; add --set \"" + param.name + "=off\"");
+        if (param.name != "Blue Channel Only") continue;
+        const std::vector<ValueWord> values = choice.ValuesOf(i);
+        if (std::ranges::any_of(values, [](ValueWord value) { return value.flag != 0; })) {
+            throw UsageError("--matte cannot show wear in one channel only; add --set \"" + param.name +
+                             "=off\"");
         }
     }
-    if (!hasDamage) throw UsageError("--matte needs damage, and \"" + choice.Info().name + "\" has none");
+}
+
+}  // namespace
+
+void CheckMatte(const std::vector<EffectChoice>& choices) {
+    bool hasDamage = false;
+    std::string names;
+    for (const EffectChoice& choice : choices) {
+        CheckChannels(choice);
+        hasDamage = hasDamage || HasDamage(choice.Info());
+        names += (names.empty() ? "\"" : ", \"") + choice.Info().name + '"';
+    }
+    if (hasDamage) return;
+    throw UsageError("--matte needs damage, and " + names +
+                     (choices.size() == 1 ? " has none" : " have none"));
 }
 
 void FillMatteGround(BgraPicture& picture) {

@@ -1,4 +1,4 @@
-// The damage of an effect as a separate picture, for compositing in other programs: wear, spots and scratches
+// The damage of the effects as a separate picture, for compositing in other programs: wear, spots and scratches
 // on a transparent background, with straight alpha (colours not multiplied by it), as editors and their file
 // formats expect. Laid over the picture, it gives the damaged picture.
 //
@@ -7,14 +7,16 @@
 // give the opacity and grey of every pixel.
 #pragma once
 
+#include <vector>
+
 #include "programs/reelfx/media/bgra_picture.h"
 #include "programs/reelfx/common/effect_choice.h"
 
 namespace velmora::hosts {
 
-// Throws UsageError when the effect makes no damage, or damage that a matte with one opacity for all channels
-// cannot show.
-void CheckMatte(const EffectChoice& choice);
+// Effects without damage leave a matte alone. Throws UsageError when no effect makes damage, or one makes damage that
+// a matte with one opacity for all channels cannot show.
+void CheckMatte(const std::vector<EffectChoice>& choices);
 
 // The picture on which the effect draws its damage.
 void FillMatteGround(BgraPicture& picture);

@@ -68,12 +68,10 @@ void ClipPictures::FailWithoutFrame() const {
     throw Failure(kExitInput, m_reader.Name() + ": " + what);
 }
 
-BgraPicture Rendered(effects::EffectSession& session, ClipPicture& source) {
+BgraPicture Rendered(EffectListSession& effects, ClipPicture& source) {
     FailIfInterrupted();
-    BgraPicture result(source.picture.Width(), source.picture.Height());
-    if (!session.Render(source.picture.Record(), result.Record(), source.seconds)) {
-        throw Failure(kExitInternal, "the frame cannot be rendered");
-    }
+    BgraPicture result;
+    effects.Render(source.picture, result, {.frame = source.index, .seconds = source.seconds});
     return result;
 }
 

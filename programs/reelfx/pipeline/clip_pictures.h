@@ -4,9 +4,9 @@
 #include <cstdint>
 #include <optional>
 
-#include "effects/effect_session.h"
 #include "programs/reelfx/media/bgra_picture.h"
 #include "programs/reelfx/pipeline/clip_section.h"
+#include "programs/reelfx/pipeline/effect_list.h"
 #include "programs/reelfx/media/media_reader.h"
 
 namespace velmora::hosts {
@@ -42,7 +42,7 @@ class ClipPictures {
     bool m_hasBegun = false;
 };
 
-// Applies the effect to the picture. Throws Failure if the user interrupts, or with kExitInternal.
-BgraPicture Rendered(effects::EffectSession& session, ClipPicture& source);
+// Applies the effects to the picture. Throws Failure if the user interrupts, or with kExitInternal.
+BgraPicture Rendered(EffectListSession& effects, ClipPicture& source);
 
 }  // namespace velmora::hosts

@@ -3,7 +3,6 @@
 #include <cstring>
 
 #include "programs/common/digest.h"
-#include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/pictures/matte.h"
 #include "programs/reelfx/media/picture_turn.h"
 
@@ -19,9 +18,9 @@ bool IsSame(const BgraPicture& a, const BgraPicture& b) {
 
 }  // namespace
 
-FrameWorker::FrameWorker(std::unique_ptr<effects::EffectSession> session, const Job& job)
-    : m_session(std::move(session)), m_job(job), m_source(job.size.width, job.size.height) {
-    if (job.isMatte) m_session->KeepDamageOnly();
+FrameWorker::FrameWorker(EffectListSession session, const Job& job)
+    : m_effects(std::move(session)), m_job(job), m_source(job.size.width, job.size.height) {
+    if (job.isMatte) m_effects.KeepDamageOnly();
 }
 
 void FrameWorker::Work(PipelineItem& item) {
@@ -44,26 +43,21 @@ void FrameWorker::Work(PipelineItem& item) {
 BgraPicture& FrameWorker::Result(const PipelineItem& item) {
     if (!m_job.isMatte) {
         m_converter.ToBgra(*item.frame, m_source);
-        return Apply(item.seconds);
+        return Apply(item);
     }
     FillMatteGround(m_source);
-    BgraPicture& result = Apply(item.seconds);
+    BgraPicture& result = Apply(item);
     ReadMatte(result);
     return result;
 }
 
-BgraPicture& FrameWorker::Apply(double seconds) {
+BgraPicture& FrameWorker::Apply(const PipelineItem& item) {
     BgraPicture* input = &m_source;
     if (m_job.quarterTurns != 0) {
         TurnPicture(m_source, m_job.quarterTurns, m_upright);
         input = &m_upright;
     }
-    if (m_result.Width() != input->Width() || m_result.Height() != input->Height()) {
-        m_result.Resize(input->Width(), input->Height());
-    }
-    if (!m_session->Render(input->Record(), m_result.Record(), seconds)) {
-        throw Failure(kExitInternal, "a frame cannot be rendered");
-    }
+    m_effects.Render(*input, m_result, {.frame = item.index, .seconds = item.seconds});
     if (m_job.quarterTurns == 0) return m_result;
     TurnPicture(m_result, 4 - m_job.quarterTurns, m_source);
     return m_source;

@@ -1,12 +1,11 @@
-// What one thread does with a frame: convert it to BGRA, turn it upright, apply the effect, and convert it
+// What one thread does with a frame: convert it to BGRA, turn it upright, apply the effects, and convert it
 // back.
 #pragma once
 
 #include <functional>
-#include <memory>
 
-#include "effects/effect_session.h"
 #include "programs/reelfx/media/bgra_picture.h"
+#include "programs/reelfx/pipeline/effect_list.h"
 #include "programs/reelfx/pipeline/frame_pipeline.h"
 #include "programs/reelfx/media/media_writer.h"
 #include "programs/reelfx/media/pixel_converter.h"
@@ -22,16 +21,16 @@ class FrameWorker {
         bool withDigest = false;
         bool isMatte = false;  // the result is only the damage, see matte.h
     };
-    FrameWorker(std::unique_ptr<effects::EffectSession> session, const Job& job);
+    FrameWorker(EffectListSession session, const Job& job);
 
     // Replaces the frame by its result and fills in the digest.
     void Work(PipelineItem& item);
 
   private:
     BgraPicture& Result(const PipelineItem& item);
-    BgraPicture& Apply(double seconds);  // the result for m_source, turned as the source is
+    BgraPicture& Apply(const PipelineItem& item);  // the result for m_source, turned as the source is
 
-    std::unique_ptr<effects::EffectSession> m_session;
+    EffectListSession m_effects;
     Job m_job;
     PixelConverter m_converter;
     BgraPicture m_source, m_result, m_upright;

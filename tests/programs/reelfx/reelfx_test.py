@@ -182,6 +182,90 @@ class SameBytes(ReelfxTest):
         self.assertEqual(self.digests(*neutral, source=raw), expected)
 
 
+class Lists(ReelfxTest):
+    """Several effects in one pass, their mix, and settings that change over time."""
+
+    LOOK = ("-e", "Film Look", "-p", "Sepia")
+    DAMAGE = ("-e", "Film Damage", "-p", "Aged", "--seed", 3)
+    RAW = ("--size", "320x180", "--rate", "30")
+
+    @classmethod
+    def setUpClass(cls):
+        cls.raw = clips.root / "plain.bgra"
+        ffmpeg("-i", clips.small, "-fps_mode", "passthrough", "-pix_fmt", "bgra", "-f", "rawvideo", cls.raw)
+
+    def bytes_of(self, *options, source=None):
+        out = self.render(source or self.raw, "out.bgra", *self.RAW, "--raw-bgra", "-y", "--frames", ":9", *options)
+        return out.read_bytes()
+
+    def test_one_pass_is_as_good_as_several(self):
+        looked = self.out / "looked.bgra"
+        looked.write_bytes(self.bytes_of(*self.LOOK))
+        damaged = self.out / "damaged.bgra"
+        damaged.write_bytes(self.bytes_of(*self.DAMAGE, source=looked))
+        self.assertEqual(self.bytes_of(*self.LOOK, "--then", *self.DAMAGE), damaged.read_bytes())
+        shaken = ("-e", "Film Camera", "-p", "Train Ride", "--mix", 30)
+        self.assertEqual(self.bytes_of(*self.LOOK, "--then", *self.DAMAGE, "--then", *shaken),
+                         self.bytes_of(*shaken, "--seed", 3, source=damaged), "the seed of the effect before")
+
+    def test_a_mix_lies_between_both(self):
+        before, after = self.raw.read_bytes(), self.bytes_of(*self.LOOK)
+        half = self.bytes_of(*self.LOOK, "--mix", 50)
+        self.assertEqual(half, bytes((a + b + 1) // 2 for a, b in zip(before, after)))
+        self.assertEqual(self.bytes_of(*self.LOOK, "--mix", "0@3 50@5"),
+                         before[:4 * len(after) // 9] + self.bytes_of(*self.LOOK, "--mix", 25)[4 * len(after) // 9:][:len(after) // 9]
+                         + half[5 * len(after) // 9:])
+
+    def test_a_fade_gives_each_frame_its_own_value(self):
+        frames = ("Film Damage", "-s", "Spots=50", "--seed", 3)
+        fade = self.digests("-e", *frames, "-s", "Wear=0@0 50@20", "-s", "Pattern=Fine@0 Grainy@30")
+        constant = {wear: self.digests("-e", *frames, "-s", f"Wear={wear}", "-s", "Pattern=Fine") for wear in (0, 25, 50)}
+        self.assertEqual([fade[0], fade[10], *fade[20:30]],
+                         [constant[0][0], constant[25][10], *constant[50][20:30]])
+        self.assertEqual(fade[30:], self.digests("-e", *frames, "-s", "Wear=50", "-s", "Pattern=Grainy")[30:])
+        by_time = [self.digests("-e", *frames, "-s", f"Wear={points}", *self.RAW, source=self.raw)
+                   for points in ("20@6 80@36", "20@0.2s 80@1.2s")]
+        self.assertEqual(*by_time)
+
+    def test_workers_and_pieces_do_not_matter(self):
+        options = (*self.LOOK, "--mix", "0@0 100@1s", "--then", *self.DAMAGE, "-s", "Wear=10@0 60@30", "-s",
+                   "Density=0@5 80@35", "-s", "Depth=50", "-s", "Black=on")
+        whole = self.digests(*options, "-j", 1)
+        self.assertEqual(len(set(whole)), 41)
+        self.assertEqual(self.digests(*options, "-j", 5), whole)
+        self.assertEqual([d for n in (1, 2, 3) for d in self.digests(*options, "--farm", f"{n}/3")], whole)
+        self.assertEqual(self.digests(*options, "--frames", "30:"), whole[30:])
+        by_time = (*self.LOOK, "--mix", "0@0 100@1s")
+        self.assertEqual(self.digests(*by_time, "--start", frame_times(clips.small)[20]), self.digests(*by_time)[20:])
+
+    def test_a_matte_has_the_damage_of_the_whole_list(self):
+        mattes = [self.bytes_of(*options, "--matte") for options in
+                  (self.DAMAGE, (*self.LOOK, "--then", *self.DAMAGE, "--then", *CAMERA, "-s", "X Jitter=9"))]
+        self.assertEqual(*mattes)
+        self.assertNotEqual(mattes[0], self.bytes_of(*self.DAMAGE, "--then", *self.DAMAGE[:4], "--seed", 9, "--matte"))
+
+    def test_samples_are_kept_when_the_whole_list_is_neutral(self):
+        neutral = (*CAMERA, "-p", "Reset To None", "--then", *self.LOOK, "--mix", 0)
+        out = self.render(clips.small, "out.mkv", *neutral, "--codec", "ffv1")
+        self.assertEqual(frame_digests(out), frame_digests(clips.small))
+        back = ("-e", "Film Look", "-s", "Saturation=-100", "--then", "-e", "Film Look", "-p", "Reset To None")
+        grey = self.render(clips.small, "grey.mkv", *back, "--codec", "ffv1")
+        self.assertNotEqual(frame_digests(grey)[0], frame_digests(clips.small)[0])
+
+    def test_a_dry_run_and_a_strip_have_the_whole_list(self):
+        options = (*self.LOOK, "--mix", 40, "--then", "-e", "Film Damage", "-s", "Wear=10@38 60@40")
+        text = reelfx("render", clips.small, self.out / "a.mp4", *options, "--dry-run").stdout.decode()
+        for words in ("Film Look, preset Sepia, mix 40", "Film Damage", "Wear=10@38 60@40"):
+            self.assertIn(words, text)
+        strip = self.out / "s.png"
+        self.assertEqual(reelfx("strip", clips.small, strip, *options, "-n", 38, "--crop", "64x100+32+16").stderr, b"")
+        self.render(clips.small, "r-%d.png", *options, "--frames", "38:")
+        for place in range(3):
+            shown = frame_digests(strip, "-vf", f"crop=64:100:{4 + place * 68}:32", "-pix_fmt", "rgb24")
+            self.assertEqual(shown, frame_digests(self.out / f"r-{39 + place}.png", "-vf", "crop=64:100:32:16", "-pix_fmt",
+                                                  "rgb24"))
+
+
 class Matte(ReelfxTest):
     """The damage matte, composited over the picture by a real compositor, gives the damaged picture."""
 
@@ -401,6 +485,10 @@ class Refusing(ReelfxTest):
         ffmpeg("-i", small, "-vn", "-c", "copy", silent)
         truncated = clips.root / "truncated.mp4"
         truncated.write_bytes(small.read_bytes()[:4000])
+        picture, links = self.out / "p-1.png", (clips.root / "symbolic.mp4", clips.root / "hard.mp4")
+        ffmpeg("-i", small, "-frames:v", 1, picture)
+        links[0].symlink_to(small.name)
+        links[1].hardlink_to(small)
         render = ("render", small, out)
         rows = [
             (2, ["Film Foo", "Film Pro"], (*render, "-e", "Film Foo")),
@@ -410,6 +498,24 @@ class Refusing(ReelfxTest):
             (2, ["#RRGGBB", "red"], (*render, *CAMERA, "-s", "Border=red")),
             (2, ["NAME=VALUE"], (*render, *CAMERA, "-s", "X Jitter")),
             (2, ["--effect"], render),
+            (2, ["did you mean \"Film Look\"?"], (*render, "-e", "Film Lok")),
+            (2, ["did you mean \"Train Ride\"?"], (*render, *CAMERA, "-p", "Train")),
+            (2, ["did you mean \"X Jitter\"?"], (*render, *CAMERA, "-s", "X Gitter=3")),
+            (2, ["did you mean \"--effect\"? See"], (*render, "--efect", "Film Look")),
+            (2, ["\"x\", \"y\""], (*render, "x", "y", *CAMERA)),
+            (2, ["ascend", "3@5 4@3"], (*render, *CAMERA, "-s", "X Jitter=3@5 4@3")),
+            (2, ["0 to 100", "101"], (*render, *CAMERA, "--mix", "101")),
+            (2, ["--effect", "twice", "--then"], (*render, *CAMERA, *CAMERA)),
+            (2, ["--effect is missing"], (*render, *CAMERA, "--then", "--mix", "3")),
+            (2, ["--random-state", "--then"], (*render, *CAMERA, "--random-state", "1f", "--then", *CAMERA)),
+            (2, ["change over time"], ("preset", "save", self.out / "p", *CAMERA, "-s", "X Jitter=3@5 4@9")),
+            (2, ["is the input"], ("render", small, small.parent / "." / ".." / small.parent.name / small.name, *CAMERA, "-y")),
+            (2, ["is the input"], ("render", f"file:{small}", links[0], *CAMERA, "-y")),
+            (2, ["is the input"], ("render", small, f"file:{links[1]}", *CAMERA, "-y")),
+            (2, ["is the input"], ("frame", picture, self.out / ".." / self.id() / picture.name, *CAMERA, "-y")),
+            (2, ["is the input"], ("render", self.out / "p-%d.png", f"{self.out}/./p-%d.png", *CAMERA, "-y")),
+            (2, ["frame, counted from 0", "\"-1\""], ("frame", small, self.out / "out.png", *CAMERA, "-n", "-1")),
+            (2, ["no option \"--preset\""], ("sheet", small, self.out / "out.png", *CAMERA, "--preset", "Oldie")),
             (2, ["no command \"frobnicate\"", "render"], ("frobnicate", small)),
             (2, ["no command \"dance\"", "show"], ("preset", "dance")),
             (2, ["no option \"--verson\""], ("--verson",)),
@@ -453,7 +559,7 @@ class Refusing(ReelfxTest):
                 self.check(code, words, *args)
                 if args[:1] == ("render",):
                     self.check(code, words, *args, "--dry-run")
-        self.assertEqual(self.left_over(), ["text.mp4"])
+        self.assertEqual(self.left_over(), ["p-1.png", "text.mp4"])
         self.assertEqual(text.read_text(), "no film")
 
     def test_empty_pipe(self):
