@@ -4,7 +4,6 @@
 #include <memory>
 #include <new>
 
-#include "effects/render_options.h"
 #include "platform/platform.h"
 
 namespace velmora {
@@ -23,7 +22,6 @@ KeptList* g_currentList = nullptr;
 struct SeededState : render::RenderState {
     SeededState() noexcept { random.Seed(support::TickCount()); }
 } g_state;
-const render::RenderOptions g_options = ReadRenderOptions();
 
 }  // namespace
 
@@ -56,8 +54,8 @@ MasterSettingsList* CurrentMasterSettings() noexcept {
     return g_currentList == nullptr ? nullptr : &g_currentList->list;
 }
 
-RenderSession ProcessSession() noexcept {
-    return {CurrentMasterSettings(), &g_state, g_options};
+RenderSession ProcessSession(const render::RenderOptions& options) noexcept {
+    return {CurrentMasterSettings(), &g_state, options};
 }
 
 }  // namespace velmora

@@ -34,6 +34,6 @@ void SetBuildMode(std::int32_t mode) noexcept;
 
 // The session of all effects created through the library. Its random numbers start from the system's tick
 // count at load, so that damage differs from run to run.
-[[nodiscard]] RenderSession ProcessSession() noexcept;
+[[nodiscard]] RenderSession ProcessSession(const render::RenderOptions& options = {}) noexcept;
 
 }  // namespace velmora

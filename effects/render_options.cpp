@@ -24,9 +24,16 @@ std::string_view Variable(const char* name) noexcept {
 
 }  // namespace
 
+std::string_view NameOf(render::SimdLevel level) noexcept {
+    for (const NamedLevel& named : kLevels) {
+        if (named.level == level) return named.name;
+    }
+    return {};
+}
+
 render::RenderOptions ReadRenderOptions() noexcept {
     render::RenderOptions options;
-    const std::string_view wanted = Variable("VELMORA_SIMD");
+    const std::string_view wanted = Variable(kSimdVariable);
     for (const NamedLevel& named : kLevels) {
         if (named.name == wanted) options.level = std::min(options.level, named.level);
     }

@@ -36,7 +36,7 @@ bool VM_CALL CRsVelmoraEffect::GetParamInfo(std::uint32_t index, ParamDescriptor
 bool VM_CALL CRsVelmoraEffect::Process(IVideoHost* host, const FrameRecord* source, void*,
                                        const FrameRecord* destination, const TimingRecord* timing) {
     const FloatGuard guard;
-    const RenderSession session = ProcessSession();
+    const RenderSession session = ProcessSession(m_options);
     if (host == nullptr || session.settings == nullptr || BuildMode() != kBuildModeReady) return false;
     return RenderFrame(session, *host, source, destination, timing);
 }

@@ -4,6 +4,7 @@
 
 #include "api/com_object.h"
 #include "api/host_api.h"
+#include "effects/render_options.h"
 
 namespace velmora {
 
@@ -23,6 +24,7 @@ class CRsVelmoraEffect final : public IVideoEffect {
     bool VM_CALL GetPresetValue(std::uint32_t preset, std::uint32_t parameter, PresetCell* cell) override;
 
   private:
+    const render::RenderOptions m_options = ReadRenderOptions();
     ReferenceCount m_references;
 };
 

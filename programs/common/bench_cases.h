@@ -3,6 +3,7 @@
 
 #include <cstdint>
 #include <span>
+#include <string>
 
 namespace velmora::bench {
 
@@ -17,10 +18,15 @@ struct BenchCase {
     const char* name;
     std::uint32_t effect;               // index in the library's order
     std::span<const CaseValue> values;  // other parameters: "Reset To None"
-    double goalNative;                  // x memcpy of a frame
+    double goalNative;                  // with AVX2, as a ratio to a memcpy of a frame
     double goalDll;
+    double goalBelow;  // the same with SSSE3, for both builds; 0: none
 };
 
 [[nodiscard]] std::span<const BenchCase> BenchCases() noexcept;
+// The one of them that makes the most work.
+[[nodiscard]] const BenchCase& EverythingCase() noexcept;
+// The case's name with its goals.
+[[nodiscard]] std::string TitleOf(const BenchCase& test, double goal);
 
 }  // namespace velmora::bench

@@ -52,11 +52,4 @@ double SecondsOfThisThread() {
 #endif
 }
 
-double PairedTimes::Typical(std::vector<double> values) {
-    if (values.empty()) return 0;
-    const auto at = values.begin() + static_cast<std::ptrdiff_t>(values.size() / 4);
-    std::nth_element(values.begin(), at, values.end());
-    return *at;
-}
-
 }  // namespace velmora::bench

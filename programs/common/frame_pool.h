@@ -1,4 +1,4 @@
-// Frames for measurements, and the measurement: the cost of work on a frame compared with a memcpy of one.
+// Frames for measurements.
 #pragma once
 
 #include <cstddef>
@@ -49,42 +49,5 @@ class FramePool {
 // The processor time of this thread, so that other programs are not counted; on Windows, where that is too
 // coarse, the elapsed time.
 [[nodiscard]] double SecondsOfThisThread();
-
-// Times of the work and of the copies alternating with it, in seconds.
-struct PairedTimes {
-    std::vector<double> works, copies;
-
-    // The lower quartiles: the cost of a run on an idle machine.
-    [[nodiscard]] double Work() const { return Typical(works); }
-    [[nodiscard]] double Copy() const { return Typical(copies); }
-    [[nodiscard]] double Ratio() const { return Work() / Copy(); }
-
-  private:
-    static double Typical(std::vector<double> values);
-};
-
-// A copy, then the work, each on the next pair of frames.
-template <typename Work>
-void RunPair(FramePool& pool, PairedTimes& times, Work&& work) {
-    const auto timed = [](auto&& action) {
-        const double start = SecondsOfThisThread();
-        action();
-        return SecondsOfThisThread() - start;
-    };
-    pool.Next();
-    times.copies.push_back(timed([&] { pool.Copy(); }));
-    pool.Next();
-    times.works.push_back(timed(work));
-}
-
-// The cost of a frame after a long jump, compared with a copy: `render(seconds)` renders the current pair of
-// frames near the start of the clip, which is not measured, and then at 10 h. Each round jumps to a different
-// time, so that nothing kept from an earlier round helps.
-template <typename Render>
-void RunJump(FramePool& pool, PairedTimes& times, Render&& render) {
-    const double round = static_cast<double>(times.works.size());
-    render(1.0 + round);
-    RunPair(pool, times, [&] { render(36000.0 + 7.0 * round); });
-}
 
 }  // namespace velmora::bench

@@ -1,6 +1,6 @@
 #include "programs/reelhost/measurements.h"
 
-#include <cstdio>
+#include <memory>
 #include <stdexcept>
 #include <string>
 
@@ -8,56 +8,63 @@
 #include "programs/common/frame_pool.h"
 #include "programs/common/effect_info.h"
 #include "programs/common/effect_run.h"
+#include "programs/common/level_times.h"
 
 namespace velmora::hosts {
 namespace {
 
 using bench::FramePool;
-using bench::PairedTimes;
+using bench::LevelTimes;
 
-EffectRun RunOf(const EffectLibrary& library, const bench::BenchCase& test) {
-    EffectRun run(library, test.effect);
-    run.ApplyPreset(FindPreset(run.Info(), "Reset To None"));
+std::unique_ptr<EffectRun> RunOf(const EffectLibrary& library, const bench::BenchCase& test) {
+    auto run = std::make_unique<EffectRun>(library, test.effect);
+    run->ApplyPreset(FindPreset(run->Info(), "Reset To None"));
     for (const bench::CaseValue& value : test.values) {
         ValueWord word = {};
-        if (run.Info().params[value.parameter].kind == kKindSlider) {
+        if (run->Info().params[value.parameter].kind == kKindSlider) {
             word.number = static_cast<float>(value.value);
         } else {
             word.bits = static_cast<std::uint32_t>(value.value);
         }
-        run.Set({value.parameter, word});
+        run->Set({value.parameter, word});
     }
     return run;
 }
 
-PairedTimes Measure(EffectRun& run, FramePool& pool, double startSeconds) {
-    constexpr int kFrames = 80;
-    PairedTimes times;
+constexpr int kFrames = 80, kJumps = 30;
+
+// Frames from a time on, 30 a second.
+LevelTimes Measure(const EffectLibrary& library, const bench::BenchCase& test, FramePool& pool,
+                   double startSeconds) {
+    auto runs = bench::MakeAtEachLevel([&] { return RunOf(library, test); });
+    LevelTimes times;
     for (int i = 0; i < kFrames; ++i) {
-        RunPair(pool, times, [&] {
-            run.Render(pool.Record(pool.Source()), pool.Record(pool.Destination()), startSeconds + i / 30.0);
+        times.AddRound(pool, [&](std::size_t level) {
+            runs[level]->Render(pool.Record(pool.Source()), pool.Record(pool.Destination()),
+                                startSeconds + i / 30.0);
         });
     }
     return times;
 }
 
-PairedTimes MeasureJumps(EffectRun& run, FramePool& pool) {
-    constexpr int kJumps = 30;
-    PairedTimes times;
+LevelTimes MeasureJumps(const EffectLibrary& library, const bench::BenchCase& test, FramePool& pool) {
+    auto runs = bench::MakeAtEachLevel([&] { return RunOf(library, test); });
+    LevelTimes times;
     for (int i = 0; i < kJumps; ++i) {
-        RunJump(pool, times, [&](double seconds) {
-            run.Render(pool.Record(pool.Source()), pool.Record(pool.Destination()), seconds);
+        times.AddJump(pool, [&](std::size_t level, double seconds) {
+            runs[level]->Render(pool.Record(pool.Source()), pool.Record(pool.Destination()), seconds);
         });
     }
     return times;
 }
 
 // The 4:2:2 frame uses the first half of its buffer.
-PairedTimes MeasureConversion(IFrameProcessor& processor, FramePool& pool, bool toBgra) {
-    constexpr int kFrames = 120;
-    PairedTimes times;
+LevelTimes MeasureConversion(const EffectLibrary& library, FramePool& pool, bool toBgra) {
+    const auto processors = bench::MakeAtEachLevel([&] { return library.CreateFrameProcessor(); });
+    LevelTimes times;
     for (int i = 0; i < kFrames; ++i) {
-        RunPair(pool, times, [&] {
+        times.AddRound(pool, [&](std::size_t level) {
+            IFrameProcessor& processor = *processors[level];
             FrameRecord source = pool.Record(pool.Source()), destination = pool.Record(pool.Destination());
             (toBgra ? source : destination).rowStep /= 2;
             const bool done = toBgra ? processor.ConvertYcbcrToBgra(&source, &destination, 255)
@@ -68,33 +75,22 @@ PairedTimes MeasureConversion(IFrameProcessor& processor, FramePool& pool, bool 
     return times;
 }
 
-void PrintRow(const std::string& name, const PairedTimes& times, const std::string& goal) {
-    std::printf("| %s | %.2f | %.2f | %s |\n", name.c_str(), 1000 * times.Work(), times.Ratio(),
-                goal.c_str());
-    std::fflush(stdout);
-}
-
-std::string GoalText(double goal) {
-    return std::to_string(goal).substr(0, 3);
-}
-
 }  // namespace
 
 void PrintBench(const EffectLibrary& library) {
-    std::printf("| case | ms | x memcpy | goal |\n|---|---|---|---|\n");
+    using bench::PrintTableRow;
+    bench::PrintTableHead();
     FramePool pool(bench::kFullHd);
     for (const bench::BenchCase& test : bench::BenchCases()) {
-        EffectRun run = RunOf(library, test);
-        PrintRow(test.name, Measure(run, pool, 1.0), GoalText(test.goalDll));
+        PrintTableRow(TitleOf(test, test.goalDll), Measure(library, test, pool, 1.0));
     }
-    const bench::BenchCase& everything = bench::BenchCases()[7];
+    const bench::BenchCase& everything = bench::EverythingCase();
     const std::string name = everything.name;
-    EffectRun late = RunOf(library, everything), jumping = RunOf(library, everything);
-    PrintRow(name + ", played at 10 h", Measure(late, pool, 36000.0), "");
-    PrintRow(name + ", first frame after a jump to 10 h", MeasureJumps(jumping, pool), "30 ms");
-    const Reference<IFrameProcessor> processor = library.CreateFrameProcessor();
-    PrintRow("frame processor, 4:2:2 to 32 bits", MeasureConversion(*processor, pool, true), "1.5");
-    PrintRow("frame processor, 32 bits to 4:2:2", MeasureConversion(*processor, pool, false), "1.5");
+    PrintTableRow(name + ", played at 10 h", Measure(library, everything, pool, 36000.0));
+    PrintTableRow(name + ", first frame after a jump to 10 h (at most 30 ms)",
+                  MeasureJumps(library, everything, pool));
+    PrintTableRow("frame processor, 4:2:2 to 32 bits (goal 1.5)", MeasureConversion(library, pool, true));
+    PrintTableRow("frame processor, 32 bits to 4:2:2 (goal 1.5)", MeasureConversion(library, pool, false));
 }
 
 }  // namespace velmora::hosts
