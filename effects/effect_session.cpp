@@ -84,6 +84,14 @@ std::uint32_t EffectSession::DrawsPerFrame(std::int32_t width) noexcept {
     return render::DrawsPerFrame(ReadStageSettings(m_settings), width);
 }
 
+bool EffectSession::RenderDeep(const render::DeepFrame& frame, double seconds) noexcept {
+    const FloatGuard guard;
+    if (m_isPinned) m_state.random.Pin(m_seed, render::TruncateTolerant(seconds * render::kFramesPerSecond));
+    MasterHost host(m_effect, m_values);
+    const std::uint32_t hostSeed = m_isPinned ? m_seed : 0;
+    return RenderDeepFrame({&m_settings, &m_state, m_options, hostSeed}, m_deep, host, frame, seconds);
+}
+
 bool EffectSession::Render(const FrameRecord& source, const FrameRecord& destination,
                            double seconds) noexcept {
     const FloatGuard guard;

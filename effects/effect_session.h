@@ -10,6 +10,8 @@
 #include "api/host_api.h"
 #include "effects/master_settings.h"
 #include "effects/render_options.h"
+#include "render/deep/deep_frame.h"
+#include "render/deep/deep_memory.h"
 #include "render/render_state.h"
 
 namespace velmora::effects {
@@ -50,6 +52,10 @@ class EffectSession {
     [[nodiscard]] bool Render(const FrameRecord& source, const FrameRecord& destination,
                               double seconds) noexcept;
 
+    // The same for a deep frame (render/deep/deep_renderer.h). False, with nothing written, when the frame is invalid or
+    // there is not enough memory.
+    [[nodiscard]] bool RenderDeep(const render::DeepFrame& frame, double seconds) noexcept;
+
   private:
     explicit EffectSession(const EffectTable& effect) noexcept;
 
@@ -57,6 +63,7 @@ class EffectSession {
     std::array<ValueWord, kPresetCellCapacity> m_values{};  // by parameter
     MasterSettingsList m_settings;
     render::RenderState m_state;
+    render::DeepMemory m_deep;
     render::RenderOptions m_options = ReadRenderOptions();
     bool m_isPinned = true;
     std::uint32_t m_seed = 0;

@@ -1,5 +1,6 @@
 #include "effects/render_session.h"
 
+#include "render/deep/deep_renderer.h"
 #include "render/frame_context.h"
 #include "render/renderer.h"
 
@@ -18,6 +19,18 @@ bool RenderFrame(const RenderSession& session, IVideoHost& host, const FrameReco
     render::RenderStages(context, settings, *session.state, session.options);
     context.Finish();
     return true;
+}
+
+bool RenderDeepFrame(const RenderSession& session, render::DeepMemory& memory, IVideoHost& host,
+                     const render::DeepFrame& frame, double seconds) noexcept {
+    render::FrameContext context(frame.width, frame.height);
+    context.SetTime(seconds);
+    session.state->random.BeginFrame(context.FrameNumber());
+    if (!frame.IsValid()) return false;
+    session.settings->ReadFromHost(host);
+    render::StageSettings settings = ReadStageSettings(*session.settings);
+    settings.hostSeed = session.hostSeed;
+    return render::RenderDeep(frame, context, settings, *session.state, memory, session.options);
 }
 
 }  // namespace velmora

@@ -5,6 +5,8 @@
 
 #include "api/host_api.h"
 #include "effects/master_settings.h"
+#include "render/deep/deep_frame.h"
+#include "render/deep/deep_memory.h"
 #include "render/image.h"
 #include "render/render_state.h"
 #include "render/renderer.h"
@@ -28,5 +30,9 @@ struct RenderSession {
 // written and no parameter is read.
 bool RenderFrame(const RenderSession& session, IVideoHost& host, const FrameRecord* source,
                  const FrameRecord* destination, const TimingRecord* timing) noexcept;
+
+// The same for a deep frame.
+bool RenderDeepFrame(const RenderSession& session, render::DeepMemory& memory, IVideoHost& host,
+                     const render::DeepFrame& frame, double seconds) noexcept;
 
 }  // namespace velmora

@@ -91,6 +91,7 @@ ColourStage PrepareColour(const StageSettings& settings, double seconds, Contras
     if (!IsNearZero(brightness)) {
         offset = std::clamp(Narrow(double{offset} + brightness), -1.0f, 1.0f);
     }
+    stage.m_offset = offset;
     stage.m_tone = BrightnessTable(offset);
     if (offset != 0.0f) stage.AddLine(stage.m_tone, 1.0 - std::abs(double{offset}));
     if (!IsNearZero(contrast)) {
@@ -98,7 +99,8 @@ ColourStage PrepareColour(const StageSettings& settings, double seconds, Contras
             cache.contrast = contrast;
             cache.table = ContrastTable(contrast);
         }
-        stage.AddLine(cache.table, ContrastGain(contrast));
+        stage.m_gain = ContrastGain(contrast);
+        stage.AddLine(cache.table, *stage.m_gain);
         for (std::uint8_t& entry : stage.m_tone) entry = cache.table[entry];
     }
     stage.m_weight = static_cast<std::int16_t>(Truncate((0.0f - settings.saturation) * 127.0));

@@ -13,6 +13,7 @@
 #include <array>
 #include <cstddef>
 #include <cstdint>
+#include <optional>
 #include <span>
 
 #include "render/byte_table.h"
@@ -49,6 +50,9 @@ class ColourStage {
         return {m_lines.data(), m_isLines ? m_lineCount : 0};
     }
     [[nodiscard]] std::int16_t Weight() const noexcept { return m_weight; }
+    // What the table is made of: v above, and the contrast's gain, if there is a contrast.
+    [[nodiscard]] float Offset() const noexcept { return m_offset; }
+    [[nodiscard]] std::optional<double> Gain() const noexcept { return m_gain; }
 
   private:
     void AddLine(const ByteTable& table, double slope) noexcept;
@@ -57,6 +61,8 @@ class ColourStage {
     bool m_active = false;
     bool m_mixes = false;
     std::int16_t m_weight = 0;  // w above
+    float m_offset = 0.0f;
+    std::optional<double> m_gain;
     ByteTable m_tone{};
     bool m_isLines = true;  // so far
     std::size_t m_lineCount = 0;

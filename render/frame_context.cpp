@@ -16,6 +16,12 @@ FrameContext::FrameContext(const FrameDescription& source, const FrameDescriptio
       m_source(ViewOf(source, m_width, m_height)),
       m_destination(ViewOf(destination, m_width, m_height)) {}
 
+FrameContext::FrameContext(std::int32_t width, std::int32_t height) noexcept
+    : m_width(width), m_height(height) {
+    m_source.bottom = m_destination.bottom = height;
+    m_source.right = m_destination.right = width;
+}
+
 void FrameContext::SetTime(double seconds) noexcept {
     m_time = seconds == seconds ? seconds : 0.0;
     m_frameNumber = TruncateTolerant(m_time * kFramesPerSecond);

@@ -17,6 +17,9 @@ class FrameContext {
     // Attaches the two frames; the processed size is the smaller of the two regions in each direction.
     FrameContext(const FrameDescription& source, const FrameDescription& destination) noexcept;
 
+    // A frame of this size whose pixels are described elsewhere: for planning only. Its views are not valid.
+    FrameContext(std::int32_t width, std::int32_t height) noexcept;
+
     // Seconds from the start of the clip. NaN counts as 0; the frame number saturates.
     void SetTime(double seconds) noexcept;
 

@@ -10,23 +10,6 @@
 namespace velmora::render {
 namespace {
 
-constexpr std::int32_t kMostLayerRows = 300;
-
-// Of the three blurs in the glow layer.
-constexpr double kNarrowShare = 0.20;
-constexpr double kMiddleShare = 0.36;
-constexpr double kWideShare = 0.44;
-constexpr double kStrongest = 0.72;  // of the glow layer at amount 1
-
-// Half the size, rounded up.
-constexpr std::int32_t Halved(std::int32_t size) noexcept {
-    return size / 2 + size % 2;
-}
-constexpr std::int32_t Reduced(std::int32_t size, int reduction) noexcept {
-    for (; reduction > 0; --reduction) size = Halved(size);
-    return size;
-}
-
 // Continues a row with copies of its end cells.
 void ContinueEnds(CellRow row, std::int32_t width) noexcept {
     for (std::int32_t i = 1; i <= kContinued; ++i) {
@@ -44,8 +27,8 @@ class GlowLayerMaker {
           m_width(width),
           m_height(height),
           m_kernels(kernels),
-          m_strength(static_cast<std::uint16_t>(RoundHalfAway(kStrongest * amount * 65535.0))) {
-        while (Reduced(height, m_reduction) > kMostLayerRows) ++m_reduction;
+          m_strength(static_cast<std::uint16_t>(RoundHalfAway(kGlowStrongest * amount * 65535.0))) {
+        while (ReducedSize(height, m_reduction) > kMostGlowRows) ++m_reduction;
     }
 
     [[nodiscard]] bool Allocate(GlowMemory& memory) noexcept;
@@ -79,20 +62,20 @@ class GlowLayerMaker {
 };
 
 bool GlowLayerMaker::Allocate(GlowMemory& memory) noexcept {
-    std::int32_t width = Reduced(m_width, m_reduction), height = Reduced(m_height, m_reduction);
+    std::int32_t width = ReducedSize(m_width, m_reduction), height = ReducedSize(m_height, m_reduction);
     std::uint64_t lanes = static_cast<std::uint64_t>(m_width) * 4 * (sizeof(Bgra) / sizeof(std::uint16_t));
     for (int level = 0; level < kLevels; ++level) {
         m_levels[level] = m_work[level] = {nullptr, width, height};
         lanes += 2 * m_levels[level].Lanes();
-        width = Halved(width);
-        height = Halved(height);
+        width = ReducedSize(width, 1);
+        height = ReducedSize(height, 1);
     }
     for (int reduction = 2; reduction < m_reduction; ++reduction) {
-        m_halves[reduction] = {nullptr, Reduced(m_width, reduction), 2};
+        m_halves[reduction] = {nullptr, ReducedSize(m_width, reduction), 2};
         lanes += m_halves[reduction].Lanes();
     }
     // A doubled row may be one cell wider than needed.
-    m_rows = {nullptr, Reduced(m_width, std::min(m_reduction, 2) == 2 ? 2 : 0) + 1, 2};
+    m_rows = {nullptr, ReducedSize(m_width, std::min(m_reduction, 2) == 2 ? 2 : 0) + 1, 2};
     lanes += m_rows.Lanes();
 
     std::uint16_t* next = memory.Reserve(lanes);
@@ -117,11 +100,11 @@ void GlowLayerMaker::ReadRow(int reduction, std::int32_t y, CellRow out) noexcep
     if (reduction == 2) return ReadBlocks(y, out);
     const CellPlane& halves = m_halves[reduction - 1];
     for (std::int32_t i = 0; i < 2; ++i) {
-        const std::int32_t lastRow = Reduced(m_height, reduction - 1) - 1;
+        const std::int32_t lastRow = ReducedSize(m_height, reduction - 1) - 1;
         ReadRow(reduction - 1, std::min(2 * y + i, lastRow), halves.Row(i));
         ContinueEnds(halves.Row(i), halves.width);
     }
-    const std::int32_t lanes = Halved(halves.width) * kCellLanes;
+    const std::int32_t lanes = ReducedSize(halves.width, 1) * kCellLanes;
     for (std::int32_t i = 0; i < lanes; ++i) {
         const std::int32_t left = i / kCellLanes * 2 * kCellLanes + i % kCellLanes;
         const int sum = halves.Row(0)[left] + halves.Row(0)[left + kCellLanes] + halves.Row(1)[left] +
@@ -241,9 +224,9 @@ GlowStage GlowLayerMaker::Make() noexcept {
     Halve(3);
     Blur(4, taps.wide);
     AddDoubled(3, 0.0, 1.0);
-    AddDoubled(2, kMiddleShare, kWideShare);
+    AddDoubled(2, kGlowMiddleShare, kGlowWideShare);
     AddDoubled(1, 0.0, 1.0);
-    AddDoubled(0, kNarrowShare, 1.0);
+    AddDoubled(0, kGlowNarrowShare, 1.0);
     return {layer, m_reduction, m_rows, m_kernels};
 }
 
@@ -277,7 +260,7 @@ void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
         ContinueEnds(row, cells);
         m_kernels->doubleAlong(row, other, cells);
         std::swap(row, other);
-        cells = Reduced(width, reduction - 1);
+        cells = ReducedSize(width, reduction - 1);
     }
     if (wanted == 0) return m_kernels->screen(in, out, row, width, dither);
     ContinueEnds(row, cells);

@@ -19,6 +19,21 @@
 
 namespace velmora::render {
 
+// The layer has at most this many rows of cells.
+inline constexpr std::int32_t kMostGlowRows = 300;
+
+// Of the three blurs in the glow layer.
+inline constexpr double kGlowNarrowShare = 0.20;
+inline constexpr double kGlowMiddleShare = 0.36;
+inline constexpr double kGlowWideShare = 0.44;
+inline constexpr double kGlowStrongest = 0.72;  // of the layer at amount 1
+
+// The size halved `times` times, rounded up each time.
+[[nodiscard]] constexpr std::int32_t ReducedSize(std::int32_t size, int times) noexcept {
+    for (; times > 0; --times) size = size / 2 + size % 2;
+    return size;
+}
+
 // Memory for the glow layer, kept so that frames of one size allocate once.
 class GlowMemory {
   public:

@@ -37,6 +37,8 @@ class JitterStage {
     [[nodiscard]] std::int32_t Dy() const noexcept { return m_dy; }  // positive: down
     [[nodiscard]] std::int32_t Dx() const noexcept { return m_dx; }  // positive: to the right
 
+    [[nodiscard]] std::uint32_t Border() const noexcept { return m_border; }
+
     // Row `y` of the shaken picture of `source`'s region.
     ShiftedRow Shifted(const ImageView& source, std::int32_t y) const noexcept;
 

@@ -9,7 +9,7 @@
 #include <span>
 
 #include "render/glow_kernels.h"
-#include "render/scratch_line.h"
+#include "render/scratch_span.h"
 #include "render/kernel_levels.h"
 #include "render/simd/target.h"
 #include "render/ycbcr.h"

@@ -71,6 +71,12 @@ bool NeedsOwnSource(const FrameContext& context, const FramePlan& plan) noexcept
 
 }  // namespace
 
+void KeepWanted(FramePlan& plan, const RenderOptions& options) noexcept {
+    ForEachStage(plan, [&options](auto& stage) {
+        if (!IsWanted(stage, options)) stage = {};
+    });
+}
+
 FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings, RenderState& state,
                     const Kernels& kernels) noexcept {
     FramePlan plan;
@@ -83,14 +89,11 @@ void RenderStages(FrameContext& context, const StageSettings& settings, RenderSt
                   const RenderOptions& options) noexcept {
     const Kernels& kernels = KernelsOf(options.level);
     FramePlan plan = PlanFrame(context, settings, state, kernels);
-    const auto isWanted = [&options](const auto& stage) { return stage.kIsDamage || !options.isDamageOnly; };
-    ForEachStage(plan, [&isWanted](auto& stage) {
-        if (!isWanted(stage)) stage = {};
-    });
+    KeepWanted(plan, options);
     // Without memory for the copy the picture is not shifted; the other stages can still work.
     if (NeedsOwnSource(context, plan) && !context.DetachSource()) plan.jitter = {};
     const ShakenRows shaken(context.Source(), plan.jitter);
-    if (isWanted(plan.glow)) {
+    if (IsWanted(plan.glow, options)) {
         plan.glow =
             PrepareGlow(settings.glow, shaken, context.Width(), context.Height(), state.glow, *kernels.glow);
     }

@@ -22,6 +22,14 @@ struct RenderOptions {
     bool isDamageOnly = false;
 };
 
+// Whether a stage runs with these options.
+template <typename Stage>
+[[nodiscard]] bool IsWanted(const Stage&, const RenderOptions& options) noexcept {
+    return Stage::kIsDamage || !options.isDamageOnly;
+}
+// Takes the others out of the plan.
+void KeepWanted(FramePlan& plan, const RenderOptions& options) noexcept;
+
 // All but glow, which starts from the picture itself.
 [[nodiscard]] FramePlan PlanFrame(const FrameContext& context, const StageSettings& settings,
                                   RenderState& state, const Kernels& kernels) noexcept;

@@ -5,6 +5,7 @@
 
 #include "render/kernels.h"
 #include "render/rounding.h"
+#include "render/scratch_span.h"
 
 namespace velmora::render {
 namespace {
@@ -30,12 +31,14 @@ ScratchStage::ScratchStage(const ScratchLine* lines, std::uint32_t count, std::i
       m_knotStep((std::uint64_t{ScratchLine::kSegments} << 16) / static_cast<std::uint64_t>(height)),
       m_kernels(&kernels) {}
 
+ScratchRowPlace ScratchStage::PlaceOf(std::int32_t y) const noexcept {
+    const std::uint64_t along = m_knotStep * static_cast<std::uint64_t>(y);
+    return {y, static_cast<std::size_t>(along >> 16), static_cast<std::int32_t>(along & 0xFFFF) >> 4};
+}
+
 void ScratchStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     if (in != out) std::memcpy(out, in, static_cast<std::size_t>(width) * sizeof(Bgra));
-    const std::uint64_t along = m_knotStep * static_cast<std::uint64_t>(y);
-    const ScratchRowPlace place = {y, static_cast<std::size_t>(along >> 16),
-                                   static_cast<std::int32_t>(along & 0xFFFF) >> 4};
-    m_kernels->scratches(m_lines, m_count, out, width, place);
+    m_kernels->scratches(m_lines, m_count, out, width, PlaceOf(y));
 }
 
 ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffset,

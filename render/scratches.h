@@ -7,6 +7,7 @@
 
 #include <array>
 #include <cstdint>
+#include <span>
 
 #include "render/frame_context.h"
 #include "render/image.h"
@@ -34,6 +35,9 @@ class ScratchStage {
                  const Kernels& kernels) noexcept;
 
     [[nodiscard]] bool IsActive() const noexcept { return m_count != 0; }
+    [[nodiscard]] std::span<const ScratchLine> Lines() const noexcept { return {m_lines, m_count}; }
+    // Where row `y` of the processed rectangle lies on the lines.
+    [[nodiscard]] ScratchRowPlace PlaceOf(std::int32_t y) const noexcept;
     // Draws the scratches' part of row `y` of the processed rectangle; `in` may be `out`.
     void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 

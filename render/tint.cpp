@@ -59,16 +59,18 @@ ByteTable FilmGammaTable(float gamma) noexcept {
 }
 
 TintStage PrepareTint(const StageSettings& settings) noexcept {
-    const std::int32_t red = TintOffset(settings.tintRed);
-    const std::int32_t green = TintOffset(settings.tintGreen);
-    const std::int32_t blue = TintOffset(settings.tintBlue);
+    const TintOffsets offsets = {TintOffset(settings.tintRed), TintOffset(settings.tintGreen),
+                                 TintOffset(settings.tintBlue)};
     TintStage stage;
-    stage.m_active = red != 0 || green != 0 || blue != 0 || settings.filmGamma != 0.0f;
+    stage.m_offsets = offsets;
+    stage.m_gamma = settings.filmGamma;
+    stage.m_active =
+        offsets.red != 0 || offsets.green != 0 || offsets.blue != 0 || settings.filmGamma != 0.0f;
     if (!stage.m_active) return stage;
     const ByteTable gamma = FilmGammaTable(settings.filmGamma);
-    stage.m_red = Chain(gamma, TintTable(red));
-    stage.m_green = Chain(gamma, TintTable(green));
-    stage.m_blue = Chain(gamma, TintTable(blue));
+    stage.m_red = Chain(gamma, TintTable(offsets.red));
+    stage.m_green = Chain(gamma, TintTable(offsets.green));
+    stage.m_blue = Chain(gamma, TintTable(offsets.blue));
     return stage;
 }
 

@@ -19,11 +19,21 @@ namespace velmora::render {
 [[nodiscard]] ByteTable TintTable(std::int32_t offset) noexcept;
 [[nodiscard]] ByteTable FilmGammaTable(float gamma) noexcept;
 
+// The offsets of a tint's channels.
+struct TintOffsets {
+    std::int32_t red = 0;
+    std::int32_t green = 0;
+    std::int32_t blue = 0;
+};
+
 class TintStage {
   public:
     static constexpr bool kIsDamage = false;
     static std::uint32_t Draws(const StageSettings&, std::int32_t) noexcept { return 0; }
     [[nodiscard]] bool IsActive() const noexcept { return m_active; }
+    // What the tables are made of.
+    [[nodiscard]] const TintOffsets& Offsets() const noexcept { return m_offsets; }
+    [[nodiscard]] float Gamma() const noexcept { return m_gamma; }
     [[nodiscard]] const ByteTable& Red() const noexcept { return m_red; }
     [[nodiscard]] const ByteTable& Green() const noexcept { return m_green; }
     [[nodiscard]] const ByteTable& Blue() const noexcept { return m_blue; }
@@ -32,6 +42,8 @@ class TintStage {
     friend TintStage PrepareTint(const StageSettings&) noexcept;
 
     bool m_active = false;
+    TintOffsets m_offsets;
+    float m_gamma = 0.0f;
     ByteTable m_red{};
     ByteTable m_green{};
     ByteTable m_blue{};

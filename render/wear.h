@@ -74,6 +74,8 @@ class WearStage {
     [[nodiscard]] WearRows RowsOver(std::int32_t y) const noexcept {
         return {m_starts, m_picture->height, y};
     }
+    [[nodiscard]] const GreyPicture& Picture() const noexcept { return *m_picture; }
+    [[nodiscard]] float Amount() const noexcept { return m_amount; }
     [[nodiscard]] bool BlueOnly() const noexcept { return m_channels == kWearBlueOnly; }
 
   private:

@@ -1,0 +1,24 @@
+// The deep kernels for the processor that the whole program is compiled for.
+
+#include "render/deep/deep_kernels.h"
+
+#include "render/glow_kernels.h"
+#include "render/simd/target.h"
+
+namespace velmora::render {
+namespace {
+
+#include "render/deep/deep_kernels.inc"
+
+}  // namespace
+
+const DeepKernels kDeepPlainKernels = kKernels;
+
+const DeepKernels& DeepKernelsOf([[maybe_unused]] SimdLevel level) noexcept {
+#if VM_HAS_AVX2
+    if (level >= SimdLevel::kAvx2) return kDeepAvx2Kernels;
+#endif
+    return kDeepPlainKernels;
+}
+
+}  // namespace velmora::render

@@ -1,0 +1,189 @@
+#include "render/deep/deep_row_program.h"
+
+#include <algorithm>
+#include <cstring>
+
+#include "render/spots.h"
+
+namespace velmora::render {
+namespace {
+
+// The kernels' entry for a format.
+std::size_t SamplesOf(const DeepFormat& format) noexcept {
+    return format.samples == DeepSamples::kFloat ? 1 : 0;
+}
+std::size_t ChannelsOf(const DeepFormat& format) noexcept {
+    return static_cast<std::size_t>(format.channels - 3);
+}
+
+void FillBorder(DeepBlock& block, std::int32_t at, std::int32_t count, std::uint32_t colour,
+                bool hasAlpha) noexcept {
+    if (count <= 0) return;
+    const auto channel = [colour](int shift) { return static_cast<float>(colour >> shift & 0xFFu) / 255.0f; };
+    std::fill_n(block.red + at, count, channel(16));
+    std::fill_n(block.green + at, count, channel(8));
+    std::fill_n(block.blue + at, count, channel(0));
+    std::fill_n(block.alpha + at, count, hasAlpha ? channel(24) : 1.0f);
+}
+
+// Moves a channel by a share of its distance to white or to black. Damage never goes beyond them.
+void Lighten(float& channel, float share) noexcept {
+    channel += share * std::max(1.0f - channel, 0.0f);
+}
+void Darken(float& channel, float share) noexcept {
+    channel -= share * std::max(channel, 0.0f);
+}
+
+template <typename Change>
+void ChangePixel(DeepBlock& block, std::int32_t x, Change&& change) noexcept {
+    change(block.red[x]);
+    change(block.green[x]);
+    change(block.blue[x]);
+}
+
+}  // namespace
+
+void DeepSource::Read(std::int32_t y, std::int32_t from, std::int32_t count,
+                      DeepBlock& block) const noexcept {
+    const DeepFormat& format = m_frame.format;
+    const std::int32_t row = y - m_jitter.Dy();
+    // The columns of the block that the source has.
+    const std::int32_t shift = m_jitter.Dx();
+    std::int32_t first = std::clamp(shift - from, 0, count);
+    std::int32_t end = std::clamp(m_frame.width + shift - from, first, count);
+    if (row < 0 || row >= m_frame.height) first = end = count;
+    FillBorder(block, 0, first, m_jitter.Border(), format.channels == 4);
+    FillBorder(block, end, count - end, m_jitter.Border(), format.channels == 4);
+    if (first == end) return;
+    const std::uint8_t* pixels = m_picture.Row(row) + (from + first - shift) * format.PixelBytes();
+    m_kernels.load[SamplesOf(format)][ChannelsOf(format)](pixels, block, first, end - first);
+    if (format.isPremultiplied) m_kernels.divide(block, first, end - first);
+}
+
+DeepRowProgram::DeepRowProgram(const DeepFrame& frame, const FramePlan& plan, DeepGlow& glow,
+                               const DeepKernels& kernels) noexcept
+    : m_frame(frame),
+      m_plan(plan),
+      m_glow(glow),
+      m_kernels(kernels),
+      m_tone(DeepToneOf(plan.colour, plan.tint)) {
+    ForEachStage(plan, [this](const auto& stage) { Add(stage); });
+}
+
+void DeepRowProgram::Add(const GlowStage&) noexcept {
+    if (m_glow.IsActive()) m_steps[m_count++] = {&DeepRowProgram::BeginGlow, &DeepRowProgram::RunGlow};
+}
+
+void DeepRowProgram::AddTone() noexcept {
+    if (m_hasTone || !m_tone.IsActive()) return;
+    m_hasTone = true;
+    m_steps[m_count++] = {&DeepRowProgram::BeginNothing, &DeepRowProgram::RunTone};
+}
+
+void DeepRowProgram::Add(const WearStage& stage) noexcept {
+    if (stage.IsActive()) m_steps[m_count++] = {&DeepRowProgram::BeginWear, &DeepRowProgram::RunWear};
+}
+
+void DeepRowProgram::Add(const ScratchStage& stage) noexcept {
+    if (stage.IsActive())
+        m_steps[m_count++] = {&DeepRowProgram::BeginScratches, &DeepRowProgram::RunScratches};
+}
+
+void DeepRowProgram::Add(const SpotStage& stage) noexcept {
+    if (stage.IsActive()) m_steps[m_count++] = {&DeepRowProgram::BeginNothing, &DeepRowProgram::RunSpots};
+}
+
+void DeepRowProgram::Run(const DeepSource& source, std::int32_t y) const noexcept {
+    const DeepFormat& format = m_frame.format;
+    Row row;
+    row.y = y;
+    for (std::size_t i = 0; i < m_count; ++i) (this->*m_steps[i].begin)(row);
+    for (row.from = m_frame.window.left; row.from < m_frame.window.right; row.from += kDeepBlock) {
+        row.count = std::min(kDeepBlock, m_frame.window.right - row.from);
+        source.Read(y, row.from, row.count, row.block);
+        for (std::size_t i = 0; i < m_count; ++i) (this->*m_steps[i].run)(row);
+        if (format.isPremultiplied) m_kernels.multiply(row.block, 0, row.count);
+        std::uint8_t* const pixels = m_frame.destination.Row(y) + row.from * format.PixelBytes();
+        m_kernels.store[SamplesOf(format)][ChannelsOf(format)](row.block, 0, pixels, row.count);
+    }
+}
+
+void DeepRowProgram::BeginWear(Row& row) const noexcept {
+    const GreyPicture& picture = m_plan.wear.Picture();
+    row.strips = m_plan.wear.RowsOver(row.y);
+    for (std::int32_t start = 0; start <= m_frame.window.left; start += picture.width) {
+        row.wear = picture.pixels + row.strips.Next() * picture.rowStep;
+        row.wearLeft = start + picture.width - m_frame.window.left;
+    }
+    row.wear += picture.width - row.wearLeft;
+}
+
+void DeepRowProgram::RunWear(Row& row) const noexcept {
+    const WearStage& stage = m_plan.wear;
+    const GreyPicture& picture = stage.Picture();
+    for (std::int32_t x = 0; x < row.count;) {
+        if (row.wearLeft == 0) {
+            row.wear = picture.pixels + row.strips.Next() * picture.rowStep;
+            row.wearLeft = picture.width;
+        }
+        const std::int32_t count = std::min(row.wearLeft, row.count - x);
+        m_kernels.wear(row.block.blue + x, row.wear, count, stage.Amount());
+        if (!stage.BlueOnly()) {
+            m_kernels.wear(row.block.green + x, row.wear, count, stage.Amount());
+            m_kernels.wear(row.block.red + x, row.wear, count, stage.Amount());
+        }
+        row.wear += count;
+        row.wearLeft -= count;
+        x += count;
+    }
+}
+
+void DeepRowProgram::BeginScratches(Row& row) const noexcept {
+    const ScratchRowPlace place = m_plan.scratches.PlaceOf(row.y);
+    std::size_t i = 0;
+    for (const ScratchLine& line : m_plan.scratches.Lines()) {
+        if (!FindSpan(line, place, row.spans[i])) row.spans[i].weights = nullptr;
+        ++i;
+    }
+}
+
+void DeepRowProgram::RunScratches(Row& row) const noexcept {
+    constexpr float kDark = kDarkest / 255.0f, kBright = kBrightest / 255.0f;
+    std::size_t next = 0;
+    for (const ScratchLine& line : m_plan.scratches.Lines()) {
+        const ScratchSpan& span = row.spans[next++];
+        if (span.weights == nullptr) continue;
+        const std::int32_t start = span.first - row.from;
+        const std::int32_t end = std::min(start + line.pixels, row.count);
+        for (std::int32_t x = std::max(start, 0); x < end; ++x) {
+            const float share = static_cast<float>(span.weights[x - start]) *
+                                static_cast<float>(span.strength) * (1.0f / 4294967296.0f);
+            ChangePixel(row.block, x, [&](float& channel) {
+                if (line.isWhite) {
+                    channel += std::max(kBright - channel, 0.0f) * share;
+                } else {
+                    channel -= std::max(channel - kDark, 0.0f) * share;
+                }
+            });
+        }
+    }
+}
+
+void DeepRowProgram::RunSpots(Row& row) const noexcept {
+    for (std::uint32_t i = 0; i < m_plan.spots.Count(); ++i) {
+        const PlacedSpot& spot = m_plan.spots.Spot(i);
+        const std::int32_t line = row.y - spot.top;
+        if (line < 0 || line >= spot.height) continue;
+        const std::uint8_t key = spot.picture->pixels[0];
+        const std::int32_t start = spot.left - row.from;
+        const std::int32_t end = std::min(start + spot.width, row.count);
+        for (std::int32_t x = std::max(start, 0); x < end; ++x) {
+            const float fraction = SpotFraction(spot.ByteAt(line, x - start), key, spot.strength);
+            ChangePixel(row.block, x, [&](float& channel) {
+                fraction > 0.0f ? Lighten(channel, fraction) : Darken(channel, -fraction);
+            });
+        }
+    }
+}
+
+}  // namespace velmora::render
