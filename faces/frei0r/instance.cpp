@@ -122,7 +122,7 @@ void Instance::SetText(std::size_t index, std::string text) {
             m_clock.SetFrameRate(kept);
             break;
         case ParamRole::kOwn:
-            const auto item = FindItem(m_plugin.effect.params[param.own], kept);
+            const auto item = FindItemOrNumber(m_plugin.effect.params[param.own], kept);
             m_own[param.own].isSet = item.has_value();
             if (item) m_own[param.own].value.count = *item;
             break;

@@ -2,19 +2,10 @@
 
 #include <frei0r.h>
 
-#include <algorithm>
-
-#include "text/names.h"
 #include "text/number_text.h"
 
 namespace velmora::hosts::frei0r {
 namespace {
-
-std::string FileName(std::string_view effectName) {
-    std::string name = "velmora_";
-    for (const char c : effectName) name += c == ' ' ? '_' : ToLower(c);
-    return name;
-}
 
 int TypeOf(ParamKind kind) {
     switch (kind) {
@@ -27,19 +18,6 @@ int TypeOf(ParamKind kind) {
         default:
             return F0R_PARAM_STRING;
     }
-}
-
-bool HoldsValue(const effects::ParamRow& param) {
-    return param.kind != kKindGroup && param.kind != kKindNone;
-}
-
-// In the effect's own panel, a colour and its amount may have the same name.
-std::string OwnName(const effects::EffectTable& effect, const effects::ParamRow& param) {
-    const auto sharesName = [&](const effects::ParamRow& other) {
-        return &other != &param && HoldsValue(other) && IsSameName(other.name, param.name);
-    };
-    if (!std::ranges::any_of(effect.params, sharesName)) return param.name;
-    return std::string(param.name) + (param.kind == kKindColour ? " Colour" : " Amount");
 }
 
 std::string QuotedList(std::span<const char* const> texts) {
@@ -67,7 +45,7 @@ std::string OwnExplanation(const effects::ParamRow& param) {
 PluginDescription DescribePlugin(const effects::EffectTable& effect) {
     PluginDescription plugin{.effect = effect,
                              .name = std::string("Velmora ") + effect.name,
-                             .fileName = FileName(effect.name),
+                             .fileName = "velmora_" + effects::IdentifierOf(effect.name),
                              .explanation = "The look of old film, with the same result in every host",
                              .params = {}};
     plugin.params = {
@@ -82,23 +60,14 @@ PluginDescription DescribePlugin(const effects::EffectTable& effect) {
     for (std::uint32_t i = 0; i < effect.params.size(); ++i) {
         const effects::ParamRow& param = effect.params[i];
         if (!HoldsValue(param)) continue;
-        plugin.params.push_back(
-            {OwnName(effect, param), TypeOf(param.kind), OwnExplanation(param), ParamRole::kOwn, i});
+        plugin.params.push_back({effects::UniqueName(effect, param), TypeOf(param.kind),
+                                 OwnExplanation(param), ParamRole::kOwn, i});
     }
     return plugin;
 }
 
-std::optional<std::uint32_t> FindPreset(const effects::EffectTable& effect, std::string_view name) {
-    for (std::uint32_t i = 0; i < effect.presetNames.size(); ++i) {
-        if (IsSameName(effect.presetNames[i], name)) return i;
-    }
-    return std::nullopt;
-}
-
-std::optional<std::uint32_t> FindItem(const effects::ParamRow& menu, std::string_view text) {
-    for (std::uint32_t i = 0; i < menu.items.size(); ++i) {
-        if (IsSameName(menu.items[i], text)) return i;
-    }
+std::optional<std::uint32_t> FindItemOrNumber(const effects::ParamRow& menu, std::string_view text) {
+    if (const auto item = effects::FindItem(menu, text)) return item;
     const auto number = ParseInteger(text);
     if (!number || *number < 0 || *number >= static_cast<std::int64_t>(menu.items.size()))
         return std::nullopt;

@@ -21,6 +21,7 @@
 #include <string_view>
 #include <vector>
 
+#include "effects/effect_names.h"
 #include "effects/effect_table.h"
 
 namespace velmora::hosts::frei0r {
@@ -47,11 +48,8 @@ struct PluginDescription {
 
 PluginDescription DescribePlugin(const effects::EffectTable& effect);
 
-// The preset of that name (text/names.h); nothing when there is none.
-[[nodiscard]] std::optional<std::uint32_t> FindPreset(const effects::EffectTable& effect,
-                                                      std::string_view name);
-
 // The menu item with that text, or with that number counted from 0.
-[[nodiscard]] std::optional<std::uint32_t> FindItem(const effects::ParamRow& menu, std::string_view text);
+[[nodiscard]] std::optional<std::uint32_t> FindItemOrNumber(const effects::ParamRow& menu,
+                                                            std::string_view text);
 
 }  // namespace velmora::hosts::frei0r
