@@ -1,0 +1,68 @@
+// A filter's settings as OBS keeps them in a scene collection.
+//
+//   key                value
+//   preset             name of the preset that was chosen; empty when the values are the user's own
+//   applied_preset     the preset whose values are in the settings. Where it differs from `preset`, as after a change
+//                      by a script, the preset is in force and its values are still to be written
+//   seed               0..4294967295
+//   source_time        whether frames follow the source's position, see film_filter.h
+//   the effect's own   slider: number as shown; colour: 0xAABBGGRR; menu: the item's text; check box: boolean.
+//                      Keys are the names in small letters with "_" for blanks, such as "film_gamma"
+//
+// Not for several threads at once: OBS does not lock settings either.
+#pragma once
+
+#include <obs.h>
+
+#include <cstdint>
+#include <string>
+#include <vector>
+
+#include "api/host_api.h"
+#include "effects/effect_table.h"
+
+namespace velmora::hosts::obs {
+
+inline constexpr const char* kPresetKey = "preset";
+inline constexpr const char* kAppliedPresetKey = "applied_preset";
+inline constexpr const char* kSeedKey = "seed";
+inline constexpr const char* kSourceTimeKey = "source_time";
+
+// One of the five filters. Kept as long as the module is loaded.
+struct FilterDescription {
+    const effects::EffectTable& effect;
+    std::uint32_t index;             // in kAllEffects
+    std::string id;                  // "velmora_film_pro"
+    std::string name;                // "Velmora Film Pro"
+    std::vector<std::string> keys;   // by parameter; empty for group markers
+    std::vector<std::string> names;  // by parameter, in English, unique
+};
+
+[[nodiscard]] FilterDescription DescribeFilter(std::uint32_t index);
+
+struct FilterValues {
+    std::vector<ValueWord> own;  // by parameter, in stored format
+    std::uint32_t seed = 0;
+    bool followsSource = false;
+};
+
+void SetDefaults(const FilterDescription& filter, obs_data_t* settings);
+
+// The values in force.
+[[nodiscard]] FilterValues ReadValues(const FilterDescription& filter, obs_data_t* settings);
+
+// Sets one value; does nothing for a group marker.
+void WriteValue(const FilterDescription& filter, std::uint32_t param, ValueWord value, obs_data_t* settings);
+
+// Writes the values of a preset that was chosen but not yet applied. False when there was nothing to write.
+bool WriteChosenPreset(const FilterDescription& filter, obs_data_t* settings);
+// True when WriteChosenPreset has something to do.
+[[nodiscard]] bool IsPresetPending(obs_data_t* settings);
+
+// Makes the settings the user's own if their values are no longer those of the preset.
+void DropPresetIfChanged(const FilterDescription& filter, obs_data_t* settings);
+
+// Whether the effect leaves every picture alone, as with its defaults.
+[[nodiscard]] bool IsNeutral(const FilterDescription& filter, const FilterValues& values);
+
+}  // namespace velmora::hosts::obs
