@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
 
 namespace velmora::reelview {
 namespace {
@@ -18,6 +19,27 @@ std::size_t Edge(std::int32_t index, std::int32_t count, std::int32_t sourceCoun
 }
 
 }  // namespace
+
+Picture Turned(Picture picture, int orientation) {
+    if (orientation < 2 || orientation > 8) return picture;
+    const bool isOnItsSide = orientation >= 5;
+    const bool isMirroredX = orientation == 2 || orientation == 3 || orientation == 7 || orientation == 8;
+    const bool isMirroredY = orientation == 3 || orientation == 4 || orientation == 6 || orientation == 7;
+    const std::int32_t width = picture.size.width, height = picture.size.height;
+    Picture result;
+    result.size = isOnItsSide ? hosts::FrameSize{height, width} : picture.size;
+    result.pixels.resize(picture.pixels.size());
+    std::uint8_t* out = result.pixels.data();
+    for (std::int32_t y = 0; y < result.size.height; ++y) {
+        for (std::int32_t x = 0; x < result.size.width; ++x, out += 4) {
+            std::int32_t fromX = isOnItsSide ? y : x, fromY = isOnItsSide ? x : y;
+            if (isMirroredX) fromX = width - 1 - fromX;
+            if (isMirroredY) fromY = height - 1 - fromY;
+            std::memcpy(out, picture.pixels.data() + (std::ptrdiff_t{fromY} * width + fromX) * 4, 4);
+        }
+    }
+    return result;
+}
 
 Picture Reduced(const Picture& picture, hosts::FrameSize largest) {
     Picture result;

@@ -21,6 +21,9 @@ struct Picture {
 
 using SharedPicture = std::shared_ptr<const Picture>;
 
+// As the viewer sees a picture that is stored with this Exif orientation, 1 to 8; any other leaves it as it is.
+[[nodiscard]] Picture Turned(Picture picture, int orientation);
+
 // For thumbnails: each pixel is the mean of the source pixels that it covers. Never larger than `picture`.
 [[nodiscard]] Picture Reduced(const Picture& picture, hosts::FrameSize largest);
 

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <istream>
 #include <memory>
 #include <optional>
 #include <stdexcept>
@@ -9,6 +10,7 @@
 #include "text/number_text.h"
 #include "programs/common/y4m.h"
 #include "programs/reelview/base/picture.h"
+#include "programs/reelview/source/sequence_names.h"
 
 namespace velmora::reelview {
 
@@ -22,8 +24,10 @@ struct ClipFacts {
     hosts::FrameSize size;
     hosts::FrameRate rate = {25, 1};
     std::int64_t frames = 1;  // may be an estimate: reading past the true end repeats the last frame
-    std::optional<hosts::Y4mFormat>
-        y4m;  // set for a YUV4MPEG2 stream, so that it can be saved in the same format
+    // Set for a YUV4MPEG2 stream, so that it can be saved in the same format.
+    std::optional<hosts::Y4mFormat> y4m;
+    bool isPictures = false;  // several pictures; `numbering` says whether one pattern names them all
+    std::optional<Numbering> numbering;
 };
 
 class ClipSource {
@@ -41,6 +45,9 @@ class ClipSource {
 
     ClipFacts m_facts;
 };
+
+// How a JPEG or TIFF file says that its picture was held: 1 to 8 as Exif has it, 1 if it does not say.
+[[nodiscard]] int StoredOrientation(std::istream& file);
 
 // Larger sides are refused, because no buffer for them fits into 32 bits.
 inline constexpr std::int32_t kLargestSide = 16384;

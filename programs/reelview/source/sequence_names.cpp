@@ -1,8 +1,6 @@
 #include "programs/reelview/source/sequence_names.h"
 
-#include <cstdint>
 #include <map>
-#include <optional>
 #include <string_view>
 
 namespace velmora::reelview {
@@ -31,6 +29,17 @@ std::optional<NumberedName> Split(std::u16string_view name) {
     return NumberedName{name.substr(0, start), name.substr(end), number};
 }
 
+std::u16string Digits(std::uint64_t number) {
+    const std::string digits = std::to_string(number);
+    return {digits.begin(), digits.end()};
+}
+
+std::u16string Escaped(std::u16string_view text) {
+    std::u16string escaped;
+    for (const char16_t c : text) escaped.append(c == u'%' ? 2 : 1, c);
+    return escaped;
+}
+
 }  // namespace
 
 std::vector<std::u16string> SequenceOf(const std::u16string& name, const std::vector<std::u16string>& names) {
@@ -51,6 +60,20 @@ std::vector<std::u16string> SequenceOf(const std::u16string& name, const std::ve
         sequence.push_back(*next->second);
     }
     return sequence;
+}
+
+std::optional<Numbering> NumberingOf(const std::vector<std::u16string>& paths) {
+    const auto first = paths.empty() ? std::nullopt : Split(paths[0]);
+    if (!first) return std::nullopt;
+    const std::size_t width = paths[0].size() - first->before.size() - first->after.size();
+    for (std::size_t i = 1; i < paths.size(); ++i) {
+        std::u16string number = Digits(first->number + i);
+        if (number.size() < width) number.insert(0, width - number.size(), u'0');
+        if (paths[i] != std::u16string(first->before) + number + std::u16string(first->after))
+            return std::nullopt;
+    }
+    const std::u16string format = width == 1 ? u"%d" : u"%0" + Digits(width) + u"d";
+    return Numbering{Escaped(first->before) + format + Escaped(first->after), first->number};
 }
 
 }  // namespace velmora::reelview

@@ -3,6 +3,7 @@
 #include <wincodec.h>
 
 #include <filesystem>
+#include <fstream>
 #include <utility>
 
 #include "programs/reelview/source/sequence_names.h"
@@ -44,12 +45,20 @@ Picture PixelsOf(IWICImagingFactory& factory, IWICBitmapSource& source) {
     return picture;
 }
 
+std::u16string Text16(const std::wstring& text) {
+    return {text.begin(), text.end()};
+}
+
 class PictureClip final : public ClipSource {
   public:
     explicit PictureClip(std::vector<std::wstring> files) : m_files(std::move(files)) {
         m_first = ReadPicture(m_files.at(0));
         m_facts.size = m_first.size;
         m_facts.frames = static_cast<std::int64_t>(m_files.size());
+        m_facts.isPictures = m_files.size() > 1;
+        std::vector<std::u16string> names;
+        for (const std::wstring& name : m_files) names.push_back(Text16(name));
+        if (m_facts.isPictures) m_facts.numbering = NumberingOf(names);
     }
 
     Picture Read(std::int64_t frame) override {
@@ -65,10 +74,6 @@ class PictureClip final : public ClipSource {
     std::vector<std::wstring> m_files;
     Picture m_first;
 };
-
-std::u16string Text16(const std::wstring& text) {
-    return {text.begin(), text.end()};
-}
 
 void EncodeFrame(IWICBitmapEncoder& encoder, IWICImagingFactory& factory, const Picture& picture) {
     Com<IWICBitmapFrameEncode> frame;
@@ -97,7 +102,9 @@ Picture ReadPicture(const std::wstring& file) {
     if (FAILED(opened) || !decoder) throw SourceError(text::kCannotRead);
     Com<IWICBitmapFrameDecode> frame;
     Check(decoder->GetFrame(0, ComOut(frame)), text::kCannotRead);
-    return PixelsOf(*factory, *frame);
+    // Not from the system, which knows the orientation only where it has the format's metadata reader.
+    std::ifstream stored(std::filesystem::path(file), std::ios::binary);
+    return Turned(PixelsOf(*factory, *frame), StoredOrientation(stored));
 }
 
 void WritePng(const std::wstring& file, const Picture& picture) {
