@@ -64,6 +64,8 @@ inline constexpr char kInvitation[] = "Drop a film or a picture here, or press C
 inline constexpr char kSaving[] = "Saving";
 inline constexpr char kSaved[] = "Saved";
 inline constexpr char kCopied[] = "Copied";
+inline constexpr char kNotNumbered[] =
+    "reelfx takes several pictures only if they are numbered without gaps.";
 inline constexpr char kCancel[] = "Cancel";
 
 // File types

@@ -18,11 +18,21 @@ std::string OutputName(const std::string& input) {
     return input.substr(0, dot) + "-film" + input.substr(dot);
 }
 
+// reelfx itself finds pictures that begin with 0 or 1.
+std::string NumberedOptions(const CommandInput& input) {
+    if (!input.rate) return "";
+    std::string options = " --rate " + std::to_string(input.rate->numerator);
+    if (input.rate->denominator != 1) options += '/' + std::to_string(input.rate->denominator);
+    if (input.firstNumber > 1) options += " --start-number " + std::to_string(input.firstNumber);
+    if (input.count > 0) options += " --frames 0:" + std::to_string(input.count);
+    return options;
+}
+
 }  // namespace
 
-std::string CommandText(const std::string& input, const hosts::EffectInfo& effect, const Values& values) {
-    std::string line = "reelfx render " + Quoted(input) + ' ' + Quoted(OutputName(input)) + " --effect " +
-                       Quoted(effect.name);
+std::string CommandText(const CommandInput& input, const hosts::EffectInfo& effect, const Values& values) {
+    std::string line = "reelfx render " + Quoted(input.path) + ' ' + Quoted(OutputName(input.path)) +
+                       NumberedOptions(input) + " --effect " + Quoted(effect.name);
     const Values defaults = DefaultsOf(effect);
     for (std::size_t i = 0; i < effect.params.size() && i < values.size(); ++i) {
         const hosts::ParamInfo& param = effect.params[i];
