@@ -43,8 +43,11 @@ int Run(int show) {
     std::unique_ptr<hosts::EffectLibrary> library;
     auto load = [&] {
         try {
-            const std::wstring file(options.library.begin(), options.library.end());
-            library = std::make_unique<hosts::EffectLibrary>(hosts::LibraryFile(file));
+            const std::wstring file =
+                hosts::LibraryFile(std::wstring(options.library.begin(), options.library.end()));
+            // Watched before its first function is called; never unloaded, because a call may have been abandoned.
+            if (const HMODULE module = LoadLibraryW(file.c_str())) WatchEndings(module);
+            library = std::make_unique<hosts::EffectLibrary>(file);
         } catch (const std::exception&) {
             library.reset();
         }

@@ -1,11 +1,15 @@
-// Calls into a third-party library that may crash. Windows on i386 only.
+// Calls into a third-party library that may crash or end the process. Windows on i386 only.
 #pragma once
+
+#include <windows.h>
 
 namespace velmora::reelview {
 
-// Runs call(argument) on this thread. False when it ended in a processor fault (a bad address, an illegal
-// instruction, a division by zero). The call is then abandoned without running destructors, so anything that it
-// worked with must not be used again. Endless calls and library code that ends the process cannot be caught.
+// Runs call(argument) on this thread. False when it ended in a processor fault (a bad address, an illegal instruction,
+// a division by zero), an exception that nobody caught or, in a watched module, in abort, exit or ExitProcess. The
+// call is then abandoned without running destructors, so anything that it worked with must not be used again. An
+// endless call cannot be stopped, nor can a system's fail-fast, with which the newer runtimes, linked statically,
+// abort.
 bool RunGuarded(void (*call)(void*), void* argument) noexcept;
 
 // The same for any callable that returns nothing.
@@ -13,5 +17,9 @@ template <class Callable>
 bool RunGuarded(Callable& callable) noexcept {
     return RunGuarded([](void* object) { (*static_cast<Callable*>(object))(); }, &callable);
 }
+
+// Watches what a loaded module imports, so that within RunGuarded its calls that would end the process only end the
+// guarded call. Elsewhere they do what they always do. For one module.
+void WatchEndings(HMODULE module) noexcept;
 
 }  // namespace velmora::reelview
