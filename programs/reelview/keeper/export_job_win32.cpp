@@ -1,3 +1,4 @@
+#include <exception>
 #include <new>
 
 #include "programs/reelview/keeper/export_job_win32.h"
@@ -47,6 +48,8 @@ ExportResult RunExport(Engine& engine, const ExportOrder& order, const std::atom
         return {ExportEnd::kFailed, error.what()};
     } catch (const std::bad_alloc&) {
         return {ExportEnd::kFailed, text::kNoMemory};
+    } catch (const std::exception&) {
+        return {ExportEnd::kFailed, text::kCannotWrite};
     }
 }
 

@@ -31,7 +31,7 @@ class Engine {
     // If the new clip cannot be opened, the current one stays open. Throws SourceError.
     const ClipFacts& Open(const ClipRequest& request);
     [[nodiscard]] const ClipFacts& Facts() const { return m_clip->Facts(); }
-    // Throws SourceError.
+    // The nearest frame that the clip has. Throws SourceError.
     [[nodiscard]] SharedPicture Frame(std::int64_t frame);
 
     struct Rendered {

@@ -1,3 +1,4 @@
+#include <algorithm>
 #include <chrono>
 #include <exception>
 
@@ -37,6 +38,8 @@ const ClipFacts& Engine::Open(const ClipRequest& request) {
 }
 
 SharedPicture Engine::Frame(std::int64_t frame) {
+    // A request may be older than the clip.
+    frame = std::clamp<std::int64_t>(frame, 0, m_clip->Facts().frames - 1);
     if (frame != m_lastIndex || !m_lastFrame) {
         m_lastFrame = std::make_shared<const Picture>(m_clip->Read(frame));
         m_lastIndex = frame;

@@ -10,6 +10,18 @@
 #include "programs/reelview/base/text_keys.h"
 
 namespace velmora::reelview {
+namespace {
+
+// Another program may be reading the clipboard just now.
+bool OpenFreeClipboard(HWND owner) {
+    for (int i = 0; i < 20; ++i) {
+        if (OpenClipboard(owner)) return true;
+        Sleep(25);
+    }
+    return false;
+}
+
+}  // namespace
 
 void MainWindow::OnCommand(int command, int code) {
     if (command == kControlEffect) {
@@ -64,7 +76,10 @@ void MainWindow::OnFileCommand(int command) {
             m_history.SetAll(DefaultsOf(Effect()));
             return ShowSettings();
         case kCommandOptions:
-            m_library.Object().GetShellServices()->ShowOptions(m_window);
+            CallLibrary([this] {
+                IShellServices* const services = m_library.Object().GetShellServices();
+                if (services != nullptr) services->ShowOptions(m_window);
+            });
             return;
         case kCommandHelp:
             return ShowHelp(help::kReelView);
@@ -137,6 +152,8 @@ void MainWindow::SaveFrame() {
             SavePng(file, *picture);
         } catch (const SourceError& failure) {
             error = failure.what();
+        } catch (const std::exception&) {
+            error = text::kCannotWrite;
         }
         OnWorker([this, error, file] {
             OnExported({error.empty() ? ExportEnd::kDone : ExportEnd::kFailed, error}, file);
@@ -184,12 +201,15 @@ void MainWindow::OnExported(const ExportResult& result, const std::wstring& file
 }
 
 void MainWindow::LoadPreset() {
-    const auto saver = Reference<IPresetSaver>::Adopt(m_library.Object().CreatePresetSaver());
-    if (!saver) return;
     PresetRecord record = {};
-    const std::int32_t result = saver->LoadPreset(m_window, &m_library.Object(), m_history.Now().effect,
-                                                  &record, m_texts.Language().c_str());
-    if (result != 0 || record.count == 0) return;  // cancelled, or the user has been told
+    std::int32_t result = -1;
+    const bool isDone = CallLibrary([&] {
+        const auto saver = Reference<IPresetSaver>::Adopt(m_library.Object().CreatePresetSaver());
+        if (!saver) return;
+        result = saver->LoadPreset(m_window, &m_library.Object(), m_history.Now().effect, &record,
+                                   m_texts.Language().c_str());
+    });
+    if (!isDone || result != 0 || record.count == 0) return;  // cancelled, or the user has been told
     Values values = m_history.Now().Current();
     for (std::size_t i = 0; i < values.size() && std::cmp_less(i, record.count); ++i) {
         if (Effect().params[i].HoldsValue()) values[i] = record.values[i].value;
@@ -199,16 +219,18 @@ void MainWindow::LoadPreset() {
 }
 
 void MainWindow::SavePreset() {
-    const auto saver = Reference<IPresetSaver>::Adopt(m_library.Object().CreatePresetSaver());
-    if (!saver) return;
     PresetRecord record = {};
     const Values& values = m_history.Now().Current();
     for (std::size_t i = 0; i < values.size() && i < kPresetCellCapacity; ++i) {
         record.values[i] = {values[i], 0, Effect().params[i].kind};
         record.count = static_cast<std::int32_t>(i) + 1;
     }
-    saver->SavePreset(m_window, &m_library.Object(), m_history.Now().effect, &record,
-                      m_texts.Language().c_str());
+    CallLibrary([&] {
+        const auto saver = Reference<IPresetSaver>::Adopt(m_library.Object().CreatePresetSaver());
+        if (!saver) return;
+        saver->SavePreset(m_window, &m_library.Object(), m_history.Now().effect, &record,
+                          m_texts.Language().c_str());
+    });
 }
 
 void MainWindow::PutOnClipboard(UINT format, const void* bytes, std::size_t size) {
@@ -217,7 +239,7 @@ void MainWindow::PutOnClipboard(UINT format, const void* bytes, std::size_t size
     std::memcpy(GlobalLock(memory), bytes, size);
     GlobalUnlock(memory);
     bool isTaken = false;
-    if (OpenClipboard(m_window)) {
+    if (OpenFreeClipboard(m_window)) {
         EmptyClipboard();
         isTaken = SetClipboardData(format, memory) != nullptr;
         CloseClipboard();
@@ -250,7 +272,19 @@ void MainWindow::CopyFrame() {
 
 void MainWindow::CopyCommand() {
     if (!m_isOpen) return;
-    const std::string line = CommandText(Utf8Of(m_file), Effect(), m_history.Now().Current());
+    if (m_facts.isPictures && !m_facts.numbering) {
+        m_note = m_texts(text::kNotNumbered);
+        ShowStatus();
+        return;
+    }
+    CommandInput input;
+    input.path = Utf8Of(m_file);
+    if (m_facts.numbering) {
+        const std::u16string& pattern = m_facts.numbering->pattern;
+        input = {Utf8Of({pattern.begin(), pattern.end()}), m_facts.rate, m_facts.numbering->first,
+                 m_isPartOfSequence ? m_facts.frames : 0};
+    }
+    const std::string line = CommandText(input, Effect(), m_history.Now().Current());
     std::wstring wide(line.size() + 1, L'\0');
     wide.resize(static_cast<std::size_t>(MultiByteToWideChar(
         CP_UTF8, 0, line.data(), static_cast<int>(line.size()), wide.data(), static_cast<int>(wide.size()))));
@@ -258,7 +292,7 @@ void MainWindow::CopyCommand() {
 }
 
 void MainWindow::ShowHelp(int topic) {
-    m_library.Object().ShowHelp(m_window, topic);
+    CallLibrary([this, topic] { m_library.Object().ShowHelp(m_window, topic); });
 }
 
 void MainWindow::ShowAbout() {

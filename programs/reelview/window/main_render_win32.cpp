@@ -3,6 +3,7 @@
 #include <new>
 #include <utility>
 
+#include "programs/reelview/library/guarded_call_win32.h"
 #include "programs/reelview/window/commands.h"
 #include "programs/reelview/window/main_messages.h"
 #include "programs/reelview/window/main_window_win32.h"
@@ -52,6 +53,7 @@ void MainWindow::OnOpened(const ClipFacts& facts, const ClipRequest& request) {
     m_isOpen = true;
     m_facts = facts;
     m_file = request.files[0];
+    m_isPartOfSequence = request.files.size() > 1;
     m_note.clear();
     m_error.clear();
     KillTimer(m_window, kTimerPlay);
@@ -93,6 +95,8 @@ void MainWindow::RequestPreview() {
             preview.error = failure.what();
         } catch (const std::bad_alloc&) {
             preview.error = text::kNoMemory;
+        } catch (const std::exception&) {
+            preview.error = text::kCannotReadFrame;
         }
         OnWorker([this, asked, preview = std::move(preview)]() mutable {
             if (asked == m_previewsAsked) m_isRendering = false;
@@ -177,6 +181,16 @@ void MainWindow::Complain(const std::wstring& about, const std::string& key) {
     const std::wstring message = NameOf(about) + L"\n\n" + m_texts(key.c_str());
     MessageBoxW(m_progress ? m_progress->m_window : m_window, message.c_str(), kProgramName,
                 MB_OK | MB_ICONEXCLAMATION);
+}
+
+bool MainWindow::CallLibrary(std::function<void()> call) {
+    if (!m_hasLibraryFailed) {
+        m_hasLibraryFailed = !RunGuarded(call);
+        // A dialog that was abandoned has left the window disabled.
+        if (m_hasLibraryFailed) EnableWindow(m_window, TRUE);
+    }
+    if (m_hasLibraryFailed) Complain(kProgramName, text::kLibraryFailed);
+    return !m_hasLibraryFailed;
 }
 
 }  // namespace velmora::reelview

@@ -97,6 +97,8 @@ class MainWindow final : public PanelOwner {
     void RequestThumbnails();
     void ShowStatus();
     void Complain(const std::wstring& about, const std::string& key);
+    // Calls the library on the window's thread. False, after a message, when it failed now or before.
+    bool CallLibrary(std::function<void()> call);
 
     void ShowSettings();     // after undo, presets and the like
     void ShowEffectParts();  // after a change of effect
@@ -123,8 +125,9 @@ class MainWindow final : public PanelOwner {
     std::unique_ptr<ProgressWindow> m_progress;
     HWND m_effectLabel = nullptr, m_effectBox = nullptr, m_status = nullptr;
 
-    bool m_isOpen = false, m_hasComplained = false;
+    bool m_isOpen = false, m_hasComplained = false, m_hasLibraryFailed = false;
     std::wstring m_file;
+    bool m_isPartOfSequence = false;  // dropped pictures: there may be more with later numbers
     ClipFacts m_facts;
     std::uint32_t m_clip = 0, m_previewsAsked = 0;
     bool m_isRendering = false;
