@@ -1,5 +1,7 @@
 #include "driver.h"
 
+#include <shlobj.h>
+
 #include <chrono>
 #include <thread>
 
@@ -75,6 +77,18 @@ std::wstring TextOf(HWND window) {
     return text;
 }
 
+std::vector<char> Clipboard(UINT format) {
+    std::vector<char> bytes;
+    if (!WaitFor([] { return OpenClipboard(nullptr) != FALSE; }, 5.0)) return bytes;
+    if (const HANDLE data = GetClipboardData(format)) {
+        const auto* const start = static_cast<const char*>(GlobalLock(data));
+        if (start != nullptr) bytes.assign(start, start + GlobalSize(data));
+        GlobalUnlock(data);
+    }
+    CloseClipboard();
+    return bytes;
+}
+
 std::wstring Media(const std::wstring& name) {
     wchar_t folder[MAX_PATH] = {};
     GetEnvironmentVariableW(L"REELVIEW_MEDIA", folder, MAX_PATH);
@@ -139,7 +153,7 @@ std::wstring Program::CloseDialogs() const {
 }
 
 // The name field is the dialog's only editable one.
-bool Program::ChooseFile(int command, const std::wstring& file) const {
+bool Program::ChooseFile(int command, const std::wstring& file, int type) const {
     Command(command);
     const HWND dialog = Dialog();
     if (dialog == nullptr) return false;
@@ -147,9 +161,35 @@ bool Program::ChooseFile(int command, const std::wstring& file) const {
     HWND field = GetDlgItem(dialog, kFileName);
     if (field == nullptr) field = GetDlgItem(dialog, kFileNameBox);
     Pause(300);
+    if (type > 0) {
+        constexpr int kFileType = 0x470;
+        SendDlgItemMessageW(dialog, kFileType, CB_SETCURSEL, static_cast<WPARAM>(type - 1), 0);
+        SendMessageW(dialog, WM_COMMAND, MAKEWPARAM(kFileType, CBN_SELENDOK),
+                     reinterpret_cast<LPARAM>(GetDlgItem(dialog, kFileType)));
+    }
     SendMessageW(field, WM_SETTEXT, 0, reinterpret_cast<LPARAM>(file.c_str()));
     PostMessageW(dialog, WM_COMMAND, IDOK, 0);
     return WaitFor([&] { return !IsWindow(dialog); }, 10.0);
+}
+
+// The list must be in the program's own memory: Wine does not pass one on to another process, as Windows does. It is
+// freed by neither, so a few places are used in turn.
+void Program::Drop(const std::vector<std::wstring>& files) {
+    constexpr SIZE_T kPlaceBytes = 16384, kPlaces = 32;
+    if (m_drops == nullptr) {
+        m_drops = static_cast<char*>(
+            VirtualAllocEx(Process(), nullptr, kPlaceBytes * kPlaces, MEM_COMMIT, PAGE_READWRITE));
+    }
+    DROPFILES head = {};
+    head.pFiles = sizeof head;
+    head.fWide = TRUE;
+    std::wstring names;
+    for (const std::wstring& file : files) names += file + L'\0';
+    char* const place = m_drops + kPlaceBytes * (m_dropCount++ % kPlaces);
+    WriteProcessMemory(Process(), place, &head, sizeof head, nullptr);
+    WriteProcessMemory(Process(), place + sizeof head, names.c_str(), (names.size() + 1) * sizeof(wchar_t),
+                       nullptr);
+    PostMessageW(m_window, WM_DROPFILES, reinterpret_cast<WPARAM>(place), 0);
 }
 
 DWORD Program::Close() {

@@ -9,6 +9,9 @@
 
 namespace velmora::reelview::test {
 
+// The clipboard's data in a format; empty if there is none.
+std::vector<char> Clipboard(UINT format);
+
 // True if the condition becomes true within a generous time limit.
 bool WaitFor(const std::function<bool()>& condition, double seconds = 20.0);
 
@@ -36,14 +39,17 @@ class Program {
     void Command(int command) const { PostMessageW(m_window, WM_COMMAND, static_cast<WPARAM>(command), 0); }
     // Presses the default button of each dialog until none is left, and returns their texts.
     std::wstring CloseDialogs() const;
-    // Selects a file in the dialog that a command opens.
-    bool ChooseFile(int command, const std::wstring& file) const;
+    // Selects a file in the dialog that a command opens, and a file type by its number from 1; 0: the usual one.
+    bool ChooseFile(int command, const std::wstring& file, int type = 0) const;
+    void Drop(const std::vector<std::wstring>& files);
     // Closes the window and returns the exit code, or 999 when the program does not end.
     DWORD Close();
 
   private:
     PROCESS_INFORMATION m_process = {};
     HWND m_window = nullptr;
+    char* m_drops = nullptr;  // in the program
+    std::size_t m_dropCount = 0;
 };
 
 // Mouse and keyboard messages to a window; positions in its pixels.

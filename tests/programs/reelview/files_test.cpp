@@ -4,6 +4,7 @@
 
 #include <filesystem>
 #include <fstream>
+#include <sstream>
 #include <string>
 #include <vector>
 
@@ -94,6 +95,44 @@ TEST(SequenceNames, ContinueTheNumber) {
     EXPECT_EQ(SequenceOf(u"f12.png", folder), (Names{u"f12.png"}));
     EXPECT_EQ(SequenceOf(u"notes.txt", folder), (Names{u"notes.txt"}));
     EXPECT_EQ(SequenceOf(u"99999999999999999999.png", folder), (Names{u"99999999999999999999.png"}));
+}
+
+TEST(Orientation, IsReadFromBothByteOrders) {
+    const auto stored = [](const std::string& bytes) {
+        std::istringstream file(bytes);
+        return StoredOrientation(file);
+    };
+    using namespace std::string_literals;
+    const std::string big = "MM\0*\0\0\0\x0A\0\0\0\1\1\x12\0\3\0\0\0\1\0\x06\0\0"s;
+    const std::string little = "II*\0\x08\0\0\0\1\0\x12\1\3\0\1\0\0\0\x08\0\0\0"s;
+    EXPECT_EQ(stored(big), 6);
+    EXPECT_EQ(stored(little), 8);
+    const std::string jpeg = "\xFF\xD8\xFF\xE0\0\4\0\0\xFF\xE1\0\x22"s + "Exif\0\0"s;
+    EXPECT_EQ(stored(jpeg + big), 6);
+    EXPECT_EQ(stored("\xFF\xD8\xFF\xDA\0\4\0\0\xFF\xE1\0\x22"s + "Exif\0\0"s + big), 1)
+        << "behind the pixels";
+    std::string odd = little;
+    odd[18] = 9;
+    for (const std::string& bytes : {odd, ""s, "\xFF\xD8"s, "\xFF\xD8\xFF\xE1\0\0"s, big.substr(0, 20)}) {
+        EXPECT_EQ(stored(bytes), 1);
+    }
+}
+
+TEST(SequenceNames, PatternsNameThemAll) {
+    using Names = std::vector<std::u16string>;
+    const auto pattern = [](const Names& names) {
+        const auto numbering = NumberingOf(names);
+        return numbering ? numbering->pattern + (numbering->first == 9 ? u" 9" : u" other")
+                         : std::u16string();
+    };
+    EXPECT_EQ(pattern({u"C:\\v2\\f008.png", u"C:\\v2\\f009.png", u"C:\\v2\\f010.png"}),
+              u"C:\\v2\\f%03d.png other");
+    EXPECT_EQ(pattern({u"f9.png", u"f10.png"}), u"f%d.png 9");
+    EXPECT_EQ(pattern({u"50%f98", u"50%f99", u"50%f100"}), u"50%%f%02d other");
+    for (const Names& names : {Names{u"f8.png", u"f010.png"}, Names{u"f8.png", u"f09.png"}, Names{u"a.png"},
+                               Names{u"a1.png", u"b2.png"}, Names{}}) {
+        EXPECT_EQ(pattern(names), u"");
+    }
 }
 
 }  // namespace

@@ -2,14 +2,11 @@
 // (default 5), MONKEY_SEED the sequence.
 
 #include <windows.h>
-#include <psapi.h>
-#include <shlobj.h>
 
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <chrono>
-#include <cstring>
 #include <cstdlib>
 #include <iostream>
 #include <random>
@@ -17,6 +14,7 @@
 #include <vector>
 
 #include "driver.h"
+#include "held.h"
 #include "programs/reelview/panel/panel_window_win32.h"
 #include "programs/reelview/view/transport_bar_win32.h"
 #include "programs/reelview/window/commands.h"
@@ -86,7 +84,21 @@ class Monkey {
         if (m_program.Dialog(0.0) != nullptr) m_program.CloseDialogs();
     }
 
+    // As at the start, so that what the program holds can be compared.
+    void Rest() {
+        WaitFor([&] { return m_program.Dialog(0.0) == nullptr || m_program.CloseDialogs().empty(); }, 5.0);
+        ChooseEffect(0);
+        m_program.Drop({Media(L"small.y4m")});
+        WaitFor([&] { return m_program.Status().starts_with(L"Frame 1 / 12"); });
+        WaitFor([] { return false; }, 2.0);  // the presets' pictures
+    }
+
   private:
+    void ChooseEffect(int effect) const {
+        SendMessageW(m_program.Control(kControlEffect), CB_SETCURSEL, static_cast<WPARAM>(effect), 0);
+        PostMessageW(m_program.Window(), WM_COMMAND, MAKEWPARAM(kControlEffect, CBN_SELCHANGE), 0);
+    }
+
     int Roll(int sides) { return std::uniform_int_distribution<int>(0, std::max(sides - 1, 0))(m_dice); }
 
     std::vector<HWND> Windows() const {
@@ -98,51 +110,24 @@ class Monkey {
     // All commands but Exit, and Help, which opens another program.
     void Order() {
         if (Roll(3) == 0) {
-            SendMessageW(m_program.Control(kControlEffect), CB_SETCURSEL, static_cast<WPARAM>(Roll(5)), 0);
-            PostMessageW(m_program.Window(), WM_COMMAND, MAKEWPARAM(kControlEffect, CBN_SELCHANGE), 0);
+            ChooseEffect(Roll(5));
             return;
         }
         const int command = kCommandOpen + Roll(kCommandLoop - kCommandOpen + 1);
         if (command != kCommandExit) m_program.Command(command);
     }
 
-    // The receiver frees the memory of a drop.
     void Drop() {
         static const wchar_t* const kFiles[] = {L"small.y4m",   L"picture.png", L"cut.png",    L"empty.png",
                                                 L"plain.avi",   L"cut.avi",     L"text.mp4",   L"huge.y4m",
                                                 L"missing.bmp", L"picture.jpg", L"header.y4m", L"picture.tif",
                                                 L"seq01.png"};
-        const std::wstring file = Media(kFiles[Roll(13)]);
-        const SIZE_T bytes = sizeof(DROPFILES) + (file.size() + 2) * sizeof(wchar_t);
-        const HGLOBAL memory = GlobalAlloc(GMEM_MOVEABLE | GMEM_SHARE | GMEM_ZEROINIT, bytes);
-        auto* const drop = static_cast<DROPFILES*>(GlobalLock(memory));
-        drop->pFiles = sizeof(DROPFILES);
-        drop->fWide = TRUE;
-        std::memcpy(drop + 1, file.c_str(), (file.size() + 1) * sizeof(wchar_t));
-        GlobalUnlock(memory);
-        if (!PostMessageW(m_program.Window(), WM_DROPFILES, reinterpret_cast<WPARAM>(memory), 0))
-            GlobalFree(memory);
+        m_program.Drop({Media(kFiles[Roll(13)])});
     }
 
     std::mt19937 m_dice;
     Program m_program;
 };
-
-struct Held {
-    DWORD handles, gdi, user;  // 0 where the system does not count them
-    SIZE_T bytes;
-};
-
-Held HeldBy(HANDLE process) {
-    Held held = {};
-    GetProcessHandleCount(process, &held.handles);
-    held.gdi = GetGuiResources(process, GR_GDIOBJECTS);
-    held.user = GetGuiResources(process, GR_USEROBJECTS);
-    PROCESS_MEMORY_COUNTERS memory = {};
-    GetProcessMemoryInfo(process, &memory, sizeof memory);
-    held.bytes = memory.PagefileUsage;
-    return held;
-}
 
 TEST(Monkey, FindsNothing) {
     const auto seed = static_cast<unsigned>(Number("MONKEY_SEED", 1));
@@ -151,6 +136,7 @@ TEST(Monkey, FindsNothing) {
     const Program& program = monkey.Home();
     ASSERT_TRUE(WaitFor([&] { return program.Status().find(L"Frame") != std::wstring::npos; }));
     for (int i = 0; i < 200; ++i) monkey.Act();
+    monkey.Rest();
     ASSERT_TRUE(program.Answers());
     const Held before = HeldBy(program.Process());
     const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(seconds);
@@ -160,7 +146,7 @@ TEST(Monkey, FindsNothing) {
         if (acts % 50 != 0) continue;
         ASSERT_TRUE(program.Lives() && program.Answers()) << "seed " << seed << ", act " << acts;
     }
-    WaitFor([&] { return program.Dialog(0.0) == nullptr || program.CloseDialogs().empty(); }, 5.0);
+    monkey.Rest();
     ASSERT_TRUE(program.Answers());
     const Held after = HeldBy(program.Process());
     std::cout << acts << " acts; handles " << before.handles << " to " << after.handles << ", GDI "

@@ -150,9 +150,38 @@ TEST(CommandText, WritesWhatIsSet) {
     effect.name = "Film Look";
     effect.params = {Slider("Tint", -100, 100), Slider("Film Gamma", 0, 100)};
     const Values values = {Value(0.25f), Value(0.0f)};
-    EXPECT_EQ(CommandText("C:\\a b\\in.mp4", effect, values),
+    EXPECT_EQ(CommandText({"C:\\a b\\in.mp4", {}, 0, 0}, effect, values),
               "reelfx render \"C:\\a b\\in.mp4\" \"C:\\a b\\in-film.mp4\" --effect \"Film Look\" --set "
               "\"Tint=-50\"");
+    const Values defaults = DefaultsOf(effect);
+    EXPECT_EQ(CommandText({"f%03d.png", hosts::FrameRate{25, 1}, 1, 0}, effect, defaults),
+              "reelfx render \"f%03d.png\" \"f%03d-film.png\" --rate 25 --effect \"Film Look\"");
+    EXPECT_EQ(CommandText({"f%d.png", hosts::FrameRate{30000, 1001}, 98, 12}, effect, defaults),
+              "reelfx render \"f%d.png\" \"f%d-film.png\" --rate 30000/1001 --start-number 98 --frames 0:12 "
+              "--effect "
+              "\"Film Look\"");
+}
+
+// Two pixels, a before b, as each Exif orientation shows them: in a row (a then b or b then a) or in a column.
+TEST(Picture, TurnsAsExifSays) {
+    Picture picture{{2, 1}, {'a', 0, 0, 0, 'b', 0, 0, 0}};
+    struct Row {
+        int orientation;
+        std::int32_t width;
+        char first;
+    };
+    for (const Row& row : {Row{1, 2, 'a'}, Row{2, 2, 'b'}, Row{3, 2, 'b'}, Row{4, 2, 'a'}, Row{5, 1, 'a'},
+                           Row{6, 1, 'a'}, Row{7, 1, 'b'}, Row{8, 1, 'b'}, Row{0, 2, 'a'}, Row{9, 2, 'a'}}) {
+        const Picture turned = Turned(picture, row.orientation);
+        EXPECT_EQ(turned.size.width, row.width) << row.orientation;
+        EXPECT_EQ(turned.pixels[0], row.first) << row.orientation;
+    }
+    // A column of two shows what mirrors the rows.
+    picture.size = {1, 2};
+    for (const Row& row : {Row{1, 1, 'a'}, Row{2, 1, 'a'}, Row{3, 1, 'b'}, Row{4, 1, 'b'}, Row{5, 2, 'a'},
+                           Row{6, 2, 'b'}, Row{7, 2, 'b'}, Row{8, 2, 'a'}}) {
+        EXPECT_EQ(Turned(picture, row.orientation).pixels[0], row.first) << row.orientation;
+    }
 }
 
 TEST(ViewOptions, Reads) {

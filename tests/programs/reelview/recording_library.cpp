@@ -1,14 +1,14 @@
-// Wraps the real library and records what the host passes to it. For each frame it writes the file REELVIEW_RECORD
-// with the effect's name and, line by line, the bits of each parameter's value. REELVIEW_FAULT makes it fail.
+// Wraps the real library and records what the host passes to it (record.h). REELVIEW_FAULT makes it fail.
 
 #include <windows.h>
 
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
-#include <string>
+#include <iterator>
 
 #include "api/host_api.h"
+#include "record.h"
 
 namespace velmora {
 namespace {
@@ -24,23 +24,21 @@ void Crash() {
     *nowhere = 1;
 }
 
-void Record(IVideoEffect& effect, IVideoHost& host) {
-    const wchar_t* const name = _wgetenv(L"REELVIEW_RECORD");
-    if (name == nullptr) return;
-    const std::wstring unfinished = std::wstring(name) + L".new";
-    std::FILE* const file = _wfopen(unfinished.c_str(), L"w");
-    if (file == nullptr) return;
-    std::fprintf(file, "%s\n", effect.GetName());
+void Write(IVideoEffect& effect, IVideoHost& host) {
+    static const char* const name = std::getenv("REELVIEW_RECORD");
+    static reelview::test::Record* const record =
+        name != nullptr ? reelview::test::OpenRecord(name, false) : nullptr;
+    if (record == nullptr) return;
+    InterlockedIncrement(&record->turn);
+    std::snprintf(record->effect, sizeof record->effect, "%s", effect.GetName());
     ParamDescriptor descriptor = {};
-    for (std::uint32_t i = 0; effect.GetParamInfo(i, &descriptor); ++i) {
+    record->count = 0;
+    while (record->count < std::size(record->values) && effect.GetParamInfo(record->count, &descriptor)) {
         ValueCell cell = {};
-        host.GetParamValue(i, &cell, descriptor.kind);
-        std::fprintf(file, "%08X\n", static_cast<unsigned>(cell.value.bits));
+        host.GetParamValue(record->count, &cell, descriptor.kind);
+        record->values[record->count++] = cell.value.bits;
     }
-    std::fclose(file);
-    // The test may be reading the previous record.
-    for (int i = 0; i < 500 && !MoveFileExW(unfinished.c_str(), name, MOVEFILE_REPLACE_EXISTING); ++i)
-        Sleep(2);
+    InterlockedIncrement(&record->turn);
 }
 
 class RecordingEffect final : public IVideoEffect {
@@ -65,10 +63,13 @@ class RecordingEffect final : public IVideoEffect {
     bool VM_CALL Process(IVideoHost* host, const FrameRecord* source, void* argument,
                          const FrameRecord* destination, const TimingRecord* timing) override {
         if (FaultIs("crashes")) Crash();
+        if (FaultIs("aborts")) std::abort();
+        if (FaultIs("ends-the-process")) ExitProcess(7);
+        if (FaultIs("raises")) RaiseException(0xE0000001u, EXCEPTION_NONCONTINUABLE, 0, nullptr);
         if (FaultIs("refuses")) return false;
         if (FaultIs("hangs")) Sleep(INFINITE);
         // Thumbnails of presets have values of their own, so they are not recorded.
-        if (source->width > 200) Record(*m_effect, *host);
+        if (source->width > 200) Write(*m_effect, *host);
         return m_effect->Process(host, source, argument, destination, timing);
     }
     const char* VM_CALL GetPresetName(std::uint32_t index) override { return m_effect->GetPresetName(index); }
@@ -99,6 +100,7 @@ class RecordingLibrary final : public IEffectLibrary {
         return effect != nullptr ? new RecordingEffect(effect) : nullptr;
     }
     std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic) override {
+        if (FaultIs("aborts-in-help")) std::abort();
         return m_library->ShowHelp(owner, topic);
     }
     IShellServices* VM_CALL GetShellServices() override { return m_library->GetShellServices(); }
