@@ -53,23 +53,48 @@ const Kernels kPlainKernels = {ToneRow, WearRow,      DrawScratchesPlain, CopyRo
 
 namespace {
 
-ByteTable Differences(const ByteTable& table) noexcept {
-    ByteTable result = table;
-    for (std::size_t i = 0; i < table.size(); ++i) {
-        if (i % 128 >= 16) result[i] = table[i] ^ table[i - 16];
+// In each half, from the second 16 bytes on.
+template <std::size_t kSize>
+void XorWithBytesBefore(std::array<std::uint8_t, kSize>& bytes) noexcept {
+    for (std::size_t i = kSize; i-- > 16;) {
+        if (i % (kSize / 2) >= 16) bytes[i] ^= bytes[i - 16];
     }
-    return result;
 }
 
 }  // namespace
+
+void ShuffleTable::Set(const ByteTable& table) noexcept {
+    differences = table;
+    XorWithBytesBefore(differences);
+    climbs = {};
+    isGentle = true;
+    for (std::size_t group = 0; group < 16; ++group) {
+        const auto over = [&](std::size_t i) {
+            return static_cast<std::int32_t>(table[16 * group + i]) -
+                   static_cast<std::int32_t>(16 * group + i);
+        };
+        std::int32_t least = over(0), most = over(0);
+        for (std::size_t i = 1; i < 16; ++i) {
+            least = std::min(least, over(i));
+            most = std::max(most, over(i));
+        }
+        isGentle = isGentle && most - least <= 15;
+        bases[group] = static_cast<std::uint8_t>(least);
+        for (std::size_t i = 0; i < 16; ++i) {
+            climbs[group % 8 * 16 + i] |= static_cast<std::uint8_t>((over(i) - least) << group / 8 * 4);
+        }
+    }
+    XorWithBytesBefore(climbs);
+}
 
 void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept {
     blue = b;
     green = g;
     red = r;
-    blueDifferences = Differences(b);
-    greenDifferences = Differences(g);
-    redDifferences = Differences(r);
+    blueShuffles.Set(b);
+    greenShuffles.Set(g);
+    redShuffles.Set(r);
+    areGentle = blueShuffles.isGentle && greenShuffles.isGentle && redShuffles.isGentle;
     for (std::size_t i = 0; i < 256; ++i) {
         blueWord[i] = b[i];
         greenWord[i] = std::uint32_t{g[i]} << 8;

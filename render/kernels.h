@@ -17,16 +17,30 @@
 
 namespace velmora::render {
 
+// A table for lookups by byte shuffles, which find one of 16 entries. A group is 16 entries that follow one another.
+struct ShuffleTable {
+    // In each half of the table, the groups after the first are XORed with the group before.
+    alignas(64) ByteTable differences;
+    // A gentle table rises by 0 to 30 in each group. Its entry i is i + the group's base + a climb of 0 to 15. Two
+    // groups share 16 bytes: group g < 8 has the lower four bits, group g + 8 the upper ones. In each half, all but the
+    // first 16 bytes are XORed with those before.
+    alignas(64) std::array<std::uint8_t, 128> climbs;
+    alignas(16) std::array<std::uint8_t, 16> bases;
+    bool isGentle;
+
+    void Set(const ByteTable& table) noexcept;
+};
+
 // One table per channel, prepared for the kernels.
 struct ChannelTables {
     alignas(64) ByteTable blue;
     alignas(64) ByteTable green;
     alignas(64) ByteTable red;
-    // For lookups by byte shuffles: in each half of a table, every entry after the first 16 is XORed with the entry 16
-    // places before it.
-    alignas(16) ByteTable blueDifferences;
-    alignas(16) ByteTable greenDifferences;
-    alignas(16) ByteTable redDifferences;
+    // For lookups by byte shuffles.
+    ShuffleTable blueShuffles;
+    ShuffleTable greenShuffles;
+    ShuffleTable redShuffles;
+    bool areGentle;  // all three
     // For lookups without byte shuffles: each entry at its channel's place in a pixel word.
     std::array<std::uint32_t, 256> blueWord;
     std::array<std::uint32_t, 256> greenWord;

@@ -7,6 +7,7 @@
 #include <cstring>
 #include <limits>
 #include <span>
+#include <type_traits>
 
 #include "render/glow_kernels.h"
 #include "render/scratch_line.h"
@@ -26,6 +27,8 @@ namespace {
 #include "render/simd/wear.inc"
 #include "render/simd/tone_lines.inc"
 #include "render/simd/channels.inc"
+#include "render/simd/mix.inc"
+#include "render/simd/mix_channels.inc"
 #include "render/simd/table_permutes.inc"
 #include "render/simd/tone_channels.inc"
 #include "render/simd/ycbcr.inc"

@@ -7,6 +7,7 @@
 #include <cstring>
 #include <limits>
 #include <span>
+#include <type_traits>
 
 #include "render/glow_kernels.h"
 #include "render/scratch_span.h"
@@ -26,6 +27,7 @@ namespace {
 #include "render/simd/wear.inc"
 #include "render/simd/tone_lines.inc"
 #include "render/simd/table_words.inc"
+#include "render/simd/mix.inc"
 #include "render/simd/mix_words.inc"
 #include "render/simd/tone_words.inc"
 #include "render/simd/glow.inc"

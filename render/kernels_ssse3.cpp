@@ -7,6 +7,7 @@
 #include <cstring>
 #include <limits>
 #include <span>
+#include <type_traits>
 
 #include "render/glow_kernels.h"
 #include "render/scratch_line.h"
@@ -26,8 +27,8 @@ namespace {
 #include "render/simd/rows.inc"
 #include "render/simd/wear.inc"
 #include "render/simd/tone_lines.inc"
-#include "render/simd/channels.inc"
-#include "render/simd/mix_channels.inc"
+#include "render/simd/mix.inc"
+#include "render/simd/mix_words.inc"
 #include "render/simd/table_words.inc"
 #include "render/simd/tone_words.inc"
 #include "render/simd/glow.inc"
