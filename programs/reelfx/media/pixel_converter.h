@@ -1,44 +1,59 @@
-// Converts decoded frames to BGRA and back. Both ways use the frame's own matrix, range and chroma position,
-// so that an unchanged picture comes back as it was. One converter per thread.
+// Converts decoded frames to pictures and back. Both ways use the frame's own matrix, range and chroma position, so
+// that an unchanged picture comes back as it was. One converter per thread.
+//
+// Frames of YCbCr, grey and deep RGB go through conversion/, which rounds once. The library's scaler does the rest:
+// 8-bit RGB, where both are exact and it is faster, frames of another size than the picture, palettes and other rare
+// formats.
 #pragma once
 
+#include <optional>
+
+#include "programs/reelfx/conversion/frame_coding.h"
+#include "programs/reelfx/conversion/frame_to_picture.h"
+#include "programs/reelfx/conversion/picture_to_frame.h"
+#include "programs/reelfx/conversion/picture_view.h"
 #include "programs/reelfx/media/av_handles.h"
 #include "programs/reelfx/media/bgra_picture.h"
 
 namespace velmora::hosts {
 
-// If a stream has no matrix tag, players assume BT.709 for high definition and BT.601 below.
-AVColorSpace EffectiveMatrix(AVColorSpace space, int width, int height);
-
-bool IsRgb(AVPixelFormat format);
-
 class PixelConverter {
   public:
-    // Fills `picture` and keeps its size: a frame of another size is scaled.
-    void ToBgra(const AVFrame& frame, BgraPicture& picture);
+    // Fills the picture, whose size and type of samples stay: a frame of another size is scaled. Alpha is the
+    // frame's, or opaque. Throws Failure (kExitInput) for a format that cannot be converted.
+    void ToPicture(const AVFrame& frame, const PictureView& picture);
 
     // Fills the frame's planes; its size, format, range, matrix and chroma position are set by the caller.
-    void FromBgra(const BgraPicture& picture, AVFrame& frame);
+    void FromPicture(const ConstPictureView& picture, AVFrame& frame);
+
+    void ToBgra(const AVFrame& frame, BgraPicture& picture) {
+        ToPicture(frame,
+                  {picture.Row(0), picture.Stride(), picture.Width(), picture.Height(), SampleType::kBytes});
+    }
+    void FromBgra(const BgraPicture& picture, AVFrame& frame) {
+        FromPicture({picture.Row(0), picture.Stride(), picture.Width(), picture.Height(), SampleType::kBytes},
+                    frame);
+    }
 
   private:
-    // One side of a conversion.
-    struct Side {
-        int width, height;
-        AVPixelFormat format;
-        AVColorSpace space;
-        AVColorRange range;
-        AVChromaLocation chroma;
-        bool operator==(const Side&) const = default;
+    template <class Conversion>
+    struct Prepared {
+        FrameCoding coding{};
+        SampleType samples{};
+        std::optional<Conversion> conversion;
     };
     struct Scaler {
-        Side from{}, to{};
+        FrameCoding from{}, to{};
         ScalerPtr context;
     };
-    static Side SideOf(const AVFrame& frame);
-    static Side SideOf(const BgraPicture& picture);
-    static void Prepare(Scaler& scaler, const Side& from, const Side& to);
+    static void Prepare(Scaler& scaler, const FrameCoding& from, const FrameCoding& to);
+    void ScaleToPicture(const AVFrame& frame, const PictureView& picture);
+    void ScaleFromPicture(const ConstPictureView& picture, AVFrame& frame);
 
-    Scaler m_toBgra, m_fromBgra;
+    Prepared<FrameToPicture> m_toPicture;
+    Prepared<PictureToFrame> m_fromPicture;
+    Scaler m_toScaler, m_fromScaler;
+    std::vector<std::uint16_t> m_words;  // a picture between floats and the scaler
 };
 
 }  // namespace velmora::hosts

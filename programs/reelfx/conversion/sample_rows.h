@@ -1,0 +1,49 @@
+// Rows of samples as floats, with padding on both sides, and their transfer from and to frames.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+#include <vector>
+
+#include "programs/reelfx/conversion/chroma_filter.h"
+#include "programs/reelfx/conversion/frame_coding.h"
+#include "programs/reelfx/conversion/row_kernels.h"
+
+namespace velmora::hosts {
+
+class FloatRow {
+  public:
+    static constexpr int kPadding = 32;  // samples on each side; more than the taps reach
+
+    explicit FloatRow(int width = 0)
+        : m_samples(static_cast<std::size_t>(width) + 2 * static_cast<std::size_t>(kPadding)) {}
+    [[nodiscard]] float* Samples() { return m_samples.data() + kPadding; }
+    [[nodiscard]] const float* Samples() const { return m_samples.data() + kPadding; }
+    // Repeats the first and the last of `count` samples into the padding.
+    void ExtendEnds(int count);
+
+  private:
+    std::vector<float> m_samples;
+};
+
+// `y` counts rows of the component's own plane.
+void ReadRow(const RowKernels& kernels, const AVFrame& frame, const ComponentLayout& layout, int y, int count,
+             float* out);
+// Adds `zero`, rounds to the nearest code number and limits to those that there are.
+void WriteRow(const RowKernels& kernels, const float* in, const ComponentLayout& layout, float zero, int y,
+              int count, AVFrame& frame);
+
+// The sum of rows by their taps; row(place) gives the row for a tap, in which sample i is the one for output i.
+template <class RowAt>
+void SumRows(const RowKernels& kernels, const FilterTaps& taps, int count, float* out, const RowAt& row) {
+    const float* rows[kMostTaps];
+    float weights[kMostTaps];
+    std::size_t used = 0;
+    for (const FilterTap& tap : taps) {
+        rows[used] = row(tap.place);
+        weights[used++] = tap.weight;
+    }
+    kernels.weightedSums[used - 1](rows, weights, out, count);
+}
+
+}  // namespace velmora::hosts
