@@ -8,8 +8,7 @@
 #include <optional>
 #include <string>
 
-#include "programs/reelview/base/box.h"
-#include "programs/reelview/base/knob_colours.h"
+#include "programs/reelview/base/picture.h"
 #include "platform/win32.h"
 
 namespace velmora::reelview {

@@ -1,12 +1,12 @@
-#include "programs/reelview/keeper/avi_sink_win32.h"
+#include "programs/reelview/keeper/export_job_win32.h"
 
 #include <cstring>
 #include <filesystem>
 #include <fstream>
 #include <utility>
 
-#include "programs/reelview/keeper/safe_file.h"
-#include "programs/reelview/source/avi_path_win32.h"
+#include "programs/reelview/keeper/frame_sink.h"
+#include "programs/reelview/source/open_clip_win32.h"
 #include "programs/reelview/base/text_keys.h"
 #include "platform/win32.h"
 

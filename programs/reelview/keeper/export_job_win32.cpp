@@ -2,7 +2,6 @@
 #include <new>
 
 #include "programs/reelview/keeper/export_job_win32.h"
-#include "programs/reelview/keeper/png_sink_win32.h"
 #include "programs/reelview/base/text_keys.h"
 
 namespace velmora::reelview {

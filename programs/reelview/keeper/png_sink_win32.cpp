@@ -1,12 +1,12 @@
-#include "programs/reelview/keeper/png_sink_win32.h"
+#include "programs/reelview/keeper/export_job_win32.h"
 
 #include <algorithm>
 #include <filesystem>
 #include <system_error>
 #include <vector>
 
-#include "programs/reelview/keeper/safe_file.h"
-#include "programs/reelview/source/wic_picture_win32.h"
+#include "programs/reelview/keeper/frame_sink.h"
+#include "programs/reelview/source/open_clip_win32.h"
 #include "programs/reelview/base/text_keys.h"
 
 namespace velmora::reelview {

@@ -1,4 +1,4 @@
-#include "programs/reelview/panel/knob_motion.h"
+#include "programs/reelview/panel/knob.h"
 
 #include <algorithm>
 #include <cmath>

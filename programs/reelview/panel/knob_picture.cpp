@@ -1,10 +1,8 @@
-#include "programs/reelview/panel/knob_picture.h"
+#include "programs/reelview/panel/knob.h"
 
 #include <algorithm>
 #include <cmath>
 #include <numbers>
-
-#include "programs/reelview/panel/knob_motion.h"
 
 namespace velmora::reelview {
 namespace {

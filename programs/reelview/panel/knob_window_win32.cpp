@@ -6,7 +6,7 @@
 #include <cmath>
 
 #include "programs/reelview/base/window_class_win32.h"
-#include "programs/reelview/panel/knob_picture.h"
+#include "programs/reelview/panel/knob.h"
 
 namespace velmora::reelview {
 namespace {

@@ -7,7 +7,7 @@
 #include <string>
 
 #include "programs/common/effect_info.h"
-#include "programs/reelview/panel/knob_motion.h"
+#include "programs/reelview/panel/knob.h"
 #include "programs/reelview/base/theme_win32.h"
 
 namespace velmora::reelview {

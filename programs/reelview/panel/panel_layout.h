@@ -7,11 +7,14 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "programs/common/effect_info.h"
-#include "programs/reelview/base/box.h"
+#include "programs/reelview/base/picture.h"
+#include "api/host_api.h"
 
 namespace velmora::reelview {
 
@@ -34,5 +37,16 @@ struct PanelLayout {
 
 // In pixels. Positions and sizes from a careless library are clamped to a range that a window can show.
 [[nodiscard]] PanelLayout LayOutPanel(const std::vector<hosts::ParamInfo>& params, UnitScale scale);
+
+// Values as the panel shows them and as a user types them: as many decimals as a thousandth of the range needs, without trailing zeros: "24.5", "-100", "0.25".
+[[nodiscard]] std::string SliderText(const hosts::ParamInfo& param, double value, char decimalPoint);
+
+// Accepts a decimal point or comma, whatever the locale, and clamps to the range. Empty when the text is not a
+// number.
+[[nodiscard]] std::optional<double> TypedSlider(const hosts::ParamInfo& param, std::string_view text);
+
+// "#RRGGBB" for a word 0x00BBGGRR.
+[[nodiscard]] std::string ColourText(std::uint32_t colour);
+[[nodiscard]] std::optional<std::uint32_t> TypedColour(std::string_view text);
 
 }  // namespace velmora::reelview

@@ -1,4 +1,4 @@
-#include "programs/reelview/panel/value_text.h"
+#include "programs/reelview/panel/panel_layout.h"
 
 #include <algorithm>
 #include <charconv>

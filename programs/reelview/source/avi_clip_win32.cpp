@@ -5,8 +5,7 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "programs/reelview/source/avi_clip_win32.h"
-#include "programs/reelview/source/avi_path_win32.h"
+#include "programs/reelview/source/open_clip_win32.h"
 #include "programs/reelview/base/text_keys.h"
 #include "platform/win32.h"
 

@@ -2,15 +2,17 @@
 #pragma once
 
 #include <cstdint>
+#include <filesystem>
 #include <istream>
 #include <memory>
 #include <optional>
 #include <stdexcept>
+#include <string>
+#include <vector>
 
 #include "text/number_text.h"
 #include "programs/common/y4m.h"
 #include "programs/reelview/base/picture.h"
-#include "programs/reelview/source/sequence_names.h"
 
 namespace velmora::reelview {
 
@@ -18,6 +20,12 @@ namespace velmora::reelview {
 class SourceError : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;
+};
+
+// A pattern that names numbered pictures.
+struct Numbering {
+    std::u16string pattern;  // as printf takes it: "frame%04d.png"; a percent sign in a name is doubled
+    std::uint64_t first = 0;
 };
 
 struct ClipFacts {
@@ -53,5 +61,16 @@ class ClipSource {
 inline constexpr std::int32_t kLargestSide = 16384;
 // Throws SourceError when a frame of this size is empty or too large.
 void CheckSize(hosts::FrameSize size);
+
+// A YUV4MPEG2 file. Throws SourceError. A truncated file gives its complete frames.
+[[nodiscard]] std::unique_ptr<ClipSource> OpenY4mClip(const std::filesystem::path& file);
+
+// Numbered pictures: `name` is a file's name, `names` lists its folder. Returns the names that differ from it only in the last run of
+// digits, in numerical order, up to the first missing number; at least `name` itself.
+[[nodiscard]] std::vector<std::u16string> SequenceOf(const std::u16string& name,
+                                                     const std::vector<std::u16string>& names);
+
+// Of paths in order. Empty unless they differ only in consecutive numbers, all padded to the same width.
+[[nodiscard]] std::optional<Numbering> NumberingOf(const std::vector<std::u16string>& paths);
 
 }  // namespace velmora::reelview

@@ -10,7 +10,7 @@
 #include <cstdlib>
 #include <cstring>
 
-#include "programs/reelview/source/media_clip_win32.h"
+#include "programs/reelview/source/open_clip_win32.h"
 #include "programs/reelview/base/text_keys.h"
 #include "platform/win32.h"
 

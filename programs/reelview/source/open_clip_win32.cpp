@@ -4,10 +4,7 @@
 #include <fstream>
 #include <string_view>
 
-#include "programs/reelview/source/avi_clip_win32.h"
-#include "programs/reelview/source/media_clip_win32.h"
-#include "programs/reelview/source/wic_picture_win32.h"
-#include "programs/reelview/source/y4m_clip.h"
+#include "programs/reelview/source/clip_source.h"
 #include "programs/reelview/base/text_keys.h"
 
 namespace velmora::reelview {

@@ -1,4 +1,4 @@
-#include "programs/reelview/source/sequence_names.h"
+#include "programs/reelview/source/clip_source.h"
 
 #include <map>
 #include <string_view>

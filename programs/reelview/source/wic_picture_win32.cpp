@@ -6,8 +6,8 @@
 #include <fstream>
 #include <utility>
 
-#include "programs/reelview/source/sequence_names.h"
-#include "programs/reelview/source/wic_picture_win32.h"
+#include "programs/reelview/source/clip_source.h"
+#include "programs/reelview/source/open_clip_win32.h"
 #include "programs/reelview/base/text_keys.h"
 
 namespace velmora::reelview {

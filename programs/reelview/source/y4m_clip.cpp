@@ -1,4 +1,4 @@
-#include "programs/reelview/source/y4m_clip.h"
+#include "programs/reelview/source/clip_source.h"
 
 #include <fstream>
 #include <string>

@@ -4,7 +4,7 @@
 #include <cstdint>
 
 #include "text/number_text.h"
-#include "programs/reelview/base/box.h"
+#include "programs/reelview/base/picture.h"
 
 namespace velmora::reelview {
 

@@ -2,10 +2,9 @@
 #include <utility>
 
 #include "help/topics.h"
-#include "programs/reelview/document/command_text.h"
-#include "programs/reelview/keeper/png_sink_win32.h"
+#include "programs/reelview/document/command_line.h"
+#include "programs/reelview/keeper/export_job_win32.h"
 #include "programs/reelview/window/commands.h"
-#include "programs/reelview/window/main_messages.h"
 #include "programs/reelview/window/main_window_win32.h"
 #include "programs/reelview/base/text_keys.h"
 

@@ -5,7 +5,6 @@
 
 #include "programs/reelview/library/guarded_call_win32.h"
 #include "programs/reelview/window/commands.h"
-#include "programs/reelview/window/main_messages.h"
 #include "programs/reelview/window/main_window_win32.h"
 #include "programs/reelview/base/text_keys.h"
 

@@ -12,7 +12,7 @@
 #include <vector>
 
 #include "programs/reelview/document/settings_history.h"
-#include "programs/reelview/document/view_options.h"
+#include "programs/reelview/document/command_line.h"
 #include "programs/reelview/keeper/export_job_win32.h"
 #include "programs/reelview/library/engine.h"
 #include "programs/reelview/library/worker.h"
@@ -20,15 +20,20 @@
 #include "programs/reelview/view/picture_window_win32.h"
 #include "programs/reelview/view/preset_list_win32.h"
 #include "programs/reelview/view/transport_bar_win32.h"
-#include "programs/reelview/window/file_dialogs_win32.h"
+#include "programs/reelview/window/dialogs_win32.h"
 #include "programs/reelview/window/menus_win32.h"
-#include "programs/reelview/window/progress_window_win32.h"
 #include "programs/reelview/window/stored_state_win32.h"
 
 namespace velmora::reelview {
 
 inline constexpr wchar_t kMainClass[] = L"Velmora Reel View";
 inline constexpr wchar_t kProgramName[] = L"Velmora Reel View";
+
+// Its message; lParam: a std::function<void()> to run and delete.
+inline constexpr UINT kMessageRun = WM_APP + 1;
+
+inline constexpr UINT_PTR kTimerPlay = 1, kTimerIdle = 2, kTimerWatch = 3;
+inline constexpr UINT kPlayMilliseconds = 10, kIdleMilliseconds = 350;
 
 class MainWindow final : public PanelOwner {
   public:

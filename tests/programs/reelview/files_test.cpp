@@ -9,9 +9,7 @@
 #include <vector>
 
 #include "programs/reelview/keeper/frame_sink.h"
-#include "programs/reelview/keeper/safe_file.h"
-#include "programs/reelview/source/sequence_names.h"
-#include "programs/reelview/source/y4m_clip.h"
+#include "programs/reelview/source/clip_source.h"
 
 namespace velmora::reelview {
 namespace {

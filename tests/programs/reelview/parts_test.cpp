@@ -11,14 +11,11 @@
 
 #include "language/language_table.h"
 #include "programs/reelview/base/text_keys.h"
-#include "programs/reelview/document/command_text.h"
+#include "programs/reelview/document/command_line.h"
 #include "programs/reelview/document/settings_history.h"
-#include "programs/reelview/document/view_options.h"
 #include "programs/reelview/library/worker.h"
-#include "programs/reelview/panel/knob_motion.h"
-#include "programs/reelview/panel/knob_picture.h"
+#include "programs/reelview/panel/knob.h"
 #include "programs/reelview/panel/panel_layout.h"
-#include "programs/reelview/panel/value_text.h"
 #include "programs/reelview/view/transport.h"
 #include "programs/reelview/view/view_geometry.h"
 

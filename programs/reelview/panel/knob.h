@@ -1,8 +1,9 @@
-// How a knob's value follows the mouse and the keys. Values are normalised to 0..1. A round knob turns through 270
-// degrees, from the lower left over the top to the lower right.
+// Knobs without windows: how they turn, and how they look.
 #pragma once
 
 #include <cstdint>
+
+#include "programs/reelview/base/picture.h"
 
 namespace velmora::reelview {
 
@@ -34,5 +35,14 @@ enum class KnobKey { kUp, kDown, kPageUp, kPageDown, kHome, kEnd };
 [[nodiscard]] double AfterKey(double value, KnobKey key, bool isFine);
 // `notches` is positive away from the user.
 [[nodiscard]] double AfterWheel(double value, double notches, bool isFine);
+
+struct KnobLook {
+    double value = 0.0;   // 0..1
+    double origin = 0.0;  // where the coloured arc starts: 0, or where the displayed value is 0
+    bool hasFocus = false, isEnabled = true;
+};
+
+// A round knob as pixels, antialiased. `side` is the square's width in pixels, at least 8.
+[[nodiscard]] Picture DrawKnob(std::int32_t side, const KnobLook& look, const KnobColours& colours);
 
 }  // namespace velmora::reelview

@@ -1,13 +1,16 @@
-// Shows the progress of saving, with a button to cancel it. Windows only.
+// The window that shows the progress of saving, and the system's dialogs for files. Windows only.
 #pragma once
 
 #include <windows.h>
 
 #include <atomic>
 #include <cstdint>
+#include <optional>
 #include <string>
 
 #include "programs/reelview/base/theme_win32.h"
+#include "programs/reelview/keeper/export_job_win32.h"
+#include "programs/reelview/base/texts_win32.h"
 
 namespace velmora::reelview {
 
@@ -37,5 +40,15 @@ class ProgressWindow {
     std::int64_t m_frames;
     std::atomic<bool>& m_isCancelled;
 };
+
+// The system's open and save dialogs. Empty when cancelled.
+[[nodiscard]] std::optional<std::wstring> AskOpenFile(HWND owner, const Texts& texts);
+[[nodiscard]] std::optional<std::wstring> AskPngFile(HWND owner, const Texts& texts);
+
+struct ClipChoice {
+    std::wstring file;
+    ClipKind kind;
+};
+[[nodiscard]] std::optional<ClipChoice> AskClipFile(HWND owner, const Texts& texts);
 
 }  // namespace velmora::reelview

@@ -1,10 +1,13 @@
+#include "programs/reelview/keeper/frame_sink.h"
+
 #include <fstream>
 #include <string>
+#include <system_error>
+#include <utility>
 #include <vector>
 
-#include "programs/reelview/keeper/frame_sink.h"
-#include "programs/reelview/keeper/safe_file.h"
 #include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/source/clip_source.h"
 
 namespace velmora::reelview {
 namespace {
@@ -72,6 +75,31 @@ class Y4mSink final : public FrameSink {
 
 std::unique_ptr<FrameSink> MakeY4mSink(const std::filesystem::path& file, const ClipFacts& facts) {
     return std::make_unique<Y4mSink>(file, facts);
+}
+
+SafeFile::SafeFile(std::filesystem::path target) : m_target(std::move(target)), m_place(m_target) {
+    std::filesystem::path name = m_target.stem();
+    name += ".unfinished";
+    std::error_code error;
+    for (int i = 0; i < 100; ++i) {
+        std::filesystem::path tried = name;
+        if (i > 0) tried += std::to_string(i);
+        tried += m_target.extension();
+        m_place.replace_filename(tried);
+        if (!std::filesystem::exists(m_place, error)) break;
+    }
+}
+
+SafeFile::~SafeFile() {
+    std::error_code error;
+    if (!m_isFinished) std::filesystem::remove(m_place, error);
+}
+
+void SafeFile::Finish() {
+    std::error_code error;
+    std::filesystem::rename(m_place, m_target, error);
+    if (error) throw SourceError(text::kCannotWrite);
+    m_isFinished = true;
 }
 
 }  // namespace velmora::reelview
