@@ -35,15 +35,20 @@ function(velmora_test_levels name)
   endforeach()
 endfunction()
 
-# velmora_check_module(TARGET EXPORT...) checks that a Windows module exports exactly the given names and imports only
-# Windows' own modules.
+# velmora_check_module(TARGET EXPORT...) or (TARGET HOSTS MODULE... EXPORTS EXPORT...) checks that a Windows module exports
+# exactly the given names and imports only Windows' own modules and those of its host.
 function(velmora_check_module target)
   if(WIN32 AND BUILD_TESTING)
-    set(kind)
+    cmake_parse_arguments(ARG "" "" "HOSTS;EXPORTS" ${ARGN})
+    set(options)
     if(CMAKE_SIZEOF_VOID_P EQUAL 8)
-      set(kind --64)
+      list(APPEND options --64)
     endif()
+    foreach(host ${ARG_HOSTS})
+      list(APPEND options --host ${host})
+    endforeach()
     add_test(NAME ${target}_imports
-      COMMAND ${PROJECT_SOURCE_DIR}/scripts/check-imports ${kind} $<TARGET_FILE:${target}> ${ARGN})
+      COMMAND ${PROJECT_SOURCE_DIR}/scripts/check-imports ${options} $<TARGET_FILE:${target}>
+        ${ARG_EXPORTS} ${ARG_UNPARSED_ARGUMENTS})
   endif()
 endfunction()

@@ -4,7 +4,7 @@
 #include <cmath>
 #include <new>
 
-#include "render/renderer.h"
+#include "render/stage_settings.h"
 #include "text/number_text.h"
 
 namespace velmora::hosts::obs {
@@ -65,13 +65,14 @@ void FilmFilter::Tick() noexcept {
 }
 
 double FilmFilter::ClockSeconds() {
-    obs_video_info video{};
     const std::uint64_t now = obs_get_video_frame_time();
     if (!m_clockStart) m_clockStart = now;
     const double elapsed = static_cast<double>(now - *m_clockStart) / kNanosecondsPerSecond;
-    if (!obs_get_video_info(&video) || video.fps_num == 0 || video.fps_den == 0) return elapsed;
-    const FrameRate rate = {static_cast<std::int32_t>(video.fps_num),
-                            static_cast<std::int32_t>(video.fps_den)};
+    // Not obs_get_video_info: it fills a record that may be longer in the OBS that runs.
+    const video_output_info* video = video_output_get_info(obs_get_video());
+    if (video == nullptr || video->fps_num == 0 || video->fps_den == 0) return elapsed;
+    const FrameRate rate = {static_cast<std::int32_t>(video->fps_num),
+                            static_cast<std::int32_t>(video->fps_den)};
     return rate.SecondsAt(std::llround(elapsed * rate.numerator / rate.denominator));
 }
 
