@@ -67,24 +67,33 @@ void ShuffleTable::Set(const ByteTable& table) noexcept {
     differences = table;
     XorWithBytesBefore(differences);
     climbs = {};
-    isGentle = true;
-    for (std::size_t group = 0; group < 16; ++group) {
-        const auto over = [&](std::size_t i) {
-            return static_cast<std::int32_t>(table[16 * group + i]) -
-                   static_cast<std::int32_t>(16 * group + i);
-        };
-        std::int32_t least = over(0), most = over(0);
-        for (std::size_t i = 1; i < 16; ++i) {
-            least = std::min(least, over(i));
-            most = std::max(most, over(i));
-        }
-        isGentle = isGentle && most - least <= 15;
-        bases[group] = static_cast<std::uint8_t>(least);
-        for (std::size_t i = 0; i < 16; ++i) {
-            climbs[group % 8 * 16 + i] |= static_cast<std::uint8_t>((over(i) - least) << group / 8 * 4);
-        }
-    }
+    kind = Kind::kGentle;
+    for (std::size_t group = 0; group < 16; ++group) SetGroup(group, table.data() + 16 * group);
     XorWithBytesBefore(climbs);
+}
+
+void ShuffleTable::SetGroup(std::size_t group, const std::uint8_t* entries) noexcept {
+    steeps[group] = 0;
+    for (const std::int32_t slope : {1, 2}) {
+        const auto rest = [&](std::int32_t i) {
+            return entries[i] - slope * (static_cast<std::int32_t>(16 * group) + i);
+        };
+        std::int32_t least = rest(0), most = rest(0);
+        for (std::int32_t i = 1; i < 16; ++i) {
+            least = std::min(least, rest(i));
+            most = std::max(most, rest(i));
+        }
+        if (most - least > 15) continue;
+        bases[group] = static_cast<std::uint8_t>(least);
+        steeps[group] = slope == 2 ? 255 : 0;
+        if (slope == 2) kind = std::max(kind, Kind::kSteep);
+        for (std::int32_t i = 0; i < 16; ++i) {
+            climbs[group % 8 * 16 + static_cast<std::size_t>(i)] |=
+                static_cast<std::uint8_t>((rest(i) - least) << group / 8 * 4);
+        }
+        return;
+    }
+    kind = Kind::kAny;
 }
 
 void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable& r) noexcept {
@@ -94,7 +103,7 @@ void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable&
     blueShuffles.Set(b);
     greenShuffles.Set(g);
     redShuffles.Set(r);
-    areGentle = blueShuffles.isGentle && greenShuffles.isGentle && redShuffles.isGentle;
+    shuffles = std::max({blueShuffles.kind, greenShuffles.kind, redShuffles.kind});
     for (std::size_t i = 0; i < 256; ++i) {
         blueWord[i] = b[i];
         greenWord[i] = std::uint32_t{g[i]} << 8;

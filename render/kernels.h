@@ -21,14 +21,22 @@ namespace velmora::render {
 struct ShuffleTable {
     // In each half of the table, the groups after the first are XORed with the group before.
     alignas(64) ByteTable differences;
-    // A gentle table rises by 0 to 30 in each group. Its entry i is i + the group's base + a climb of 0 to 15. Two
+    // A smooth table's entry i is i, or 2 i where the table is steep, plus the group's base and a climb of 0 to 15. Two
     // groups share 16 bytes: group g < 8 has the lower four bits, group g + 8 the upper ones. In each half, all but the
     // first 16 bytes are XORed with those before.
     alignas(64) std::array<std::uint8_t, 128> climbs;
     alignas(16) std::array<std::uint8_t, 16> bases;
-    bool isGentle;
+    alignas(16) std::array<std::uint8_t, 16> steeps;  // 255 for steep groups, else 0
+    enum class Kind {
+        kGentle,
+        kSteep,
+        kAny
+    } kind;  // a gentle table has no steep group, a table of any kind no climbs
 
     void Set(const ByteTable& table) noexcept;
+
+  private:
+    void SetGroup(std::size_t group, const std::uint8_t* entries) noexcept;
 };
 
 // One table per channel, prepared for the kernels.
@@ -40,7 +48,7 @@ struct ChannelTables {
     ShuffleTable blueShuffles;
     ShuffleTable greenShuffles;
     ShuffleTable redShuffles;
-    bool areGentle;  // all three
+    ShuffleTable::Kind shuffles;  // the last of the three tables' kinds
     // For lookups without byte shuffles: each entry at its channel's place in a pixel word.
     std::array<std::uint32_t, 256> blueWord;
     std::array<std::uint32_t, 256> greenWord;

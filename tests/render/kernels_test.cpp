@@ -92,35 +92,37 @@ ChannelTables AnyTables(std::mt19937& numbers) {
     return result;
 }
 
-// Tables that rise by 0 to 30 in each 16 entries, by all of it in the first of them.
-ChannelTables GentleTables(std::mt19937& numbers) {
+// Tables with some rises of `steepest` in 16 entries and falls, in all others, of up to 15 against their index.
+ChannelTables SmoothTables(std::mt19937& numbers, std::size_t steepest) {
     ByteTable tables[3];
     for (ByteTable& table : tables) {
         for (std::size_t i = 0; i < table.size(); ++i) {
-            const std::size_t entry = i < 16 ? 2 * i : i + numbers() % 16;
+            const std::size_t entry = i < 16 ? i * steepest / 15 : i + numbers() % 16;
             table[i] = static_cast<std::uint8_t>(std::min<std::size_t>(entry, 255));
         }
     }
     ChannelTables result;
     result.Set(tables[0], tables[1], tables[2]);
-    EXPECT_TRUE(result.areGentle);
     return result;
 }
 
 TEST(Kernels, ToneIsThePlainOneOnEveryLevel) {
     std::mt19937 numbers(4);
     const ChannelTables before = AnyTables(numbers), after = AnyTables(numbers),
-                        gentle = GentleTables(numbers);
-    EXPECT_FALSE(after.areGentle);
+                        gentle = SmoothTables(numbers, 30), steep = SmoothTables(numbers, 45);
+    EXPECT_EQ(after.shuffles, ShuffleTable::Kind::kAny);
+    EXPECT_EQ(gentle.shuffles, ShuffleTable::Kind::kGentle);
+    EXPECT_EQ(steep.shuffles, ShuffleTable::Kind::kSteep);
     // Kinds of lines that kernels compute, and one that they do not.
-    const ToneLine up = {200 << 8, 3000, 0, 8}, cut = {60000, 0, 9000, 6}, steep = {53248, 0, 10200, 7},
+    const ToneLine up = {200 << 8, 3000, 0, 8}, cut = {60000, 0, 9000, 6}, sharp = {53248, 0, 10200, 7},
                    other = {60000, 2000, 0, 6};
-    std::vector<Tone> tones = {
-        {&before, true, 40, &after},  {nullptr, true, -127, &after}, {&before, true, 127, nullptr},
-        {&before, false, 0, nullptr}, {nullptr, false, 0, &after},   {nullptr, true, -1, nullptr},
-        {nullptr, true, 0, nullptr},  {nullptr, true, -60, &gentle}, {nullptr, false, 0, &gentle}};
+    std::vector<Tone> tones = {{&before, true, 40, &after},   {nullptr, true, -127, &after},
+                               {&before, true, 127, nullptr}, {&before, false, 0, nullptr},
+                               {nullptr, false, 0, &after},   {nullptr, true, -1, nullptr},
+                               {nullptr, true, 0, nullptr},   {nullptr, true, -60, &gentle},
+                               {nullptr, false, 0, &gentle},  {nullptr, false, 0, &steep}};
     // Lines and the table they make.
-    const std::vector<ToneLine> lines[] = {{up}, {cut}, {up, cut}, {steep}, {up, steep}, {other}, {cut, up}};
+    const std::vector<ToneLine> lines[] = {{up}, {cut}, {up, cut}, {sharp}, {up, sharp}, {other}, {cut, up}};
     ChannelTables tables[std::size(lines)];
     for (std::size_t i = 0; i < std::size(lines); ++i) {
         ByteTable table;
