@@ -77,11 +77,20 @@ void EffectSession::StartRandom(std::uint32_t state) noexcept {
     m_state.random.Seed(state);
 }
 
-std::uint32_t EffectSession::DrawsPerFrame(std::int32_t width) noexcept {
+render::StageSettings EffectSession::PresentSettings() noexcept {
     const FloatGuard guard;
     MasterHost host(m_effect, m_values);
     m_settings.ReadFromHost(host);
-    return render::DrawsPerFrame(ReadStageSettings(m_settings), width);
+    return ReadStageSettings(m_settings);
+}
+
+std::uint32_t EffectSession::DrawsPerFrame(std::int32_t width) noexcept {
+    const FloatGuard guard;
+    return render::DrawsPerFrame(PresentSettings(), width);
+}
+
+void EffectSession::KeepArrangement() noexcept {
+    m_arrangement = render::OwnArrangement(PresentSettings());
 }
 
 bool EffectSession::RenderDeep(const render::DeepFrame& frame, double seconds) noexcept {
@@ -99,7 +108,8 @@ bool EffectSession::Render(const FrameRecord& source, const FrameRecord& destina
     MasterHost host(m_effect, m_values);
     const TimingRecord timing = {0.0, 0.0, seconds};
     const std::uint32_t hostSeed = m_isPinned ? m_seed : 0;
-    return RenderFrame({&m_settings, &m_state, m_options, hostSeed}, host, &source, &destination, &timing);
+    return RenderFrame({&m_settings, &m_state, m_options, hostSeed, m_arrangement}, host, &source,
+                       &destination, &timing);
 }
 
 }  // namespace velmora::effects

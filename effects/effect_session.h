@@ -5,6 +5,7 @@
 #include <array>
 #include <cstdint>
 #include <memory>
+#include <optional>
 
 #include "effects/effect_table.h"
 #include "api/host_api.h"
@@ -13,6 +14,7 @@
 #include "render/deep/deep_frame.h"
 #include "render/deep/deep_memory.h"
 #include "render/render_state.h"
+#include "render/stage_settings.h"
 
 namespace velmora::effects {
 
@@ -43,6 +45,10 @@ class EffectSession {
     // the state that a later frame of a sequence starts from.
     [[nodiscard]] std::uint32_t DrawsPerFrame(std::int32_t width) noexcept;
 
+    // From now on scratches keep the places and flicker the rhythm that the present values give them, while values
+    // change from frame to frame. There are at most as many scratches as now, unless a frame has more, which moves all.
+    void KeepArrangement() noexcept;
+
     // From now on only wear, scratches and spots are drawn, with the same positions and strength as in the whole
     // effect; nothing moves the picture or changes its colours.
     void KeepDamageOnly() noexcept { m_options.isDamageOnly = true; }
@@ -57,6 +63,7 @@ class EffectSession {
     [[nodiscard]] bool RenderDeep(const render::DeepFrame& frame, double seconds) noexcept;
 
   private:
+    [[nodiscard]] render::StageSettings PresentSettings() noexcept;
     explicit EffectSession(const EffectTable& effect) noexcept;
 
     const EffectTable& m_effect;
@@ -65,6 +72,7 @@ class EffectSession {
     render::RenderState m_state;
     render::DeepMemory m_deep;
     render::RenderOptions m_options = ReadRenderOptions();
+    std::optional<render::Arrangement> m_arrangement;
     bool m_isPinned = true;
     std::uint32_t m_seed = 0;
 };

@@ -16,6 +16,7 @@ bool RenderFrame(const RenderSession& session, IVideoHost& host, const FrameReco
     session.settings->ReadFromHost(host);
     render::StageSettings settings = ReadStageSettings(*session.settings);
     settings.hostSeed = session.hostSeed;
+    settings.arrangement = session.arrangement;
     render::RenderStages(context, settings, *session.state, session.options);
     context.Finish();
     return true;

@@ -3,6 +3,8 @@
 // each of its threads.
 #pragma once
 
+#include <optional>
+
 #include "api/host_api.h"
 #include "effects/master_settings.h"
 #include "render/deep/deep_frame.h"
@@ -10,6 +12,7 @@
 #include "render/image.h"
 #include "render/render_state.h"
 #include "render/renderer.h"
+#include "render/stage_settings.h"
 
 namespace velmora {
 
@@ -18,6 +21,7 @@ struct RenderSession {
     render::RenderState* state = nullptr;    // not owned
     render::RenderOptions options;
     std::uint32_t hostSeed = 0;  // StageSettings::hostSeed; hosts of the library set none
+    std::optional<render::Arrangement> arrangement = {};  // StageSettings::arrangement; likewise
 };
 
 // A host's frame in the renderer's terms.

@@ -39,15 +39,14 @@ std::uint8_t Saturate(std::int32_t value) noexcept {
 
 }  // namespace
 
-float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds,
+float FlickerOffset(float seed, float flicker, std::uint32_t rate, double seconds,
                     std::uint32_t hostSeed) noexcept {
     // Much less than one draw, so it only absorbs the rounding error of the product.
     constexpr double kTolerance = 1e-9;
     constexpr double kPeriod = 4294967296.0;  // of the generator; only the count modulo this matters
     double draws = std::ceil(seconds * rate - kTolerance);
     draws = draws >= 1.0 ? std::min(draws, std::numeric_limits<double>::max()) : 1.0;
-    const auto own = std::bit_cast<std::uint32_t>(Narrow(double{saturation} + flicker));
-    Random random(SeedFor(own, hostSeed));
+    Random random(SeedFor(std::bit_cast<std::uint32_t>(seed), hostSeed));
     random.Skip(static_cast<std::uint32_t>(std::fmod(draws, kPeriod)) - 1u);
     return Narrow(random.DrawDecimal(0.0f, flicker, 2) - 0.5 * flicker);
 }
@@ -85,7 +84,8 @@ ColourStage PrepareColour(const StageSettings& settings, double seconds, Contras
 
     float offset = 0.0f;
     if (!IsNearZero(settings.flicker)) {
-        offset = FlickerOffset(settings.saturation, settings.flicker, settings.flickerRate, seconds,
+        const Arrangement arrangement = settings.arrangement.value_or(OwnArrangement(settings));
+        offset = FlickerOffset(arrangement.flickerSeed, settings.flicker, settings.flickerRate, seconds,
                                settings.hostSeed);
     }
     if (!IsNearZero(brightness)) {

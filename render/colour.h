@@ -25,9 +25,9 @@
 namespace velmora::render {
 
 // The flicker's share of the brightness offset at a given time. The value changes `rate` times a second. The k-th
-// value comes from a sequence seeded by the settings and the host's seed, so every run gives the same. The cost
-// does not depend on the time. Within +-0.5; single precision.
-[[nodiscard]] float FlickerOffset(float saturation, float flicker, std::uint32_t rate, double seconds,
+// value comes from a sequence seeded by `seed`, an arrangement's, and the host's seed, so every run gives the same. The
+// cost does not depend on the time. Within +-0.5; single precision.
+[[nodiscard]] float FlickerOffset(float seed, float flicker, std::uint32_t rate, double seconds,
                                   std::uint32_t hostSeed = 0) noexcept;
 
 [[nodiscard]] ByteTable BrightnessTable(float offset) noexcept;

@@ -34,8 +34,9 @@ void Move(ScratchState& scratch, std::int32_t frames) noexcept {
 
 ScratchReplayKey ReplayKeyOf(const StageSettings& settings) noexcept {
     const std::uint32_t either = settings.scratchKinds & (kScratchBlack | kScratchWhite);
-    return {SeedFor(std::bit_cast<std::uint32_t>(settings.scratchSeed), settings.hostSeed),
-            std::min(settings.scratchCount, kMostScratches),
+    const Arrangement arrangement = settings.arrangement.value_or(OwnArrangement(settings));
+    return {SeedFor(std::bit_cast<std::uint32_t>(arrangement.scratchSeed), settings.hostSeed),
+            std::min(std::max(settings.scratchCount, arrangement.scratchLives), kMostScratches),
             either != kScratchBlack && either != kScratchWhite};
 }
 

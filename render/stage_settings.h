@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 
 namespace velmora::render {
 
@@ -10,6 +11,14 @@ enum ScratchKinds : std::uint32_t { kScratchBlack = 1, kScratchWhite = 2, kScrat
 enum WearChannels : std::int32_t { kWearBlueOnly = 4, kWearAllChannels = 7 };
 
 inline constexpr std::uint32_t kFramesPerSecond = 30;  // whatever the host's rate is
+
+// Where scratches are and how flicker runs follows from their settings. A host that changes these from frame to frame
+// gives the same arrangement with all frames; otherwise each would have scratches and flicker of its own.
+struct Arrangement {
+    float scratchSeed = 0.0f;
+    std::uint32_t scratchLives = 0;  // the most scratches that any frame shows
+    float flickerSeed = 0.0f;
+};
 
 struct StageSettings {
     std::int32_t yJitter = 0;  // largest shift in pixels, 0..10
@@ -43,6 +52,14 @@ struct StageSettings {
 
     // Varies scratches and flicker, whose own seeds come from the values above. 0 if the host gives no seed.
     std::uint32_t hostSeed = 0;
+
+    std::optional<Arrangement> arrangement = {};  // nothing: that of the settings
 };
+
+// The arrangement that the settings have by themselves.
+[[nodiscard]] inline Arrangement OwnArrangement(const StageSettings& settings) noexcept {
+    const double tone = double{settings.saturation} + settings.flicker;
+    return {settings.scratchSeed, settings.scratchCount, static_cast<float>(tone)};
+}
 
 }  // namespace velmora::render

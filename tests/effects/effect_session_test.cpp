@@ -4,7 +4,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <memory>
+#include <set>
 #include <string>
 #include <string_view>
 #include <thread>
@@ -49,6 +51,12 @@ Picture FrameOf(EffectSession& session, double seconds) {
 // The middle of frame n's duration.
 double SecondsOf(int frame) {
     return (frame + 0.5) / 30.0;
+}
+
+std::uint32_t ParamNamed(const EffectTable& effect, std::string_view name) {
+    std::uint32_t param = 0;
+    while (effect.params[param].name != name) ++param;
+    return param;
 }
 
 std::uint32_t PresetNamed(const EffectTable& effect, std::string_view name) {
@@ -208,6 +216,59 @@ TEST_F(ProcessWide, EffectObjectsAndSessionsRenderTheSameBytes) {
             }
         }
         effect->Release();
+    }
+}
+
+// The columns of a grey picture that scratches touch, and how bright the picture is.
+struct Seen {
+    std::set<std::int32_t> columns;
+    double brightness = 0.0;
+};
+
+Seen SeenIn(EffectSession& session, int frame) {
+    Picture source, result;
+    std::ranges::fill(source.bytes, std::uint8_t{128});
+    EXPECT_TRUE(session.Render(source.Record(), result.Record(), SecondsOf(frame)));
+    Seen seen;
+    for (std::size_t i = 0; i < result.bytes.size(); i += 4) {
+        if (result.bytes[i] != result.bytes[kWidth * 4 - 4])
+            seen.columns.insert(static_cast<std::int32_t>(i / 4 % kWidth));
+        seen.brightness += result.bytes[i];
+    }
+    return seen;
+}
+
+// A fade that rearranged everything in every frame would not look like one.
+TEST(EffectSession, ValuesMayChangeInAKeptArrangement) {
+    auto constant = EffectSession::Create(kFilmDamage), fading = EffectSession::Create(kFilmDamage);
+    const auto density = ParamNamed(kFilmDamage, "Density"), depth = ParamNamed(kFilmDamage, "Depth");
+    for (EffectSession* session : {constant.get(), fading.get()}) {
+        session->SetValue(density, {.number = 0.75f});
+        session->SetValue(depth, {.number = 1.0f});
+    }
+    fading->KeepArrangement();
+    for (int frame = 0; frame < 90; frame += 10) {
+        const auto all = SeenIn(*constant, frame).columns;
+        fading->SetValue(depth, {.number = 0.9f});
+        const auto same = SeenIn(*fading, frame).columns;  // but for edges that are now too faint
+        EXPECT_TRUE(same.size() * 4 > all.size() * 3 && std::ranges::includes(all, same)) << frame;
+        fading->SetValue(density, {.number = 0.25f});
+        const auto some = SeenIn(*fading, frame).columns;
+        EXPECT_TRUE(some.size() < all.size() && std::ranges::includes(all, some)) << frame;
+        fading->SetValue(density, {.number = 0.75f});
+    }
+    auto whole = EffectSession::Create(kFilmCamera), half = EffectSession::Create(kFilmCamera);
+    const auto flicker = ParamNamed(kFilmCamera, "Flicker"), rate = ParamNamed(kFilmCamera, "Flicker Rate");
+    for (EffectSession* session : {whole.get(), half.get()}) {
+        session->SetValue(flicker, {.number = 0.8f});
+        session->SetValue(rate, {.number = 1.0f});
+    }
+    half->KeepArrangement();
+    half->SetValue(flicker, {.number = 0.4f});
+    constexpr double kGrey = 128.0 * kWidth * kHeight, kRounding = 2.0 * kWidth * kHeight;
+    for (int frame = 0; frame < 30; ++frame) {
+        const double wanted = (SeenIn(*whole, frame).brightness - kGrey) / 2.0;
+        EXPECT_NEAR(SeenIn(*half, frame).brightness - kGrey, wanted, kRounding) << frame;
     }
 }
 

@@ -141,8 +141,9 @@ TEST(FlickerOffset, IsTheLastOfItsDraws) {
                         {2, 0x1p70 + 0x1p20, 2097152}};
     for (const Row& row : rows) {
         for (const float flicker : {0.16f, 0.615f, 1.0f, 0.003f}) {
-            EXPECT_EQ(FlickerOffset(0.25f, flicker, row.rate, row.seconds),
-                      PlainFlicker(0.25f, flicker, row.rate, row.draws))
+            EXPECT_EQ(
+                FlickerOffset(static_cast<float>(0.25 + double{flicker}), flicker, row.rate, row.seconds),
+                PlainFlicker(0.25f, flicker, row.rate, row.draws))
                 << row.rate << ' ' << row.seconds << ' ' << flicker;
         }
     }

@@ -79,6 +79,12 @@ std::unique_ptr<effects::EffectSession> EffectChoice::NewSession() const {
     if (!session) throw std::bad_alloc();
     if (m_preset) session->ApplyPreset(*m_preset);
     for (const Setting& setting : m_fileSettings) session->SetValue(setting.parameter, setting.value);
+    if (Fades()) {
+        // Else every frame of a fade would have scratches and flicker of its own.
+        for (const TimedSetting& setting : m_settings)
+            session->SetValue(setting.Parameter(), setting.Largest());
+        session->KeepArrangement();
+    }
     MoveTo({}, *session);
     if (m_options.randomState) {
         session->StartRandom(*m_options.randomState);
