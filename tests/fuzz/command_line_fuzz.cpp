@@ -97,6 +97,12 @@ void Check(const velmora::hosts::RenderOptions& options) {
     Require(options.output || options.withDigests);
 }
 
+void Check(const BatchOptions& options) {
+    Check(options.render);
+    Require(!options.inputs.empty() && !options.folder.empty());
+    for (const std::string& input : options.inputs) Require(!BatchOutput(options, input).empty());
+}
+
 void ReadForReelhost(std::vector<char*>& arguments) {
     const HostOptions options = ReadHostOptions(static_cast<int>(arguments.size()), arguments.data());
     Require(!options.size || (IsSize(*options.size) && options.rate));

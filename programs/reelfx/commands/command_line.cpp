@@ -8,6 +8,7 @@
 #include <map>
 #include <set>
 #include <sstream>
+#include <utility>
 
 #include "text/names.h"
 #include "text/number_text.h"
@@ -167,20 +168,24 @@ ProgressKind ReadProgress(const TypedOptions& typed) {
     throw UsageError("--progress takes auto, none, text or json, not \"" + typed.progress + '"');
 }
 
+OutputOptions ReadOutput(const TypedOptions& typed) {
+    OutputOptions output = typed.output;
+    output.path = LocalPath(typed.outPath);
+    output.format = Given(typed.format);
+    output.codec = Given(typed.codec);
+    output.pixelFormat = Given(typed.pixelFormat);
+    if (!typed.crf.empty()) output.crf = Parsed("--crf", typed.crf, ParseNumber, "a number");
+    output.needsAlpha = typed.matte;
+    return output;
+}
+
 RenderOptions ReadRender(const CLI::App& command, const TypedOptions& typed) {
     RenderOptions options;
     options.input = ReadInput(typed);
     options.effects = ReadEffects(command, typed);
     options.section = ReadSection(typed);
-    if (!typed.outPath.empty()) {
-        OutputOptions output = typed.output;
-        output.path = LocalPath(typed.outPath);
-        output.format = Given(typed.format);
-        output.codec = Given(typed.codec);
-        output.pixelFormat = Given(typed.pixelFormat);
-        if (!typed.crf.empty()) output.crf = Parsed("--crf", typed.crf, ParseNumber, "a number");
-        output.needsAlpha = typed.matte;
-        options.output = output;
+    if (!typed.outPath.empty() || !typed.into.empty()) {
+        options.output = ReadOutput(typed);
     } else if (!typed.digests) {
         throw UsageError("render needs OUT, or --hash to print digests only");
     }
@@ -194,6 +199,22 @@ RenderOptions ReadRender(const CLI::App& command, const TypedOptions& typed) {
     options.isDryRun = typed.dryRun;
     options.progress = ReadProgress(typed);
     return options;
+}
+
+// One clip, or with --into many.
+Command ReadRenders(const CLI::App& command, const TypedOptions& typed) {
+    RenderOptions render = ReadRender(command, typed);
+    if (typed.into.empty()) {
+        if (!typed.more.empty()) throw UsageError("more than IN and OUT: several clips need --into FOLDER");
+        return render;
+    }
+    if (typed.digests) throw UsageError("--hash prints the digests of one clip, not of several with --into");
+    BatchOptions batch = {
+        .render = std::move(render), .inputs = {typed.input.path}, .folder = LocalPath(typed.into)};
+    if (!typed.outPath.empty()) batch.inputs.push_back(typed.outPath);
+    batch.inputs.insert(batch.inputs.end(), typed.more.begin(), typed.more.end());
+    for (std::string& input : batch.inputs) input = LocalPath(input);
+    return batch;
 }
 
 PictureOptions ReadPicture(const CLI::App& command, const TypedOptions& typed) {
@@ -243,7 +264,7 @@ struct CommandReader {
 constexpr CommandReader kCommands[] = {
     {"list", [](const CLI::App&, const TypedOptions& typed) -> Command { return ReadList(typed); }},
     {"presets", [](const CLI::App&, const TypedOptions& typed) -> Command { return typed.presetsOf; }},
-    {"render", [](const CLI::App& c, const TypedOptions& typed) -> Command { return ReadRender(c, typed); }},
+    {"render", ReadRenders},
     {"frame",
      [](const CLI::App& c, const TypedOptions& typed) -> Command {
          return FrameOptions{ReadPicture(c, typed)};

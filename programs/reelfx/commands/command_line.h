@@ -5,6 +5,7 @@
 #include <variant>
 
 #include "programs/reelfx/common/failure.h"
+#include "programs/reelfx/commands/batch_command.h"
 #include "programs/reelfx/commands/info_command.h"
 #include "programs/reelfx/commands/list_command.h"
 #include "programs/reelfx/commands/picture_commands.h"
@@ -20,9 +21,9 @@ namespace velmora::hosts {
 struct TextCommand {
     std::string text;
 };
-using Command =
-    std::variant<TextCommand, ListOptions, RenderOptions, FrameOptions, SheetOptions, StripOptions,
-                 PresetShowOptions, PresetSaveOptions, PresetsOptions, InfoOptions, StudioOptions>;
+using Command = std::variant<TextCommand, ListOptions, RenderOptions, BatchOptions, FrameOptions,
+                             SheetOptions, StripOptions, PresetShowOptions, PresetSaveOptions, PresetsOptions,
+                             InfoOptions, StudioOptions>;
 
 // Parses the arguments; opens and writes nothing. Throws UsageError.
 Command ReadCommandLine(int count, const char* const* arguments);

@@ -82,6 +82,13 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
     CLI::App& render = *app.add_subcommand("render", "Render a clip through one or several effects");
     AddInput(render, typed);
     render.add_option("OUT", typed.outPath, "File, image pattern, or - (YUV4MPEG2)")->type_name("FILE");
+    render.add_option("MORE", typed.more, "With --into: further clips; OUT is one too")->type_name("FILE");
+    render
+        .add_option("--into", typed.into,
+                    "Render each of the clips to a file of its name in this folder; --format chooses another "
+                    "container. "
+                    "A clip that fails does not stop the others")
+        ->type_name("FOLDER");
     AddEffectList(render, typed);
     render
         .add_option("--frames", typed.frames,

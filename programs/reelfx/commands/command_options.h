@@ -48,8 +48,9 @@ struct TypedOptions {
     // Those of all effects of a list; the parser's order says which belongs to which.
     std::vector<std::string> effects, presets, presetFiles, settings, mixes, seeds;
     int thens = 0;
+    std::vector<std::string> more;
     OutputOptions output;
-    std::string outPath, size, rate, randomState, frames, farm, start, duration;
+    std::string outPath, into, size, rate, randomState, frames, farm, start, duration;
     std::string format, codec, crf, pixelFormat, progress = "auto";
     int threads = 0;
     bool overwrite = false, noSound = false, digests = false, quiet = false, dryRun = false, matte = false;

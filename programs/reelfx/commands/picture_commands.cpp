@@ -6,6 +6,7 @@
 #include "programs/reelfx/media/pixel_converter.h"
 #include "programs/reelfx/pictures/still_writer.h"
 #include <filesystem>
+#include <optional>
 #include <utility>
 #include <vector>
 
@@ -42,7 +43,7 @@ std::string FileNameOf(std::string effect) {
     return effect;
 }
 
-// The folder of several sheets. It is created if needed, and removed again if no sheet is written.
+// Where several sheets are written.
 class SheetPlaces {
   public:
     explicit SheetPlaces(const std::string& out) : m_pattern(out) {
@@ -53,20 +54,8 @@ class SheetPlaces {
             m_pattern = (fs::path(out) / kNameMark).string() + ".png";
         }
         CheckStillName(m_pattern);
-        std::error_code error;
-        const fs::path folder = fs::path(m_pattern).parent_path();
-        if (folder.empty() || fs::is_directory(folder, error)) return;
-        if (!fs::create_directory(folder, error))
-            throw Failure(kExitOutput,
-                          folder.string() + ": the folder cannot be created: " + error.message());
-        m_made = folder;
+        m_folder.emplace(fs::path(m_pattern).parent_path());
     }
-    ~SheetPlaces() {
-        std::error_code isNotEmpty;
-        if (!m_made.empty()) std::filesystem::remove(m_made, isNotEmpty);
-    }
-    SheetPlaces(const SheetPlaces&) = delete;
-    SheetPlaces& operator=(const SheetPlaces&) = delete;
 
     [[nodiscard]] std::string Of(const std::string& effect) const {
         std::string path = m_pattern;
@@ -86,7 +75,7 @@ class SheetPlaces {
     }
 
     std::string m_pattern;
-    std::filesystem::path m_made;
+    std::optional<MadeFolder> m_folder;
 };
 
 // All are drawn before the first is written, so that a failure does not leave some of the five.

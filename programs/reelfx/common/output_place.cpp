@@ -5,6 +5,7 @@
 #include <cstring>
 #include <fcntl.h>
 #include <string_view>
+#include <utility>
 #include <sys/file.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -134,6 +135,20 @@ void CheckOutputPlace(const std::string& path, bool mayOverwrite, std::int64_t f
     if (access(fs::absolute(path).parent_path().c_str(), W_OK | X_OK) != 0) {
         throw Failure(kExitOutput, path + ": cannot be written: " + std::strerror(errno));
     }
+}
+
+MadeFolder::MadeFolder(fs::path folder) {
+    std::error_code error;
+    if (folder.empty() || fs::is_directory(folder, error)) return;
+    if (!fs::create_directory(folder, error)) {
+        throw Failure(kExitOutput, folder.string() + ": the folder cannot be created: " + error.message());
+    }
+    m_made = std::move(folder);
+}
+
+MadeFolder::~MadeFolder() {
+    std::error_code isNotEmpty;
+    if (!m_made.empty()) fs::remove(m_made, isNotEmpty);
 }
 
 OutputPlace::OutputPlace(const std::string& path, bool mayOverwrite, std::int64_t firstImage)

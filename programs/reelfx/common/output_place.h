@@ -19,6 +19,19 @@ std::string LocalPath(const std::string& path);
 // Both may be patterns of image files.
 void CheckIsNotInput(const std::string& path, const std::string& input, std::int64_t firstImage = 1);
 
+// A folder for results. It is created if needed, and removed again if nothing was written to it.
+class MadeFolder {
+  public:
+    // An empty path is the current folder. Throws Failure (kExitOutput) if the folder cannot be created.
+    explicit MadeFolder(std::filesystem::path folder);
+    ~MadeFolder();
+    MadeFolder(const MadeFolder&) = delete;
+    MadeFolder& operator=(const MadeFolder&) = delete;
+
+  private:
+    std::filesystem::path m_made;  // empty if it was there
+};
+
 class OutputPlace {
   public:
     // `path` is a file's name, a pattern of image files ("frames-%04d.png"), or "-" for standard output.

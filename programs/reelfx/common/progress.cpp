@@ -45,10 +45,12 @@ std::string ProgressJson(std::int64_t done, std::int64_t total, double seconds, 
     return "{\"frame\":" + std::to_string(done) + frames + rest;
 }
 
-Progress::Progress(std::int64_t total, ProgressKind kind) : m_total(total), m_kind(kind) {
-    if (kind != ProgressKind::kAuto) return;
-    m_kind = isatty(STDERR_FILENO) != 0 ? ProgressKind::kText : ProgressKind::kNone;
+ProgressKind Resolved(ProgressKind kind) {
+    if (kind != ProgressKind::kAuto) return kind;
+    return isatty(STDERR_FILENO) != 0 ? ProgressKind::kText : ProgressKind::kNone;
 }
+
+Progress::Progress(std::int64_t total, ProgressKind kind) : m_total(total), m_kind(Resolved(kind)) {}
 
 Progress::~Progress() {
     if (m_kind != ProgressKind::kText || m_done == 0) return;

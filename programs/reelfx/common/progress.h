@@ -15,6 +15,9 @@ enum class ProgressKind {
     kJson,
 };
 
+// Text or nothing instead of kAuto.
+ProgressKind Resolved(ProgressKind kind);
+
 class Progress {
   public:
     // `total` is 0 if unknown.

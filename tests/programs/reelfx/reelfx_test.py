@@ -266,6 +266,48 @@ class Lists(ReelfxTest):
                                                   "rgb24"))
 
 
+class Batch(ReelfxTest):
+    def test_clips_go_into_a_folder_and_a_bad_one_does_not_stop_the_others(self):
+        (clips.root / "other").mkdir()
+        inputs = [clips.small, clips.odd, clips.root / "bad.mp4", clips.root / "other" / "last.mp4"]
+        inputs[2].write_text("no film")
+        shutil.copy(clips.small, inputs[3])
+        folder, options = self.out / "new", (*TRAIN, "--frames", ":3", "--codec", "ffv1", "--format", "matroska")
+        done = reelfx("render", *inputs, "--into", folder, *options)
+        self.assertEqual(done.returncode, 3)
+        text = done.stderr.decode()
+        self.assertEqual(text.count("\n"), 2, text)
+        self.assertIn(f"{inputs[2]}: ", text)
+        self.assertIn("3 of 4 clips rendered", text)
+        self.assertEqual(sorted(os.listdir(folder)), ["last.mkv", "odd.mkv", "small.mkv"])
+        self.assertEqual((folder / "small.mkv").read_bytes(),
+                         self.render(clips.small, "small.mkv", *options).read_bytes())
+        again = reelfx("render", inputs[1], inputs[3], "--into", folder, *options, "--progress", "json")
+        self.assertEqual(again.returncode, 4)
+        self.assertIn('{"clip":2,"clips":2,"input":"%s","output":"%s"}' % (inputs[3], folder / "last.mkv"),
+                      again.stderr.decode())
+        self.assertEqual(reelfx("render", inputs[1], "--into", folder, *options, "-y").returncode, 0)
+
+    def test_collisions_are_refused_before_anything_is_rendered(self):
+        (self.out / "a").mkdir(), (self.out / "b").mkdir()
+        same = [shutil.copy(clips.small, self.out / f"{name}/clip.mp4") for name in "ab"]
+        for words, args in ((("both be written", "a/clip.mp4", "b/clip.mp4"), (*same, "--into", self.out / "c")),
+                            (("is the input",), (*same[:1], "--into", self.out / "a", "-y")),
+                            (("is the input",), (self.out / "a/clip.mp4", clips.odd, "--into", self.out / "b/../a", "-y")),
+                            (("no preset \"Nope\"",), (*same[:1], "--into", self.out / "c", "-p", "Nope")),
+                            (("--hash",), (*same[:1], "--into", self.out / "c", "--hash")),
+                            (("standard input",), ("-", clips.odd, "--into", self.out / "c")),
+                            (("--into",), (*same, clips.odd))):
+            with self.subTest(args=args):
+                done = reelfx("render", *args, *CAMERA)
+                self.assertEqual((done.returncode, done.stderr.count(b"\n")), (2, 1), done.stderr)
+                for word in words:
+                    self.assertIn(word, done.stderr.decode())
+        dry = reelfx("render", *same[:1], clips.odd, "--into", self.out / "c", *CAMERA, "--dry-run")
+        self.assertEqual((dry.returncode, dry.stdout.count(b"output ")), (0, 2), dry.stderr)
+        self.assertEqual(self.left_over(), ["a", "b"])
+
+
 class Matte(ReelfxTest):
     """The damage matte, composited over the picture by a real compositor, gives the damaged picture."""
 
@@ -502,7 +544,7 @@ class Refusing(ReelfxTest):
             (2, ["did you mean \"Train Ride\"?"], (*render, *CAMERA, "-p", "Train")),
             (2, ["did you mean \"X Jitter\"?"], (*render, *CAMERA, "-s", "X Gitter=3")),
             (2, ["did you mean \"--effect\"? See"], (*render, "--efect", "Film Look")),
-            (2, ["\"x\", \"y\""], (*render, "x", "y", *CAMERA)),
+            (2, ["\"x\", \"y\""], ("info", small, "x", "y")),
             (2, ["ascend", "3@5 4@3"], (*render, *CAMERA, "-s", "X Jitter=3@5 4@3")),
             (2, ["0 to 100", "101"], (*render, *CAMERA, "--mix", "101")),
             (2, ["--effect", "twice", "--then"], (*render, *CAMERA, *CAMERA)),
