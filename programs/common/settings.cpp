@@ -30,7 +30,7 @@ std::optional<ValueWord> ParseSlider(const ParamInfo& param, std::string_view te
     const auto shown = ParseNumber(text);
     if (!shown || *shown < param.minimum || *shown > param.maximum) return std::nullopt;
     ValueWord word;
-    word.number = static_cast<float>((*shown - param.minimum) / (double{param.maximum} - param.minimum));
+    word.number = NormalisedSlider({param.minimum, param.maximum}, *shown);
     return word;
 }
 
@@ -98,6 +98,10 @@ std::string Expected(const ParamInfo& param) {
 }
 
 }  // namespace
+
+float NormalisedSlider(const SliderRange& range, double shown) {
+    return static_cast<float>((shown - range.minimum) / (double{range.maximum} - range.minimum));
+}
 
 Setting ParseSetting(const EffectInfo& effect, std::string_view text) {
     const std::size_t equals = text.find('=');

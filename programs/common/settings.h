@@ -22,6 +22,13 @@ struct Setting {
     ValueWord value;  // stored form: normalised number, colour word, item index or flag
 };
 
+// What a slider shows at its ends.
+struct SliderRange {
+    float minimum = 0.0f, maximum = 0.0f;
+};
+// The stored number, 0..1, of a shown one.
+float NormalisedSlider(const SliderRange& range, double shown);
+
 // Throws UsageError if there is no such parameter (and lists those that exist), or if the value is out of
 // range or of another kind.
 Setting ParseSetting(const EffectInfo& effect, std::string_view text);

@@ -40,16 +40,6 @@ std::uint32_t MixedColour(std::uint32_t from, std::uint32_t to, double share) {
     return mixed;
 }
 
-ValueWord Mixed(std::uint32_t kind, ValueWord from, ValueWord to, double share) {
-    ValueWord mixed = from;
-    if (kind == kKindSlider) {
-        mixed.number = static_cast<float>(from.number + (double{to.number} - from.number) * share);
-    } else if (kind == kKindColour) {
-        mixed.colour = MixedColour(from.colour, to.colour, share);
-    }
-    return mixed;
-}
-
 }  // namespace
 
 TimedSetting::TimedSetting(const EffectInfo& effect, std::string_view text) {
@@ -59,9 +49,11 @@ TimedSetting::TimedSetting(const EffectInfo& effect, std::string_view text) {
     } else {
         const Setting setting = ParseSetting(effect, text);
         m_parameter = setting.parameter;
-        m_points = {{0.0, setting.value}};
+        m_points = {{0.0, setting.value, 0.0}};
     }
-    m_kind = effect.params[m_parameter].kind;
+    const ParamInfo& param = effect.params[m_parameter];
+    m_kind = param.kind;
+    m_range = {param.minimum, param.maximum};
 }
 
 void TimedSetting::AddPoints(const EffectInfo& effect, std::string_view name, std::string_view text) {
@@ -85,7 +77,7 @@ void TimedSetting::AddPoints(const EffectInfo& effect, std::string_view name, st
         }
         if (position.isInSeconds) isInSeconds = position.isInSeconds;
         m_parameter = setting.parameter;
-        m_points.push_back({position.value, setting.value});
+        m_points.push_back({position.value, setting.value, ParseNumber(text.substr(0, at)).value_or(0.0)});
         text.remove_prefix(std::min(text.find_first_not_of(' ', end), text.size()));
     }
     m_isInSeconds = isInSeconds.value_or(false);
@@ -97,8 +89,14 @@ ValueWord TimedSetting::At(const ClipPlace& place) const {
     if (after == m_points.begin()) return m_points.front().value;
     if (after == m_points.end()) return m_points.back().value;
     const Point& from = *(after - 1);
-    return Mixed(m_kind, from.value, after->value,
-                 (position - from.position) / (after->position - from.position));
+    const double share = (position - from.position) / (after->position - from.position);
+    ValueWord value = from.value;
+    if (m_kind == kKindSlider) {
+        value.number = NormalisedSlider(m_range, from.shown + (after->shown - from.shown) * share);
+    } else if (m_kind == kKindColour) {
+        value.colour = MixedColour(from.value.colour, after->value.colour, share);
+    }
+    return value;
 }
 
 std::vector<ValueWord> TimedSetting::Values() const {

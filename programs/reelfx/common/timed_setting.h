@@ -42,12 +42,14 @@ class TimedSetting {
     struct Point {
         double position;  // in frames or seconds
         ValueWord value;
+        double shown;  // of a slider, before it is narrowed
     };
 
     void AddPoints(const EffectInfo& effect, std::string_view name, std::string_view text);
 
     std::uint32_t m_parameter = 0;
     std::uint32_t m_kind = 0;  // ParamKind
+    SliderRange m_range;
     bool m_isInSeconds = false;
     std::vector<Point> m_points;  // one at least, in order
 };

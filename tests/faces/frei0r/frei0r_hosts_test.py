@@ -181,6 +181,15 @@ class Hosts(unittest.TestCase):
         self.assertEqual(in_melt(self.work, "Film Damage", "25", more=("Wear=0", "Pattern=Fine")), wanted)
         self.assertEqual(in_melt(self.work, "Film Damage", "25", more=("4=0", "5=3")), wanted)
 
+    def test_values_that_a_host_changes_count_in_their_frame(self):
+        # Values of a fade are passed frame by frame, by melt's frame threads also for several frames at once.
+        wanted = self.work.expected("Film Damage", "25", "--set", "Wear=10@0 60@16", "--set", "Spots=0@4 80@19")
+        self.assertEqual(len(set(wanted)), FRAMES)
+        for real_time in (-1, -4):
+            with self.subTest(real_time=real_time):
+                self.assertEqual(in_melt(self.work, "Film Damage", "25", real_time=real_time,
+                                         more=("Wear=0=0.1;16=0.6", "Spots=4=0;19=0.8")), wanted)
+
     def test_slices_of_melt_do_no_harm(self):
         # A slice is a separate picture to a plug-in, but it must come through whole.
         self.assertEqual(len(in_melt(self.work, "Film Pro", "25", more=("threads=4",))), FRAMES)
