@@ -48,13 +48,14 @@ TimeUnit UnitOfModule(std::string_view fileName) {
     return TimeUnit::kUnknown;
 }
 
-void FrameClock::SetFrameRate(std::string_view text) noexcept {
+bool FrameClock::SetFrameRate(std::string_view text) noexcept {
     m_toldUnit = TakeSuffix(text, "ms")  ? TimeUnit::kMilliseconds
                  : TakeSuffix(text, "s") ? TimeUnit::kSeconds
                                          : TimeUnit::kUnknown;
     while (TakeSuffix(text, " ")) {
     }
     m_rate = ParseRate(text);
+    return m_rate || text.empty() || IsSameButForCase(text, "none");
 }
 
 double FrameClock::ClipSeconds(double hostTime) noexcept {

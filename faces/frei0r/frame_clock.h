@@ -31,8 +31,9 @@ class FrameClock {
   public:
     explicit FrameClock(TimeUnit hostUnit) noexcept : m_unit(hostUnit) {}
 
-    // "25", "29.97", "30000/1001", optionally followed by "ms" or "s". Anything else counts as not given.
-    void SetFrameRate(std::string_view text) noexcept;
+    // "25", "29.97", "30000/1001", optionally followed by "ms" or "s". Anything else counts as not given; false for what
+    // is neither empty nor "none".
+    bool SetFrameRate(std::string_view text) noexcept;
     void SetStartFrame(std::int64_t frame) noexcept { m_startFrame = frame; }
 
     // Seconds from the start of the clip. A time that is not a number counts as 0.

@@ -3,10 +3,10 @@
 #include <algorithm>
 #include <cmath>
 #include <cstdio>
-#include <cstring>
 #include <limits>
 #include <new>
 
+#include "faces/frei0r/error_picture.h"
 #include "text/names.h"
 #include "text/number_text.h"
 
@@ -52,11 +52,28 @@ std::optional<std::int64_t> WholeNumber(std::string_view text) {
     return std::llround(*number);
 }
 
-std::uint32_t SeedOf(std::string_view text) {
+std::optional<std::uint32_t> SeedOf(std::string_view text) {
+    if (text.empty()) return 0;
     const auto seed = WholeNumber(text);
-    return seed && *seed >= 0 && *seed <= std::numeric_limits<std::uint32_t>::max()
-               ? static_cast<std::uint32_t>(*seed)
-               : 0;
+    if (!seed || *seed < 0 || *seed > std::numeric_limits<std::uint32_t>::max()) return std::nullopt;
+    return static_cast<std::uint32_t>(*seed);
+}
+
+bool IsNone(const std::string& text) {
+    return text.empty() || IsSameName(text, "none");
+}
+
+// The preset or item that was probably meant.
+std::optional<std::string> NearestTo(const PluginDescription& plugin, const PluginParam& param,
+                                     const std::string& text) {
+    std::vector<std::string> names;
+    if (param.role == ParamRole::kPreset) {
+        names.assign(plugin.effect.presetNames.begin(), plugin.effect.presetNames.end());
+    } else if (param.role == ParamRole::kOwn) {
+        const auto& items = plugin.effect.params[param.own].items;
+        names.assign(items.begin(), items.end());
+    }
+    return NearestName(text, names);
 }
 
 // Frei0r's cheapest colour model in hosts is red, green, blue, alpha; the effects work on blue, green, red, alpha.
@@ -68,9 +85,11 @@ void SwapRedAndBlue(const std::uint32_t* in, std::uint32_t* out, std::size_t cou
     }
 }
 
-void WarnOfPreset(const PluginDescription& plugin, const std::string& name) {
-    std::fprintf(stderr, "%s: there is no preset \"%s\". %s\n", plugin.fileName.c_str(), name.c_str(),
-                 plugin.params[0].explanation.c_str());
+void Warn(const PluginDescription& plugin, const PluginParam& param, const std::string& text) {
+    const auto nearest = NearestTo(plugin, param, text);
+    const std::string hint = nearest ? "; did you mean \"" + *nearest + "\"?" : ".";
+    std::fprintf(stderr, "%s: %s cannot be \"%s\"%s %s\n", plugin.fileName.c_str(), param.name.c_str(),
+                 text.c_str(), hint.c_str(), param.explanation.c_str());
 }
 
 }  // namespace
@@ -86,6 +105,7 @@ Instance::Instance(const PluginDescription& plugin, std::uint32_t width, std::ui
       m_clock(hostUnit) {
     if (m_session == nullptr) throw std::bad_alloc();
     for (const PluginParam& param : plugin.params) m_texts.push_back(DefaultText(plugin, param));
+    m_faults.resize(m_texts.size());
     for (std::size_t i = 0; i < m_own.size(); ++i) m_own[i].value = plugin.effect.params[i].defaultValue;
 }
 
@@ -104,29 +124,36 @@ void Instance::Set(int index, const void* value) {
 void Instance::SetText(std::size_t index, std::string text) {
     const PluginParam& param = m_plugin.params[index];
     const bool isNew = text != m_texts[index];
+    const bool isRead = ReadText(param, text);
+    if (!isRead && isNew) Warn(m_plugin, param, text);
+    m_faults[index] = isRead ? "" : text;
     m_texts[index] = std::move(text);
-    const std::string& kept = m_texts[index];
+}
+
+bool Instance::ReadText(const PluginParam& param, const std::string& text) {
     switch (param.role) {
         case ParamRole::kPreset:
-            m_preset = FindPreset(m_plugin.effect, kept);
-            if (isNew && !m_preset && !kept.empty() && !IsSameName(kept, "none"))
-                WarnOfPreset(m_plugin, kept);
-            break;
-        case ParamRole::kSeed:
-            m_seed = SeedOf(kept);
-            break;
-        case ParamRole::kStartFrame:
-            m_clock.SetStartFrame(WholeNumber(kept).value_or(0));
-            break;
+            m_preset = FindPreset(m_plugin.effect, text);
+            return m_preset || IsNone(text);
+        case ParamRole::kSeed: {
+            const auto seed = SeedOf(text);
+            m_seed = seed.value_or(0);
+            return seed.has_value();
+        }
+        case ParamRole::kStartFrame: {
+            const auto frame = WholeNumber(text);
+            m_clock.SetStartFrame(frame.value_or(0));
+            return frame || text.empty();
+        }
         case ParamRole::kFrameRate:
-            m_clock.SetFrameRate(kept);
-            break;
+            return m_clock.SetFrameRate(text);
         case ParamRole::kOwn:
-            const auto item = FindItemOrNumber(m_plugin.effect.params[param.own], kept);
-            m_own[param.own].isSet = item.has_value();
-            if (item) m_own[param.own].value.count = *item;
             break;
     }
+    const auto item = FindItemOrNumber(m_plugin.effect.params[param.own], text);
+    m_own[param.own].isSet = item.has_value();
+    if (item) m_own[param.own].value.count = *item;
+    return item || text.empty();
 }
 
 void Instance::SetOwn(const PluginParam& param, const void* value) {
@@ -192,7 +219,26 @@ void Instance::TellSession() noexcept {
 
 void Instance::Update(double hostTime, const std::uint32_t* in, std::uint32_t* out) noexcept {
     const std::scoped_lock lock(m_mutex);
-    if (!Render(hostTime, in, out) && in != out) std::memcpy(out, in, m_pixelCount * sizeof(*out));
+    std::vector<std::string> faults;
+    try {
+        faults = FaultLines();
+        if (faults.empty() && Render(hostTime, in, out)) return;
+    } catch (const std::bad_alloc&) {
+        // The stripes alone must do.
+    }
+    PaintError(faults, out, m_width, m_height);
+}
+
+std::vector<std::string> Instance::FaultLines() const {
+    for (std::size_t i = 0; i < m_faults.size(); ++i) {
+        if (m_faults[i].empty()) continue;
+        const PluginParam& param = m_plugin.params[i];
+        std::vector<std::string> lines = {m_plugin.name, "unknown " + param.name, m_faults[i]};
+        if (const auto nearest = NearestTo(m_plugin, param, m_faults[i]))
+            lines.push_back("did you mean " + *nearest);
+        return lines;
+    }
+    return {};
 }
 
 bool Instance::Render(double hostTime, const std::uint32_t* in, std::uint32_t* out) noexcept {

@@ -3,6 +3,9 @@
 //
 // A preset supplies all values that the host has not set. Some hosts set every parameter, mostly to its
 // default; so a value that is at its default does not override the preset.
+//
+// A text that is not what its parameter takes, such as an unknown preset, is a fault: it is written to standard error
+// and, until the host sets another text, on every frame, since frei0r has no other way to refuse it.
 #pragma once
 
 #include <frei0r.h>
@@ -26,9 +29,7 @@ class Instance {
     // `plugin` outlives the instance. Throws std::bad_alloc.
     Instance(const PluginDescription& plugin, std::uint32_t width, std::uint32_t height, TimeUnit hostUnit);
 
-    // As f0r_set_param_value and f0r_get_param_value. An index past the last parameter does nothing. A text
-    // that is not a preset, item or number has no effect; for an unknown preset, one line is written to
-    // standard error.
+    // As f0r_set_param_value and f0r_get_param_value. An index past the last parameter does nothing.
     void Set(int index, const void* value);
     void Get(int index, void* value);
 
@@ -42,9 +43,12 @@ class Instance {
     };
 
     void SetText(std::size_t index, std::string text);
+    // False if the parameter does not take the text.
+    bool ReadText(const PluginParam& param, const std::string& text);
     void SetOwn(const PluginParam& param, const void* value);
     [[nodiscard]] bool IsDefault(std::uint32_t own) const noexcept;
     void TellSession() noexcept;
+    [[nodiscard]] std::vector<std::string> FaultLines() const;
     [[nodiscard]] bool Render(double hostTime, const std::uint32_t* in, std::uint32_t* out) noexcept;
 
     const PluginDescription& m_plugin;
@@ -52,8 +56,9 @@ class Instance {
     const std::uint32_t m_width, m_height;
     std::mutex m_mutex;  // guards all below
     std::unique_ptr<effects::EffectSession> m_session;
-    std::vector<std::string> m_texts;  // by parameter of the plug-in; only strings are used
-    std::vector<OwnValue> m_own;       // by parameter of the effect
+    std::vector<std::string> m_texts;   // by parameter of the plug-in; only strings are used
+    std::vector<std::string> m_faults;  // by parameter of the plug-in; empty: none
+    std::vector<OwnValue> m_own;        // by parameter of the effect
     FrameClock m_clock;
     std::optional<std::uint32_t> m_preset;
     std::uint32_t m_seed = 0;

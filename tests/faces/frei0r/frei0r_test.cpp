@@ -181,6 +181,42 @@ TEST(Frei0rInstance, TakesEachKindOfValueAndGivesItBack) {
     }
 }
 
+TEST(Frei0rInstance, ShowsWhatItCannotRead) {
+    const struct {
+        const char *name, *text;
+        bool isRead;
+    } rows[] = {
+        {"preset", "Sepa", false},       {"preset", "sepia", true},     {"preset", "Fluorescent Light", true},
+        {"preset", "none", true},        {"preset", "", true},          {"seed", "-1", false},
+        {"seed", "many", false},         {"seed", "4294967296", false}, {"seed", "7.000000", true},
+        {"start frame", "first", false}, {"start frame", "-3", true},   {"frame rate", "fast", false},
+        {"frame rate", "25 ms", true},   {"frame rate", "none", true},  {"frame rate", "", true},
+    };
+    const Pixels in = Ramp(200, 120);
+    for (const auto& row : rows) {
+        Host host(effects::kFilmLook, 200, 120);
+        const Pixels plain = host.Update(0.0, in);
+        host.Text(row.name, row.text);
+        const Pixels shown = host.Update(0.0, in);
+        // Either film, or a picture that has nothing of it.
+        std::size_t same = 0;
+        for (std::size_t i = 0; i < in.size(); ++i) same += shown[i] == in[i] ? 1 : 0;
+        EXPECT_EQ(same == 0 && std::set(shown.begin(), shown.end()).size() == 3, !row.isRead)
+            << row.name << " " << row.text;
+        host.Text(row.name, row.name == std::string_view("preset") ? "none" : "0");
+        EXPECT_EQ(host.Update(0.0, in) == plain, row.name != std::string_view("frame rate"))
+            << "the host has corrected it";
+    }
+    for (const std::uint32_t side : {1u, 2u, 9u}) {
+        Host host(effects::kFilmDamage, side, side);
+        host.Text("Pattern", "Blotchi");
+        Pixels out(std::size_t{side} * side + 8, 0xABABABABu);
+        const Pixels source(std::size_t{side} * side, 1u);
+        (*host).Update(0.0, source.data(), out.data());
+        EXPECT_EQ(std::count(out.begin(), out.end(), 0xABABABABu), 8) << side;
+    }
+}
+
 TEST(Frei0rInstance, LeavesThePictureAloneByDefault) {
     const Pixels in = Ramp(33, 9);
     for (const effects::EffectTable* effect : effects::kAllEffects) {
