@@ -33,6 +33,16 @@ put_help() {
     rm -rf "$pages"
 }
 
+# put_page FILE PLACE PACKAGE: a Markdown page without what is for others: lines from "<!-- only A B -->" to "<!-- end -->"
+# stay in the packages A and B only.
+put_page() {
+    awk -v package="$3" '
+        /^<!-- only .* -->$/ { dropped = index($0, " " package " ") == 0; next }
+        /^<!-- end -->$/ { dropped = 0; next }
+        /^<!--/ { next }
+        !dropped' "$1" | install -D -m 644 /dev/stdin "$2"
+}
+
 # Gives everything below a folder the same time stamp.
 set_times() { find "$1" -exec touch -h -d "@$SOURCE_DATE_EPOCH" {} +; }
 

@@ -15,8 +15,9 @@ from packing import CLIP, DIST, check_digest_list, check_no_build_paths, files_b
 
 PRODUCT = "velmora-reel-effects-1.0-linux-x86_64"
 PLUGINS = [f"velmora_film_{name}" for name in ("camera", "damage", "express", "look", "pro")]
-DEB_FILES = ["usr/bin/reelfx", *(f"usr/lib/velmora-reel-effects/{name}" for name in ("farm-slurm", "farm-join")),
-             "usr/share/man/man1/reelfx.1.gz", "usr/share/bash-completion/completions/reelfx",
+NAMES = ("reelfx", "reelfx-farm-slurm", "reelfx-farm-join")
+DEB_FILES = [*(f"usr/bin/{name}" for name in NAMES), *(f"usr/share/man/man1/{name}.1.gz" for name in NAMES),
+             "usr/share/bash-completion/completions/reelfx",
              "usr/share/zsh/vendor-completions/_reelfx", "usr/share/fish/vendor_completions.d/reelfx.fish",
              "usr/share/velmora-reel-effects/reel.html",
              *(f"usr/lib/frei0r-1/{name}.so" for name in PLUGINS),
@@ -38,6 +39,7 @@ def check_tarball(path, work, expected):
     unpacked = folder / PRODUCT
     check_digest_list(unpacked)
     check_no_build_paths(unpacked)
+    check_page(unpacked / "docs/hosts.md")
     assert digests(unpacked / "reelfx") == expected
 
     home = work / "home"
@@ -45,7 +47,14 @@ def check_tarball(path, work, expected):
     kept = home / ".local" / "share" / "kdenlive" / "effects" / "mine.xml"
     kept.parent.mkdir(parents=True)
     kept.write_text("a user's own")
+    (home / ".frei0r-1").mkdir()  # the user's own folders, with nothing in them
+    (home / ".local" / "bin").mkdir()
+    before = sorted(home.rglob("*"))
     environment = {"HOME": str(home), "PATH": os.environ["PATH"]}
+    for words, code in ((["--help"], 0), (["--frobnicate"], 2), (["--remove", "all"], 2), (["--remove"], 0)):
+        done = subprocess.run([unpacked / "install.sh", *words], env=environment, capture_output=True, text=True)
+        assert (done.returncode, sorted(home.rglob("*"))) == (code, before), (words, done)
+        assert words == ["--remove"] or "Usage: install.sh" in done.stdout + done.stderr, done
     said = run(unpacked / "install.sh", env=environment)
     installed = {str(home / name) for name in files_below(home)} - {str(kept)}
     listing = str(home / ".local/share/velmora-reel-effects/installed-files")
@@ -56,8 +65,27 @@ def check_tarball(path, work, expected):
     # FFmpeg finds the plug-in by itself, and its frames are those of reelfx.
     run("ffmpeg", "-nostdin", "-v", "error", "-i", CLIP, "-vf", "frei0r=velmora_film_pro:super8|7", "-frames:v", "2",
         "-f", "null", "-", env=environment)
+    assert "Usage: " in run(home / ".local/bin/reelfx-farm-join", "--help")
+    run(unpacked / "install.sh", env=environment)  # again, as for a new version
+    changed = home / ".local/share/man/man1/reelfx.1"
+    changed.write_text("the user's own now")
     run(unpacked / "install.sh", "--remove", env=environment)
-    assert list(files_below(home)) == [kept.relative_to(home).as_posix()], files_below(home)
+    assert changed.read_text() == "the user's own now"
+    for path in (changed, *list(changed.parents)[:2]):
+        path.unlink() if path.is_file() else path.rmdir()
+    assert sorted(home.rglob("*")) == before, set(home.rglob("*")) ^ set(before)
+    theirs = home / ".local/bin/reelfx"
+    theirs.write_text("another program")
+    done = subprocess.run([unpacked / "install.sh"], env=environment, capture_output=True, text=True)
+    assert done.returncode == 1 and str(theirs) in done.stderr, done
+    assert sorted(home.rglob("*")) == sorted([*before, theirs]) and theirs.read_text() == "another program"
+
+
+def check_page(page):
+    """The page for users of the plug-ins names nothing that only the source tree has."""
+    for word in ("make ", "build/", "scripts/", "frei0r_hosts", "<!--", ".dll"):
+        assert word not in page.read_text(), f"{page}: {word}"
+    assert "melt" in page.read_text()
 
 
 def check_deb(path, work, expected):
@@ -78,6 +106,7 @@ def check_deb(path, work, expected):
             assert (unpacked / name).read_bytes()[4:8] == bytes(4), name
             gzip.decompress((unpacked / name).read_bytes())
     check_no_build_paths(unpacked)
+    check_page(unpacked / "usr/share/doc/velmora-reel-effects/hosts.md")
     assert digests(unpacked / "usr/bin/reelfx") == expected
 
 

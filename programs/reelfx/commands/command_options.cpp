@@ -2,6 +2,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include "programs/reelfx/media/encoder_choice.h"
 #include "text/number_text.h"
 
 namespace velmora::hosts {
@@ -55,14 +56,16 @@ void AddMix(CLI::App& command, TypedOptions& typed) {
 
 void AddRandom(CLI::App& command, TypedOptions& typed) {
     AddOfEach(command, "--seed", typed.seeds,
-              "Another seed gives other shake, flicker and damage; with 0, flicker and scratches are "
-              "those of the Windows library")
+              "Another seed gives other shake, flicker and damage; with 0, flicker and scratches are those "
+              "that the "
+              "effects have in Windows editors")
         .type_name("N")
         ->default_str("0")
         ->envname("REELFX_SEED");
     command
-        .add_option("--random-state", typed.randomState,
-                    "Use one continuous random sequence from this state, as the Windows library does")
+        .add_option(
+            "--random-state", typed.randomState,
+            "Use one continuous random sequence from this state, as the effects do in Windows editors")
         ->type_name("HEX");
 }
 
@@ -98,7 +101,7 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         .add_option("--farm", typed.farm,
                     "Render part N of M parts of about the same length, without sound, for rendering one "
                     "clip on many "
-                    "machines; farm-join joins the parts")
+                    "machines; reelfx-farm-join joins the parts")
         ->type_name("N/M");
     render.add_option("--start", typed.start, "Start at this time of the clip")->type_name("TIME");
     render.add_option("--duration", typed.duration, "Render only this long")->type_name("TIME");
@@ -108,8 +111,10 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         ->envname("REELFX_THREADS");
     render.add_option("--format", typed.format, "Container, if the file name extension of OUT does not say")
         ->type_name("FORMAT");
-    render.add_option("--codec", typed.codec, "Video codec")->type_name("CODEC")->envname("REELFX_CODEC");
-    render.add_option("--crf", typed.crf, "Quality, on the codec's own scale")
+    render.add_option("--codec", typed.codec, "Video codec; default: " + UsualCodecs())
+        ->type_name("CODEC")
+        ->envname("REELFX_CODEC");
+    render.add_option("--crf", typed.crf, "Quality, on the codec's own scale; default: " + UsualQualities())
         ->type_name("N")
         ->envname("REELFX_CRF");
     render.add_option("--pix-fmt", typed.pixelFormat, "Pixel format; default: the source's")

@@ -108,6 +108,22 @@ AVPixelFormat AskedPixelFormat(const std::string& name, const AVCodec& codec, co
 
 }  // namespace
 
+std::string UsualCodecs() {
+    std::string text;
+    for (const char* name : {"mp4", "mov", "matroska", "webm", "avi", "mpegts"}) {
+        const AVOutputFormat* const container = av_guess_format(name, nullptr, nullptr);
+        const AVCodec* const codec = container ? avcodec_find_encoder(container->video_codec) : nullptr;
+        if (codec) text += (text.empty() ? "" : ", ") + std::string(codec->name) + " in " + name;
+    }
+    return text;
+}
+
+std::string UsualQualities() {
+    std::string text;
+    for (const QualityRow& row : kQualities) text += std::string(row.crf) + " for " + row.codec + ", ";
+    return text + "otherwise quantiser " + std::to_string(kQuantiser);
+}
+
 const AVOutputFormat& ChooseContainer(const OutputOptions& options) {
     const char* name = options.format ? options.format->c_str() : nullptr;
     if (options.isRawBgra) name = "rawvideo";

@@ -19,6 +19,10 @@ struct OutputOptions {
     bool needsAlpha = false;  // the pixel format must support transparency
 };
 
+// For the help: the codecs of the usual containers, and each codec's quality, if none is asked for.
+std::string UsualCodecs();
+std::string UsualQualities();
+
 // Each throws Failure (kExitUsage) with one line when there is no match.
 const AVOutputFormat& ChooseContainer(const OutputOptions& options);
 const AVCodec& ChooseCodec(const OutputOptions& options, const AVOutputFormat& container);

@@ -1,6 +1,6 @@
 """reelfx in bash: candidates may hold spaces and "=", and may be typed with quotes or backslashes."""
 
-from commands import CODECS, settings_of
+from commands import WORDS, settings_of
 
 BODY = r'''
 # The effect that the line names, else the one of the environment, in small letters.
@@ -53,7 +53,8 @@ _reelfx()
         EFFECT) _reelfx_offer < <(_reelfx_effects) ;;
         PRESET) _reelfx_offer < <(_reelfx_presets "$(_reelfx_effect)") ;;
         NAME=VALUE) _reelfx_offer < <(_reelfx_settings "$(_reelfx_effect)") ;;
-        CODEC) _reelfx_offer < <(printf '%s\n' @CODECS@) ;;
+        FOLDER) _filedir -d ;;
+@WORDS@
         *\|*) _reelfx_offer < <(tr '|' '\n' <<< "$value") ;;
         '') _reelfx_offer < <(_reelfx_words "$command") ;;
     esac
@@ -98,10 +99,11 @@ def text(program):
     values = [f"        {'|'.join(names)}) value={quoted(value)} ;;" for names, value in program.valued_options().items()]
     places = [f"        {quoted(' '.join(c.words))}) value={c.positionals[0].value} ;;" for c in program.commands
               if c.positionals]
+    words = [f"        {kind}) _reelfx_offer < <({lines(known)}) ;;" for kind, known in WORDS.items()]
     body = BODY
     for mark, replacement in (("@EFFECT_OPTIONS@", "|".join(program.options_taking("EFFECT"))),
                               ("@FIND_COMMAND@", "\n".join(finding)), ("@VALUES@", "\n".join(values)),
-                              ("@POSITIONALS@", "\n".join(places)), ("@CODECS@", " ".join(CODECS))):
+                              ("@POSITIONALS@", "\n".join(places)), ("@WORDS@", "\n".join(words))):
         body = body.replace(mark, replacement)
     effects = program.effects
     return "\n".join((

@@ -97,6 +97,11 @@ def settings_of(effect):
     return words
 
 
-# Commonly used codecs; --codec takes any that FFmpeg has.
-CODECS = ("ffv1", "libaom-av1", "libsvtav1", "libvpx-vp9", "libx264", "libx265", "mjpeg", "mpeg4", "png", "prores_ks",
-          "qtrle")
+# Commonly used ones; the options take any that FFmpeg has.
+WORDS = {
+    "CODEC": ("ffv1", "libaom-av1", "libsvtav1", "libvpx-vp9", "libx264", "libx265", "mjpeg", "mpeg4", "png", "prores_ks",
+              "qtrle"),
+    "FORMAT": ("avi", "gif", "image2", "matroska", "mov", "mp4", "mpegts", "mxf", "nut", "ogg", "webm", "yuv4mpegpipe"),
+    "PIXELS": ("bgra", "gbrp", "gray", "rgb24", "rgb48le", "rgba", "rgba64le", "yuv420p", "yuv420p10le", "yuv422p",
+               "yuv422p10le", "yuv444p", "yuv444p10le", "yuva420p", "yuva444p10le"),
+}

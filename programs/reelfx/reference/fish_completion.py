@@ -1,6 +1,6 @@
 """reelfx in fish."""
 
-from commands import CODECS, settings_of
+from commands import WORDS, settings_of
 
 HEAD = r'''# fish completion for reelfx; written by its build.
 
@@ -46,7 +46,8 @@ def by_effect(function, effects, words_of):
 
 def candidates(value):
     found = {"EFFECT": "(__reelfx_effects)", "PRESET": "(__reelfx_presets (__reelfx_effect))",
-             "NAME=VALUE": "(__reelfx_settings (__reelfx_effect))", "CODEC": " ".join(CODECS)}
+             "NAME=VALUE": "(__reelfx_settings (__reelfx_effect))", "FOLDER": "(__fish_complete_directories)",
+             **{kind: " ".join(words) for kind, words in WORDS.items()}}
     return value.replace("|", " ") if "|" in value else found.get(value, "")
 
 

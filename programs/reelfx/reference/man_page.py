@@ -3,7 +3,7 @@
 import textwrap
 
 # The date of the last change of the text.
-DATE = "2026-11-21"
+DATE = "2026-11-22"
 
 DESCRIPTION = """\
 reelfx makes video look like old film: shake, dust, scratches, worn emulsion, flicker, faded colours and glow. It reads
@@ -11,15 +11,30 @@ everything that FFmpeg can read and keeps sound, size, frame rate, times and col
 
 The same settings, seed and frames give the same bytes on every machine and with any number of threads, whether a part of a
 clip or the whole clip is rendered. Another seed gives other shake, flicker, wear, spots and scratches. With seed 0, flicker
-and scratches are those of the Windows library.
+and scratches are those that the effects have in Windows editors.
 
-Upper and lower case are the same in names of effects, presets and parameters. A slider takes a number in its range, a colour
+Only letters and digits count in names of effects, presets and parameters, in either case. A slider takes a number in its range, a colour
 #RRGGBB, a menu the text of an item or its number from 0, a check box on or off. Settings are applied in this order: built-in
 preset, preset file, each --set.
 
+A setting can change over time: --set "Wear=10@0 60@125" goes evenly from 10 in frame 0 to 60 in frame 125 of the clip. With an s,
+positions are seconds since the first frame: "Wear=10@0 60@5s". Before the first point and after the last their values are held.
+Menus and check boxes change at their points. A colour goes from one to the other. Positions count from the start of the clip, also
+where only a part of it is rendered. Scratches and flicker stay where the largest values of the fade put them.
+
+--then begins another effect, which is applied to the result of those before. Options of an effect (--effect, --preset,
+--preset-file, --set, --mix, --seed) belong to the effect in whose place they are typed. --mix 30 makes 30 per cent of an effect's
+picture and 70 per cent of the picture before it. With --matte, the damage of all effects is drawn, and effects without damage do
+nothing.
+
+With --into, many clips are rendered with the same options, each to a file of its own name in the folder. Names that meet, and
+results that would replace a clip, are refused before anything is rendered. A clip that fails is reported, the others are
+rendered, and the exit status is that of the first that failed.
+
 With --progress json, each line on standard error that begins with a brace is an object with the fields frame (frames done),
 frames (their total number, if known), seconds and fps (since the start), and progress: continue, or end when everything has
-been written. A command that fails writes one line of text instead of end.
+been written. A command that fails writes one line of text instead of end. With --into, an object with the fields clip, clips, input
+and output comes before each clip.
 
 With --hash, a line is printed on standard output for each frame: the word frame, its number in the clip from 0, the word md5,
 and the MD5 of its rows of blue, green, red and alpha bytes. FFmpeg's framemd5 gives the same MD5 for the pixel format bgra.
@@ -30,6 +45,9 @@ EXAMPLES = (
      'reelfx render in.mp4 out.mp4 --effect "Film Pro" --preset "Super 8" --seed 7'),
     ("Render ten seconds with your own settings:",
      'reelfx render in.mp4 out.mp4 -e "Film Camera" -s "X Jitter=4" -s Flicker=20 --start 1:30 --duration 10'),
+    ("Colours and damage in one pass, the damage growing for five seconds:",
+     'reelfx render in.mp4 out.mp4 -e "Film Look" -p Sepia --mix 60 --then -e "Film Damage" -s "Wear=0@0 60@5s"'),
+    ("Render all clips of a folder:", 'reelfx render clips/*.mp4 --into old -e "Film Express" -p Newsreel'),
     ("Show all presets of an effect on one frame:", 'reelfx sheet in.mp4 sheet.png -e "Film Damage" -n 20'),
     ("Show how scratches move, in one picture:",
      'reelfx strip in.mp4 strip.png -e "Film Damage" -p Shredded --crop 150x500+600+0'),
@@ -123,7 +141,7 @@ def text(program):
     for what, command in EXAMPLES:
         lines += [escaped(what), ".PP", ".RS 4", ".nf", escaped(command), ".fi", ".RE", ".PP"]
     lines.pop()
-    lines += [".SH SEE ALSO", r"\fBffmpeg\fR(1), \fBmelt\fR(1)"]
+    lines += [".SH SEE ALSO", r"\fBreelfx\-farm\-join\fR(1), \fBreelfx\-farm\-slurm\fR(1), \fBffmpeg\fR(1), \fBmelt\fR(1)"]
     text = "\n".join(lines)
     kept = text.split(".nf\n")  # unfilled lines end at ".fi"
     filled = ["\n".join(wrapped(line) for line in part.split("\n")) for part in kept[:1]]

@@ -1,6 +1,6 @@
 """reelfx in zsh, through _arguments."""
 
-from commands import CODECS, settings_of
+from commands import WORDS, settings_of
 
 HEAD = """#compdef reelfx
 # Written by the build of reelfx.
@@ -52,7 +52,7 @@ def quoted(word):
 
 def action(value):
     simple = {"FILE": "_files", "EFFECT": "_reelfx_effects", "PRESET": "_reelfx_preset", "NAME=VALUE": "_reelfx_setting",
-              "CODEC": "(" + " ".join(CODECS) + ")"}
+              "FOLDER": "_files -/", **{kind: "(" + " ".join(words) + ")" for kind, words in WORDS.items()}}
     if "|" in value:
         return "(" + value.replace("|", " ") + ")"
     return simple.get(value, "")
@@ -75,7 +75,7 @@ def spec(option):
 
 
 def place(positional):
-    return quoted(f":{escaped(positional.positional)}:{action(positional.value)}")
+    return quoted(f"{'*' if positional.repeats else ''}:{escaped(positional.positional)}:{action(positional.value)}")
 
 
 def arguments(command, indent):

@@ -107,7 +107,7 @@ class Joining(FarmTest):
                    *"1234")
         self.assertEqual(done.returncode, 0, done.stderr.decode())
         parts = [str(part).replace("{}", n) for n in "1234"]
-        done = run(SCRIPTS / "farm-join", clips.small, self.root / "joined.mkv", *parts)
+        done = run(SCRIPTS / "reelfx-farm-join", clips.small, self.root / "joined.mkv", *parts)
         self.assertEqual((done.returncode, done.stderr), (0, b""))
         self.assert_whole(self.root / "joined.mkv")
 
@@ -119,7 +119,7 @@ class Joining(FarmTest):
                     self.assertEqual(reelfx("render", clips.small, part, *OPTIONS, "--codec", codec, "--farm",
                                             n + "/3").returncode, 0)
                 joined = self.root / ("joined" + ending)
-                done = run(SCRIPTS / "farm-join", clips.small, joined, *parts)
+                done = run(SCRIPTS / "reelfx-farm-join", clips.small, joined, *parts)
                 self.assertEqual((done.returncode, done.stderr), (0, b""))
                 self.assertEqual(frame_times(joined), frame_times(clips.small))
                 self.assertEqual(sound_digest(joined), sound_digest(clips.small))
@@ -131,7 +131,7 @@ class Joining(FarmTest):
                                 (3, (clips.small, out, broken)), (4, (clips.small, broken, whole)),
                                 (4, (clips.small, self.root / "no" / "out.mkv", whole))):
             with self.subTest(arguments=arguments):
-                done = run(SCRIPTS / "farm-join", *arguments)
+                done = run(SCRIPTS / "reelfx-farm-join", *arguments)
                 self.assertEqual((done.returncode, done.stderr.count(b"\n")), (code, 1), done.stderr)
         self.assertEqual(os.listdir(self.root), ["broken.mkv"])
 
@@ -223,7 +223,7 @@ class Scheduler(FarmTest):
         self.addCleanup(self.cluster.stop)
 
     def farm(self, *arguments):
-        return run(SCRIPTS / "farm-slurm", "--wait", *arguments, env=self.cluster.environment)
+        return run(SCRIPTS / "reelfx-farm-slurm", "--wait", *arguments, env=self.cluster.environment)
 
     def test_four_parts_and_their_join(self):
         joined = self.root / "a film.mkv"

@@ -1,5 +1,6 @@
 """The man page and the shell completion of reelfx, checked by the programs that read them."""
 
+import itertools
 import os
 import pty
 import re
@@ -13,6 +14,7 @@ from pathlib import Path
 
 SHARE = Path(os.environ["REELFX_SHARE"])
 MAN_PAGE = SHARE / "man/man1/reelfx.1"
+MAN_PAGES = sorted(MAN_PAGE.parent.glob("*.1"))
 
 # What is typed, where "\t" is the Tab key, and the arguments that reelfx then receives.
 TYPED = (
@@ -22,6 +24,7 @@ TYPED = (
     ("render a b -e 'Film Pro' -s Y\\ Jit\t4", "render a b -e 'Film Pro' -s 'Y Jitter=4'"),
     ("preset sh\tmi\t", "preset show 'mine one.fxp'"),
     ("list film\\ e\t--js\t", "list 'Film Express' --json"),
+    ("render a b --format matr\t--pix-fmt yuv420p1\t", "render a b --format matroska --pix-fmt yuv420p10le"),
     ("render mi\tout.mov --codec pror\t", "render 'mine one.fxp' out.mov --codec prores_ks"),
 )
 
@@ -110,6 +113,7 @@ class Completion(unittest.TestCase):
                 ("reelfx render a b -e 'Film Camera' -p Tr", ["Train Ride"]),
                 ("reelfx render a b -e 'Film Damage' -s Pattern=G", ["Pattern=Grainy"]),
                 ("reelfx list 'Film E", ["Film Express"]),
+                ("reelfx render a b --format mat", ["matroska"]),
                 ("reelfx preset show mi", ["mine one.fxp"])):
             with self.subTest(typed=typed):
                 script = f"source {SHARE}/fish/vendor_completions.d/reelfx.fish; complete -C \"{typed}\""
@@ -122,11 +126,13 @@ class Completion(unittest.TestCase):
 
 class ManPage(unittest.TestCase):
     def test_formatters_have_nothing_to_say(self):
-        for command in (["man", "--warnings", "-E", "UTF-8", "-Tutf8", "-Z", "-l"], ["mandoc", "-Tlint"]):
+        self.assertEqual(len(MAN_PAGES), 3)
+        commands = (["man", "--warnings", "-E", "UTF-8", "-Tutf8", "-Z", "-l"], ["mandoc", "-Tlint"])
+        for command, page in itertools.product(commands, MAN_PAGES):
             if not shutil.which(command[0]):
                 continue
-            with self.subTest(command=command):
-                done = subprocess.run([*command, MAN_PAGE], capture_output=True,
+            with self.subTest(command=command, page=page.name):
+                done = subprocess.run([*command, page], capture_output=True,
                                       env=dict(os.environ, MANROFFSEQ="", MANWIDTH="80"))
                 self.assertEqual(done.stderr, b"")
                 if command[0] == "mandoc":
