@@ -8,9 +8,12 @@
 
 namespace velmora::hosts::frei0r {
 
-// Kdenlive's effect file, with sliders in their shown range, and presets and menus as lists. Parameters are
-// bound by index, which MLT looks up first.
+// Kdenlive's effect file, with sliders in their shown range, and menus as lists. Parameters are bound by index,
+// which MLT looks up first.
 std::string KdenliveEffect(const PluginDescription& plugin);
+
+// The built-in presets as Kdenlive keeps a user's presets of an effect.
+std::string KdenlivePresets(const PluginDescription& plugin);
 
 // Shotcut's description of a filter, and its panel.
 std::string ShotcutMetadata(const PluginDescription& plugin);
@@ -31,6 +34,14 @@ std::vector<std::string> ChoicesOf(const PluginDescription& plugin, const Plugin
 
 // "0.5", "1", "#000000", "Blotchy", "none".
 std::string DefaultOf(const PluginDescription& plugin, const PluginParam& param);
+
+// The value of an own parameter in the built-in preset, as a text like DefaultOf's.
+std::string PresetValueOf(const PluginDescription& plugin, std::uint32_t preset, const PluginParam& param);
+
+// The order in which a panel shows the parameters: where the clip starts comes first, because every cut needs it, and
+// the effect's own parameters after it. The parameter "preset" is left out: editors offer the built-in presets as
+// presets of their own, which set every control.
+std::vector<std::size_t> PanelOrder(const PluginDescription& plugin);
 
 // The effect's row of an own parameter.
 inline const effects::ParamRow& RowOf(const PluginDescription& plugin, const PluginParam& param) {

@@ -4,6 +4,7 @@
 
 #include <cstdio>
 
+#include "effects/effect_queries.h"
 #include "text/number_text.h"
 
 namespace velmora::hosts::frei0r {
@@ -16,6 +17,23 @@ std::vector<std::string> NoneAnd(const Texts& texts) {
     std::vector<std::string> all = {"none"};
     all.insert(all.end(), std::begin(texts), std::end(texts));
     return all;
+}
+
+std::string ValueText(const effects::ParamRow& row, ValueWord value) {
+    switch (row.kind) {
+        case kKindSlider:
+            return NumberText(value.number);
+        case kKindCheckBox:
+            return value.flag != 0 ? "1" : "0";
+        case kKindColour: {
+            char text[8];
+            std::snprintf(text, sizeof(text), "#%02x%02x%02x", value.colour & 0xFFu,
+                          value.colour >> 8 & 0xFFu, value.colour >> 16 & 0xFFu);
+            return text;
+        }
+        default:
+            return row.items[value.count];
+    }
 }
 
 }  // namespace
@@ -57,21 +75,24 @@ std::string DefaultOf(const PluginDescription& plugin, const PluginParam& param)
             break;
     }
     const effects::ParamRow& row = RowOf(plugin, param);
-    switch (row.kind) {
-        case kKindSlider:
-            return NumberText(row.defaultValue.number);
-        case kKindCheckBox:
-            return row.defaultValue.flag != 0 ? "1" : "0";
-        case kKindColour: {
-            const std::uint32_t colour = row.defaultValue.colour;
-            char text[8];
-            std::snprintf(text, sizeof(text), "#%02x%02x%02x", colour & 0xFFu, colour >> 8 & 0xFFu,
-                          colour >> 16 & 0xFFu);
-            return text;
+    return ValueText(row, row.defaultValue);
+}
+
+std::string PresetValueOf(const PluginDescription& plugin, std::uint32_t preset, const PluginParam& param) {
+    PresetCell cell;
+    if (!effects::CopyPresetValue(plugin.effect, preset, param.own, &cell)) return DefaultOf(plugin, param);
+    return ValueText(RowOf(plugin, param), cell.value);
+}
+
+std::vector<std::size_t> PanelOrder(const PluginDescription& plugin) {
+    std::vector<std::size_t> order;
+    for (const ParamRole role :
+         {ParamRole::kStartFrame, ParamRole::kFrameRate, ParamRole::kSeed, ParamRole::kOwn}) {
+        for (std::size_t i = 0; i < plugin.params.size(); ++i) {
+            if (plugin.params[i].role == role) order.push_back(i);
         }
-        default:
-            return row.items[row.defaultValue.count];
     }
+    return order;
 }
 
 std::string Joined(const std::vector<std::string>& texts, const char* separator) {

@@ -70,7 +70,7 @@ std::string KdenliveEffect(const PluginDescription& plugin) {
                        Attribute("id", service) + Attribute("type", "video") + ">\n    <name>" +
                        Escaped(plugin.name) + "</name>\n    <description>" + Escaped(plugin.explanation) +
                        "</description>\n    <author>Velmora</author>\n";
-    for (std::size_t i = 0; i < plugin.params.size(); ++i) {
+    for (const std::size_t i : PanelOrder(plugin)) {
         const PluginParam& param = plugin.params[i];
         text += "    <parameter" + Attribute("name", std::to_string(i)) + TypeAttributes(plugin, param) +
                 Attribute("default", DefaultOf(plugin, param)) + ">\n";
@@ -80,6 +80,24 @@ std::string KdenliveEffect(const PluginDescription& plugin) {
         text += "        <name>" + Escaped(Label(plugin, param)) + "</name>\n    </parameter>\n";
     }
     return text + "</effect>\n";
+}
+
+std::string KdenlivePresets(const PluginDescription& plugin) {
+    std::vector<std::string> presets;
+    for (std::uint32_t preset = 0; preset < plugin.effect.presetNames.size(); ++preset) {
+        std::vector<std::string> values;
+        for (std::size_t i = 0; i < plugin.params.size(); ++i) {
+            const PluginParam& param = plugin.params[i];
+            if (param.role != ParamRole::kOwn) continue;
+            // A control that can be animated holds keyframes, here a single one.
+            const std::string start = param.type == F0R_PARAM_DOUBLE ? "0=" : "";
+            values.push_back("{\"name\": " + Quoted(std::to_string(i)) +
+                             ", \"value\": " + Quoted(start + PresetValueOf(plugin, preset, param)) + '}');
+        }
+        presets.push_back("    {" + Quoted(plugin.effect.presetNames[preset]) + ": [\n        " +
+                          Joined(values, ",\n        ") + "]}");
+    }
+    return "[\n" + Joined(presets, ",\n") + "\n]\n";
 }
 
 }  // namespace velmora::hosts::frei0r

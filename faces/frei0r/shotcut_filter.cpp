@@ -1,10 +1,103 @@
 #include <frei0r.h>
 
-#include "text/number_text.h"
 #include "faces/frei0r/editor_files.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts::frei0r {
 namespace {
+
+constexpr const char* kPanelImports = R"(import QtQuick 2.12
+import QtQuick.Controls 2.12
+import QtQuick.Layouts 1.12
+import Shotcut.Controls 1.0 as Shotcut
+
+Item {
+    property bool isRefreshing: true
+    property var allNames: [)";
+
+// Saves the built-in presets among the user's, as Shotcut's own filters do, and leaves the filter at its defaults.
+constexpr const char* kPanelFunctions = R"(
+
+    function set(name, value) {
+        if (!isRefreshing)
+            filter.set(name, value);
+    }
+
+    function reset(name, value) {
+        filter.set(name, value);
+        refresh();
+    }
+
+    function savePresets() {
+        for (var i = 0; i < builtInPresets.length; i++) {
+            for (var j = 0; j < ownNames.length; j++)
+                filter.set(ownNames[j], builtInPresets[i][1][j]);
+            filter.savePreset(['preset'].concat(ownNames), builtInPresets[i][0]);
+        }
+    }
+
+    // Earlier projects hold it by number, which MLT prefers.
+    function renamePreset() {
+        if (filter.get('0') === '')
+            return;
+        filter.set('preset', filter.get('0'));
+        filter.resetProperty('0');
+    }
+
+    function refresh() {
+        isRefreshing = true;
+)";
+
+constexpr const char* kPanelRefreshEnd =
+    R"(        control0.currentIndex = Math.max(0, control0.model.indexOf(filter.get('preset')));
+        control0.visible = control0.currentIndex > 0;
+        isRefreshing = false;
+    }
+
+    function setDefaults() {
+)";
+
+constexpr const char* kPanelStart = R"(    }
+
+    Component.onCompleted: {
+        if (filter.isNew) {
+            filter.blockSignals = true;
+            filter.set('preset', "none");
+            savePresets();
+            setDefaults();
+            filter.savePreset(allNames);
+            filter.blockSignals = false;
+            filter.changed();
+        } else {
+            renamePreset();
+        }
+        refresh();
+    }
+
+    GridLayout {
+        anchors.fill: parent
+        anchors.margins: 8
+        columns: 3
+
+        Label {
+            text: qsTr('Preset')
+            Layout.alignment: Qt.AlignRight
+        }
+
+        Shotcut.Preset {
+            Layout.columnSpan: 2
+            parameters: allNames
+            onPresetSelected: refresh()
+        }
+)";
+
+constexpr const char* kPanelEnd = R"(
+        Item {
+            Layout.fillHeight: true
+        }
+    }
+}
+)";
 
 // A row of the panel: the declaration of its control, and the code that sets it from the filter.
 struct Control {
@@ -12,13 +105,11 @@ struct Control {
     std::string refresh;
 };
 
-// Shotcut has its own row "Preset" for presets that users save.
-std::string RowLabel(const PluginParam& param) {
-    return param.role == ParamRole::kPreset ? "Built-in preset" : LabelOf(param);
-}
-
+// MLT finds a parameter by number or by name. The first one of a saved preset must be a name: a preset that starts with
+// a number is written as a plain list, whose values reach the wrong parameters. The others cannot be names, because
+// Shotcut splits the list of properties at spaces.
 std::string Property(std::size_t index) {
-    return "'" + std::to_string(index) + "'";
+    return index == 0 ? "'preset'" : "'" + std::to_string(index) + "'";
 }
 
 std::string QuotedChoices(std::vector<std::string> choices) {
@@ -60,7 +151,44 @@ Control Slider(const std::string& id, const std::string& property, const effects
                 "\n            maximumValue: " + maximum +
                 "\n            stepSize: 0.1\n            decimals: 1\n            onValueChanged: set(" +
                 property + ", (value - minimumValue) / " + range + ")\n        }",
-            id + ".value = filter.getDouble(" + property + ") * " + range + " + (" + minimum + ")"};
+            id + ".value = Math.round(filter.getDouble(" + property + ") * " + range + " * 1000) / 1000 + (" +
+                minimum + ")"};
+}
+
+// The list of built-in presets, shown only in a project that uses it: it was in panels before the presets were
+// Shotcut's own, and a slider at its default does not override it.
+std::string OldPresetRow(const PluginDescription& plugin) {
+    const Control list = List("control0", "'preset'", ChoicesOf(plugin, plugin.params[0]));
+    return "\n        Label {\n            text: \"Built-in preset\"\n            visible: control0.visible\n"
+           "            Layout.alignment: Qt.AlignRight\n        }\n\n        " +
+           list.declaration +
+           "\n\n        Shotcut.UndoButton {\n            visible: control0.visible\n"
+           "            onClicked: reset('preset', \"none\")\n        }\n";
+}
+
+// Fills in the start frame and the frame rate, by which a cut in the middle of a clip keeps the damage of the whole clip.
+std::string CutButton(const std::string& startFrame, const std::string& frameRate) {
+    return "\n        Item {\n            width: 1\n        }\n\n        Shotcut.Button {\n            text: "
+           "\"Start frame and rate of this cut\"\n            Layout.columnSpan: 2\n            onClicked: "
+           "{\n"
+           "                filter.set(" +
+           startFrame + ", '' + filter.in);\n                filter.set(" + frameRate +
+           ", '' + Math.round(profile.fps * 1000) / 1000);\n                refresh();\n            }\n      "
+           "  }\n";
+}
+
+// The names and values of the built-in presets, the values in the order of `own`.
+std::string PresetData(const PluginDescription& plugin, const std::vector<std::size_t>& own) {
+    std::vector<std::string> presets;
+    for (std::uint32_t preset = 0; preset < plugin.effect.presetNames.size(); ++preset) {
+        std::vector<std::string> values;
+        for (const std::size_t i : own) {
+            values.push_back(Quoted(PresetValueOf(plugin, preset, plugin.params[i])));
+        }
+        presets.push_back('[' + Quoted(plugin.effect.presetNames[preset]) + ", [" + Joined(values, ", ") +
+                          "]]");
+    }
+    return "[\n        " + Joined(presets, ",\n        ") + "\n    ]";
 }
 
 Control ControlOf(const PluginDescription& plugin, const PluginParam& param, std::size_t index) {
@@ -90,44 +218,31 @@ std::string ShotcutMetadata(const PluginDescription& plugin) {
 }
 
 std::string ShotcutPanel(const PluginDescription& plugin) {
-    std::string defaults, refreshes, rows;
-    std::vector<std::string> properties;
-    for (std::size_t i = 0; i < plugin.params.size(); ++i) {
+    std::string defaults = "        filter.set('preset', \"none\");\n", refreshes, rows;
+    std::vector<std::string> properties, ownProperties;
+    std::vector<std::size_t> own;
+    for (std::size_t i = 0; i < plugin.params.size(); ++i) properties.push_back(Property(i));
+    for (const std::size_t i : PanelOrder(plugin)) {
         const PluginParam& param = plugin.params[i];
         const Control control = ControlOf(plugin, param, i);
-        properties.push_back(Property(i));
-        defaults +=
-            "            filter.set(" + Property(i) + ", " + Quoted(DefaultOf(plugin, param)) + ");\n";
+        const std::string property = Property(i);
+        const std::string setDefault = property + ", " + Quoted(DefaultOf(plugin, param));
+        if (param.role == ParamRole::kOwn) {
+            own.push_back(i);
+            ownProperties.push_back(property);
+        }
+        defaults += "        filter.set(" + setDefault + ");\n";
         refreshes += "        " + control.refresh + ";\n";
-        rows += "\n        Label {\n            text: " + Quoted(RowLabel(param)) +
+        rows += "\n        Label {\n            text: " + Quoted(LabelOf(param)) +
                 "\n            Layout.alignment: Qt.AlignRight\n        }\n\n        " + control.declaration +
-                "\n\n        Shotcut.UndoButton {\n            onClicked: reset(" + Property(i) + ", " +
-                Quoted(DefaultOf(plugin, param)) + ")\n        }\n";
+                "\n\n        Shotcut.UndoButton {\n            onClicked: reset(" + setDefault +
+                ")\n        }\n";
+        if (param.role == ParamRole::kFrameRate) rows += CutButton(Property(2), property);
     }
-    return "import QtQuick 2.12\nimport QtQuick.Controls 2.12\nimport QtQuick.Layouts 1.12\n"
-           "import Shotcut.Controls 1.0 as Shotcut\n\nItem {\n"
-           "    property bool isRefreshing: true\n"
-           "    property var parameterNames: [" +
-           Joined(properties, ", ") +
-           "]\n    width: 420\n    height: " + std::to_string(36 * (properties.size() + 2)) +
-           "\n\n    function set(name, value) {\n        if (!isRefreshing)\n            filter.set(name, "
-           "value);\n    }\n\n"
-           "    function reset(name, value) {\n        filter.set(name, value);\n        refresh();\n    "
-           "}\n\n"
-           "    function refresh() {\n        isRefreshing = true;\n" +
-           refreshes +
-           "        isRefreshing = false;\n    }\n\n    Component.onCompleted: {\n        if (filter.isNew) "
-           "{\n" +
-           defaults +
-           "            filter.savePreset(parameterNames);\n        }\n        refresh();\n    }\n\n"
-           "    GridLayout {\n        anchors.fill: parent\n        anchors.margins: 8\n        columns: "
-           "3\n\n"
-           "        Label {\n            text: qsTr('Preset')\n            Layout.alignment: Qt.AlignRight\n "
-           "       }\n\n"
-           "        Shotcut.Preset {\n            Layout.columnSpan: 2\n            parameters: "
-           "parameterNames\n"
-           "            onPresetSelected: refresh()\n        }\n" +
-           rows + "\n        Item {\n            Layout.fillHeight: true\n        }\n    }\n}\n";
+    return kPanelImports + Joined(properties, ", ") + "]\n    property var ownNames: [" +
+           Joined(ownProperties, ", ") + "]\n    property var builtInPresets: " + PresetData(plugin, own) +
+           "\n    width: 420\n    height: " + std::to_string(36 * (properties.size() + 3)) + kPanelFunctions +
+           refreshes + kPanelRefreshEnd + defaults + kPanelStart + OldPresetRow(plugin) + rows + kPanelEnd;
 }
 
 }  // namespace velmora::hosts::frei0r

@@ -1,5 +1,5 @@
 // write_editor_files FOLDER: writes the editors' files for all plug-ins, in the editors' own layout:
-//   kdenlive/effects/PLUGIN.xml, shotcut/filters/PLUGIN/{meta,ui}.qml, mlt/frei0r/filter_frei0r.PLUGIN.yml
+//   kdenlive/effects/PLUGIN.xml, kdenlive/presets/frei0r.PLUGIN.json, shotcut/filters/PLUGIN/{meta,ui}.qml, mlt/frei0r/filter_frei0r.PLUGIN.yml
 
 #include <exception>
 #include <filesystem>
@@ -23,6 +23,7 @@ void WriteAll(const std::filesystem::path& folder) {
     for (const velmora::effects::EffectTable* effect : velmora::effects::kAllEffects) {
         const PluginDescription plugin = DescribePlugin(*effect);
         Write(folder / "kdenlive/effects" / (plugin.fileName + ".xml"), KdenliveEffect(plugin));
+        Write(folder / "kdenlive/presets" / ("frei0r." + plugin.fileName + ".json"), KdenlivePresets(plugin));
         Write(folder / "shotcut/filters" / plugin.fileName / "meta.qml", ShotcutMetadata(plugin));
         Write(folder / "shotcut/filters" / plugin.fileName / "ui.qml", ShotcutPanel(plugin));
         Write(folder / "mlt/frei0r" / ("filter_frei0r." + plugin.fileName + ".yml"), MltMetadata(plugin));

@@ -23,6 +23,8 @@ DEB_FILES = [*(f"usr/bin/{name}" for name in NAMES), *(f"usr/share/man/man1/{nam
              *(f"usr/lib/frei0r-1/{name}.so" for name in PLUGINS),
              *(f"usr/share/mlt-7/frei0r/filter_frei0r.{name}.yml" for name in PLUGINS),
              *(f"usr/share/kdenlive/effects/{name}.xml" for name in PLUGINS),
+             *(f"usr/share/velmora-reel-effects/kdenlive/presets/frei0r.{name}.json" for name in PLUGINS),
+             "usr/bin/velmora-kdenlive-setup", "usr/share/man/man1/velmora-kdenlive-setup.1.gz",
              *(f"usr/share/doc/velmora-reel-effects/{name}" for name in
                ("copyright", "changelog.gz", "changelog.Debian.gz", "help/start.html"))]
 

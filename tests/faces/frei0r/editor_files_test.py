@@ -4,6 +4,7 @@
 Environment: REELFX; VELMORA_DIST: the build results, with plug-ins built without sanitizers.
 """
 
+import json
 import os
 import re
 import shutil
@@ -44,10 +45,10 @@ def parameters_of_plugin(plugin):
 
 
 class EditorFiles(unittest.TestCase):
-    def test_kdenlive_binds_every_parameter_by_its_index(self):
+    def test_kdenlive_binds_every_parameter_but_the_preset_by_its_index(self):
         for plugin in PLUGINS:
             names = [p.get("name") for p in kdenlive_parameters(plugin)]
-            self.assertEqual(names, [str(i) for i in range(len(parameters_of_plugin(plugin)))], plugin)
+            self.assertEqual(sorted(names, key=int), [str(i) for i in range(1, len(parameters_of_plugin(plugin)))], plugin)
 
     def test_kdenlive_finds_values_and_defaults_in_range(self):
         for plugin in PLUGINS:
@@ -68,14 +69,47 @@ class EditorFiles(unittest.TestCase):
                 else:
                     self.assertEqual((parameter.get("type"), default in ("0", "1")), ("bool", True), where)
 
-    def test_a_preset_shows_although_kdenlive_passes_every_value(self):
+    def test_presets_of_kdenlive_give_the_frames_of_the_built_in_ones(self):
         work = hosts.Work()
         self.addCleanup(work.folder.cleanup)
-        for effect in hosts.PRESETS:
-            values = [f"{p.get('name')}={p.get('default')}" for p in kdenlive_parameters(hosts.plugin_name(effect))[4:]]
-            # An animated value includes its frame number.
-            values = [re.sub(r"^(\d+)=([0-9.]+)$", r"\1=0=\2", v) for v in values]
-            self.assertEqual(hosts.in_melt(work, effect, "25", more=values), work.expected(effect, "25"), effect)
+        for effect, preset in hosts.PRESETS.items():
+            presets = json.loads((EDITORS / f"kdenlive/presets/frei0r.{hosts.plugin_name(effect)}.json").read_text())
+            (values,) = [entry[preset] for entry in presets if preset in entry]
+            settings = ["preset=none", *(f"{value['name']}={value['value']}" for value in values)]
+            self.assertEqual(hosts.in_melt(work, effect, "25", more=settings), work.expected(effect, "25"), effect)
+
+    def test_a_users_own_presets_and_categories_stay_in_kdenlive(self):
+        ours = EDITORS / "kdenlive/presets/frei0r.velmora_film_look.json"
+        own_sepia = {"Sepia": [{"name": "4", "value": "#123456"}]}
+        categories = '<group list="sepia,mine">\n<text>Stylize</text>\n</group>'
+        # What the user has before; what the names are after setting up; what is left after removing.
+        for before, names, after in [
+            (None, 30, None),
+            ([{"Mine": []}], 31, [{"Mine": []}]),
+            ({"Mine": []}, 31, [{"Mine": []}]),
+            ([own_sepia], 30, [own_sepia]),
+            ("{ no list", None, "{ no list"),
+        ]:
+            with self.subTest(before), tempfile.TemporaryDirectory() as home:
+                system, data = Path(home) / "system/kdenlive", Path(home) / "data/kdenlive"
+                file = data / "effects/presets" / ours.name
+                for folder in (system, file.parent):
+                    folder.mkdir(parents=True)
+                (system / "kdenliveeffectscategory.rc").write_text(categories)
+                if before is not None:
+                    file.write_text(before if isinstance(before, str) else json.dumps(before))
+                setup = [hosts.ROOT / "scripts/kdenlive-setup"]
+                environment = dict(os.environ, XDG_DATA_HOME=str(data.parent), XDG_DATA_DIRS=str(system.parent))
+                for _ in range(2):
+                    subprocess.run(setup, env=environment, check=True, capture_output=True)
+                if names:
+                    self.assertEqual(len({name for entry in json.loads(file.read_text()) for name in entry}), names)
+                text = (data / "kdenliveeffectscategory.rc").read_text()
+                self.assertRegex(text, '^<group list="sepia,mine(,frei0r.velmora_film_[a-z]+){5}">\n<text>Stylize')
+                subprocess.run([*setup, "--remove"], env=environment, check=True, capture_output=True)
+                left = file.read_text() if file.exists() else None
+                self.assertEqual(left if left is None or isinstance(before, str) else json.loads(left), after)
+                self.assertFalse((data / "kdenliveeffectscategory.rc").exists())
 
     def test_mlt_reads_its_description(self):
         with tempfile.TemporaryDirectory() as folder:
@@ -100,10 +134,12 @@ class EditorFiles(unittest.TestCase):
             self.assertIn(f'mlt_service: "frei0r.{plugin}"', (folder / "meta.qml").read_text())
             panel = (folder / "ui.qml").read_text()
             count = len(parameters_of_plugin(plugin))
-            self.assertEqual(re.findall(r"id: control(\d+)", panel), [str(i) for i in range(count)], plugin)
-            for i in range(count):
-                self.assertEqual(len(re.findall(rf"onClicked: reset\('{i}'", panel)), 1)
-                self.assertRegex(panel, rf"filter.get(Double)?\('{i}'\)")
+            self.assertEqual(sorted(re.findall(r"id: control(\d+)", panel), key=int), [str(i) for i in range(count)], plugin)
+            # A saved preset that starts with a number would be read wrongly.
+            self.assertIn("property var allNames: ['preset', '1', '2',", panel)
+            for name in ["preset", *range(1, count)]:
+                self.assertEqual(len(re.findall(rf"onClicked: reset\('{name}'", panel)), 1)
+                self.assertRegex(panel, rf"filter.get(Double)?\('{name}'\)")
 
     def test_a_user_installs_and_removes_them(self):
         with tempfile.TemporaryDirectory(prefix="home of é ") as home:
