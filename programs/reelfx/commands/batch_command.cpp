@@ -38,7 +38,9 @@ class Batch {
             if (input == "-") throw UsageError("--into needs clips with names, not standard input");
             const std::string out = BatchOutput(options, input);
             if (const auto [other, isNew] = inputOf.emplace(out, input); !isNew) {
-                throw UsageError(other->second + " and " + input + " would both be written to " + out);
+                std::string both = other->second;
+                both.append(" and ").append(input).append(" would both be written to ").append(out);
+                throw UsageError(both);
             }
             m_outputs.push_back(out);
         }

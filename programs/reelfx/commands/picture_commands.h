@@ -36,7 +36,7 @@ struct SheetOptions {
 };
 
 // Throw Failure or UsageError.
-ExitCode Run(const FrameOptions& options);
-ExitCode Run(const SheetOptions& options);
+ExitCode Run(const FrameOptions& command);
+ExitCode Run(const SheetOptions& command);
 
 }  // namespace velmora::hosts

@@ -109,18 +109,25 @@ AVPixelFormat AskedPixelFormat(const std::string& name, const AVCodec& codec, co
 }  // namespace
 
 std::string UsualCodecs() {
-    std::string text;
+    std::string text, last;
     for (const char* name : {"mp4", "mov", "matroska", "webm", "avi", "mpegts"}) {
         const AVOutputFormat* const container = av_guess_format(name, nullptr, nullptr);
         const AVCodec* const codec = container ? avcodec_find_encoder(container->video_codec) : nullptr;
-        if (codec) text += (text.empty() ? "" : ", ") + std::string(codec->name) + " in " + name;
+        if (!codec) continue;
+        if (codec->name == last) {
+            text.append(", ").append(name);
+        } else {
+            text.append(text.empty() ? "" : "; ").append(codec->name).append(" in ").append(name);
+        }
+        last = codec->name;
     }
     return text;
 }
 
 std::string UsualQualities() {
     std::string text;
-    for (const QualityRow& row : kQualities) text += std::string(row.crf) + " for " + row.codec + ", ";
+    for (const QualityRow& row : kQualities)
+        text.append(row.crf).append(" for ").append(row.codec).append(", ");
     return text + "otherwise quantiser " + std::to_string(kQuantiser);
 }
 

@@ -73,7 +73,7 @@ def wrapped(line):
 def synopsis(command):
     words = [r"[\fIOPTION\fR]..."] if command.options else []
     for positional in command.positionals:
-        name = rf"\fI{positional.positional}\fR"
+        name = rf"\fI{positional.positional}\fR" + ("..." if positional.repeats else "")
         words.append(name if positional.required else f"[{name}]")
     return rf"\fBreelfx {' '.join(command.words)}\fR " + " ".join(words)
 

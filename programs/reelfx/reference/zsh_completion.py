@@ -13,6 +13,7 @@ BODY = r'''
 # The effect that the line names, else the one of the environment, in small letters.
 _reelfx_effect() {
     local effect=${opt_args[--effect]-${opt_args[-e]-${REELFX_EFFECT-}}}
+    effect=${effect##*:}  # of several effects, the one typed last
     print -r -- ${(L)${(Q)effect}}
 }
 

@@ -22,6 +22,8 @@ TYPED = (
      "render in.mp4 out.mp4 --overwrite -e 'Film Camera' --preset 'Train Ride'"),
     ("render a b -e 'Film Damage' --set Pat\tGr\t", "render a b -e 'Film Damage' --set Pattern=Grainy"),
     ("render a b -e 'Film Pro' -s Y\\ Jit\t4", "render a b -e 'Film Pro' -s 'Y Jitter=4'"),
+    ("render a b -e 'Film Look' -p Sep\t--then -e 'Film Damage' -p Shr\t",
+     "render a b -e 'Film Look' -p Sepia --then -e 'Film Damage' -p Shredded"),
     ("preset sh\tmi\t", "preset show 'mine one.fxp'"),
     ("list film\\ e\t--js\t", "list 'Film Express' --json"),
     ("render a b --format matr\t--pix-fmt yuv420p1\t", "render a b --format matroska --pix-fmt yuv420p10le"),
