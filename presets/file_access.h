@@ -5,6 +5,7 @@
 
 #include <cstdio>
 #include <functional>
+#include <optional>
 #include <string>
 
 namespace velmora {
@@ -33,6 +34,9 @@ using NativePath = std::string;
 
 // The path that an 8-bit name stands for, with any link to another file resolved; false when there is none.
 [[nodiscard]] bool MakeNativePath(const char* fileName, NativePath* path);
+
+// The 8-bit name of a UTF-8 path; nothing when it has no exact one.
+[[nodiscard]] std::optional<std::string> FileNameFromUtf8(const std::string& path);
 
 // Binary, for reading; null when it cannot be opened, or is a folder or a device.
 [[nodiscard]] std::FILE* OpenForReading(const NativePath& path);

@@ -18,6 +18,10 @@ bool MakeNativePath(const char* fileName, NativePath* path) {
     return true;
 }
 
+std::optional<std::string> FileNameFromUtf8(const std::string& path) {
+    return path;
+}
+
 std::FILE* OpenForReading(const NativePath& path) {
     std::FILE* file = std::fopen(path.c_str(), "rb");
     struct stat status {};

@@ -6,6 +6,7 @@
 #include <windows.h>
 
 #include "text/code_page.h"
+#include "text/utf.h"
 
 namespace velmora {
 
@@ -15,6 +16,11 @@ bool MakeNativePath(const char* fileName, NativePath* path) {
     const std::u16string wide = Widen(fileName);
     path->assign(wide.begin(), wide.end());
     return !wide.empty();
+}
+
+std::optional<std::string> FileNameFromUtf8(const std::string& path) {
+    const auto wide = Utf16FromUtf8(path);
+    return wide ? NarrowExactly(*wide) : std::nullopt;
 }
 
 std::FILE* OpenForReading(const NativePath& path) {

@@ -7,6 +7,9 @@
 #include <new>
 
 #include "faces/frei0r/error_picture.h"
+#include "effects/effect_queries.h"
+#include "presets/file_access.h"
+#include "presets/preset_file.h"
 #include "text/names.h"
 #include "text/number_text.h"
 
@@ -57,6 +60,26 @@ std::optional<std::uint32_t> SeedOf(std::string_view text) {
     const auto seed = WholeNumber(text);
     if (!seed || *seed < 0 || *seed > std::numeric_limits<std::uint32_t>::max()) return std::nullopt;
     return static_cast<std::uint32_t>(*seed);
+}
+
+// A preset file is named by its path, so that no name of a preset is taken for one.
+bool IsPath(const std::string& text) {
+    return text.find_first_of("/\\") != std::string::npos;
+}
+
+// The values in a preset file, by parameter of the effect; empty when it cannot be read or belongs to another effect.
+std::vector<ValueWord> PresetFileValues(const effects::EffectTable& effect, const std::string& path) {
+    PresetRecord record{};
+    std::vector<std::uint32_t> kinds;
+    for (const effects::ParamRow& row : effect.params) kinds.push_back(row.kind);
+    const auto name = FileNameFromUtf8(path);
+    if (!name || !ReadPreset(name->c_str(), &record) ||
+        !IsCompatible(kLibraryName, effect.name, kinds, &record)) {
+        return {};
+    }
+    std::vector<ValueWord> values;
+    for (std::size_t i = 0; i < kinds.size(); ++i) values.push_back(record.values[i].value);
+    return values;
 }
 
 bool IsNone(const std::string& text) {
@@ -124,6 +147,8 @@ void Instance::Set(int index, const void* value) {
 void Instance::SetText(std::size_t index, std::string text) {
     const PluginParam& param = m_plugin.params[index];
     const bool isNew = text != m_texts[index];
+    if (!isNew && param.role == ParamRole::kPreset)
+        return;  // hosts set it for each frame; it may name a file
     const bool isRead = ReadText(param, text);
     if (!isRead && isNew) Warn(m_plugin, param, text);
     m_faults[index] = isRead ? "" : text;
@@ -133,8 +158,7 @@ void Instance::SetText(std::size_t index, std::string text) {
 bool Instance::ReadText(const PluginParam& param, const std::string& text) {
     switch (param.role) {
         case ParamRole::kPreset:
-            m_preset = FindPreset(m_plugin.effect, text);
-            return m_preset || IsNone(text);
+            return ReadPresetText(text);
         case ParamRole::kSeed: {
             const auto seed = SeedOf(text);
             m_seed = seed.value_or(0);
@@ -154,6 +178,21 @@ bool Instance::ReadText(const PluginParam& param, const std::string& text) {
     m_own[param.own].isSet = item.has_value();
     if (item) m_own[param.own].value.count = *item;
     return item || text.empty();
+}
+
+bool Instance::ReadPresetText(const std::string& text) {
+    if (IsPath(text)) {
+        m_presetValues = PresetFileValues(m_plugin.effect, text);
+        return !m_presetValues.empty();
+    }
+    m_presetValues.clear();
+    const auto preset = FindPreset(m_plugin.effect, text);
+    PresetCell cell;
+    for (std::uint32_t own = 0; preset && own < m_own.size(); ++own) {
+        if (effects::CopyPresetValue(m_plugin.effect, *preset, own, &cell))
+            m_presetValues.push_back(cell.value);
+    }
+    return preset || IsNone(text);
 }
 
 void Instance::SetOwn(const PluginParam& param, const void* value) {
@@ -209,10 +248,10 @@ void Instance::TellSession() noexcept {
     for (const PluginParam& param : m_plugin.params) {
         if (param.role == ParamRole::kOwn && !m_own[param.own].isSet) hostSetsAll = false;
     }
-    if (m_preset) m_session->ApplyPreset(*m_preset);
     for (std::uint32_t own = 0; own < m_own.size(); ++own) {
         const bool yieldsToPreset = !m_own[own].isSet || (hostSetsAll && IsDefault(own));
-        if (!m_preset || !yieldsToPreset) m_session->SetValue(own, m_own[own].value);
+        const bool isPresets = own < m_presetValues.size() && yieldsToPreset;
+        m_session->SetValue(own, isPresets ? m_presetValues[own] : m_own[own].value);
     }
     m_session->PinRandom(m_seed);
 }

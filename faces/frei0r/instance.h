@@ -45,6 +45,7 @@ class Instance {
     void SetText(std::size_t index, std::string text);
     // False if the parameter does not take the text.
     bool ReadText(const PluginParam& param, const std::string& text);
+    bool ReadPresetText(const std::string& text);
     void SetOwn(const PluginParam& param, const void* value);
     [[nodiscard]] bool IsDefault(std::uint32_t own) const noexcept;
     void TellSession() noexcept;
@@ -60,7 +61,7 @@ class Instance {
     std::vector<std::string> m_faults;  // by parameter of the plug-in; empty: none
     std::vector<OwnValue> m_own;        // by parameter of the effect
     FrameClock m_clock;
-    std::optional<std::uint32_t> m_preset;
+    std::vector<ValueWord> m_presetValues;  // by parameter of the effect; empty without a preset
     std::uint32_t m_seed = 0;
     std::unique_ptr<std::uint32_t[]>
         m_source;  // the input in the effect's pixel order; allocated by the first frame

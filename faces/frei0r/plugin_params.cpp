@@ -49,7 +49,8 @@ PluginDescription DescribePlugin(const effects::EffectTable& effect) {
                              .explanation = "The look of old film, with the same result in every host",
                              .params = {}};
     plugin.params = {
-        {"preset", F0R_PARAM_STRING, "None or one of " + QuotedList(effect.presetNames), ParamRole::kPreset},
+        {"preset", F0R_PARAM_STRING,
+         "None, the path of a preset file, or one of " + QuotedList(effect.presetNames), ParamRole::kPreset},
         {"seed", F0R_PARAM_STRING, "0 to 4294967295. Another seed gives other shake, flicker and damage",
          ParamRole::kSeed},
         {"start frame", F0R_PARAM_STRING, "Number of the clip's frame at the host's time 0",

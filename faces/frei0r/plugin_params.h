@@ -2,7 +2,7 @@
 // (FFmpeg's "a|b|c", MLT's "0=...") and by name, so the order is part of the contract: append only.
 //
 //   index  name           type    value
-//   0      preset         string  a preset's name, or empty for none
+//   0      preset         string  a preset's name, the path of a preset file (with a slash), or empty for none
 //   1      seed           string  0..4294967295; another seed gives other shake, flicker and damage
 //   2      start frame    string  the clip's frame that the host's time 0 shows
 //   3      frame rate     string  "25", "30000/1001"; see frame_clock.h

@@ -2,13 +2,12 @@
 
 #include <algorithm>
 #include <filesystem>
-#include <optional>
 #include <vector>
 
 #include "effects/effect_names.h"
+#include "presets/file_access.h"
 #include "presets/preset_file.h"
 #include "presets/preset_names.h"
-#include "text/code_page.h"
 
 namespace velmora::hosts::obs {
 namespace {
@@ -17,13 +16,9 @@ std::filesystem::path PathOf(const std::string& utf8) {
     return std::u8string(utf8.begin(), utf8.end());
 }
 
-// Preset files have 8-bit names on Windows; other systems take the bytes as they are.
-std::optional<std::string> FileName(const std::filesystem::path& path) {
-#ifdef _WIN32
-    return NarrowExactly(path.u16string());
-#else
-    return path.string();
-#endif
+std::string Utf8Of(const std::filesystem::path& path) {
+    const std::u8string text = path.u8string();
+    return {text.begin(), text.end()};
 }
 
 void FillField(char (&field)[kPresetNameWidth], const std::string& text) {
@@ -41,7 +36,7 @@ std::string PresetFileExtension(const FilterDescription& filter) {
 }
 
 bool LoadPresetFile(const FilterDescription& filter, const std::string& path, obs_data_t* settings) {
-    const auto name = FileName(PathOf(path));
+    const auto name = FileNameFromUtf8(path);
     PresetRecord record{};
     std::vector<std::uint32_t> kinds;
     for (const effects::ParamRow& row : filter.effect.params) kinds.push_back(row.kind);
@@ -59,8 +54,8 @@ bool SavePresetFile(const FilterDescription& filter, const std::string& path, ob
     std::filesystem::path place = PathOf(path);
     const std::string extension = "." + PresetFileExtension(filter);
     if (place.extension() != extension) place += extension;
-    const auto name = FileName(place);
-    const auto title = FileName(place.stem());
+    const auto name = FileNameFromUtf8(Utf8Of(place));
+    const auto title = FileNameFromUtf8(Utf8Of(place.stem()));
     if (!name || !title) return false;
     PresetRecord record{};
     FillField(record.name, *title);

@@ -4,6 +4,8 @@
 
 #include <atomic>
 #include <cstdint>
+#include <cstdio>
+#include <filesystem>
 #include <limits>
 #include <set>
 #include <string>
@@ -15,6 +17,8 @@
 #include "faces/frei0r/instance.h"
 #include "faces/frei0r/plugin_params.h"
 #include "platform/platform.h"
+#include "presets/file_access.h"
+#include "presets/preset_file.h"
 
 namespace velmora::hosts::frei0r {
 namespace {
@@ -152,6 +156,44 @@ TEST(Frei0rInstance, LetsValuesOverrideThePresetAlsoByTheirDefaults) {
     sparing.Number("Saturation", 0.5);  // the default, not the preset's value
     session->SetValue(2, {.number = 0.5f});
     EXPECT_EQ(sparing.Update(0.0, in), Expected(*session, 40, 30, in, 0.0));
+}
+
+TEST(Frei0rInstance, ReadsAPresetFileOnceAndOnlyOfItsEffect) {
+    const auto& effect = effects::kFilmLook;
+    const std::string path = testing::TempDir() + "/a look \xC3\xA9.preset";
+    PresetRecord record{};
+    std::snprintf(record.name, sizeof(record.name), "Mine");
+    std::snprintf(record.libraryName, sizeof(record.libraryName), "%s", kLibraryName);
+    std::snprintf(record.effectName, sizeof(record.effectName), "%s", effect.name);
+    const auto session = effects::EffectSession::Create(effect);
+    session->ApplyPreset(*FindPreset(effect, "Rust"));
+    session->SetValue(2, {.number = 0.25f});
+    for (std::uint32_t i = 0; i < effect.params.size(); ++i) {
+        record.values[i] = {session->Value(i), 0, effect.params[i].kind};
+        ++record.count;
+    }
+    const auto name = FileNameFromUtf8(path);
+    ASSERT_TRUE(name && WritePreset(name->c_str(), &record));
+
+    const Pixels in = Ramp(200, 120);
+    const Pixels rust = Expected(*session, 200, 120, in, 0.0);
+    Host host(effect, 200, 120);
+    host.Text("preset", path.c_str());
+    EXPECT_EQ(host.Update(0.0, in), rust);
+    // Hosts set their parameters for every frame.
+    std::filesystem::remove(std::u8string(path.begin(), path.end()));
+    host.Text("preset", path.c_str());
+    EXPECT_EQ(host.Update(0.0, in), rust);
+    host.Text("preset", "sepia");
+    host.Text("preset", path.c_str());
+    EXPECT_NE(host.Update(0.0, in), rust) << "the file is gone";
+
+    ASSERT_TRUE(WritePreset(name->c_str(), &record));
+    Host other(effects::kFilmDamage, 200, 120);
+    const Pixels plain = other.Update(0.0, in);
+    other.Text("preset", path.c_str());
+    EXPECT_NE(other.Update(0.0, in), plain) << "an error is shown";
+    std::filesystem::remove(std::u8string(path.begin(), path.end()));
 }
 
 TEST(Frei0rInstance, TakesEachKindOfValueAndGivesItBack) {
