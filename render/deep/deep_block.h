@@ -10,10 +10,12 @@ inline constexpr std::int32_t kDeepBlock = 512;  // pixels; a multiple of the gl
 
 // Colours are 0 for black and 1 for white, not multiplied by alpha, and may be outside. Never NaN or infinite.
 struct DeepBlock {
-    alignas(64) float red[kDeepBlock];
-    alignas(64) float green[kDeepBlock];
-    alignas(64) float blue[kDeepBlock];
-    alignas(64) float alpha[kDeepBlock];
+    static constexpr std::int32_t kPad = 16;  // kernels may write whole vectors
+
+    alignas(64) float red[kDeepBlock + kPad];
+    alignas(64) float green[kDeepBlock + kPad];
+    alignas(64) float blue[kDeepBlock + kPad];
+    alignas(64) float alpha[kDeepBlock + kPad];
 };
 
 }  // namespace velmora::render

@@ -271,7 +271,7 @@ void DeepGlow::BeginRow(std::int32_t width, std::int32_t y) noexcept {
 }
 
 void DeepGlow::Screen(DeepBlock& block, std::int32_t from, std::int32_t count) const noexcept {
-    alignas(64) float layer[kDeepBlock + 8];
+    alignas(64) float layer[kDeepBlock + 64];
     const std::int32_t into = from % 4;  // the first cell
     float* const channels[] = {block.red, block.green, block.blue};
     for (int c = 0; c < 3; ++c) {

@@ -13,7 +13,7 @@ namespace velmora::render {
 
 // Rows of cells, three channels after each other in each row, with padding at both ends of each channel.
 struct DeepCells {
-    static constexpr std::int32_t kPad = 8;
+    static constexpr std::int32_t kPad = 24;
 
     float* base = nullptr;
     std::int32_t width = 0;

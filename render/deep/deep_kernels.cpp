@@ -1,4 +1,4 @@
-// The deep kernels for the processor that the whole program is compiled for.
+// The deep kernels without vectors of their own: the reference for the others.
 
 #include "render/deep/deep_kernels.h"
 
@@ -7,6 +7,8 @@
 
 namespace velmora::render {
 namespace {
+
+#include "render/simd/floats_plain.h"
 
 #include "render/deep/deep_kernels.inc"
 
@@ -17,6 +19,9 @@ const DeepKernels kDeepPlainKernels = kKernels;
 const DeepKernels& DeepKernelsOf([[maybe_unused]] SimdLevel level) noexcept {
 #if VM_HAS_AVX2
     if (level >= SimdLevel::kAvx2) return kDeepAvx2Kernels;
+#endif
+#if VM_HAS_SSE2
+    if (level >= SimdLevel::kSse2) return kDeepSse2Kernels;
 #endif
     return kDeepPlainKernels;
 }

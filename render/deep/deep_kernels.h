@@ -1,5 +1,7 @@
-// The row operations of deep pictures. There is one source (deep_kernels.inc), compiled for each SIMD level; all levels
-// do the same arithmetic in the same order and so give the same bytes.
+// The row operations of deep pictures. There is one source (deep_kernels.inc), compiled with the vectors of each SIMD
+// level; all levels do the same arithmetic in the same order and so give the same bytes.
+//
+// Blocks and rows of floats are written up to the end of a vector, at most 7 numbers (14 when doubled) beyond the last.
 #pragma once
 
 #include <cstdint>
@@ -18,10 +20,10 @@ struct DeepTaps {
     float pair[kMostPairs] = {};
 };
 
-// Rows of one channel of the glow layer, with kCellPad numbers of padding at both ends. See GlowKernels
+// Rows of one channel of the glow layer, with padding at both ends. See GlowKernels
 // (render/glow_kernels.h), which do the same in integers.
 struct DeepGlowKernels {
-    // Adds a row, or the sum of each four neighbours of a row.
+    // Adds a row; sums each four neighbours of a row.
     void (*add)(float* out, const float* row, std::int32_t count) noexcept;
     void (*sumFours)(const float* row, float* out, std::int32_t count, float times) noexcept;
     void (*keepHighlights)(float* red, float* green, float* blue, std::int32_t count) noexcept;
@@ -48,8 +50,13 @@ struct DeepKernels {
     void (*divide)(DeepBlock& block, std::int32_t at, std::int32_t count) noexcept;
     void (*multiply)(DeepBlock& block, std::int32_t at, std::int32_t count) noexcept;
     void (*tone)(DeepBlock& block, std::int32_t count, const DeepTone& tone) noexcept;
-    // Lightens a channel by `amount` under a byte of 255.
-    void (*wear)(float* channel, const std::uint8_t* bytes, std::int32_t count, float amount) noexcept;
+    // Lightens the block's first pixels by `amount` under a byte of 255.
+    void (*wear)(DeepBlock& block, const std::uint8_t* bytes, std::int32_t count, float amount,
+                 bool blueOnly) noexcept;
+    // Moves a channel toward a level by shares, which are 0 to the end of the last vector, less half a level of 255 for
+    // the truncation in 8 bits.
+    void (*scratch)(float* channel, const float* shares, std::int32_t count, float towards,
+                    bool isWhite) noexcept;
     DeepGlowKernels glow;
 };
 
@@ -57,6 +64,7 @@ struct DeepKernels {
 [[nodiscard]] const DeepKernels& DeepKernelsOf(SimdLevel level) noexcept;
 
 extern const DeepKernels kDeepPlainKernels;
+extern const DeepKernels kDeepSse2Kernels;
 extern const DeepKernels kDeepAvx2Kernels;
 
 }  // namespace velmora::render

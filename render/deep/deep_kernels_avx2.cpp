@@ -13,6 +13,8 @@ VM_BEGIN_TARGET("avx2")
 namespace velmora::render {
 namespace {
 
+#include "render/simd/floats_avx2.h"
+
 #include "render/deep/deep_kernels.inc"
 
 }  // namespace

@@ -52,12 +52,14 @@ void DeepSource::Read(std::int32_t y, std::int32_t from, std::int32_t count,
     std::int32_t first = std::clamp(shift - from, 0, count);
     std::int32_t end = std::clamp(m_frame.width + shift - from, first, count);
     if (row < 0 || row >= m_frame.height) first = end = count;
+    if (first != end) {
+        const std::uint8_t* pixels = m_picture.Row(row) + (from + first - shift) * format.PixelBytes();
+        m_kernels.load[SamplesOf(format)][ChannelsOf(format)](pixels, block, first, end - first);
+        if (format.isPremultiplied) m_kernels.divide(block, first, end - first);
+    }
+    // After the load, which may write a vector's rest.
     FillBorder(block, 0, first, m_jitter.Border(), format.channels == 4);
     FillBorder(block, end, count - end, m_jitter.Border(), format.channels == 4);
-    if (first == end) return;
-    const std::uint8_t* pixels = m_picture.Row(row) + (from + first - shift) * format.PixelBytes();
-    m_kernels.load[SamplesOf(format)][ChannelsOf(format)](pixels, block, first, end - first);
-    if (format.isPremultiplied) m_kernels.divide(block, first, end - first);
 }
 
 DeepRowProgram::DeepRowProgram(const DeepFrame& frame, const FramePlan& plan, DeepGlow& glow,
@@ -127,15 +129,12 @@ void DeepRowProgram::RunWear(Row& row) const noexcept {
             row.wearLeft = picture.width;
         }
         const std::int32_t count = std::min(row.wearLeft, row.count - x);
-        m_kernels.wear(row.block.blue + x, row.wear, count, stage.Amount());
-        if (!stage.BlueOnly()) {
-            m_kernels.wear(row.block.green + x, row.wear, count, stage.Amount());
-            m_kernels.wear(row.block.red + x, row.wear, count, stage.Amount());
-        }
+        std::memcpy(row.wearBytes + x, row.wear, static_cast<std::size_t>(count));
         row.wear += count;
         row.wearLeft -= count;
         x += count;
     }
+    m_kernels.wear(row.block, row.wearBytes, row.count, stage.Amount(), stage.BlueOnly());
 }
 
 void DeepRowProgram::BeginScratches(Row& row) const noexcept {
@@ -148,24 +147,22 @@ void DeepRowProgram::BeginScratches(Row& row) const noexcept {
 }
 
 void DeepRowProgram::RunScratches(Row& row) const noexcept {
-    constexpr float kDark = kDarkest / 255.0f, kBright = kBrightest / 255.0f;
     std::size_t next = 0;
     for (const ScratchLine& line : m_plan.scratches.Lines()) {
         const ScratchSpan& span = row.spans[next++];
         if (span.weights == nullptr) continue;
-        const std::int32_t start = span.first - row.from;
-        const std::int32_t end = std::min(start + line.pixels, row.count);
-        for (std::int32_t x = std::max(start, 0); x < end; ++x) {
-            const float share = static_cast<float>(span.weights[x - start]) *
-                                static_cast<float>(span.strength) * (1.0f / 4294967296.0f);
-            ChangePixel(row.block, x, [&](float& channel) {
-                if (line.isWhite) {
-                    channel += std::max(kBright - channel, 0.0f) * share;
-                } else {
-                    channel -= std::max(channel - kDark, 0.0f) * share;
-                }
-            });
-        }
+        const std::int32_t start = std::max(span.first - row.from, 0);
+        const std::int32_t skipped = row.from + start - span.first;
+        const std::int32_t count = std::min(line.pixels - skipped, row.count - start);
+        if (count <= 0) continue;
+        float shares[kMostScratchPixels + 8] = {};
+        const float strength = static_cast<float>(span.strength) * (1.0f / 4294967296.0f);
+        for (std::int32_t i = 0; i < count; ++i)
+            shares[i] = static_cast<float>(span.weights[skipped + i]) * strength;
+        const float towards = static_cast<float>(line.isWhite ? kBrightest : kDarkest) / 255.0f;
+        m_kernels.scratch(row.block.red + start, shares, count, towards, line.isWhite);
+        m_kernels.scratch(row.block.green + start, shares, count, towards, line.isWhite);
+        m_kernels.scratch(row.block.blue + start, shares, count, towards, line.isWhite);
     }
 }
 

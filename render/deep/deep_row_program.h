@@ -56,6 +56,7 @@ class DeepRowProgram {
         WearRows strips{Random(), 3, 0};
         const std::uint8_t* wear = nullptr;
         std::int32_t wearLeft = 0;
+        std::uint8_t wearBytes[kDeepBlock + DeepBlock::kPad];
         std::array<ScratchSpan, kMostScratches> spans{};  // without weights if the row has no such scratch
     };
     struct Step {

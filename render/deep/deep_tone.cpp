@@ -2,11 +2,16 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstddef>
+#include <iterator>
 #include <limits>
 #include <numbers>
 
 namespace velmora::render {
 namespace {
+
+// What a truncation to whole levels of 255 takes away on average.
+constexpr double kHalfLevel = 0.5 / 255.0;
 
 constexpr float kNoBound = std::numeric_limits<float>::infinity();
 
@@ -14,7 +19,8 @@ DeepTone::Line LineOf(const ColourStage& colour) noexcept {
     const double offset = colour.Offset();
     const double gain = colour.Gain().value_or(1.0);
     const double times = gain * (1.0 - std::abs(offset));
-    const double plus = gain * (std::max(offset, 0.0) - 0.5) + 0.5;
+    const double truncated = colour.Gain() ? kHalfLevel : 0.0;
+    const double plus = gain * (std::max(offset, 0.0) - 0.5) + 0.5 - truncated;
     const bool isClamped = gain > 1.0;
     return {static_cast<float>(times), static_cast<float>(plus), isClamped ? 0.0f : -kNoBound,
             isClamped ? 1.0f : kNoBound};
@@ -22,36 +28,68 @@ DeepTone::Line LineOf(const ColourStage& colour) noexcept {
 
 DeepTone::Mix MixOf(std::int32_t weight) noexcept {
     const auto share = [weight](double part) { return static_cast<float>(weight * part / (128.0 * 256.0)); };
-    return {static_cast<float>((127 - weight) / 128.0), share(76), share(149), share(30)};
+    // The grey value is truncated, and then the sum.
+    const double truncated = kHalfLevel * (weight / 128.0 + 1.0);
+    return {static_cast<float>((127 - weight) / 128.0), share(76), share(149), share(30),
+            static_cast<float>(-truncated)};
 }
 
-DeepTone::Gamma GammaOf(double gamma) noexcept {
+// Of numbers of q.
+constexpr double kTruncated = 0.5 / 256.0;
+constexpr double kToUnit = 256.0 / 255.0;  // from q to x
+
+// S and its slope.
+struct Curve {
+    double gamma;
+
+    [[nodiscard]] double At(double q) const noexcept {
+        return gamma * (1.0 - std::cos(std::numbers::pi * q)) / 2.0 + (1.0 - gamma) * q;
+    }
+    [[nodiscard]] double SlopeAt(double q) const noexcept {
+        return gamma * std::numbers::pi / 2.0 * std::sin(std::numbers::pi * q) + (1.0 - gamma);
+    }
+};
+
+// From numbers `in` times as large to numbers `out` times as large.
+DeepTone::Gamma GammaOf(double gamma, double in, double out) noexcept {
     // sin(pi z) for |z| <= 1/2, by the odd polynomial with the least greatest error among those that are exact at the
     // ends, where black must stay black.
     constexpr double kSine[] = {3.141580651881463, -5.167088727680982, 2.541387300211141, -0.55329127836248};
     DeepTone::Gamma result;
-    for (std::size_t i = 0; i < result.factors.size(); ++i) {
-        result.factors[i] = static_cast<float>(0.5 * gamma * kSine[i] + (i == 0 ? 1.0 - gamma : 0.0));
+    double scale = out;
+    for (std::size_t i = 0; i < std::size(kSine); ++i) {
+        scale /= i == 0 ? in : in * in;
+        const double factor = 0.5 * gamma * kSine[i] + (i == 0 ? 1.0 - gamma : 0.0);
+        result.factors[i] = static_cast<float>(factor * scale);
     }
-    const auto slopeAt = [gamma](double q) {
-        const double pi = std::numbers::pi;
-        return static_cast<float>(gamma * pi / 2.0 * std::sin(pi * q) + (1.0 - gamma));
-    };
-    result.slopeBelow = slopeAt(0.0);
-    result.slopeAbove = slopeAt(255.0 / 256.0);
+    result.black = static_cast<float>((kTruncated - 0.5) * out);
     return result;
 }
 
-DeepTone::Tint TintOf(std::int32_t offset) noexcept {
+DeepTone::Tint TintOf(std::int32_t offset, double gamma) noexcept {
+    constexpr double kWhite = 255.0 / 256.0;
+    const bool bends = gamma != 0.0, lifts = offset > 0;
+    const Curve curve{gamma};
+    const double truncated = bends ? kTruncated : 0.0;
     const double from = offset / 256.0;
-    if (offset > 0) {
-        const double times = (256 - offset) / 255.0;
-        return {true, static_cast<float>(times), static_cast<float>(0.5 * times + from - 0.5),
-                static_cast<float>(255.0 / 256.0 - 0.5)};
-    }
-    const double times = 255.0 / (256 + offset);
-    return {false, static_cast<float>(times), static_cast<float>((0.5 + from) * times - 0.5),
-            offset < 0 ? -0.5f : -kNoBound};
+    const double times = lifts ? (256 - offset) / 255.0 : 255.0 / (256 + offset);
+    // The tint of q.
+    const auto tinted = [&](double q) { return lifts ? from + q * times : (q + from) * times; };
+    const double black = std::max(tinted(0.0), 0.0);
+    const double white = std::min(tinted(curve.At(kWhite) - truncated), kWhite);
+    const auto slope = [&](double q, double thenAt) {
+        return static_cast<float>(curve.SlopeAt(q) * times * curve.SlopeAt(thenAt));
+    };
+    DeepTone::Tint result;
+    result.lifts = lifts;
+    // Without a gamma the tint takes x - middle to x + black itself.
+    const double in = bends ? 1.0 : 1.0 / kToUnit, out = bends ? 1.0 : kToUnit;
+    result.times = static_cast<float>(times * in * out);
+    result.plus = static_cast<float>((tinted(0.5 - truncated) - 0.5) * out);
+    result.bound = static_cast<float>((lifts ? kWhite - 0.5 : -0.5) * out);
+    result.slopeBelow = offset < 0 ? 0.0f : slope(0.0, black);
+    result.slopeAbove = slope(kWhite, white);
+    return result;
 }
 
 }  // namespace
@@ -67,9 +105,14 @@ DeepTone DeepToneOf(const ColourStage& colour, const TintStage& tint) noexcept {
     if (tint.IsActive()) {
         tone.tints = true;
         tone.bends = tint.Gamma() != 0.0f;
-        tone.gamma = GammaOf(tint.Gamma());
+        tone.first = GammaOf(tint.Gamma(), kToUnit, 1.0);
+        tone.second = GammaOf(tint.Gamma(), 1.0, kToUnit);
+        tone.middle = static_cast<float>(0.5 * kToUnit);
+        tone.black = tone.bends ? tone.second.black : static_cast<float>(-0.5 * kToUnit);
         const TintOffsets& offsets = tint.Offsets();
-        tone.tint = {TintOf(offsets.red), TintOf(offsets.green), TintOf(offsets.blue)};
+        tone.tint[0] = TintOf(offsets.red, tint.Gamma());
+        tone.tint[1] = TintOf(offsets.green, tint.Gamma());
+        tone.tint[2] = TintOf(offsets.blue, tint.Gamma());
     }
     return tone;
 }

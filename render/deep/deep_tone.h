@@ -1,21 +1,23 @@
-// Colour and tint (render/colour.h, render/tint.h) as exact curves, without tables and without rounding.
+// Colour and tint (render/colour.h, render/tint.h) as curves, without tables and without rounding.
 //
 // With x the channel, 0..1, and the plan's values v, g, w, o and gamma:
 //   brightness, flicker   x (1 - |v|) + max(v, 0)
-//   contrast              g (x - 1/2) + 1/2, clamped to 0..1 for g > 1
-//   saturation            ((127 - w) x + w (76 R + 149 G + 30 B) / 256) / 128, clamped to 0..1
-//   film gamma            S(q) = gamma (1 - cos(pi q)) / 2 + (1 - gamma) q with q = 255 x / 256, times 256 / 255
+//   contrast              g (x - 1/2) + 1/2 - t, clamped to 0..1 for g > 1
+//   saturation            ((127 - w) x + w (76 R + 149 G + 30 B) / 256) / 128 - t (1 + w / 128), clamped to 0..1
+//   film gamma            S(q) = gamma (1 - cos(pi q)) / 2 + (1 - gamma) q with q = 255 x / 256, times 256 / 255;
+//                         less t, but at least 0
 //   tint                  o > 0: o / 255 + x (256 - o) / 255, at most 1
-//                         o <= 0: (255 x + o) / (256 + o), at least 0 for o < 0
-// in the order brightness, contrast, saturation, gamma, tint, gamma. What the settings narrow (w and o are whole
-// numbers) stays narrowed, so that the deep picture is the 8-bit one without its rounding.
+//                         o <= 0: (255 x + o) / (256 + o), at least 0
+// in the order brightness, contrast, saturation, gamma, tint, gamma.
 //
-// Below 0 and above 1 each step continues in a straight line, except where it is clamped: a clamped contrast stays at
-// black and white, a tint that crushes blacks stays at black. A lifting tint continues its line from white on. The
-// saturation's bounds widen to the range of the pixel's own channels, so that bright greys stay greys.
+// t is half a level of 255: where the 8-bit stage truncates it takes away that much on average, and several stages of
+// a preset together take away several levels. Without t the deep picture would be visibly brighter than the 8-bit one.
+// What the settings narrow (w and o are whole numbers) stays narrowed for the same reason.
+//
+// Below 0 and above 1 brightness and contrast continue as lines, except that a clamped contrast stays at black and
+// white. The saturation's bounds widen to the range of the pixel's own channels, so that bright greys stay greys. Gamma
+// and tint continue, as one stage, with their slopes at 0 and 1; a tint that crushes blacks stays at black.
 #pragma once
-
-#include <array>
 
 #include "render/colour.h"
 #include "render/tint.h"
@@ -29,17 +31,19 @@ struct DeepTone {
     };
     // The saturation's shares.
     struct Mix {
-        float own, red, green, blue;
+        float own, red, green, blue, plus;
     };
-    // With z = 255 x / 256 - 1/2. S(z) - 1/2 = z (a + b z² + c z⁴ + d z⁶), which is within 4e-7 of the formula.
+    // S - 1/2 = max(z (a + b z² + c z⁴ + d z⁶), black) with z = q - 1/2, which is within 4e-7 of the formula. It is t
+    // too high, which the next step takes away.
     struct Gamma {
-        std::array<float, 4> factors;
-        float slopeBelow, slopeAbove;  // at the ends of 0..255/256
+        float factors[4];
+        float black;
     };
     struct Tint {
-        bool lifts;         // o > 0
-        float times, plus;  // of z
-        float bound;        // of the result: the most if it lifts, else the least
+        bool lifts;  // o > 0
+        float times, plus;
+        float bound;                   // of the result: the most if it lifts, else the least
+        float slopeBelow, slopeAbove;  // of the whole stage at x = 0 and x = 1
     };
 
     bool hasLine = false;
@@ -48,8 +52,10 @@ struct DeepTone {
     bool bends = false;  // with a tint, even if it is neutral
     Line line{};
     Mix mix{};
-    Gamma gamma{};
-    std::array<Tint, 3> tint{};  // red, green, blue
+    // The gamma before the tint, from x - middle, and after it, to x + black. Without a gamma the tint alone does this.
+    Gamma first{}, second{};
+    float middle = 0.0f, black = 0.0f;
+    Tint tint[3]{};  // red, green, blue
 
     [[nodiscard]] bool IsActive() const noexcept { return hasLine || mixes || tints; }
 };

@@ -1,0 +1,81 @@
+// Eight floats in a vector (floats_plain.h says what the functions do).
+
+using Floats = __m256;
+constexpr std::int32_t kFloats = 8;
+
+inline Floats All(float x) noexcept { return _mm256_set1_ps(x); }
+inline Floats Load(const float* from) noexcept { return _mm256_loadu_ps(from); }
+inline void Store(float* to, Floats x) noexcept { _mm256_storeu_ps(to, x); }
+
+inline Floats Least(Floats a, Floats b) noexcept { return _mm256_min_ps(a, b); }
+inline Floats Most(Floats a, Floats b) noexcept { return _mm256_max_ps(a, b); }
+inline Floats NumberOr0(Floats x) noexcept { return _mm256_and_ps(_mm256_cmp_ps(x, x, _CMP_ORD_Q), x); }
+inline Floats WherePositive(Floats sign, Floats x) noexcept {
+    return _mm256_and_ps(_mm256_cmp_ps(sign, _mm256_setzero_ps(), _CMP_GT_OQ), x);
+}
+
+// The 64-bit halves of both blocks, in the order 0 2 1 3.
+inline Floats InOrder(Floats x) noexcept {
+    return _mm256_castpd_ps(_mm256_permute4x64_pd(_mm256_castps_pd(x), _MM_SHUFFLE(3, 1, 2, 0)));
+}
+inline Floats Evens(Floats a, Floats b) noexcept {
+    return InOrder(_mm256_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0)));
+}
+inline Floats Odds(Floats a, Floats b) noexcept {
+    return InOrder(_mm256_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1)));
+}
+inline void StoreInTurn(float* to, Floats a, Floats b) noexcept {
+    const Floats low = _mm256_unpacklo_ps(a, b), high = _mm256_unpackhi_ps(a, b);
+    Store(to, _mm256_permute2f128_ps(low, high, 0x20));
+    Store(to + 8, _mm256_permute2f128_ps(low, high, 0x31));
+}
+
+struct FourFloats {
+    Floats a, b, c, d;
+};
+// Within each block.
+inline FourFloats Transposed(const FourFloats& x) noexcept {
+    const Floats ab = _mm256_unpacklo_ps(x.a, x.b), cd = _mm256_unpacklo_ps(x.c, x.d);
+    const Floats abHigh = _mm256_unpackhi_ps(x.a, x.b), cdHigh = _mm256_unpackhi_ps(x.c, x.d);
+    return {_mm256_shuffle_ps(ab, cd, _MM_SHUFFLE(1, 0, 1, 0)),
+            _mm256_shuffle_ps(ab, cd, _MM_SHUFFLE(3, 2, 3, 2)),
+            _mm256_shuffle_ps(abHigh, cdHigh, _MM_SHUFFLE(1, 0, 1, 0)),
+            _mm256_shuffle_ps(abHigh, cdHigh, _MM_SHUFFLE(3, 2, 3, 2))};
+}
+// A pixel and the one four places after it.
+inline Floats LoadBoth(const float* from) noexcept {
+    return _mm256_insertf128_ps(_mm256_castps128_ps256(_mm_loadu_ps(from)), _mm_loadu_ps(from + 16), 1);
+}
+inline FourFloats LoadFours(const float* from) noexcept {
+    return Transposed({LoadBoth(from), LoadBoth(from + 4), LoadBoth(from + 8), LoadBoth(from + 12)});
+}
+inline Floats LoadBoth(const std::uint16_t* from) noexcept {
+    const __m128i low = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(from));
+    const __m128i high = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(from + 16));
+    return _mm256_cvtepi32_ps(_mm256_cvtepu16_epi32(_mm_unpacklo_epi64(low, high)));
+}
+inline FourFloats LoadFours(const std::uint16_t* from) noexcept {
+    return Transposed({LoadBoth(from), LoadBoth(from + 4), LoadBoth(from + 8), LoadBoth(from + 12)});
+}
+inline void StoreBoth(float* to, Floats x) noexcept {
+    _mm_storeu_ps(to, _mm256_castps256_ps128(x));
+    _mm_storeu_ps(to + 16, _mm256_extractf128_ps(x, 1));
+}
+inline void StoreFours(float* to, const FourFloats& x) noexcept {
+    const FourFloats pixels = Transposed(x);
+    StoreBoth(to, pixels.a);
+    StoreBoth(to + 4, pixels.b);
+    StoreBoth(to + 8, pixels.c);
+    StoreBoth(to + 12, pixels.d);
+}
+inline void StoreFours(std::uint16_t* to, const FourFloats& x) noexcept {
+    const FourFloats pixels = Transposed(x);
+    const __m256i first = _mm256_packus_epi32(_mm256_cvttps_epi32(pixels.a), _mm256_cvttps_epi32(pixels.b));
+    const __m256i second = _mm256_packus_epi32(_mm256_cvttps_epi32(pixels.c), _mm256_cvttps_epi32(pixels.d));
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(to), _mm256_permute2x128_si256(first, second, 0x20));
+    _mm256_storeu_si256(reinterpret_cast<__m256i*>(to + 16), _mm256_permute2x128_si256(first, second, 0x31));
+}
+inline Floats LoadBytes(const std::uint8_t* from) noexcept {
+    const __m128i bytes = _mm_loadl_epi64(reinterpret_cast<const __m128i*>(from));
+    return _mm256_cvtepi32_ps(_mm256_cvtepu8_epi32(bytes));
+}
