@@ -192,6 +192,9 @@ RenderOptions ReadRender(const CLI::App& command, const TypedOptions& typed) {
     if (typed.digests && typed.outPath == "-")
         throw UsageError("--hash and OUT - both write to standard output");
     options.threads = typed.threads;
+    if (typed.depth == "8") options.depth = SampleType::kBytes;
+    if (typed.depth == "16") options.depth = SampleType::kWords;
+    if (typed.depth == "float") options.depth = SampleType::kFloats;
     options.mayOverwrite = typed.overwrite;
     options.isMatte = typed.matte;
     options.withSound = !typed.noSound && !typed.matte && !options.section.farm;

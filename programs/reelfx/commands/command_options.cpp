@@ -105,6 +105,14 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         ->type_name("N/M");
     render.add_option("--start", typed.start, "Start at this time of the clip")->type_name("TIME");
     render.add_option("--duration", typed.duration, "Render only this long")->type_name("TIME");
+    render
+        .add_option(
+            "--depth", typed.depth,
+            "What the effects work in: 8 or 16 bits or float. Default: float for clips of more than 8 "
+            "bits, else 8")
+        ->type_name("auto|8|16|float")
+        ->check(CLI::IsMember({"auto", "8", "16", "float"}))
+        ->capture_default_str();
     render.add_option("--threads,-j", typed.threads, "Frames rendered at once; 0: all processors")
         ->type_name("N")
         ->check(CLI::Range(0, 256))
@@ -125,7 +133,9 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         "Write only the damage (wear, spots, scratches) on a transparent background, with straight alpha "
         "and without sound, for compositing in other programs");
     render.add_flag("--raw-bgra", typed.output.isRawBgra, "OUT is raw BGRA frames");
-    render.add_flag("--hash", typed.digests, "Print the MD5 of each frame as BGRA; OUT may be omitted");
+    render.add_flag("--hash", typed.digests,
+                    "Print the MD5 of each frame as the effects leave it: BGRA in 8 bits, RGBA in others; "
+                    "OUT may be omitted");
     render.add_flag("--no-sound", typed.noSound, "Leave out sound and subtitles");
     render.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
     render

@@ -51,7 +51,7 @@ struct TypedOptions {
     std::vector<std::string> more;
     OutputOptions output;
     std::string outPath, into, size, rate, randomState, frames, farm, start, duration;
-    std::string format, codec, crf, pixelFormat, progress = "auto";
+    std::string format, codec, crf, pixelFormat, progress = "auto", depth = "auto";
     int threads = 0;
     bool overwrite = false, noSound = false, digests = false, quiet = false, dryRun = false, matte = false;
     ListOptions list;

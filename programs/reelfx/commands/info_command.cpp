@@ -27,6 +27,7 @@ Json JsonOf(const std::string& name, const MediaFacts& facts) {
         {"codec", facts.codec},
         {"pixelFormat", facts.pixelFormat},
         {"bits", facts.bits},
+        {"depth", DepthText(SamplesFor(facts))},
         {"width", facts.size.width},
         {"height", facts.size.height},
         {"turn", facts.turn},
@@ -63,6 +64,7 @@ void Print(const std::string& name, const MediaFacts& facts) {
          (facts.frames > 0 ? std::to_string(facts.frames) + " frames" : "number of frames unknown") +
              (facts.seconds > 0.0 ? ", " + NumberText(facts.seconds) + " s" : ""));
     Line("picture", facts.codec + " " + facts.pixelFormat + " in " + facts.container);
+    Line("depth", std::to_string(facts.bits) + " bits, effects work in " + DepthText(SamplesFor(facts)));
     Line("colour", "matrix " + facts.matrix + ", range " + facts.range + ", primaries " + facts.primaries +
                        ", transfer " + facts.transfer);
     for (const OtherStreamFacts& other : facts.others) {

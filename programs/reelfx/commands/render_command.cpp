@@ -91,6 +91,7 @@ class RenderRun {
                                       .size = {first.width, first.height},
                                       .quarterTurns = QuarterTurnsOf(m_reader.Picture()),
                                       .withDigest = m_options.withDigests,
+                                      .samples = SamplesOf(m_options, m_reader),
                                       .isMatte = m_options.isMatte};
         std::vector<FramePipeline::Worker> workers;
         for (unsigned i = 0; i < count; ++i) {

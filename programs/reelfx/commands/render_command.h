@@ -6,6 +6,7 @@
 
 #include "programs/reelfx/pipeline/clip_section.h"
 #include "programs/reelfx/common/effect_choice.h"
+#include "programs/reelfx/conversion/picture_view.h"
 #include "programs/reelfx/media/encoder_choice.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/media_reader.h"
@@ -22,6 +23,7 @@ struct RenderOptions {
     bool mayOverwrite = false;
     bool withSound = true;
     bool withDigests = false;  // a line for each frame on standard output
+    std::optional<SampleType> depth;  // that the effects work in; none: as SamplesFor says
     bool isMatte = false;      // only the damage, without the picture
     bool isDryRun = false;     // checks and reports, but writes nothing
     ProgressKind progress = ProgressKind::kAuto;

@@ -50,6 +50,12 @@ std::string EffectText(const EffectChoice& choice) {
 
 }  // namespace
 
+SampleType SamplesOf(const RenderOptions& options, const MediaReader& reader) {
+    // The matte is read from what damage does to bytes.
+    if (options.isMatte) return SampleType::kBytes;
+    return options.depth.value_or(SamplesFor(FactsOf(reader)));
+}
+
 std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectList& effects,
                      const MediaReader& reader, const MediaWriter* writer, unsigned threads) {
     const MediaFacts facts = FactsOf(reader);
@@ -58,6 +64,7 @@ std::string PlanText(const RenderOptions& options, const SectionOptions& section
     text += Line("part", SectionText(section, ClipSection::FrameCountGuess(reader, section)));
     for (const EffectChoice& choice : effects.Choices()) text += EffectText(choice);
     if (options.isMatte) text += Line("matte", "only the damage, with straight alpha");
+    text += Line("depth", DepthText(SamplesOf(options, reader)));
     text += Line("threads", std::to_string(threads));
     text += Line("output", writer ? writer->Description() : "digests on standard output");
     return text;

@@ -10,6 +10,9 @@
 
 namespace velmora::hosts {
 
+// What the effects work on.
+SampleType SamplesOf(const RenderOptions& options, const MediaReader& reader);
+
 // Returns lines of text with line ends. `section` has the farm part resolved. A null `writer` means digests
 // only.
 std::string PlanText(const RenderOptions& options, const SectionOptions& section, const EffectList& effects,

@@ -85,6 +85,14 @@ MediaFacts FactsOf(const MediaReader& reader) {
     return facts;
 }
 
+SampleType SamplesFor(const MediaFacts& facts) {
+    return facts.bits > 8 ? SampleType::kFloats : SampleType::kBytes;
+}
+
+std::string DepthText(SampleType samples) {
+    return samples == SampleType::kBytes ? "8 bits" : samples == SampleType::kWords ? "16 bits" : "float";
+}
+
 std::string RateText(FrameRate rate) {
     return NumberText(static_cast<double>(rate.numerator) / rate.denominator);
 }
@@ -102,11 +110,9 @@ std::vector<std::string> NotesOn(const MediaFacts& facts) {
     const auto note = [&](bool applies, const std::string& text) {
         if (applies) notes.push_back(text);
     };
+    note(facts.bits > 8, std::to_string(facts.bits) + " bits per channel: the effects work in floating point");
     note(facts.turn != 0, "rotation tag " + std::to_string(facts.turn) +
                               " degrees: effects are applied to the upright picture, the tag is kept");
-    note(facts.bits > 8,
-         std::to_string(facts.bits) +
-             " bits per channel: frames changed by an effect are rounded to 8 bits, others are kept");
     note(facts.isUnevenRate, "variable frame rate: the times of the frames are kept");
     note(facts.isInterlaced, "interlaced: both fields of a frame are rendered as one picture");
     note(facts.matrix == "unknown" && facts.assumedMatrix != "gbr",

@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "programs/reelfx/conversion/picture_view.h"
 #include "programs/reelfx/media/media_reader.h"
 
 namespace velmora::hosts {
@@ -43,6 +44,11 @@ std::string ShortText(const MediaFacts& facts);
 
 // What rendering does with the clip beyond the plain case, a sentence each.
 std::vector<std::string> NotesOn(const MediaFacts& facts);
+
+// What effects work on by themselves: bytes, or floats for a clip of more than 8 bits, which keep all that it has.
+SampleType SamplesFor(const MediaFacts& facts);
+// "8 bits", "16 bits", "float"
+std::string DepthText(SampleType samples);
 
 // "29.97", "25"
 std::string RateText(FrameRate rate);

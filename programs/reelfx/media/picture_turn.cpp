@@ -23,18 +23,19 @@ int QuarterTurnsOf(const AVStream& stream) {
 void TurnPicture(const BgraPicture& from, int quarterTurns, BgraPicture& to) {
     const std::int32_t width = from.Width(), height = from.Height();
     if (quarterTurns % 2 != 0) {
-        to.Resize(height, width);  // NOLINT(readability-suspicious-call-argument): on its side
+        to.ResizeLike(from, height, width);  // NOLINT(readability-suspicious-call-argument): on its side
     } else {
-        to.Resize(width, height);
+        to.ResizeLike(from, width, height);
     }
+    const std::ptrdiff_t bytes = from.PixelBytes();
     for (std::int32_t y = 0; y < height; ++y) {
         const std::uint8_t* pixel = from.Row(y);
-        for (std::int32_t x = 0; x < width; ++x, pixel += 4) {
+        for (std::int32_t x = 0; x < width; ++x, pixel += bytes) {
             std::int32_t toX = x, toY = y;
             if (quarterTurns == 1) toX = height - 1 - y, toY = x;
             if (quarterTurns == 2) toX = width - 1 - x, toY = height - 1 - y;
             if (quarterTurns == 3) toX = y, toY = width - 1 - x;
-            std::memcpy(to.Row(toY) + std::ptrdiff_t{toX} * 4, pixel, 4);
+            std::memcpy(to.Row(toY) + toX * bytes, pixel, static_cast<std::size_t>(bytes));
         }
     }
 }

@@ -11,7 +11,7 @@ namespace {
 
 bool IsSame(const BgraPicture& a, const BgraPicture& b) {
     for (std::int32_t y = 0; y < a.Height(); ++y) {
-        if (std::memcmp(a.Row(y), b.Row(y), static_cast<std::size_t>(a.Width()) * 4) != 0) return false;
+        if (std::memcmp(a.Row(y), b.Row(y), a.RowBytes()) != 0) return false;
     }
     return true;
 }
@@ -19,30 +19,30 @@ bool IsSame(const BgraPicture& a, const BgraPicture& b) {
 }  // namespace
 
 FrameWorker::FrameWorker(EffectListSession session, const Job& job)
-    : m_effects(std::move(session)), m_job(job), m_source(job.size.width, job.size.height) {
+    : m_effects(std::move(session)), m_job(job), m_source(job.size.width, job.size.height, job.samples) {
     if (job.isMatte) m_effects.KeepDamageOnly();
 }
 
 void FrameWorker::Work(PipelineItem& item) {
     const BgraPicture& result = Result(item);
     if (m_job.withDigest) {
-        item.digest = FrameDigest(result.Row(0), result.Width(), result.Height(), result.Stride());
+        item.digest = FrameDigest(result.Row(0), static_cast<std::int32_t>(result.RowBytes() / 4),
+                                  result.Height(), result.Stride());
     }
     if (!m_job.writer) return;
-    // An unchanged frame keeps its own samples, including those that 8-bit RGB cannot hold: more than 8 bits,
-    // and values below black.
+    // An unchanged frame keeps its own samples, including those that the picture cannot hold.
     if (!m_job.isMatte && &result != &m_source && m_job.writer->TakesAsItIs(*item.frame) &&
         IsSame(m_source, result)) {
         return;
     }
     FramePtr frame = m_job.writer->NewResult(*item.frame);
-    m_converter.FromBgra(result, *frame);
+    m_converter.FromPicture(result.View(), *frame);
     item.frame = std::move(frame);
 }
 
 BgraPicture& FrameWorker::Result(const PipelineItem& item) {
     if (!m_job.isMatte) {
-        m_converter.ToBgra(*item.frame, m_source);
+        m_converter.ToPicture(*item.frame, m_source.View());
         return Apply(item);
     }
     FillMatteGround(m_source);

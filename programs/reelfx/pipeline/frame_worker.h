@@ -1,4 +1,4 @@
-// What one thread does with a frame: convert it to BGRA, turn it upright, apply the effects, and convert it
+// What one thread does with a frame: convert it to a picture, turn it upright, apply the effects, and convert it
 // back.
 #pragma once
 
@@ -19,7 +19,8 @@ class FrameWorker {
         FrameSize size = {};                  // of the source's frames
         int quarterTurns = 0;                 // see QuarterTurnsOf
         bool withDigest = false;
-        bool isMatte = false;  // the result is only the damage, see matte.h
+        SampleType samples = SampleType::kBytes;  // that the effects work on
+        bool isMatte = false;                     // the result is only the damage, see matte.h
     };
     FrameWorker(EffectListSession session, const Job& job);
 
