@@ -5,6 +5,7 @@
 
 #include <benchmark/benchmark.h>
 
+#include <bit>
 #include <map>
 #include <memory>
 #include <string>
@@ -36,6 +37,29 @@ void RunCase(benchmark::State& state, LevelTimes& times, const BenchCase& test, 
                                          seconds)) {
                 state.SkipWithError("frame refused");
             }
+        });
+    }
+}
+
+// Deep frames, still as a ratio to a memcpy of an 8-bit one. The pictures are larger than the caches by themselves.
+void RunDeep(benchmark::State& state, LevelTimes& times, const BenchCase& test, render::DeepSamples samples) {
+    FramePool pool(kFullHd);
+    const render::DeepFormat format = {samples, 4, false};
+    const std::ptrdiff_t step = kFullHd.width * format.PixelBytes();
+    std::vector<float> source(static_cast<std::size_t>(step * kFullHd.height / 4)),
+        destination(source.size());
+    for (std::size_t i = 0; i < source.size(); ++i) {
+        const std::uint8_t byte = pool.Source()[i % (std::size_t{kFullHd.width} * kFullHd.height * 4)];
+        source[i] = samples == render::DeepSamples::kFloat ? static_cast<float>(byte) / 255.0f
+                                                           : std::bit_cast<float>(byte * 0x01010101u);
+    }
+    const auto frame = render::DeepFrame::Whole(kFullHd.width, kFullHd.height, format, {source.data(), step},
+                                                {destination.data(), step});
+    const auto sessions = MakeAtEachLevel([&] { return SessionOf(test); });
+    for (auto _ : state) {
+        const double seconds = 1.0 + static_cast<double>(times.Rounds()) / 30.0;
+        times.AddRound(pool, [&](std::size_t level) {
+            if (!sessions[level]->RenderDeep(frame, seconds)) state.SkipWithError("frame refused");
         });
     }
 }
@@ -113,6 +137,12 @@ int main(int argc, char** argv) {
     Register("Film Pro, everything, first frame after a jump to 10 h (at most 30 ms)", 30,
              [&everything](State& state, LevelTimes& times) { RunJumps(state, times, everything); });
     RegisterCase("Film Pro, everything, 3840x2160", everything, kUltraHd, 1.0);
+    Register("Film Pro, everything, 16 bits", 40, [&everything](State& state, LevelTimes& times) {
+        RunDeep(state, times, everything, velmora::render::DeepSamples::kUnsigned16);
+    });
+    Register("Film Pro, everything, float", 40, [&everything](State& state, LevelTimes& times) {
+        RunDeep(state, times, everything, velmora::render::DeepSamples::kFloat);
+    });
     Register("frame processor, 4:2:2 to 32 bits (goal 1.5)", 80,
              [](State& state, LevelTimes& times) { RunConversion(state, times, true); });
     Register("frame processor, 32 bits to 4:2:2 (goal 1.5)", 80,
