@@ -41,6 +41,15 @@ class MasterHost final : public PlainHost {
     OwnValues m_own;
 };
 
+bool LeavesPicturesAlone(const render::StageSettings& s) noexcept {
+    const render::StageSettings neutral;
+    const bool isStill = s.yJitter == 0 && s.xJitter == 0 && s.flicker == 0.0f;
+    const bool hasNoLook = s.glow == 0.0f && s.saturation == 0.0f && s.brightness == 0.0f &&
+                           s.contrast == 0.0f && s.filmGamma == 0.0f && s.tintRed == neutral.tintRed &&
+                           s.tintGreen == neutral.tintGreen && s.tintBlue == neutral.tintBlue;
+    return isStill && hasNoLook && s.wear == 0.0f && s.scratchCount == 0 && s.spots == 0.0f;
+}
+
 }  // namespace
 
 std::unique_ptr<EffectSession> EffectSession::Create(const EffectTable& effect) noexcept {
@@ -99,6 +108,13 @@ bool EffectSession::RenderDeep(const render::DeepFrame& frame, double seconds) n
     MasterHost host(m_effect, m_values);
     const std::uint32_t hostSeed = m_isPinned ? m_seed : 0;
     return RenderDeepFrame({&m_settings, &m_state, m_options, hostSeed}, m_deep, host, frame, seconds);
+}
+
+bool EffectSession::IsNeutral() noexcept {
+    const FloatGuard guard;
+    MasterHost host(m_effect, m_values);
+    m_settings.ReadFromHost(host);
+    return LeavesPicturesAlone(ReadStageSettings(m_settings));
 }
 
 bool EffectSession::Render(const FrameRecord& source, const FrameRecord& destination,

@@ -49,6 +49,9 @@ class EffectSession {
     // change from frame to frame. There are at most as many scratches as now, unless a frame has more, which moves all.
     void KeepArrangement() noexcept;
 
+    // Whether the current values leave every picture as it is, at any time.
+    [[nodiscard]] bool IsNeutral() noexcept;
+
     // From now on only wear, scratches and spots are drawn, with the same positions and strength as in the whole
     // effect; nothing moves the picture or changes its colours.
     void KeepDamageOnly() noexcept { m_options.isDamageOnly = true; }

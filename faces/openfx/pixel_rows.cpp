@@ -1,0 +1,204 @@
+#include "faces/openfx/pixel_rows.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstring>
+#include <limits>
+
+namespace velmora::hosts::openfx {
+namespace {
+
+// Samples need not be aligned.
+template <typename Sample>
+Sample Get(const std::byte* at) noexcept {
+    Sample sample;
+    std::memcpy(&sample, at, sizeof sample);
+    return sample;
+}
+template <typename Sample>
+void Put(std::byte* at, Sample sample) noexcept {
+    std::memcpy(at, &sample, sizeof sample);
+}
+
+template <typename Sample>
+constexpr float kWhite = std::numeric_limits<Sample>::max();
+template <>
+constexpr float kWhite<float> = 1.0f;
+
+template <typename Sample>
+float ToUnit(Sample sample) noexcept {
+    return static_cast<float>(sample) / kWhite<Sample>;
+}
+template <typename Sample>
+Sample FromUnit(float value) noexcept {
+    // Not a number counts as 0.
+    const float scaled = value > 0.0f ? std::min(value, 1.0f) * kWhite<Sample> : 0.0f;
+    return static_cast<Sample>(scaled + 0.5f);
+}
+template <>
+float FromUnit<float>(float value) noexcept {
+    return value;
+}
+
+// Light to display values and back. Both continue beyond 1, and below 0 where the picture has such values.
+float ToDisplay(WorkingSpace space, float light) noexcept {
+    if (!(light == light)) return 0.0f;
+    if (space == WorkingSpace::kLinear24) return std::copysign(std::pow(std::abs(light), 1.0f / 2.4f), light);
+    return light <= 0.0031308f ? light * 12.92f : 1.055f * std::pow(light, 1.0f / 2.4f) - 0.055f;
+}
+float ToLight(WorkingSpace space, float display) noexcept {
+    if (space == WorkingSpace::kLinear24) return std::copysign(std::pow(std::abs(display), 2.4f), display);
+    return display <= 0.04045f ? display / 12.92f : std::pow((display + 0.055f) / 1.055f, 2.4f);
+}
+bool IsLinear(WorkingSpace space) noexcept {
+    return space == WorkingSpace::kLinearSrgb || space == WorkingSpace::kLinear24;
+}
+
+int DividedByte(int colour, int alpha) noexcept {
+    return alpha == 0 ? 0 : std::min((colour * 255 + alpha / 2) / alpha, 255);
+}
+int MultipliedByte(int colour, int alpha) noexcept {
+    return (colour * alpha + 127) / 255;
+}
+
+// The working bytes are in the order of the library's pixels.
+void LoadBytes(const PixelFormat& format, const std::byte* host, std::byte* work, int count) noexcept {
+    for (int i = 0; i < count; ++i, host += format.channels, work += 4) {
+        const auto alpha = format.channels == 4 ? host[3] : std::byte{255};
+        work[0] = host[2];
+        work[1] = host[1];
+        work[2] = host[0];
+        work[3] = alpha;
+        if (!format.isDividedHere || alpha == std::byte{255}) continue;
+        for (int c = 0; c < 3; ++c) {
+            work[c] = static_cast<std::byte>(
+                DividedByte(std::to_integer<int>(work[c]), std::to_integer<int>(alpha)));
+        }
+    }
+}
+
+template <typename Sample>
+void LoadFloats(const PixelFormat& format, const std::byte* host, std::byte* work, int count) noexcept {
+    for (int i = 0; i < count; ++i, host += format.HostBytes(), work += format.WorkBytes()) {
+        const float alpha = format.channels == 4 ? ToUnit(Get<Sample>(host + 3 * sizeof(Sample))) : 1.0f;
+        for (int c = 0; c < 3; ++c) {
+            float value = ToUnit(Get<Sample>(host + static_cast<std::size_t>(c) * sizeof(Sample)));
+            if (format.isDividedHere) value = alpha > 0.0f ? value / alpha : 0.0f;
+            if (IsLinear(format.space)) value = ToDisplay(format.space, value);
+            Put(work + static_cast<std::size_t>(c) * sizeof(float), value);
+        }
+        if (format.channels == 4) Put(work + 3 * sizeof(float), alpha);
+    }
+}
+
+// One pixel's colours as the host codes them.
+void FinishBytes(const PixelFormat& format, const std::byte* work, std::uint8_t (&out)[3]) noexcept {
+    const int alpha = std::to_integer<int>(work[3]);
+    for (int c = 0; c < 3; ++c) {
+        const int value = std::to_integer<int>(work[2 - c]);
+        out[c] = static_cast<std::uint8_t>(format.isDividedHere && alpha != 255 ? MultipliedByte(value, alpha)
+                                                                                : value);
+    }
+}
+template <typename Sample>
+void FinishFloats(const PixelFormat& format, const std::byte* work, Sample (&out)[3]) noexcept {
+    const float alpha = format.isDividedHere ? Get<float>(work + 3 * sizeof(float)) : 1.0f;
+    for (int c = 0; c < 3; ++c) {
+        float value = Get<float>(work + static_cast<std::size_t>(c) * sizeof(float));
+        if (IsLinear(format.space)) value = ToLight(format.space, value);
+        out[c] = FromUnit<Sample>(format.isDividedHere ? value * alpha : value);
+    }
+}
+
+template <typename Sample>
+Sample Mixed(Sample original, Sample result, float share) noexcept {
+    const float mixed =
+        static_cast<float>(original) + (static_cast<float>(result) - static_cast<float>(original)) * share;
+    return static_cast<Sample>(mixed + 0.5f);
+}
+template <>
+float Mixed<float>(float original, float result, float share) noexcept {
+    return original + (result - original) * share;
+}
+
+// `finish(work, colours)` gives a pixel's colours in the host's samples.
+template <typename Sample, typename Finish>
+void Store(const PixelFormat& format, const std::byte* work, const std::byte* original, const float* share,
+           std::byte* host, int count, Finish finish) noexcept {
+    constexpr std::size_t kSize = sizeof(Sample);
+    const std::size_t hostBytes = format.HostBytes(), workBytes = format.WorkBytes();
+    for (int i = 0; i < count; ++i, work += workBytes, original += hostBytes, host += hostBytes) {
+        const float part = share == nullptr ? 1.0f : share[i];
+        if (part <= 0.0f) {
+            std::memmove(host, original, hostBytes);
+            continue;
+        }
+        Sample colours[3];
+        finish(work, colours);
+        for (std::size_t c = 0; c < 3; ++c) {
+            Put(host + c * kSize,
+                part >= 1.0f ? colours[c] : Mixed(Get<Sample>(original + c * kSize), colours[c], part));
+        }
+        if (format.channels == 4) Put(host + 3 * kSize, Get<Sample>(original + 3 * kSize));
+    }
+}
+
+}  // namespace
+
+PixelFormat::PixelFormat(const HostImage& image, WorkingSpace workingSpace) noexcept
+    : depth(image.Depth()), channels(image.Channels()), work(WorkKind::kFloats), space(workingSpace) {
+    const bool isDivided = image.IsPremultiplied() && space != WorkingSpace::kNone;
+    if (!IsLinear(space) && depth == Depth::kByte) work = WorkKind::kBytes;
+    if (!IsLinear(space) && depth == Depth::kShort) work = WorkKind::kShorts;
+    isDividedHere = isDivided && (IsLinear(space) || work == WorkKind::kBytes);
+    isDividedByRenderer = isDivided && !isDividedHere;
+}
+
+void LoadRow(const PixelFormat& format, const std::byte* host, std::byte* work, int count) noexcept {
+    const bool isCopied = !IsLinear(format.space) && !format.isDividedHere;
+    if (format.work == WorkKind::kBytes) {
+        LoadBytes(format, host, work, count);
+    } else if (isCopied) {
+        std::memcpy(work, host, static_cast<std::size_t>(count) * format.HostBytes());
+    } else if (format.depth == Depth::kByte) {
+        LoadFloats<std::uint8_t>(format, host, work, count);
+    } else if (format.depth == Depth::kShort) {
+        LoadFloats<std::uint16_t>(format, host, work, count);
+    } else {
+        LoadFloats<float>(format, host, work, count);
+    }
+}
+
+void StoreRow(const PixelFormat& format, const std::byte* work, const std::byte* original, const float* share,
+              std::byte* host, int count) noexcept {
+    const auto floats = [&format](const std::byte* pixel, auto& out) { FinishFloats(format, pixel, out); };
+    if (format.work == WorkKind::kBytes) {
+        Store<std::uint8_t>(
+            format, work, original, share, host, count,
+            [&format](const std::byte* pixel, auto& out) { FinishBytes(format, pixel, out); });
+    } else if (format.work == WorkKind::kShorts) {
+        Store<std::uint16_t>(format, work, original, share, host, count,
+                             [](const std::byte* pixel, auto& out) { std::memcpy(out, pixel, sizeof out); });
+    } else if (format.depth == Depth::kByte) {
+        Store<std::uint8_t>(format, work, original, share, host, count, floats);
+    } else if (format.depth == Depth::kShort) {
+        Store<std::uint16_t>(format, work, original, share, host, count, floats);
+    } else {
+        Store<float>(format, work, original, share, host, count, floats);
+    }
+}
+
+void AlphaRow(const HostImage& mask, const std::byte* host, float times, float* out, int count) noexcept {
+    const auto size = static_cast<std::size_t>(SampleBytes(mask.Depth()));
+    const auto channels = static_cast<std::size_t>(mask.Channels());
+    host += (channels - 1) * size;
+    for (int i = 0; i < count; ++i, host += channels * size) {
+        float alpha = 0.0f;
+        if (mask.Depth() == Depth::kByte) alpha = ToUnit(Get<std::uint8_t>(host));
+        if (mask.Depth() == Depth::kShort) alpha = ToUnit(Get<std::uint16_t>(host));
+        if (mask.Depth() == Depth::kFloat) alpha = Get<float>(host);
+        out[i] = alpha > 0.0f ? std::min(alpha, 1.0f) * times : 0.0f;
+    }
+}
+
+}  // namespace velmora::hosts::openfx

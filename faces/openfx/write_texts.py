@@ -1,0 +1,50 @@
+"""Writes what the plug-ins say about their parameters: write_texts.py HELP OUTPUT
+
+Each effect's help page has a table with a row for each control; the last cell says what the control does. Controls that
+share a name are told apart as the plug-ins do it: the colour first, then its amount.
+"""
+
+import html
+import re
+import sys
+from collections import Counter
+from pathlib import Path
+
+EFFECTS = ["Film Camera", "Film Look", "Film Damage", "Film Express", "Film Pro"]
+ROW = re.compile(r"<tr><td>(.*?)</td><td>(.*?)</td><td>.*?</td><td>(.*?)</td></tr>")
+
+
+def text(cell):
+    return html.unescape(re.sub(r"<[^>]*>", "", cell)).replace("\N{MINUS SIGN}", "-").strip()
+
+
+def hints(page):
+    rows = [tuple(map(text, row)) for row in ROW.findall(page)]
+    count = Counter(name for name, _, _ in rows)
+    for name, values, what in rows:
+        if count[name] > 1:
+            name += " Colour" if values == "any colour" else " Amount"
+        yield name, what
+
+
+def quoted(words):
+    return '"' + words.replace("\\", "\\\\").replace('"', '\\"') + '"'
+
+
+def main(folder, output):
+    lines = ['#include "faces/openfx/plugin_texts.h"', "", "namespace velmora::hosts::openfx {", "namespace {", "",
+             "struct Hint {", "    std::string_view effect, title, text;", "};", "constexpr Hint kHints[] = {"]
+    for effect in EFFECTS:
+        page = Path(folder, effect.lower().replace(" ", "-") + ".html").read_text(encoding="utf-8")
+        found = list(hints(page))
+        if not found:
+            sys.exit(f"write_texts.py: the help page of {effect} has no table of controls")
+        lines += [f"    {{{quoted(effect)}, {quoted(name)}, {quoted(what)}}}," for name, what in found]
+    lines += ["};", "", "}  // namespace", "", "std::string HintOf(std::string_view effect, std::string_view title) {",
+              "    for (const Hint& hint : kHints) {",
+              "        if (hint.effect == effect && hint.title == title) return std::string(hint.text);", "    }",
+              "    return {};", "}", "", "}  // namespace velmora::hosts::openfx", ""]
+    Path(output).write_text("\n".join(lines), encoding="utf-8")
+
+
+main(*sys.argv[1:])
