@@ -91,23 +91,25 @@ void LoadFloats(const PixelFormat& format, const std::byte* host, std::byte* wor
     }
 }
 
-// One pixel's colours as the host codes them.
-void FinishBytes(const PixelFormat& format, const std::byte* work, std::uint8_t (&out)[3]) noexcept {
+// One pixel as the host codes it. A shifted picture and its border bring their own alpha.
+void FinishBytes(const PixelFormat& format, const std::byte* work, std::uint8_t (&out)[4]) noexcept {
     const int alpha = std::to_integer<int>(work[3]);
     for (int c = 0; c < 3; ++c) {
         const int value = std::to_integer<int>(work[2 - c]);
         out[c] = static_cast<std::uint8_t>(format.isDividedHere && alpha != 255 ? MultipliedByte(value, alpha)
                                                                                 : value);
     }
+    out[3] = static_cast<std::uint8_t>(alpha);
 }
 template <typename Sample>
-void FinishFloats(const PixelFormat& format, const std::byte* work, Sample (&out)[3]) noexcept {
-    const float alpha = format.isDividedHere ? Get<float>(work + 3 * sizeof(float)) : 1.0f;
+void FinishFloats(const PixelFormat& format, const std::byte* work, Sample (&out)[4]) noexcept {
+    const float alpha = format.channels == 4 ? Get<float>(work + 3 * sizeof(float)) : 1.0f;
     for (int c = 0; c < 3; ++c) {
         float value = Get<float>(work + static_cast<std::size_t>(c) * sizeof(float));
         if (IsLinear(format.space)) value = ToLight(format.space, value);
         out[c] = FromUnit<Sample>(format.isDividedHere ? value * alpha : value);
     }
+    out[3] = FromUnit<Sample>(alpha);
 }
 
 template <typename Sample>
@@ -121,25 +123,24 @@ float Mixed<float>(float original, float result, float share) noexcept {
     return original + (result - original) * share;
 }
 
-// `finish(work, colours)` gives a pixel's colours in the host's samples.
+// `finish(work, pixel)` gives a pixel in the host's samples, always with alpha.
 template <typename Sample, typename Finish>
 void Store(const PixelFormat& format, const std::byte* work, const std::byte* original, const float* share,
            std::byte* host, int count, Finish finish) noexcept {
-    constexpr std::size_t kSize = sizeof(Sample);
     const std::size_t hostBytes = format.HostBytes(), workBytes = format.WorkBytes();
+    const auto channels = static_cast<std::size_t>(format.channels);
     for (int i = 0; i < count; ++i, work += workBytes, original += hostBytes, host += hostBytes) {
         const float part = share == nullptr ? 1.0f : share[i];
         if (part <= 0.0f) {
             std::memmove(host, original, hostBytes);
             continue;
         }
-        Sample colours[3];
-        finish(work, colours);
-        for (std::size_t c = 0; c < 3; ++c) {
-            Put(host + c * kSize,
-                part >= 1.0f ? colours[c] : Mixed(Get<Sample>(original + c * kSize), colours[c], part));
+        Sample pixel[4];
+        finish(work, pixel);
+        for (std::size_t c = 0; c < channels; ++c) {
+            const std::size_t at = c * sizeof(Sample);
+            Put(host + at, part >= 1.0f ? pixel[c] : Mixed(Get<Sample>(original + at), pixel[c], part));
         }
-        if (format.channels == 4) Put(host + 3 * kSize, Get<Sample>(original + 3 * kSize));
     }
 }
 
@@ -178,7 +179,7 @@ void StoreRow(const PixelFormat& format, const std::byte* work, const std::byte*
             [&format](const std::byte* pixel, auto& out) { FinishBytes(format, pixel, out); });
     } else if (format.work == WorkKind::kShorts) {
         Store<std::uint16_t>(format, work, original, share, host, count,
-                             [](const std::byte* pixel, auto& out) { std::memcpy(out, pixel, sizeof out); });
+                             [&format](const std::byte* pixel, auto& out) { std::memcpy(out, pixel, format.WorkBytes()); });
     } else if (format.depth == Depth::kByte) {
         Store<std::uint8_t>(format, work, original, share, host, count, floats);
     } else if (format.depth == Depth::kShort) {

@@ -41,6 +41,7 @@ inline void Require(bool holds, const char* text) {
 
 struct CheckContext {
     std::string libraryPath;  // empty: the default
+    std::string bundlePath;   // of the OpenFX bundle; empty: the default
     int level = kUsualLevel;
     Dice dice;
 
@@ -56,7 +57,8 @@ struct Check {
     const char* what;
 };
 
-// In the order in which they run, which is by level.
+// In the order in which they run: those of the library, then those of the OpenFX bundle, each by level. On Windows the
+// 32-bit program has the first, the 64-bit one the second, because a process can load only modules of its own kind.
 [[nodiscard]] std::span<const Check> AllChecks();
 
 }  // namespace velmora::reelcheck

@@ -5,6 +5,7 @@ namespace {
 
 // clang-format off
 constexpr Check kChecks[] = {
+#ifdef REELCHECK_LIBRARY
     {"exports",           1, CheckExports,        "the two exports, and when the library may be unloaded"},
     {"references",        1, CheckReferences,     "counts and interfaces of every object"},
     {"descriptions",      1, CheckDescriptions,   "every parameter of every effect describes itself within its record"},
@@ -42,6 +43,26 @@ constexpr Check kChecks[] = {
     {"system-dialogs",    8, CheckSystemDialogs,   "the system's own dialogs, cancelled"},
     {"endurance",         8, CheckEndurance,       "thousands of frames with changing presets: nothing grows"},
     {"largest-sizes",     9, CheckLargestSizes,   "every effect at up to 8192x4320"},
+#endif
+#ifdef REELCHECK_OPENFX
+    {"openfx-exports",        1, CheckOpenfxExports,       "the OpenFX bundle's two exports, and its list of plug-ins"},
+    {"openfx-descriptions",   1, CheckOpenfxDescriptions,  "every plug-in describes itself in every context, as the effects' tables say"},
+    {"openfx-first-frames",   1, CheckOpenfxFirstFrames,   "every preset of every plug-in: the picture of reelfx"},
+    {"openfx-missing-suites", 2, CheckOpenfxMissingSuites, "no host, no suites, suites without functions: refused in every action"},
+    {"openfx-wrong-handles",  2, CheckOpenfxWrongHandles,  "handles that are none or of another object, actions without arguments, unknown actions"},
+    {"openfx-refused",        2, CheckOpenfxRefused,       "pictures that cannot be: refused, nothing is written or kept"},
+    {"openfx-layouts",        3, CheckOpenfxLayouts,       "sizes from 1x1 on between forbidden pages, any origin, row bytes of both signs, windows: the same picture"},
+    {"openfx-parts",          3, CheckOpenfxParts,         "sources smaller than their region, outputs larger than it"},
+    {"openfx-presets",        3, CheckOpenfxPresets,       "a preset sets every parameter in one step; the button draws a seed"},
+    {"openfx-identity",       3, CheckOpenfxIdentity,      "neutral values and a mix of nothing leave the source; which frames vary"},
+    {"openfx-mask",           3, CheckOpenfxMask,          "mix and mask, 8-bit and float, smaller than the picture"},
+    {"openfx-fields",         3, CheckOpenfxFields,        "one field: its rows and no others"},
+    {"openfx-abort",          4, CheckOpenfxAbort,         "stopped at every question whether to go on: nothing is kept, the next frame is right"},
+    {"openfx-memory",         4, CheckOpenfxMemory,        "each block of the host's memory fails once; a host without memory"},
+    {"openfx-threads",        4, CheckOpenfxThreads,       "frames of one instance on several threads at once: the same bytes"},
+    {"openfx-hostile-values", 4, CheckOpenfxHostileValues, "odd values for every parameter, time and rate"},
+    {"openfx-loading",        4, CheckOpenfxLoading,       "100 rounds of loading and unloading, also without describing: handles, modules and memory stay"},
+#endif
 };
 // clang-format on
 

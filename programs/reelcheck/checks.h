@@ -58,4 +58,27 @@ void CheckSystemDialogs(CheckContext& context);
 void CheckProcessorState(CheckContext& context);
 void CheckStack(CheckContext& context);
 
+// checks_openfx_tables.cpp
+void CheckOpenfxExports(CheckContext& context);
+void CheckOpenfxDescriptions(CheckContext& context);
+void CheckOpenfxMissingSuites(CheckContext& context);
+void CheckOpenfxWrongHandles(CheckContext& context);
+void CheckOpenfxLoading(CheckContext& context);
+
+// checks_openfx_frames.cpp
+void CheckOpenfxFirstFrames(CheckContext& context);
+void CheckOpenfxLayouts(CheckContext& context);
+void CheckOpenfxParts(CheckContext& context);
+void CheckOpenfxRefused(CheckContext& context);
+void CheckOpenfxFields(CheckContext& context);
+void CheckOpenfxMask(CheckContext& context);
+
+// checks_openfx_instances.cpp
+void CheckOpenfxPresets(CheckContext& context);
+void CheckOpenfxIdentity(CheckContext& context);
+void CheckOpenfxAbort(CheckContext& context);
+void CheckOpenfxMemory(CheckContext& context);
+void CheckOpenfxThreads(CheckContext& context);
+void CheckOpenfxHostileValues(CheckContext& context);
+
 }  // namespace velmora::reelcheck

@@ -41,7 +41,7 @@ void WatchDeadline() {
 }
 
 void RunOne(const Check& check, const Options& options) {
-    CheckContext context{options.library, options.level, Dice(options.seed, check.name)};
+    CheckContext context{options.library, options.bundle, options.level, Dice(options.seed, check.name)};
     WriteLine("begin\n");
     const Clock::time_point start = Clock::now();
     g_deadline = Now() + options.timeoutSeconds;
@@ -63,8 +63,10 @@ void RunOne(const Check& check, const Options& options) {
 
 int RunChild(const Options& options) {
     ReportCrashes();
+#ifdef REELCHECK_LIBRARY
     InstallAllocationHooks();
     InstallDialogHooks();
+#endif
     std::thread(WatchDeadline).detach();
     const std::vector<const Check*> checks = ChosenChecks(options);
     for (std::size_t i = static_cast<std::size_t>(*options.childFrom); i < checks.size(); ++i) {

@@ -8,9 +8,11 @@
 namespace velmora::reelcheck {
 
 const char* const kHelp =
-    "reelcheck: tries whether the library keeps its promises to a host, whatever the host does.\n"
+    "reelcheck: tries whether the library and the OpenFX plug-ins keep their promises to a host,\n"
+    "whatever the host does.\n"
     "\n"
     "  reelcheck [--level N] [--seed S] [--timeout SECONDS] [--only NAME]... [--json] [--library PATH]\n"
+    "            [--bundle PATH]\n"
     "  reelcheck --list\n"
     "\n"
     "  --level     from 1, a first look, to 10, everything and long (default 5)\n"
@@ -19,8 +21,16 @@ const char* const kHelp =
     "  --only      run this check, whatever its level; several are possible\n"
     "  --json      print the results as one JSON object\n"
     "  --library   the library to check (Windows; default: the one beside this program)\n"
+    "  --bundle    the OpenFX bundle to check (default: the one beside this program)\n"
     "  --list      print the checks with their levels\n"
     "\n"
+#ifdef REELCHECK_LIBRARY
+#ifndef REELCHECK_OPENFX
+    "This is the 32-bit program: it checks the library. The OpenFX plug-ins need the 64-bit one.\n"
+#endif
+#else
+    "This is the 64-bit program: it checks the OpenFX plug-ins. The library needs the 32-bit one.\n"
+#endif
     "The checks run in a process of their own: when the library crashes or hangs, that is a result.\n"
     "Exit codes: 0 all checks passed, 1 a check failed, 2 command line.\n";
 
@@ -92,6 +102,16 @@ Options ReadOptions(int count, char** arguments) {
             options.only.emplace_back(reader.Value("a check's name"));
         } else if (name == "--library") {
             options.library = reader.Value("a path");
+#ifndef REELCHECK_LIBRARY
+            throw std::invalid_argument(
+                "the library is a 32-bit module, which this 64-bit program cannot load");
+#endif
+        } else if (name == "--bundle") {
+            options.bundle = reader.Value("a path");
+#ifndef REELCHECK_OPENFX
+            throw std::invalid_argument(
+                "OpenFX plug-ins are 64-bit modules, which this 32-bit program cannot load");
+#endif
         } else if (name == "--child") {
             options.childFrom = number(0, 1000, "a position");
         } else {
@@ -107,6 +127,7 @@ std::vector<std::string> ChildArguments(const Options& options, int position) {
         "--seed",  std::to_string(options.seed), "--timeout", std::to_string(options.timeoutSeconds)};
     for (const std::string& name : options.only) arguments.insert(arguments.end(), {"--only", name});
     if (!options.library.empty()) arguments.insert(arguments.end(), {"--library", options.library});
+    if (!options.bundle.empty()) arguments.insert(arguments.end(), {"--bundle", options.bundle});
     return arguments;
 }
 

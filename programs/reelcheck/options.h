@@ -16,6 +16,7 @@ struct Options {
     int timeoutSeconds = 900;  // for one check
     std::vector<std::string> only;
     std::string library;
+    std::string bundle;
     bool help = false;
     bool list = false;
     bool json = false;

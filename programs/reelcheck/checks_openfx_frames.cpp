@@ -1,0 +1,216 @@
+// The frames that the OpenFX plug-ins render.
+
+#include <algorithm>
+#include <cmath>
+
+#include "programs/reelcheck/checks.h"
+#include "programs/reelcheck/openfx_host.h"
+
+namespace velmora::reelcheck {
+namespace {
+
+// Whether `part` of two pictures is equal, and everything else in the first still has the fill byte.
+bool IsOnlyInside(const HostPicture& picture, const HostPicture& whole, const OfxRectI& part,
+                  std::uint8_t fill, int field = -1) {
+    const auto bytes = static_cast<std::size_t>(picture.PixelBytes());
+    const OfxRectI& b = picture.shape.bounds;
+    for (int y = b.y1; y < b.y2; ++y) {
+        for (int x = b.x1; x < b.x2; ++x) {
+            const bool isInside =
+                x >= part.x1 && x < part.x2 && y >= part.y1 && y < part.y2 && (field < 0 || (y & 1) == field);
+            const std::uint8_t* const pixel = picture.Pixel(x, y);
+            if (isInside && !std::equal(pixel, pixel + bytes, whole.Pixel(x, y))) return false;
+            if (!isInside && std::any_of(pixel, pixel + bytes, [fill](auto byte) { return byte != fill; }))
+                return false;
+        }
+    }
+    return true;
+}
+
+}  // namespace
+
+void CheckOpenfxFirstFrames(CheckContext& context) {
+    const OpenfxModule module(context.bundlePath);
+    for (int i = 0; i < module.Count(); ++i) {
+        OpenfxPlugin plugin(module, i);
+        for (const char* components : {kOfxImageComponentRGBA, kOfxImageComponentRGB}) {
+            PictureShape shape = Plain(97, 61);
+            shape.components = components;
+            HostPicture source(shape), output(shape), expected(shape);
+            source.Paint(context.dice);
+            OpenfxInstance instance(plugin);
+            instance.Param("seed").values[0] = kSeed;
+            for (std::uint32_t preset = 0; preset < plugin.Effect().presetNames.size(); ++preset) {
+                SetPlace("%s, %s, %s", plugin.Effect().name, plugin.Effect().presetNames[preset], components);
+                instance.ChoosePreset(preset);
+                instance.RenderWhole(source, output, kTime);
+                RenderExpected(plugin.Effect(), preset, kSeed, kSeconds, source, expected);
+                Require(output.IsSameAs(expected), "not the picture of reelfx");
+            }
+        }
+    }
+    RequireNothingHeld();
+}
+
+void CheckOpenfxLayouts(CheckContext& context) {
+    const OpenfxModule module(context.bundlePath);
+    for (int i = 0; i < module.Count(); ++i) {
+        Busy busy(module, i);
+        for (int round = 0; round < context.Rounds(60, 2000); ++round) {
+            PictureShape shape = Plain(context.dice.Between(1, 40), context.dice.Between(1, 24));
+            HostPicture plain(shape), expected(shape);
+            plain.Paint(context.dice);
+            busy.instance.RenderWhole(plain, expected, kTime);
+            // The same picture elsewhere, its rows in another order, in part.
+            const int dx = context.dice.Between(-9, 9), dy = context.dice.Between(-9, 9);
+            shape.bounds = Square(dx, dy, shape.Width(), shape.Height());
+            shape.padding = context.dice.Between(0, 9);
+            shape.isTopDown = context.dice.OneIn(2);
+            shape.edge = context.dice.OneIn(2) ? Edge::kFront : Edge::kBack;
+            HostPicture source(shape);
+            shape.isTopDown = context.dice.OneIn(2);
+            HostPicture output(shape), whole(shape);
+            for (int y = 0; y < shape.Height(); ++y) {
+                const auto bytes = static_cast<std::size_t>(shape.Width() * 4);
+                std::copy_n(plain.Pixel(0, y), bytes, source.Pixel(dx, dy + y));
+                std::copy_n(expected.Pixel(0, y), bytes, whole.Pixel(dx, dy + y));
+            }
+            source.memory.ForbidWriting();
+            output.Fill(0xA5);
+            const OfxRectI window = Square(dx + context.dice.Between(0, shape.Width() - 1),
+                                           dy + context.dice.Between(0, shape.Height() - 1),
+                                           context.dice.Between(0, 20), context.dice.Between(0, 20));
+            SetPlace("%s, %dx%d at %d,%d, window %d,%d to %d,%d", busy.plugin.Effect().name, shape.Width(),
+                     shape.Height(), dx, dy, window.x1, window.y1, window.x2, window.y2);
+            busy.instance.Clip("Source").Show(&source);
+            busy.instance.Clip("Output").Show(&output);
+            Require(busy.instance.Render(kTime, window) == kOfxStatOK, "is not rendered");
+            Require(IsOnlyInside(output, whole, window, 0xA5),
+                    "a wrong picture, or something outside the window");
+        }
+    }
+    RequireNothingHeld();
+}
+
+// The source has less than its region, the output is larger than it.
+void CheckOpenfxParts(CheckContext& context) {
+    const OpenfxModule module(context.bundlePath);
+    Busy busy(module, 1);
+    PictureShape shape = Plain(30, 20);
+    HostPicture whole(shape), expected(shape);
+    whole.Paint(context.dice);
+    for (int y = 0; y < 20; ++y) {
+        for (int x = 0; x < 30; ++x) {
+            if (x < 4 || x >= 25 || y < 3 || y >= 17) std::fill_n(whole.Pixel(x, y), 4, std::uint8_t{0});
+        }
+    }
+    busy.instance.RenderWhole(whole, expected, kTime);
+    shape.region = shape.bounds;
+    shape.bounds = {4, 3, 25, 17};
+    HostPicture part(shape);
+    for (int y = 3; y < 17; ++y) std::copy_n(whole.Pixel(4, y), 21 * 4, part.Pixel(4, y));
+    PictureShape wide = Plain(1, 1);
+    wide.bounds = {-5, -5, 40, 30};
+    HostPicture output(wide);
+    busy.instance.RenderWhole(part, output, kTime);
+    for (int y = -5; y < 30; ++y) {
+        for (int x = -5; x < 40; ++x) {
+            const bool isThere = x >= 4 && x < 25 && y >= 3 && y < 17;
+            const std::uint8_t* const pixel = output.Pixel(x, y);
+            if (isThere ? !std::equal(pixel, pixel + 4, expected.Pixel(x, y))
+                        : std::any_of(pixel, pixel + 4, [](auto byte) { return byte != 0; })) {
+                Fail(Text("a wrong pixel at %d,%d", x, y));
+            }
+        }
+    }
+    RequireNothingHeld();
+}
+
+void CheckOpenfxRefused(CheckContext& context) {
+    const OpenfxModule module(context.bundlePath);
+    Busy busy(module, 4, kOfxImageEffectContextGeneral);
+    HostPicture good(Plain(8, 6)), output(Plain(8, 6));
+    good.Paint(context.dice);
+    const auto refuses = [&](const char* what, HostPicture* source, HostPicture* to, OfxStatus expected) {
+        SetPlace("%s", what);
+        output.Fill(0x5A);
+        busy.instance.Clip("Source").Show(source);
+        busy.instance.Clip("Output").Show(to);
+        const OfxStatus status = busy.instance.Render(kTime, {0, 0, 8, 6});
+        if (status != expected) Fail(Text("status %d, not %d", status, expected));
+        Require(IsOnlyInside(output, output, {}, 0x5A), "writes");
+        RequireNothingHeld();
+    };
+    refuses("no source", nullptr, &output, kOfxStatFailed);
+    refuses("no output", &good, nullptr, kOfxStatFailed);
+    const auto refusesShape = [&](const char* what, auto&& change) {
+        PictureShape shape = Plain(8, 6);
+        change(shape);
+        HostPicture odd(shape);
+        refuses(what, &odd, &output, kOfxStatErrImageFormat);
+    };
+    refusesShape("another depth", [](PictureShape& shape) { shape.depth = kOfxBitDepthShort; });
+    refusesShape("other components", [](PictureShape& shape) { shape.components = kOfxImageComponentRGB; });
+    refusesShape("alpha alone", [](PictureShape& shape) { shape.components = kOfxImageComponentAlpha; });
+    refusesShape("an unknown depth", [](PictureShape& shape) { shape.depth = "OfxBitDepthHalf"; });
+    refusesShape("rows that overlap", [](PictureShape& shape) { shape.padding = -8; });
+}
+
+void CheckOpenfxMask(CheckContext& context) {
+    const OpenfxModule module(context.bundlePath);
+    Busy busy(module, 4, kOfxImageEffectContextGeneral);
+    HostPicture source(Plain(40, 30)), full(Plain(40, 30)), output(Plain(40, 30));
+    source.Paint(context.dice);
+    busy.instance.RenderWhole(source, full, kTime);
+    PictureShape maskShape = Plain(1, 1);
+    maskShape.bounds = {5, 4, 35, 25};
+    for (const char* depth : {kOfxBitDepthByte, kOfxBitDepthFloat}) {
+        maskShape.components =
+            depth == std::string_view(kOfxBitDepthByte) ? kOfxImageComponentAlpha : kOfxImageComponentRGBA;
+        maskShape.depth = depth;
+        HostPicture mask(maskShape);
+        mask.Paint(context.dice);
+        const int alpha = maskShape.Channels() - 1;
+        for (const double percent : {100.0, 37.5}) {
+            SetPlace("%s, mix %g", depth, percent);
+            busy.instance.ShowMask(&mask);
+            busy.instance.Param("mix").values[0] = percent;
+            busy.instance.RenderWhole(source, output, kTime);
+            for (int y = 0; y < 30; ++y) {
+                for (int x = 0; x < 40; ++x) {
+                    const bool isCovered = x >= 5 && x < 35 && y >= 4 && y < 25;
+                    const double share = isCovered ? mask.Sample(x, y, alpha) * percent / 100.0 : 0.0;
+                    for (int c = 0; c < 3; ++c) {
+                        const double from = source.Pixel(x, y)[c], to = full.Pixel(x, y)[c];
+                        const double exact = from + (to - from) * share;
+                        // Half a step of rounding, and the last bits of the float arithmetic.
+                        if (std::abs(output.Pixel(x, y)[c] - exact) > 0.501)
+                            Fail(Text("a wrong mix at %d,%d", x, y));
+                    }
+                }
+            }
+        }
+    }
+    RequireNothingHeld();
+}
+
+void CheckOpenfxFields(CheckContext& context) {
+    const OpenfxModule module(context.bundlePath);
+    Busy busy(module, 0);
+    PictureShape shape = Plain(24, 18);
+    shape.bounds = {-3, -3, 21, 15};
+    HostPicture source(shape), whole(shape), output(shape);
+    source.Paint(context.dice);
+    busy.instance.RenderWhole(source, whole, kTime);
+    busy.instance.Clip("Output").Show(&output);
+    for (int field = 0; field < 2; ++field) {
+        SetPlace("field %d", field);
+        output.Fill(0x77);
+        const char* const name = field == 0 ? kOfxImageFieldLower : kOfxImageFieldUpper;
+        Require(busy.instance.Render(kTime, shape.bounds, name) == kOfxStatOK, "is not rendered");
+        Require(IsOnlyInside(output, whole, shape.bounds, 0x77, field), "not the rows of the field");
+    }
+    RequireNothingHeld();
+}
+
+}  // namespace velmora::reelcheck
