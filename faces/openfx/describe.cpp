@@ -132,7 +132,9 @@ void Describe(const Suites& suites, OfxImageEffectHandle descriptor, const effec
     plugin.Offer(kOfxPropPluginDescription, "The look of old film, with the same result in every host.");
     plugin.Set(kOfxImageEffectPropSupportedContexts, kOfxImageEffectContextFilter, 0);
     plugin.Set(kOfxImageEffectPropSupportedContexts, kOfxImageEffectContextGeneral, 1);
-    plugin.Set(kOfxImageEffectPropSupportedPixelDepths, kOfxBitDepthByte, 0);
+    plugin.Set(kOfxImageEffectPropSupportedPixelDepths, kOfxBitDepthFloat, 0);
+    plugin.Set(kOfxImageEffectPropSupportedPixelDepths, kOfxBitDepthShort, 1);
+    plugin.Set(kOfxImageEffectPropSupportedPixelDepths, kOfxBitDepthByte, 2);
     plugin.Set(kOfxImageEffectPluginPropSingleInstance, 0);
     plugin.Set(kOfxImageEffectPluginPropHostFrameThreading, 0);
     plugin.Set(kOfxImageEffectPluginRenderThreadSafety, kOfxImageEffectRenderFullySafe);

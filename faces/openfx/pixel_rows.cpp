@@ -178,8 +178,9 @@ void StoreRow(const PixelFormat& format, const std::byte* work, const std::byte*
             format, work, original, share, host, count,
             [&format](const std::byte* pixel, auto& out) { FinishBytes(format, pixel, out); });
     } else if (format.work == WorkKind::kShorts) {
-        Store<std::uint16_t>(format, work, original, share, host, count,
-                             [&format](const std::byte* pixel, auto& out) { std::memcpy(out, pixel, format.WorkBytes()); });
+        Store<std::uint16_t>(
+            format, work, original, share, host, count,
+            [&format](const std::byte* pixel, auto& out) { std::memcpy(out, pixel, format.WorkBytes()); });
     } else if (format.depth == Depth::kByte) {
         Store<std::uint8_t>(format, work, original, share, host, count, floats);
     } else if (format.depth == Depth::kShort) {

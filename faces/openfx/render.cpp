@@ -102,18 +102,42 @@ class FrameRender {
         }
     }
 
+    // The part of the picture that is written.
+    [[nodiscard]] OfxRectI Inside() const {
+        return Intersection(m_window, Intersection(m_region, m_source.Bounds()));
+    }
+
     void Render(const Canvas& source, const Canvas& result) const {
+        const OfxRectI inside = Inside();
+        if (inside.x1 >= inside.x2 || inside.y1 >= inside.y2) return;
         const auto session = m_instance.Session(m_values);
         const double seconds = m_instance.ClipSeconds(m_time, m_values.startFrame);
-        if (m_format.work != WorkKind::kBytes) throw ActionFailed{kOfxStatErrImageFormat};
         const auto step = static_cast<std::int32_t>(source.RowBytes());
-        const FrameRecord from = {source.Data(), source.Width(), source.Height(), step, 0, 0, 0};
-        const FrameRecord to = {result.Data(), result.Width(), result.Height(), step, 0, 0, 0};
-        if (!session->Render(from, to, seconds)) throw ActionFailed{kOfxStatFailed};
+        bool isRendered = false;
+        if (m_format.work == WorkKind::kBytes) {
+            const FrameRecord from = {source.Data(), source.Width(), source.Height(), step, 0, 0, 0};
+            const FrameRecord to = {result.Data(), result.Width(), result.Height(), step, 0, 0, 0};
+            isRendered = session->Render(from, to, seconds);
+        } else {
+            const render::DeepFormat format = {m_format.work == WorkKind::kShorts
+                                                   ? render::DeepSamples::kUnsigned16
+                                                   : render::DeepSamples::kFloat,
+                                               m_format.channels, m_format.isDividedByRenderer};
+            const render::Rectangle window = {m_region.y2 - inside.y2, m_region.y2 - inside.y1,
+                                              inside.x1 - m_region.x1, inside.x2 - m_region.x1};
+            isRendered = session->RenderDeep({source.Width(),
+                                              source.Height(),
+                                              format,
+                                              {source.Data(), step},
+                                              {result.Data(), step},
+                                              window},
+                                             seconds);
+        }
+        if (!isRendered) throw ActionFailed{kOfxStatFailed};
     }
 
     void Store(const Canvas& result) const {
-        const OfxRectI inside = Intersection(m_window, Intersection(m_region, m_source.Bounds()));
+        const OfxRectI inside = Inside();
         const std::size_t pixelBytes = m_format.HostBytes();
         const auto width = static_cast<std::size_t>(m_window.x2 - m_window.x1);
         const HostMemory shares(m_instance.Host(), m_instance.Handle(), width * sizeof(float));

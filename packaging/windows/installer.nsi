@@ -1,10 +1,11 @@
 ; The Windows installer. Built by packaging/pack-windows, which defines VERSION, STAGE (the folder of files to install),
 ; LISTS (the folder of the two generated lists), KILOBYTES (the size of the files) and OUTPUT.
 ;
-;   setup.exe [/S] [/AllUsers | /CurrentUser] [/D=folder]
+;   setup.exe [/S] [/AllUsers | /CurrentUser] [/OpenFX] [/D=folder]
 ;
 ; /S shows no dialogs. Unless one of the two is given, a run with administrator rights installs for all users, any other
-; for the current user. /D= comes last and is never quoted. Exit codes: 0 done, 1 cancelled by the user, 2 nothing was
+; for the current user. /OpenFX chooses the OpenFX plug-ins, which are left out otherwise: their hosts look in one folder for
+; all users, so they need 64-bit Windows and an installation for all users. /D= comes last and is never quoted. Exit codes: 0 done, 1 cancelled by the user, 2 nothing was
 ; changed because a program is using the library, or a file could not be written.
 ;
 ; The library needs no registry entries: users choose its folder in the editor. The only entries are the uninstaller's, whose
@@ -33,6 +34,9 @@ ManifestDPIAware true
 !include MultiUser.nsh
 !include MUI2.nsh
 !include LogicLib.nsh
+!include FileFunc.nsh
+!include x64.nsh
+!include Sections.nsh
 
 Name "${PRODUCT}"
 OutFile "${OUTPUT}"
@@ -47,12 +51,14 @@ VIAddVersionKey "CompanyName" "Velmora"
 VIAddVersionKey "LegalCopyright" "Copyright Velmora. MIT licence."
 
 !define MUI_ABORTWARNING
+!define MUI_COMPONENTSPAGE_NODESC
 !define MUI_FINISHPAGE_SHOWREADME "$INSTDIR\README.txt"
 !define MUI_FINISHPAGE_SHOWREADME_TEXT "Show how to use it in a video editor"
 
 !insertmacro MUI_PAGE_WELCOME
 !insertmacro MUI_PAGE_LICENSE "${STAGE}/LICENSE.txt"
 !insertmacro MULTIUSER_PAGE_INSTALLMODE
+!insertmacro MUI_PAGE_COMPONENTS
 !insertmacro MUI_PAGE_DIRECTORY
 !insertmacro MUI_PAGE_INSTFILES
 !insertmacro MUI_PAGE_FINISH
@@ -77,21 +83,25 @@ Var EarlierFolder
     ${EndIf}
 !macroend
 
+; Where OpenFX hosts look.
+!define OPENFX_FOLDER "$COMMONFILES64\OFX\Plugins"
+!define OPENFX_BUNDLE "VelmoraReelEffects.ofx.bundle"
+!macro REMOVE_OPENFX
+    ReadRegDWORD $0 SHCTX "${UNINSTALL_KEY}" "OpenFX"
+    ${If} $0 == 1
+        RMDir /r "${OPENFX_FOLDER}\${OPENFX_BUNDLE}"
+        RMDir "${OPENFX_FOLDER}"
+        RMDir "$COMMONFILES64\OFX"
+    ${EndIf}
+!macroend
+
 !define OPEN_WITH_KEY "Software\Classes\Applications\reelview.exe"
 !macro OFFER_FOR EXTENSION
     WriteRegStr SHCTX "${OPEN_WITH_KEY}\SupportedTypes" "${EXTENSION}" ""
 !macroend
 
-Function .onInit
-    ; MULTIUSER_INIT replaces $INSTDIR with the default folder of its mode.
-    StrCpy $GivenFolder $INSTDIR
-    !insertmacro MULTIUSER_INIT
-    ${If} $GivenFolder != ""
-        StrCpy $INSTDIR $GivenFolder
-    ${EndIf}
-FunctionEnd
-
-Section
+Section "${PRODUCT}"
+    SectionIn RO
     ReadRegStr $EarlierFolder SHCTX "${UNINSTALL_KEY}" "InstallLocation"
     !insertmacro STOP_WHEN_IN_USE "$INSTDIR"
     ${If} $EarlierFolder != ""
@@ -136,6 +146,38 @@ Section
     WriteRegDWORD SHCTX "${UNINSTALL_KEY}" "NoRepair" 1
 SectionEnd
 
+Section /o "OpenFX plug-ins (64-bit, for all users)" OpenFX
+    ${If} ${RunningX64}
+    ${AndIf} $MultiUser.InstallMode == "AllUsers"
+        SetOutPath "${OPENFX_FOLDER}"
+        File /r "${STAGE}/64-bit/${OPENFX_BUNDLE}"
+        SetOutPath "$INSTDIR"
+        WriteRegDWORD SHCTX "${UNINSTALL_KEY}" "OpenFX" 1
+    ${Else}
+        DetailPrint "The OpenFX plug-ins need 64-bit Windows and an installation for all users."
+    ${EndIf}
+SectionEnd
+
+Function .onInit
+    ; MULTIUSER_INIT replaces $INSTDIR with the default folder of its mode.
+    StrCpy $GivenFolder $INSTDIR
+    !insertmacro MULTIUSER_INIT
+    ${If} $GivenFolder != ""
+        StrCpy $INSTDIR $GivenFolder
+    ${EndIf}
+    ; An update keeps what was chosen before.
+    ReadRegDWORD $0 SHCTX "${UNINSTALL_KEY}" "OpenFX"
+    ${If} $0 == 1
+        !insertmacro SelectSection ${OpenFX}
+    ${EndIf}
+    ${GetParameters} $0
+    ClearErrors
+    ${GetOptions} $0 "/OpenFX" $1
+    ${IfNot} ${Errors}
+        !insertmacro SelectSection ${OpenFX}
+    ${EndIf}
+FunctionEnd
+
 ; There may be an installation for all users and one for each user. The uninstaller always removes the one that it belongs
 ; to, and the entry that names its folder.
 Function un.onInit
@@ -165,6 +207,7 @@ Section Uninstall
     ${EndIf}
     ReadRegStr $0 SHCTX "${UNINSTALL_KEY}" "InstallLocation"
     ${If} $0 == $INSTDIR
+        !insertmacro REMOVE_OPENFX
         Delete "$SMPROGRAMS\Velmora Reel View.lnk"
         DeleteRegKey SHCTX "${OPEN_WITH_KEY}"
         DeleteRegKey /ifempty SHCTX "Software\Classes\Applications"

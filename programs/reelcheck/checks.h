@@ -67,6 +67,7 @@ void CheckOpenfxLoading(CheckContext& context);
 
 // checks_openfx_frames.cpp
 void CheckOpenfxFirstFrames(CheckContext& context);
+void CheckOpenfxSpaces(CheckContext& context);
 void CheckOpenfxLayouts(CheckContext& context);
 void CheckOpenfxParts(CheckContext& context);
 void CheckOpenfxRefused(CheckContext& context);

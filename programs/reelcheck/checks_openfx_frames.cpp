@@ -9,6 +9,8 @@
 namespace velmora::reelcheck {
 namespace {
 
+constexpr const char* kDepths[] = {kOfxBitDepthByte, kOfxBitDepthShort, kOfxBitDepthFloat};
+
 // Whether `part` of two pictures is equal, and everything else in the first still has the fill byte.
 bool IsOnlyInside(const HostPicture& picture, const HostPicture& whole, const OfxRectI& part,
                   std::uint8_t fill, int field = -1) {
@@ -33,15 +35,17 @@ void CheckOpenfxFirstFrames(CheckContext& context) {
     const OpenfxModule module(context.bundlePath);
     for (int i = 0; i < module.Count(); ++i) {
         OpenfxPlugin plugin(module, i);
-        for (const char* components : {kOfxImageComponentRGBA, kOfxImageComponentRGB}) {
+        for (int format = 0; format < 6; ++format) {
             PictureShape shape = Plain(97, 61);
-            shape.components = components;
+            shape.depth = kDepths[format % 3];
+            shape.components = format < 3 ? kOfxImageComponentRGBA : kOfxImageComponentRGB;
             HostPicture source(shape), output(shape), expected(shape);
-            source.Paint(context.dice);
+            source.Paint(context.dice, true);
             OpenfxInstance instance(plugin);
             instance.Param("seed").values[0] = kSeed;
             for (std::uint32_t preset = 0; preset < plugin.Effect().presetNames.size(); ++preset) {
-                SetPlace("%s, %s, %s", plugin.Effect().name, plugin.Effect().presetNames[preset], components);
+                SetPlace("%s, %s, %s, %s", plugin.Effect().name, plugin.Effect().presetNames[preset],
+                         shape.depth, shape.components);
                 instance.ChoosePreset(preset);
                 instance.RenderWhole(source, output, kTime);
                 RenderExpected(plugin.Effect(), preset, kSeed, kSeconds, source, expected);
@@ -52,12 +56,78 @@ void CheckOpenfxFirstFrames(CheckContext& context) {
     RequireNothingHeld();
 }
 
+// Light values come out as the display values would, premultiplied ones as if they were not.
+void CheckOpenfxSpaces(CheckContext& context) {
+    enum Space { kDisplay, kLinearSrgb, kLinear24, kNone };
+    const auto toLight = [](int space, double v) {
+        if (space == kLinear24) return std::pow(v, 2.4);
+        return v <= 0.04045 ? v / 12.92 : std::pow((v + 0.055) / 1.055, 2.4);
+    };
+    const OpenfxModule module(context.bundlePath);
+    Busy busy(module, 1);
+    for (const char* depth : kDepths) {
+        for (const int space : {kDisplay, kLinearSrgb, kLinear24}) {
+            for (const bool isPremultiplied : {false, true}) {
+                SetPlace("%s, space %d%s", depth, space, isPremultiplied ? ", premultiplied" : "");
+                PictureShape shape = Plain(40, 24);
+                shape.depth = kOfxBitDepthFloat;
+                HostPicture display(shape), expected(shape);
+                display.Paint(context.dice);
+                RenderExpected(busy.plugin.Effect(), Busy::kPreset, kSeed, kSeconds, display, expected);
+                shape.depth = depth;
+                shape.isPremultiplied = isPremultiplied;
+                HostPicture source(shape), output(shape);
+                const auto coded = [&](const HostPicture& from, int x, int y, int c) {
+                    const double value = from.Sample(x, y, c), alpha = from.Sample(x, y, 3);
+                    if (c == 3) return value;
+                    return (space == kDisplay ? value : toLight(space, value)) *
+                           (isPremultiplied ? alpha : 1.0);
+                };
+                for (int p = 0; p < 40 * 24 * 4; ++p) {
+                    source.SetSample(p / 4 % 40, p / 160, p % 4, coded(display, p / 4 % 40, p / 160, p % 4));
+                }
+                busy.instance.Param("workingSpace").values[0] = space;
+                busy.instance.RenderWhole(source, output, kTime);
+                // What the source's samples round away is amplified by the curves and by dividing by small alphas, so
+                // shallow pictures are compared where they are opaque and not dark.
+                const bool isFloat = shape.SampleBytes() == 4;
+                const double most = isFloat ? 0.0005 : shape.SampleBytes() == 2 ? 0.01 : 0.08;
+                for (int y = 0; y < 24; ++y) {
+                    for (int x = 0; x < 40; ++x) {
+                        if (display.Sample(x, y, 3) < (isFloat ? 0.05 : 1.0)) continue;
+                        for (int c = 0; c < 4; ++c) {
+                            const double difference = output.Sample(x, y, c) - coded(expected, x, y, c);
+                            if (!isFloat && c < 3 && display.Sample(x, y, c) < 0.2) continue;
+                            if (std::abs(difference) > most)
+                                Fail(Text("%g away at %d,%d,%d", difference, x, y, c));
+                        }
+                    }
+                }
+            }
+        }
+    }
+    // Taken as it is: what alpha says does not matter.
+    busy.instance.Param("workingSpace").values[0] = kNone;
+    PictureShape shape = Plain(20, 10);
+    HostPicture straight(shape), one(shape);
+    shape.isPremultiplied = true;
+    HostPicture multiplied(shape), other(shape);
+    straight.Paint(context.dice);
+    for (int y = 0; y < 10; ++y) std::copy_n(straight.Pixel(0, y), 80, multiplied.Pixel(0, y));
+    busy.instance.RenderWhole(straight, one, kTime);
+    busy.instance.RenderWhole(multiplied, other, kTime);
+    Require(one.IsSameAs(other), "values are not taken as they are");
+    RequireNothingHeld();
+}
+
 void CheckOpenfxLayouts(CheckContext& context) {
     const OpenfxModule module(context.bundlePath);
     for (int i = 0; i < module.Count(); ++i) {
         Busy busy(module, i);
         for (int round = 0; round < context.Rounds(60, 2000); ++round) {
             PictureShape shape = Plain(context.dice.Between(1, 40), context.dice.Between(1, 24));
+            shape.depth = kDepths[round % 3];
+            shape.components = context.dice.OneIn(2) ? kOfxImageComponentRGBA : kOfxImageComponentRGB;
             HostPicture plain(shape), expected(shape);
             plain.Paint(context.dice);
             busy.instance.RenderWhole(plain, expected, kTime);
@@ -71,7 +141,7 @@ void CheckOpenfxLayouts(CheckContext& context) {
             shape.isTopDown = context.dice.OneIn(2);
             HostPicture output(shape), whole(shape);
             for (int y = 0; y < shape.Height(); ++y) {
-                const auto bytes = static_cast<std::size_t>(shape.Width() * 4);
+                const auto bytes = static_cast<std::size_t>(shape.Width() * plain.PixelBytes());
                 std::copy_n(plain.Pixel(0, y), bytes, source.Pixel(dx, dy + y));
                 std::copy_n(expected.Pixel(0, y), bytes, whole.Pixel(dx, dy + y));
             }

@@ -4,7 +4,7 @@
 #include <cmath>
 #include <set>
 
-#include "effects/effect_queries.h"
+#include "effects/effect_names.h"
 #include "programs/reelcheck/checks.h"
 #include "programs/reelcheck/openfx_host.h"
 #include "programs/reelcheck/process_figures.h"
@@ -87,7 +87,7 @@ void CheckParams(HostEffect& effect, const effects::EffectTable& table) {
     }
     for (std::uint32_t i = 0; i < table.params.size(); ++i) {
         if (!effects::HoldsValue(table.params[i])) continue;
-        const std::string title = effects::DistinctName(table, i);
+        const std::string title = effects::UniqueName(table, table.params[i]);
         Require(labels.contains(title), ("no parameter is called " + title).c_str());
     }
     HostParam* const preset = effect.params.Find("preset");
@@ -99,7 +99,9 @@ void CheckParams(HostEffect& effect, const effects::EffectTable& table) {
 void CheckDescriptor(PropertySet& p) {
     for (const char* context : kContexts)
         Require(Has(p, kOfxImageEffectPropSupportedContexts, context), context);
-    Require(Has(p, kOfxImageEffectPropSupportedPixelDepths, kOfxBitDepthByte), "no 8-bit pictures");
+    for (const char* depth : {kOfxBitDepthByte, kOfxBitDepthShort, kOfxBitDepthFloat}) {
+        Require(Has(p, kOfxImageEffectPropSupportedPixelDepths, depth), depth);
+    }
     Require(!p.Text(kOfxPropLabel).empty() && !p.Text(kOfxImageEffectPluginPropGrouping).empty(), "no name");
     Require(p.Text(kOfxImageEffectPluginRenderThreadSafety) == kOfxImageEffectRenderFullySafe,
             "not safe in threads");

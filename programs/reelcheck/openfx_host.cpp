@@ -128,6 +128,8 @@ OpenfxInstance::~OpenfxInstance() {
     if (m_plugin.Call(kOfxActionDestroyInstance, m_effect.Handle()) != kOfxStatOK) {
         Complain("an instance cannot be destroyed");
     }
+    const auto& data = m_effect.properties.Values(kOfxPropInstanceData);
+    if (data.size() != 1 || std::get<void*>(data.front()) != nullptr) Complain("an instance stays when it is destroyed");
 }
 
 HostParam& OpenfxInstance::Param(std::string_view name) {
@@ -195,36 +197,59 @@ void RequireNothingHeld() {
     if (State().blocks != 0) Fail(Text("%d blocks of memory are not freed", State().blocks.exchange(0)));
 }
 
-void RenderExpected(const effects::EffectTable& effect, std::uint32_t preset, std::uint32_t seed,
-                    double seconds, const HostPicture& source, HostPicture& expected) {
-    const OfxRectI bounds = source.shape.bounds;
-    const int width = source.shape.Width(), height = source.shape.Height(),
-              channels = source.shape.Channels();
-    std::vector<std::uint8_t> from(static_cast<std::size_t>(width * height * 4)), to(from.size());
-    const auto at = [&](std::vector<std::uint8_t>& pixels, int x, int y) {
-        return &pixels[static_cast<std::size_t>(((bounds.y2 - 1 - y) * width + x - bounds.x1) * 4)];
-    };
-    for (int y = bounds.y1; y < bounds.y2; ++y) {
-        for (int x = bounds.x1; x < bounds.x2; ++x) {
-            const std::uint8_t* const pixel = source.Pixel(x, y);
-            std::uint8_t* const own = at(from, x, y);
-            own[0] = pixel[2], own[1] = pixel[1], own[2] = pixel[0], own[3] = channels == 4 ? pixel[3] : 255;
+namespace {
+
+// Copies a picture from or to rows without padding, from the top. 8-bit pixels are the library's there.
+template <bool kIsLoading>
+void CopyRows(const HostPicture& picture, std::vector<std::uint8_t>& rows) {
+    const OfxRectI bounds = picture.shape.bounds;
+    const bool isByte = picture.shape.SampleBytes() == 1;
+    const bool hasAlpha = picture.shape.Channels() == 4;
+    const std::size_t pixelBytes = isByte ? 4 : static_cast<std::size_t>(picture.PixelBytes());
+    if (kIsLoading)
+        rows.resize(static_cast<std::size_t>(picture.shape.Width() * picture.shape.Height()) * pixelBytes);
+    std::uint8_t* own = rows.data();
+    for (int y = bounds.y2 - 1; y >= bounds.y1; --y) {
+        for (int x = bounds.x1; x < bounds.x2; ++x, own += pixelBytes) {
+            std::uint8_t* const pixel = picture.Pixel(x, y);
+            if (!isByte) {
+                std::memcpy(kIsLoading ? own : pixel, kIsLoading ? pixel : own, pixelBytes);
+            } else if (kIsLoading) {
+                own[0] = pixel[2], own[1] = pixel[1], own[2] = pixel[0], own[3] = hasAlpha ? pixel[3] : 255;
+            } else {
+                pixel[0] = own[2], pixel[1] = own[1], pixel[2] = own[0];
+                if (hasAlpha) pixel[3] = own[3];
+            }
         }
     }
+}
+
+}  // namespace
+
+void RenderExpected(const effects::EffectTable& effect, std::uint32_t preset, std::uint32_t seed,
+                    double seconds, const HostPicture& source, HostPicture& expected) {
+    const int width = source.shape.Width(), height = source.shape.Height();
+    std::vector<std::uint8_t> from;
+    CopyRows<true>(source, from);
+    std::vector<std::uint8_t> to(from.size());
+    const auto step = static_cast<std::int32_t>(from.size()) / height;
     const auto session = effects::EffectSession::Create(effect);
     session->ApplyPreset(preset);
     session->PinRandom(seed);
-    const FrameRecord fromRecord = {from.data(), width, height, width * 4, 0, 0, 0};
-    const FrameRecord toRecord = {to.data(), width, height, width * 4, 0, 0, 0};
-    Require(session->Render(fromRecord, toRecord, seconds), "the core does not render");
-    for (int y = bounds.y1; y < bounds.y2; ++y) {
-        for (int x = bounds.x1; x < bounds.x2; ++x) {
-            std::uint8_t* const pixel = expected.Pixel(x, y);
-            const std::uint8_t* const own = at(to, x, y);
-            pixel[0] = own[2], pixel[1] = own[1], pixel[2] = own[0];
-            if (channels == 4) pixel[3] = own[3];
-        }
+    if (source.shape.SampleBytes() == 1) {
+        Require(session->Render({from.data(), width, height, step, 0, 0, 0},
+                                {to.data(), width, height, step, 0, 0, 0}, seconds),
+                "the core does not render");
+    } else {
+        const render::DeepFormat format = {
+            source.shape.SampleBytes() == 2 ? render::DeepSamples::kUnsigned16 : render::DeepSamples::kFloat,
+            source.shape.Channels(), source.shape.isPremultiplied};
+        Require(session->RenderDeep(
+                    render::DeepFrame::Whole(width, height, format, {from.data(), step}, {to.data(), step}),
+                    seconds),
+                "the core does not render");
     }
+    CopyRows<false>(expected, to);
 }
 
 }  // namespace velmora::reelcheck

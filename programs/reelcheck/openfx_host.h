@@ -97,8 +97,7 @@ class OpenfxInstance {
 // After a check: nothing is held, and nothing was complained of.
 void RequireNothingHeld();
 
-// What the effect makes of an 8-bit picture: by the linked core, which is what reelfx uses. Frames of `frameRate` are
-// numbered from 0. The preset's values, or the defaults where there is no such preset.
+// What the effect makes of a picture with a preset: by the linked core, which is what reelfx uses.
 void RenderExpected(const effects::EffectTable& effect, std::uint32_t preset, std::uint32_t seed,
                     double seconds, const HostPicture& source, HostPicture& expected);
 

@@ -21,6 +21,8 @@ DEB_FILES = [*(f"usr/bin/{name}" for name in NAMES), *(f"usr/share/man/man1/{nam
              "usr/share/zsh/vendor-completions/_reelfx", "usr/share/fish/vendor_completions.d/reelfx.fish",
              "usr/share/velmora-reel-effects/reel.html",
              *(f"usr/lib/frei0r-1/{name}.so" for name in PLUGINS),
+             *(f"usr/OFX/Plugins/VelmoraReelEffects.ofx.bundle/Contents/{name}" for name in
+               ("Info.plist", "Linux-x86-64/VelmoraReelEffects.ofx")),
              *(f"usr/share/mlt-7/frei0r/filter_frei0r.{name}.yml" for name in PLUGINS),
              *(f"usr/share/kdenlive/effects/{name}.xml" for name in PLUGINS),
              *(f"usr/share/velmora-reel-effects/kdenlive/presets/frei0r.{name}.json" for name in PLUGINS),

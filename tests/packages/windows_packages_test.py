@@ -20,6 +20,9 @@ WINE = ROOT / "scripts" / "wine32"
 MUST_HAVE = """VMReelEffects.dll VMLang.dll VMReelEffectsLang.xml resources.dll VMReelEffects.chm reelhost.exe reelview.exe reelcheck.exe
     frei0r/velmora_film_camera.dll frei0r/velmora_film_look.dll frei0r/velmora_film_damage.dll
     frei0r/velmora_film_express.dll frei0r/velmora_film_pro.dll sdk/host_api.h sdk/example_host.cpp docs/hosts.txt
+    64-bit/reelcheck.exe 64-bit/frei0r/velmora_film_pro.dll docs/openfx.txt
+    64-bit/VelmoraReelEffects.ofx.bundle/Contents/Info.plist
+    64-bit/VelmoraReelEffects.ofx.bundle/Contents/Win64/VelmoraReelEffects.ofx
     docs/help/start.html README.txt reel.html LICENSE.txt third-party.txt SHA256SUMS""".split()
 UNINSTALL = r"Software\Microsoft\Windows\CurrentVersion\Uninstall"
 OWN_KEY = UNINSTALL + r"\VelmoraReelEffects"
@@ -109,7 +112,10 @@ def check_zip(path, work):
     assert {name: files.get(name) for name in files_below(DIST)} == files_below(DIST), "not what was built"
     check_digest_list(unpacked)
     check_no_build_paths(unpacked)
-    for module in [*unpacked.glob("*.dll"), *unpacked.glob("*.exe"), *unpacked.glob("frei0r/*.dll")]:
+    # The OpenFX plug-ins as they lie in the package, by the program beside them.
+    run(ROOT / "scripts" / "wine64", unpacked / "64-bit" / "reelcheck.exe", "--level", "1", "--seed", "1")
+    for module in [*unpacked.glob("*.dll"), *unpacked.glob("*.exe"), *unpacked.glob("**/frei0r/*.dll"),
+                   *unpacked.glob("64-bit/*.exe"), *unpacked.glob("**/*.ofx")]:
         head = module.read_bytes()[:0x400]
         stamp = head.index(b"PE\0\0") + 8
         assert head[stamp:stamp + 4] == bytes(4), f"{module.name} bears the time of its build"
