@@ -23,8 +23,8 @@ FAULTS = {
     "many-steps": ("openfx-presets", "one step"),
     "never-neutral": ("openfx-identity", "defaults change"),
     "ignores-fields": ("openfx-fields", "rows of the field"),
-    "never-stops": ("openfx-abort", "goes on"),
-    "shares-state": ("openfx-threads", "is not rendered"),
+    "never-stops": ("openfx-abort", "asks too rarely"),
+    "shares-state": ("openfx-threads", "differs"),
     "stays": ("openfx-presets", "stays when it is destroyed"),
 }
 
