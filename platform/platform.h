@@ -24,6 +24,9 @@ void UnloadModule(ModuleHandle module) noexcept;
 // there is not enough memory.
 [[nodiscard]] std::u16string ModuleFolder(ModuleHandle module) noexcept;
 
+// The language that the user reads, as the two lower-case letters of ISO 639; "en" when unknown.
+[[nodiscard]] std::string UserLanguage();
+
 // The path of the module that holds a code address, in the system's 8-bit text; empty when unknown.
 [[nodiscard]] std::string ModuleAt(const void* address);
 

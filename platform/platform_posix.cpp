@@ -1,6 +1,7 @@
 #include <dlfcn.h>
 
 #include <chrono>
+#include <cstdlib>
 #include <filesystem>
 #include <system_error>
 
@@ -38,6 +39,18 @@ std::u16string ModuleFolder(ModuleHandle) noexcept try {
     return error ? std::u16string() : (program.parent_path() / "").u16string();
 } catch (...) {
     return {};
+}
+
+std::string UserLanguage() {
+    for (const char* name : {"LC_ALL", "LC_MESSAGES", "LANG"}) {
+        const char* const value = std::getenv(name);
+        if (value == nullptr || *value == 0) continue;
+        const std::string locale = value;
+        const auto isLetter = [](char c) { return c >= 'a' && c <= 'z'; };
+        if (locale.size() >= 2 && isLetter(locale[0]) && isLetter(locale[1])) return locale.substr(0, 2);
+        break;
+    }
+    return "en";
 }
 
 std::string ModuleAt(const void* address) {

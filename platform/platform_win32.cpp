@@ -55,6 +55,12 @@ std::u16string ModuleFolder(ModuleHandle module) noexcept try {
     return {};
 }
 
+std::string UserLanguage() {
+    char code[9] = {};
+    const LCID locale = MAKELCID(GetUserDefaultUILanguage(), SORT_DEFAULT);
+    return GetLocaleInfoA(locale, LOCALE_SISO639LANGNAME, code, sizeof code) == 3 ? code : "en";
+}
+
 std::string ModuleAt(const void* address) {
     const HMODULE module = Holding(address);
     if (module == nullptr) return "";

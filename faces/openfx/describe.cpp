@@ -3,6 +3,8 @@
 #include <string>
 
 #include "faces/openfx/plugin_params.h"
+#include "faces/openfx/plugin_texts.h"
+#include "platform/platform.h"
 
 namespace velmora::hosts::openfx {
 namespace {
@@ -45,7 +47,7 @@ class ParamDefiner {
 
     void Define(const PluginParam& param, const effects::EffectTable& effect) const {
         const Properties properties = Define(param.type, param.name);
-        properties.Set(kOfxPropLabel, param.label.c_str());
+        properties.Set(kOfxPropLabel, LabelOf(m_language, param.label).c_str());
         if (!param.hint.empty()) properties.Offer(kOfxParamPropHint, param.hint.c_str());
         if (!param.parent.empty()) properties.Offer(kOfxParamPropParent, param.parent.c_str());
         DefineValue(param, effect, properties);
@@ -56,7 +58,7 @@ class ParamDefiner {
     void DefinePage(const char* name, const char* label, const std::vector<PluginParam>& params,
                     std::size_t first, std::size_t end, int place) const {
         const Properties page = Define(kOfxParamTypePage, name);
-        page.Set(kOfxPropLabel, label);
+        page.Set(kOfxPropLabel, LabelOf(m_language, label).c_str());
         int child = 0;
         for (std::size_t i = first; i < end; ++i) {
             if (params[i].role == ParamRole::kGroup) continue;
@@ -74,8 +76,8 @@ class ParamDefiner {
         return {m_suites, handle};
     }
 
-    static void DefineValue(const PluginParam& param, const effects::EffectTable& effect,
-                            const Properties& properties) {
+    void DefineValue(const PluginParam& param, const effects::EffectTable& effect,
+                     const Properties& properties) const {
         const std::string_view type = param.type;
         const int standard = static_cast<int>(param.standard);
         if (type == kOfxParamTypeDouble) {
@@ -87,7 +89,10 @@ class ParamDefiner {
             properties.Set(kOfxParamPropMax, static_cast<int>(param.maximum));
         } else if (type == kOfxParamTypeChoice) {
             for (std::size_t i = 0; i < param.choices.size(); ++i) {
-                properties.Set(kOfxParamPropChoiceOption, param.choices[i].c_str(), static_cast<int>(i));
+                // A preset's name is a name.
+                const bool isNamed = param.role == ParamRole::kPreset && i > 0;
+                const std::string item = isNamed ? param.choices[i] : LabelOf(m_language, param.choices[i]);
+                properties.Set(kOfxParamPropChoiceOption, item.c_str(), static_cast<int>(i));
             }
             properties.Set(kOfxParamPropDefault, standard);
         } else if (type == kOfxParamTypeBoolean) {
@@ -120,6 +125,7 @@ class ParamDefiner {
     }
 
     const Suites& m_suites;
+    const std::string m_language = support::UserLanguage();
     OfxParamSetHandle m_params = nullptr;
 };
 

@@ -8,6 +8,7 @@
 #include "programs/reelcheck/checks.h"
 #include "programs/reelcheck/openfx_host.h"
 #include "programs/reelcheck/process_figures.h"
+#include "text/names.h"
 
 namespace velmora::reelcheck {
 namespace {
@@ -71,7 +72,6 @@ void CheckParam(HostEffect& effect, HostParam& param) {
 // Every parameter that a user can set is on one page, and those of the effect are as in its table.
 void CheckParams(HostEffect& effect, const effects::EffectTable& table) {
     std::multiset<std::string> onPages;
-    std::set<std::string> labels;
     for (const auto& param : effect.params.params) {
         CheckParam(effect, *param);
         if (param->type == kOfxParamTypePage) {
@@ -79,7 +79,6 @@ void CheckParams(HostEffect& effect, const effects::EffectTable& table) {
                 onPages.insert(std::get<std::string>(child));
             }
         }
-        labels.insert(param->properties.Text(kOfxPropLabel));
     }
     for (const auto& param : effect.params.params) {
         if (param->Dimension() > 0 && onPages.count(param->name) != 1)
@@ -88,7 +87,8 @@ void CheckParams(HostEffect& effect, const effects::EffectTable& table) {
     for (std::uint32_t i = 0; i < table.params.size(); ++i) {
         if (!effects::HoldsValue(table.params[i])) continue;
         const std::string title = effects::UniqueName(table, table.params[i]);
-        Require(labels.contains(title), ("no parameter is called " + title).c_str());
+        const auto isIt = [&](const auto& param) { return IsSameName(param->name, title); };
+        Require(std::ranges::any_of(effect.params.params, isIt), ("no parameter is called " + title).c_str());
     }
     HostParam* const preset = effect.params.Find("preset");
     Require(preset != nullptr && preset->properties.Count(kOfxParamPropChoiceOption) ==

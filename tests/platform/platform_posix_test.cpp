@@ -6,6 +6,7 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <cstdlib>
 #include <filesystem>
 
 #include "tests/presets/temporary_folder.h"
@@ -34,6 +35,22 @@ TEST(Platform, KnowsTheProgramsFolder) {
     const std::filesystem::path folder(ModuleFolder(nullptr));
     EXPECT_TRUE(std::filesystem::exists(folder / "platform_test")) << folder;
     EXPECT_EQ(ModuleFolder(nullptr).back(), u'/');
+}
+
+TEST(Platform, ReadsTheLanguageFromTheFirstVariableThatIsSet) {
+    struct Row {
+        const char *all, *messages, *lang, *expected;
+    };
+    const Row rows[] = {
+        {"de_DE.UTF-8", "fr_FR", "es", "de"}, {"", "fr_FR.UTF-8", "es", "fr"}, {"", "", "zh_CN.UTF-8", "zh"},
+        {"C.UTF-8", "fr", "fr", "en"},        {"POSIX", "", "", "en"},         {"", "", "", "en"},
+    };
+    for (const Row& row : rows) {
+        setenv("LC_ALL", row.all, 1);
+        setenv("LC_MESSAGES", row.messages, 1);
+        setenv("LANG", row.lang, 1);
+        EXPECT_EQ(UserLanguage(), row.expected) << row.all << ' ' << row.messages << ' ' << row.lang;
+    }
 }
 
 }  // namespace
