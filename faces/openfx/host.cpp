@@ -18,27 +18,27 @@ bool AreThere(Function... function) {
 }  // namespace
 
 Suites FetchSuites(const OfxHost* host) {
-    constexpr ActionFailed kMissing = {kOfxStatErrMissingHostFeature};
-    if (host == nullptr || host->fetchSuite == nullptr) throw kMissing;
+    if (host == nullptr || host->fetchSuite == nullptr) throw ActionFailed{kOfxStatErrMissingHostFeature};
     const Suites suites = {.property = Fetch<OfxPropertySuiteV1>(*host, kOfxPropertySuite),
                            .effect = Fetch<OfxImageEffectSuiteV1>(*host, kOfxImageEffectSuite),
                            .parameter = Fetch<OfxParameterSuiteV1>(*host, kOfxParameterSuite),
                            .memory = Fetch<OfxMemorySuiteV1>(*host, kOfxMemorySuite)};
-    if (!AreThere(suites.property, suites.effect, suites.parameter)) throw kMissing;
+    if (!AreThere(suites.property, suites.effect, suites.parameter))
+        throw ActionFailed{kOfxStatErrMissingHostFeature};
     const OfxPropertySuiteV1& p = *suites.property;
     if (!AreThere(p.propSetPointer, p.propSetString, p.propSetDouble, p.propSetInt, p.propSetDoubleN) ||
         !AreThere(p.propGetPointer, p.propGetString, p.propGetDouble, p.propGetInt, p.propGetIntN)) {
-        throw kMissing;
+        throw ActionFailed{kOfxStatErrMissingHostFeature};
     }
     const OfxImageEffectSuiteV1& e = *suites.effect;
     if (!AreThere(e.getPropertySet, e.getParamSet, e.clipDefine, e.clipGetHandle, e.clipGetPropertySet) ||
         !AreThere(e.clipGetImage, e.clipReleaseImage, e.clipGetRegionOfDefinition, e.abort)) {
-        throw kMissing;
+        throw ActionFailed{kOfxStatErrMissingHostFeature};
     }
     const OfxParameterSuiteV1& q = *suites.parameter;
     if (!AreThere(q.paramDefine, q.paramGetHandle, q.paramSetGetPropertySet, q.paramGetValue) ||
         !AreThere(q.paramGetValueAtTime, q.paramSetValue, q.paramEditBegin, q.paramEditEnd)) {
-        throw kMissing;
+        throw ActionFailed{kOfxStatErrMissingHostFeature};
     }
     return suites;
 }

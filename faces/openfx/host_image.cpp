@@ -5,21 +5,20 @@
 namespace velmora::hosts::openfx {
 namespace {
 
-constexpr ActionFailed kWrongFormat = {kOfxStatErrImageFormat};
 constexpr int kLargestSide = 1 << 20;
 
 Depth DepthOf(std::string_view name) {
     if (name == kOfxBitDepthByte) return Depth::kByte;
     if (name == kOfxBitDepthShort) return Depth::kShort;
     if (name == kOfxBitDepthFloat) return Depth::kFloat;
-    throw kWrongFormat;
+    throw ActionFailed{kOfxStatErrImageFormat};
 }
 
 int ChannelsOf(std::string_view components) {
     if (components == kOfxImageComponentRGBA) return 4;
     if (components == kOfxImageComponentRGB) return 3;
     if (components == kOfxImageComponentAlpha) return 1;
-    throw kWrongFormat;
+    throw ActionFailed{kOfxStatErrImageFormat};
 }
 
 bool IsPossible(const OfxRectI& r) {
@@ -52,7 +51,7 @@ void HostImage::Read(const Properties& image) {
     const auto bounds = image.Rectangle(kOfxImagePropBounds);
     const auto rowBytes = image.Int(kOfxImagePropRowBytes);
     m_data = static_cast<std::byte*>(image.Pointer(kOfxImagePropData));
-    if (!bounds || !rowBytes || m_data == nullptr) throw kWrongFormat;
+    if (!bounds || !rowBytes || m_data == nullptr) throw ActionFailed{kOfxStatErrImageFormat};
     m_bounds = *bounds;
     m_rowBytes = *rowBytes;
     m_depth = DepthOf(image.Text(kOfxImageEffectPropPixelDepth));
@@ -64,9 +63,10 @@ void HostImage::Read(const Properties& image) {
 }
 
 void HostImage::Check() const {
-    if (!IsPossible(m_bounds)) throw kWrongFormat;
+    if (!IsPossible(m_bounds)) throw ActionFailed{kOfxStatErrImageFormat};
     const int needed = (m_bounds.x2 - m_bounds.x1) * m_channels * SampleBytes(m_depth);
-    if (m_bounds.y2 - m_bounds.y1 > 1 && std::abs(std::ptrdiff_t{m_rowBytes}) < needed) throw kWrongFormat;
+    if (m_bounds.y2 - m_bounds.y1 > 1 && std::abs(std::ptrdiff_t{m_rowBytes}) < needed)
+        throw ActionFailed{kOfxStatErrImageFormat};
 }
 
 }  // namespace velmora::hosts::openfx

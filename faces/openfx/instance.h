@@ -61,7 +61,7 @@ class Instance {
     [[nodiscard]] OfxParamHandle Of(ParamRole role) const;
 
     const Suites m_suites;
-    const OfxImageEffectHandle m_handle;
+    OfxImageEffectHandle m_handle;
     const effects::EffectTable& m_effect;
     const std::vector<PluginParam> m_params;
     std::vector<OfxParamHandle> m_handles;  // of m_params; null for groups

@@ -147,7 +147,7 @@ void Store(const PixelFormat& format, const std::byte* work, const std::byte* or
 }  // namespace
 
 PixelFormat::PixelFormat(const HostImage& image, WorkingSpace workingSpace) noexcept
-    : depth(image.Depth()), channels(image.Channels()), work(WorkKind::kFloats), space(workingSpace) {
+    : depth(image.Depth()), channels(image.Channels()), space(workingSpace) {
     const bool isDivided = image.IsPremultiplied() && space != WorkingSpace::kNone;
     if (!IsLinear(space) && depth == Depth::kByte) work = WorkKind::kBytes;
     if (!IsLinear(space) && depth == Depth::kShort) work = WorkKind::kShorts;

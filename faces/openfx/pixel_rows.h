@@ -22,7 +22,7 @@ struct PixelFormat {
 
     Depth depth;
     int channels;  // 3 or 4
-    WorkKind work;
+    WorkKind work = WorkKind::kFloats;
     WorkingSpace space;
     // The colours are divided by alpha before, and multiplied after, by these functions; or by the renderer.
     bool isDividedHere = false;

@@ -63,7 +63,7 @@ OfxStatus DoDescribeInContext(const Call& call) {
 OfxStatus DoCreate(const Call& call) {
     auto instance = std::make_unique<Instance>(call.suites, call.handle, call.effect);
     InstanceProperties(call).SetPointer(kOfxPropInstanceData, instance.get());
-    instance.release();
+    static_cast<void>(instance.release());  // the host keeps it
     return kOfxStatOK;
 }
 

@@ -72,7 +72,7 @@ class FrameRender {
         const bool isSame =
             m_source.Depth() == m_output.Depth() && m_source.Channels() == m_output.Channels();
         if (!isSame || m_source.Channels() < 3) throw ActionFailed{kOfxStatErrImageFormat};
-        if (const OfxImageClipHandle mask = instance.Mask()) m_mask.emplace(instance.Host(), mask, time);
+        if (OfxImageClipHandle mask = instance.Mask()) m_mask.emplace(instance.Host(), mask, time);
         if (field == kOfxImageFieldLower) m_field = 0;
         if (field == kOfxImageFieldUpper) m_field = 1;
     }

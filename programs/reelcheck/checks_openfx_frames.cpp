@@ -141,7 +141,8 @@ void CheckOpenfxLayouts(CheckContext& context) {
             shape.isTopDown = context.dice.OneIn(2);
             HostPicture output(shape), whole(shape);
             for (int y = 0; y < shape.Height(); ++y) {
-                const auto bytes = static_cast<std::size_t>(shape.Width() * plain.PixelBytes());
+                const auto bytes =
+                    static_cast<std::size_t>(shape.Width()) * static_cast<std::size_t>(plain.PixelBytes());
                 std::copy_n(plain.Pixel(0, y), bytes, source.Pixel(dx, dy + y));
                 std::copy_n(expected.Pixel(0, y), bytes, whole.Pixel(dx, dy + y));
             }

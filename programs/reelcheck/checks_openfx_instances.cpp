@@ -153,6 +153,7 @@ void CheckOpenfxThreads(CheckContext& context) {
             for (int frame = 0; frame < kFrames; ++frame)
                 output.ShowAt(frame, many[static_cast<std::size_t>(frame)]);
             std::vector<std::thread> threads;
+            threads.reserve(kThreads);
             for (int t = 0; t < kThreads; ++t) threads.emplace_back(renderAll, t, kThreads);
             for (std::thread& thread : threads) thread.join();
             for (std::size_t frame = 0; frame < one.size(); ++frame) {

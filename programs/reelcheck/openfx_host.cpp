@@ -73,7 +73,8 @@ OpenfxModule::~OpenfxModule() {
 }
 
 Arguments& Arguments::Add(const char* name, std::vector<PropertyValue> values) {
-    m_set.Add(name, static_cast<int>(values.size()), std::move(values));
+    const int count = static_cast<int>(values.size());
+    m_set.Add(name, count, std::move(values));
     return *this;
 }
 
@@ -124,21 +125,22 @@ OpenfxInstance::OpenfxInstance(const OpenfxPlugin& plugin, const char* context, 
     plugin.Expect(kOfxStatOK, kOfxActionCreateInstance, m_effect.Handle());
 }
 
-OpenfxInstance::~OpenfxInstance() {
+OpenfxInstance::~OpenfxInstance() {  // NOLINT(bugprone-exception-escape): complaining may, without memory
     if (m_plugin.Call(kOfxActionDestroyInstance, m_effect.Handle()) != kOfxStatOK) {
         Complain("an instance cannot be destroyed");
     }
     const auto& data = m_effect.properties.Values(kOfxPropInstanceData);
-    if (data.size() != 1 || std::get<void*>(data.front()) != nullptr) Complain("an instance stays when it is destroyed");
+    void* const* const kept = data.size() == 1 ? std::get_if<void*>(data.data()) : nullptr;
+    if (kept == nullptr || *kept != nullptr) Complain("an instance stays when it is destroyed");
 }
 
-HostParam& OpenfxInstance::Param(std::string_view name) {
+HostParam& OpenfxInstance::Param(std::string_view name) const {
     HostParam* const param = m_effect.params.Find(name);
     if (param == nullptr) Fail("there is no parameter " + std::string(name));
     return *param;
 }
 
-HostClip& OpenfxInstance::Clip(std::string_view name) {
+HostClip& OpenfxInstance::Clip(std::string_view name) const {
     HostClip* const clip = m_effect.Find(name);
     if (clip == nullptr) Fail("there is no clip " + std::string(name));
     return *clip;

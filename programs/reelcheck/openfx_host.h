@@ -72,13 +72,13 @@ class OpenfxInstance {
   public:
     explicit OpenfxInstance(const OpenfxPlugin& plugin, const char* context = kOfxImageEffectContextFilter,
                             double frameRate = 25.0);
-    ~OpenfxInstance();
+    ~OpenfxInstance();  // NOLINT(bugprone-exception-escape): complaining may, without memory
     OpenfxInstance(const OpenfxInstance&) = delete;
     OpenfxInstance& operator=(const OpenfxInstance&) = delete;
 
     [[nodiscard]] HostEffect& Effect() { return m_effect; }
-    [[nodiscard]] HostParam& Param(std::string_view name);
-    [[nodiscard]] HostClip& Clip(std::string_view name);
+    [[nodiscard]] HostParam& Param(std::string_view name) const;
+    [[nodiscard]] HostClip& Clip(std::string_view name) const;
     void ShowMask(HostPicture* mask);
     // Chooses a preset as a user does.
     void ChoosePreset(std::uint32_t preset);

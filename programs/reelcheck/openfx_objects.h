@@ -144,11 +144,11 @@ struct PictureShape {
 
 class HostPicture {
   public:
-    explicit HostPicture(const PictureShape& shape);
+    explicit HostPicture(const PictureShape& own);
     // Smooth parts, edges, noise, black and white; some of it transparent if there is alpha. Deep pictures are 8-bit
     // ones with finer steps, float ones also go beyond 0 and 1 if `isWide`.
     void Paint(Dice& dice, bool isWide = false);
-    void Fill(std::uint8_t byte);
+    void Fill(std::uint8_t byte) const;
     [[nodiscard]] std::uint8_t* Pixel(int x, int y) const;  // within the bounds
     [[nodiscard]] int PixelBytes() const { return shape.Channels() * shape.SampleBytes(); }
     // A sample as 0..1.

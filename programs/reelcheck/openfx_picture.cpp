@@ -100,12 +100,12 @@ void HostPicture::Paint(Dice& dice, bool isWide) {
     }
 }
 
-void HostPicture::Fill(std::uint8_t byte) {
+void HostPicture::Fill(std::uint8_t byte) const {
     std::memset(memory.Data(), byte, memory.Size());
 }
 
 bool HostPicture::IsSameAs(const HostPicture& other) const {
-    const auto width = static_cast<std::size_t>(shape.Width() * PixelBytes());
+    const auto width = static_cast<std::size_t>(shape.Width()) * static_cast<std::size_t>(PixelBytes());
     for (int y = shape.bounds.y1; y < shape.bounds.y2; ++y) {
         if (std::memcmp(Pixel(shape.bounds.x1, y), other.Pixel(shape.bounds.x1, y), width) != 0) return false;
     }
