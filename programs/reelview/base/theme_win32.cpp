@@ -117,6 +117,9 @@ void Theme::PaintMenuBox(HWND menu) const {
     FrameRect(dc.Dc(), &area, edge.get());
     InflateRect(&area, -1, -1);
     FrameRect(dc.Dc(), &area, FieldBrush());
+    // Around the text too, where a system without dark controls draws a light line.
+    const RECT inner = {area.left + 1, area.top + 1, button.left, area.bottom - 1};
+    FrameRect(dc.Dc(), &inner, FieldBrush());
     const int x = (button.left + button.right) / 2, y = (button.top + button.bottom) / 2, half = Px(4);
     const POINT arrow[] = {{x - half, y - half / 2}, {x + half, y - half / 2}, {x, y + half / 2 + 1}};
     const Brush text(CreateSolidBrush(m_palette.text));
