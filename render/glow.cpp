@@ -1,7 +1,6 @@
 #include "render/glow.h"
 
 #include <algorithm>
-#include <new>
 
 #include "render/glow_taps.h"
 #include "render/mix_bits.h"
@@ -231,16 +230,6 @@ GlowStage GlowLayerMaker::Make() noexcept {
 }
 
 }  // namespace
-
-std::uint16_t* GlowMemory::Reserve(std::uint64_t lanes) noexcept {
-    if (lanes > PTRDIFF_MAX / sizeof(std::uint16_t)) return nullptr;
-    if (lanes > m_size) {
-        m_lanes.reset();
-        m_lanes.reset(new (std::nothrow) std::uint16_t[static_cast<std::size_t>(lanes)]);
-        m_size = m_lanes != nullptr ? lanes : 0;
-    }
-    return m_lanes.get();
-}
 
 void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     const std::int32_t side = 1 << m_reduction;

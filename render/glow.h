@@ -10,9 +10,9 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <memory>
 
 #include "render/glow_kernels.h"
+#include "render/growing_memory.h"
 #include "render/image.h"
 #include "render/row_reader.h"
 #include "render/stage_settings.h"
@@ -34,16 +34,7 @@ inline constexpr double kGlowStrongest = 0.72;  // of the layer at amount 1
     return size;
 }
 
-// Memory for the glow layer, kept so that frames of one size allocate once.
-class GlowMemory {
-  public:
-    // At least `lanes` uninitialised numbers, or null if there is not enough memory. Invalidates the previous ones.
-    [[nodiscard]] std::uint16_t* Reserve(std::uint64_t lanes) noexcept;
-
-  private:
-    std::unique_ptr<std::uint16_t[]> m_lanes;
-    std::uint64_t m_size = 0;
-};
+using GlowMemory = GrowingMemory<std::uint16_t>;
 
 // Rows of cells, `width` wide, with padding at both ends.
 struct CellPlane {

@@ -8,7 +8,7 @@
 
 #include "render/glow.h"
 #include "render/random.h"
-#include "render/row_memory.h"
+#include "render/growing_memory.h"
 #include "render/scratches.h"
 #include "render/wear_factors.h"
 
@@ -46,7 +46,7 @@ struct RenderState {
     ScratchMemory scratches;
     GlowMemory glow;
     WearFactors wear;
-    RowMemory row;
+    GrowingMemory<Bgra> row;
 };
 
 }  // namespace velmora::render

@@ -43,9 +43,10 @@ bool IsStreamed(const FrameContext& context, const RenderOptions& options) noexc
 }
 
 void RenderByRows(FrameContext& context, const FramePlan& plan, const RenderOptions& options,
-                  const Kernels& kernels, RowMemory& memory) noexcept {
+                  const Kernels& kernels, GrowingMemory<Bgra>& memory) noexcept {
     const RowProgram program(plan, kernels);
-    Bgra* const own = IsStreamed(context, options) ? memory.Reserve(context.Width()) : nullptr;
+    const auto width = static_cast<std::uint64_t>(context.Width());
+    Bgra* const own = IsStreamed(context, options) ? memory.Reserve(width) : nullptr;
     if (own == nullptr && !plan.jitter.IsActive() && program.IsEmpty()) return;
     const ImageView& source = context.Source();
     const ImageView& destination = context.ClaimDestination();

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <limits>
-#include <new>
 
 #include "render/kernels.h"
 
@@ -70,17 +69,15 @@ ImagingStatus ConvertRows(RowFunction convert, Source* source, std::ptrdiff_t so
 
 bool PackedImage::Reserve(std::int32_t width, std::int32_t height, std::int32_t channels) noexcept {
     if (width < 1 || height < 1 || channels < 1 || channels > 4) return false;
-    if (m_pixels != nullptr && width <= m_width && height <= m_height) return true;
+    if (m_pixels.Data() != nullptr && width <= m_width && height <= m_height) return true;
     width = std::max(width, m_width);
     height = std::max(height, m_height);
     *this = {};  // free the old image before allocating the new one
+    constexpr std::uint64_t kMost = std::numeric_limits<std::ptrdiff_t>::max();
     const std::uint64_t rowStep =
         std::uint64_t(static_cast<std::uint32_t>(width)) * static_cast<std::uint32_t>(channels);
-    constexpr std::uint64_t kMost = std::numeric_limits<std::ptrdiff_t>::max();
     if (rowStep > kMost / static_cast<std::uint32_t>(height)) return false;
-    m_pixels.reset(new (std::nothrow)
-                       std::uint8_t[static_cast<std::size_t>(rowStep) * static_cast<std::uint32_t>(height)]);
-    if (m_pixels == nullptr) return false;
+    if (m_pixels.Reserve(rowStep * static_cast<std::uint32_t>(height)) == nullptr) return false;
     m_rowStep = static_cast<std::size_t>(rowStep);
     m_width = width;
     m_height = height;

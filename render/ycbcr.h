@@ -7,8 +7,8 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <memory>
 
+#include "render/growing_memory.h"
 #include "render/image.h"
 
 namespace velmora::render {
@@ -22,12 +22,12 @@ class PackedImage {
     // is below 1; the image is then empty.
     [[nodiscard]] bool Reserve(std::int32_t width, std::int32_t height, std::int32_t channels) noexcept;
     [[nodiscard]] std::uint8_t* Row(std::int32_t row) const noexcept {
-        return m_pixels.get() + m_rowStep * static_cast<std::size_t>(row);
+        return m_pixels.Data() + m_rowStep * static_cast<std::size_t>(row);
     }
     [[nodiscard]] std::size_t RowStep() const noexcept { return m_rowStep; }
 
   private:
-    std::unique_ptr<std::uint8_t[]> m_pixels;
+    GrowingMemory<std::uint8_t> m_pixels;
     std::size_t m_rowStep = 0;  // bytes
     std::int32_t m_width = 0;
     std::int32_t m_height = 0;

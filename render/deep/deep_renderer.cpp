@@ -41,7 +41,7 @@ Rectangle NeededBy(const DeepFrame& frame, bool readsAll) noexcept {
 }
 
 // Replaces the source with a copy.
-bool Detach(const DeepFrame& frame, const Rectangle& part, DeepBuffer<std::uint8_t>& memory,
+bool Detach(const DeepFrame& frame, const Rectangle& part, GrowingMemory<std::uint8_t>& memory,
             DeepPicture& picture) noexcept {
     const auto pixelBytes = static_cast<std::size_t>(frame.format.PixelBytes());
     const std::size_t rowBytes = static_cast<std::size_t>(frame.width) * pixelBytes;
