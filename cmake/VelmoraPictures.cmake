@@ -20,5 +20,5 @@ function(velmora_embed_pictures target)
     DEPENDS ${script} ${pictures}
     COMMENT "Embedding the wear pictures and spots"
     VERBATIM)
-  target_sources(${target} PRIVATE ${source} ${PROJECT_SOURCE_DIR}/render/pictures.cpp)
+  target_sources(${target} PRIVATE ${source})
 endfunction()

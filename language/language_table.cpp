@@ -9,7 +9,6 @@
 
 #include <tinyxml.h>
 
-#include "language/markup_check.h"
 #include "text/utf.h"
 
 namespace velmora::language {

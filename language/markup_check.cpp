@@ -1,4 +1,4 @@
-#include "language/markup_check.h"
+#include "language/language_table.h"
 
 #include <algorithm>
 #include <array>

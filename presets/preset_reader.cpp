@@ -8,7 +8,6 @@
 #include "presets/file_access.h"
 #include "text/c_locale_numbers.h"
 #include "presets/preset_file.h"
-#include "presets/xml_limits.h"
 
 namespace velmora {
 

@@ -9,7 +9,6 @@
 #include "platform/float_guard.h"
 #include "presets/preset_file.h"
 #include "presets/dialogs.h"
-#include "presets/preset_names.h"
 #include "text/code_page.h"
 #include "text/strings.h"
 

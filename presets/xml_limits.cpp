@@ -1,4 +1,4 @@
-#include "presets/xml_limits.h"
+#include "presets/file_access.h"
 
 #include <cstring>
 

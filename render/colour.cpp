@@ -6,7 +6,7 @@
 #include <iterator>
 #include <limits>
 
-#include "render/mix_bits.h"
+#include "render/random.h"
 #include "render/rounding.h"
 
 namespace velmora::render {

@@ -16,11 +16,10 @@
 #include <optional>
 #include <span>
 
-#include "render/byte_table.h"
+#include "render/tone_line.h"
 #include "render/image.h"
 #include "render/render_state.h"
 #include "render/stage_settings.h"
-#include "render/tone_line.h"
 
 namespace velmora::render {
 

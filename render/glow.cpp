@@ -2,8 +2,7 @@
 
 #include <algorithm>
 
-#include "render/glow_taps.h"
-#include "render/mix_bits.h"
+#include "render/random.h"
 #include "render/rounding.h"
 
 namespace velmora::render {

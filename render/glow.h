@@ -14,7 +14,6 @@
 #include "render/glow_kernels.h"
 #include "render/growing_memory.h"
 #include "render/image.h"
-#include "render/row_reader.h"
 #include "render/stage_settings.h"
 
 namespace velmora::render {
@@ -85,5 +84,14 @@ class GlowStage {
 [[nodiscard]] GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width,
                                     std::int32_t height, GlowMemory& memory,
                                     const GlowKernels& kernels) noexcept;
+
+// The filters of the glow layer's pyramid, in its levels 0, 2 and 4.
+struct GlowLayerTaps {
+    GlowTaps narrow, middle, wide;
+};
+
+// For a glow layer whose cells are `cell` pixels wide. The filters leave out the blur that reducing, halving and
+// doubling add anyway.
+[[nodiscard]] GlowLayerTaps MakeGlowLayerTaps(double height, double cell) noexcept;
 
 }  // namespace velmora::render

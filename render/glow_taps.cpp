@@ -1,4 +1,4 @@
-#include "render/glow_taps.h"
+#include "render/glow.h"
 
 #include <algorithm>
 

@@ -6,7 +6,6 @@
 
 #include "render/image.h"
 #include "render/random.h"
-#include "render/row_reader.h"
 #include "render/stage_settings.h"
 
 namespace velmora::render {

@@ -2,7 +2,10 @@
 // Draws use integer arithmetic only, so a state gives the same numbers on every build.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
+
+#include "render/rounding.h"
 
 namespace velmora::render {
 
@@ -28,7 +31,13 @@ class Random {
     }
 
     // A draw between `low` and `high` with `decimals` digits after the point, clamped to the two.
-    double DrawDecimal(float low, float high, int decimals) noexcept;
+    double DrawDecimal(float low, float high, int decimals) noexcept {
+        double scale = 1.0;
+        for (int i = 0; i < decimals; ++i) scale *= 10.0;
+        const std::int32_t drawn =
+            Draw(RoundHalfAway(Narrow(low * scale)), RoundHalfAway(Narrow(high * scale)));
+        return std::clamp(drawn / scale, double{std::min(low, high)}, double{std::max(low, high)});
+    }
 
     // Advances as `count` draws would, in at most 32 rounds.
     constexpr void Skip(std::uint32_t count) noexcept {
@@ -46,5 +55,18 @@ class Random {
 
     std::uint32_t m_state = 0;
 };
+
+// A hash of one word, for looks that must not depend on the build or on the order of work. Every bit of the argument affects about half of the result's bits.
+constexpr std::uint32_t MixBits(std::uint32_t word) noexcept {
+    word = (word ^ (word >> 15)) * 0x9E3779B1u;
+    word = (word ^ (word >> 13)) * 0x85A308D3u;
+    return word ^ (word >> 16);
+}
+
+// Combines a sequence's seed, which depends on the settings only, with the host's seed. A host seed of 0 means none
+// and leaves the seed as it is. Any two other host seeds give different results.
+constexpr std::uint32_t SeedFor(std::uint32_t own, std::uint32_t hostSeed) noexcept {
+    return hostSeed == 0 ? own : MixBits(own ^ MixBits(hostSeed));
+}
 
 }  // namespace velmora::render

@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "render/mix_bits.h"
+#include "render/random.h"
 
 namespace velmora::render {
 namespace {

@@ -9,7 +9,6 @@
 #include <cstddef>
 #include <cstdint>
 
-#include "render/scratch_shape.h"
 #include "render/scratch_state.h"
 
 namespace velmora::render {

@@ -1,4 +1,4 @@
-#include "render/scratch_shape.h"
+#include "render/scratch_state.h"
 
 #include <algorithm>
 

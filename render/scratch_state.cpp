@@ -4,7 +4,7 @@
 #include <bit>
 #include <utility>
 
-#include "render/mix_bits.h"
+#include "render/random.h"
 #include "render/rounding.h"
 
 namespace velmora::render {

@@ -3,12 +3,14 @@
 #pragma once
 
 #include <algorithm>
+#include <array>
 #include <cstdint>
 #include <optional>
 
-#include "render/byte_table.h"
-
 namespace velmora::render {
+
+// A lookup table for one channel.
+using ByteTable = std::array<std::uint8_t, 256>;
 
 // The entry for i, in unsigned 16 bits: (i × 256 × times >> 16) + plus, at most 65535, less minus, at least 0;
 // shifted right by `shift` and at most 255.

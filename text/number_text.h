@@ -3,6 +3,7 @@
 
 #include <cstdint>
 #include <optional>
+#include <stdexcept>
 #include <string>
 #include <string_view>
 
@@ -37,5 +38,12 @@ std::string NumberText(double value);
 
 // Eight digits after "0x".
 std::string HexText(std::uint32_t word);
+
+// An error in what the user asked for: one line that says what is wrong and, where it helps, what would be right. The
+// programs' main functions catch and print it.
+class UsageError : public std::runtime_error {
+  public:
+    using std::runtime_error::runtime_error;
+};
 
 }  // namespace velmora::hosts

@@ -5,9 +5,9 @@
 #include <vector>
 
 #include "effects/effect_names.h"
+#include "presets/dialogs.h"
 #include "presets/file_access.h"
 #include "presets/preset_file.h"
-#include "presets/preset_names.h"
 
 namespace velmora::hosts::obs {
 namespace {

@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "text/names.h"
 
 namespace velmora::hosts {

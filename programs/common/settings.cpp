@@ -3,9 +3,8 @@
 #include <optional>
 #include <vector>
 
-#include "programs/common/usage_error.h"
-#include "text/names.h"
 #include "text/number_text.h"
+#include "text/names.h"
 
 namespace velmora::hosts {
 namespace {

@@ -1,4 +1,4 @@
-#include "programs/reelcheck/run.h"
+#include "programs/reelcheck/options.h"
 
 #include <atomic>
 #include <chrono>

@@ -4,7 +4,6 @@
 #include <exception>
 
 #include "programs/reelcheck/options.h"
-#include "programs/reelcheck/run.h"
 
 namespace velmora::reelcheck {
 namespace {

@@ -1,4 +1,5 @@
-// The command line.
+// The command line, and the run that it asks for: the checks run in child processes; the parent follows them and prints
+// what they report.
 #pragma once
 
 #include <cstdint>
@@ -33,5 +34,18 @@ extern const char* const kHelp;
 // The checks of this run, in order: those named, else those of its level and below. Throws std::invalid_argument for
 // an unknown name.
 [[nodiscard]] std::vector<const Check*> ChosenChecks(const Options& options);
+
+// Prints one line per check and a final one; or everything as JSON. True when every check passed.
+[[nodiscard]] bool RunChecks(const Options& options);
+
+// The child's part: runs checks and reports each one on standard output.
+//
+// Runs the selected checks from options.childFrom on. Lines, one per event:
+//
+//   begin
+//   ok SECONDS
+//   failed SECONDS TEXT
+//   crash TEXT             and the process ends
+int RunChild(const Options& options);
 
 }  // namespace velmora::reelcheck

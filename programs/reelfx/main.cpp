@@ -5,7 +5,7 @@
 #include <new>
 #include <system_error>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/commands/command_line.h"
 #include "programs/reelfx/common/interrupt.h"
 

@@ -2,7 +2,7 @@
 
 #include <stdexcept>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts {
 

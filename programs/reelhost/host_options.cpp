@@ -2,7 +2,7 @@
 
 #include <string_view>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts {
 

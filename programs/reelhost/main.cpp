@@ -8,12 +8,11 @@
 #include <stdexcept>
 
 #include "programs/common/digest.h"
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/common/effect_library.h"
 #include "programs/common/effect_run.h"
 #include "programs/reelhost/frame_stream.h"
 #include "programs/reelhost/host_options.h"
-#include "programs/reelhost/random_state.h"
 #include "programs/reelhost/measurements.h"
 #include "text/names.h"
 

@@ -1,4 +1,4 @@
-#include "programs/reelhost/random_state.h"
+#include "programs/reelhost/measurements.h"
 
 #include <array>
 #include <optional>

@@ -4,7 +4,6 @@
 #include <cstdlib>
 
 #include "render/glow.h"
-#include "render/glow_taps.h"
 
 namespace velmora::render {
 namespace {

@@ -8,7 +8,7 @@
 #include <variant>
 #include <vector>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/commands/command_line.h"
 #include "programs/reelhost/host_options.h"
 #include "tests/fuzz/fuzz_input.h"

@@ -8,7 +8,7 @@
 #include <string>
 
 #include "presets/preset_file.h"
-#include "presets/xml_limits.h"
+#include "presets/file_access.h"
 
 namespace {
 

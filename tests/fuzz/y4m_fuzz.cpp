@@ -13,7 +13,7 @@
 #include <string_view>
 #include <vector>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/common/y4m.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/media_reader.h"

@@ -1,4 +1,4 @@
-#include "presets/preset_names.h"
+#include "presets/dialogs.h"
 
 #include <gtest/gtest.h>
 

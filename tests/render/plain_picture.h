@@ -8,7 +8,6 @@
 #include <vector>
 
 #include "render/image.h"
-#include "render/row_reader.h"
 
 namespace velmora::testing {
 

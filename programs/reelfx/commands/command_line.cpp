@@ -13,7 +13,6 @@
 #include "text/names.h"
 #include "text/number_text.h"
 #include "programs/common/effect_info.h"
-#include "programs/common/usage_error.h"
 #include "programs/reelfx/commands/command_options.h"
 #include "programs/reelfx/common/output_place.h"
 

@@ -10,7 +10,7 @@
 #include <utility>
 #include <vector>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/common/output_place.h"
 
 namespace velmora::hosts {

@@ -4,7 +4,7 @@
 #include <filesystem>
 #include <nlohmann/json.hpp>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/common/preset_io.h"
 
 namespace velmora::hosts {

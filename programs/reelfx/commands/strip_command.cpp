@@ -5,7 +5,7 @@
 #include <tuple>
 #include <vector>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/common/output_place.h"
 #include "programs/reelfx/pictures/picture_grid.h"
 #include "programs/reelfx/pictures/still_writer.h"

@@ -5,7 +5,7 @@
 
 #include "effects/effect_queries.h"
 #include "effects/effect_table.h"
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/common/preset_io.h"
 
 namespace velmora::hosts {

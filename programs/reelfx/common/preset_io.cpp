@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <filesystem>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/output_place.h"
 #include "presets/preset_file.h"

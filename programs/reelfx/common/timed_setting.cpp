@@ -4,7 +4,6 @@
 #include <cmath>
 #include <optional>
 
-#include "programs/common/usage_error.h"
 #include "text/number_text.h"
 
 namespace velmora::hosts {

@@ -4,7 +4,7 @@
 #include <cmath>
 #include <string>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts {
 namespace {

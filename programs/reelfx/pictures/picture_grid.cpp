@@ -7,7 +7,7 @@
 #include <memory>
 #include <new>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts {
 namespace {

@@ -3,7 +3,7 @@
 #include <filesystem>
 #include <fstream>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/output_place.h"
 #include "programs/reelfx/media/pixel_converter.h"

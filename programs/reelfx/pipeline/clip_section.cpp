@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cmath>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/common/interrupt.h"
 
 namespace velmora::hosts {

@@ -5,7 +5,7 @@
 #include <type_traits>
 #include <utility>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/common/failure.h"
 
 namespace velmora::hosts {

@@ -4,7 +4,7 @@
 #include <string>
 #include <vector>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelview/base/text_keys.h"
 
 namespace velmora::reelview {

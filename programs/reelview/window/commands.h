@@ -1,5 +1,10 @@
-// Command numbers for menus and shortcuts.
+// Command numbers for menus and shortcuts, and the numbers of resources, which the resource compiler reads here too.
 #pragma once
+
+#define VM_ICON_REELVIEW 1
+#define VM_KEYS_REELVIEW 2
+
+#ifndef RC_INVOKED
 
 namespace velmora::reelview {
 
@@ -41,3 +46,5 @@ enum Command : int {
 };
 
 }  // namespace velmora::reelview
+
+#endif

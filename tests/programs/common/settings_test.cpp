@@ -5,7 +5,7 @@
 #include <cstring>
 
 #include "programs/common/digest.h"
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts {
 namespace {

@@ -4,7 +4,7 @@
 
 #include <vector>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 
 namespace velmora::hosts {
 namespace {

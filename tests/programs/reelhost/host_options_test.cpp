@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelhost/frame_stream.h"
 #include "programs/reelhost/host_options.h"
 
