@@ -6,7 +6,7 @@
 #include <map>
 #include <nlohmann/json.hpp>
 
-#include "programs/common/usage_error.h"
+#include "text/number_text.h"
 #include "programs/reelfx/common/interrupt.h"
 #include "programs/reelfx/common/output_place.h"
 #include "programs/reelfx/pipeline/effect_list.h"
