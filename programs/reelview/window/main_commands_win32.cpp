@@ -24,7 +24,10 @@ bool OpenFreeClipboard(HWND owner) {
 
 void MainWindow::OnCommand(int command, int code) {
     if (command == kControlEffect) {
-        if (code != CBN_SELCHANGE) return;
+        // Not while the list is open: choosing moves the box, and the arrow keys pass through other effects. The list may
+        // close before or after the selection changes.
+        const bool isOpen = SendMessageW(m_effectBox, CB_GETDROPPEDSTATE, 0, 0) != FALSE;
+        if (code != CBN_CLOSEUP && (code != CBN_SELCHANGE || isOpen)) return;
         const LRESULT effect = SendMessageW(m_effectBox, CB_GETCURSEL, 0, 0);
         if (effect == CB_ERR) return;
         m_history.ChooseEffect(static_cast<std::uint32_t>(effect));
