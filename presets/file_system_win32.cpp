@@ -19,7 +19,7 @@ bool MakeNativePath(const char* fileName, NativePath* path) {
 }
 
 std::optional<std::string> FileNameFromUtf8(const std::string& path) {
-    const auto wide = Utf16FromUtf8(path);
+    const auto wide = language::Utf16FromUtf8(path);
     return wide ? NarrowExactly(*wide) : std::nullopt;
 }
 
