@@ -55,9 +55,9 @@ class ParamDefiner {
     }
 
     // A page of the parameters from `first` to before `end`, without groups.
-    void DefinePage(const char* pageName, const char* label, const std::vector<PluginParam>& params,
+    void DefinePage(const char* identifier, const char* label, const std::vector<PluginParam>& params,
                     std::size_t first, std::size_t end, int place) const {
-        const Properties page = Define(kOfxParamTypePage, pageName);
+        const Properties page = Define(kOfxParamTypePage, identifier);
         page.Set(kOfxPropLabel, LabelOf(m_language, label).c_str());
         int child = 0;
         for (std::size_t i = first; i < end; ++i) {
@@ -66,7 +66,7 @@ class ParamDefiner {
         }
         OfxPropertySetHandle handle = nullptr;
         Require(m_suites.parameter->paramSetGetPropertySet(m_params, &handle));
-        Properties(m_suites, handle).Offer(kOfxPluginPropParamPageOrder, pageName, place);
+        Properties(m_suites, handle).Offer(kOfxPluginPropParamPageOrder, identifier, place);
     }
 
   private:
