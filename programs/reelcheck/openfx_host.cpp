@@ -146,7 +146,7 @@ HostClip& OpenfxInstance::Clip(std::string_view name) const {
     return *clip;
 }
 
-void OpenfxInstance::ShowMask(HostPicture* mask) {
+void OpenfxInstance::ShowMask(HostPicture* mask) const {
     Clip("Mask").Show(mask);
     Clip("Mask").properties.Put(kOfxImageClipPropConnected, {mask != nullptr ? 1 : 0});
 }

@@ -79,7 +79,7 @@ class OpenfxInstance {
     [[nodiscard]] HostEffect& Effect() { return m_effect; }
     [[nodiscard]] HostParam& Param(std::string_view name) const;
     [[nodiscard]] HostClip& Clip(std::string_view name) const;
-    void ShowMask(HostPicture* mask);
+    void ShowMask(HostPicture* mask) const;
     // Chooses a preset as a user does.
     void ChoosePreset(std::uint32_t preset);
     OfxStatus Change(const char* name, const char* reason);
