@@ -46,6 +46,10 @@ struct DeepKernels {
     // Between pixels and the planes of a block from place `at` on, by DeepSamples and by channels - 3.
     void (*load[2][2])(const void* pixels, DeepBlock& block, std::int32_t at, std::int32_t count) noexcept;
     void (*store[2][2])(const DeepBlock& block, std::int32_t at, void* pixels, std::int32_t count) noexcept;
+    // Stores the first pixels of a block as four floats at a multiple of 16 bytes, bypassing the caches if the level can.
+    // After the last row of a frame, `endStream` makes them visible to other threads.
+    void (*stream)(const DeepBlock& block, void* pixels, std::int32_t count) noexcept;
+    void (*endStream)() noexcept;
     // By alpha, for premultiplied pictures.
     void (*divide)(DeepBlock& block, std::int32_t at, std::int32_t count) noexcept;
     void (*multiply)(DeepBlock& block, std::int32_t at, std::int32_t count) noexcept;

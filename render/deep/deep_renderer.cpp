@@ -97,8 +97,12 @@ bool RenderDeep(const DeepFrame& frame, const FrameContext& context, const Stage
         glow =
             PrepareDeepGlow(settings.glow, source, frame.width, frame.height, memory.glow, deepKernels.glow);
     }
-    const DeepRowProgram program(frame, plan, glow, deepKernels);
+    // Not when working in place: what was read is then still in the caches when it is written.
+    const std::int64_t bytes = std::int64_t{frame.width} * frame.height * frame.format.PixelBytes();
+    const bool streams = bytes >= options.streamedBytes && !Overlap(frame);
+    const DeepRowProgram program(frame, plan, glow, deepKernels, streams);
     for (std::int32_t y = frame.window.top; y < frame.window.bottom; ++y) program.Run(source, y);
+    if (streams) deepKernels.endStream();
     return true;
 }
 

@@ -34,6 +34,13 @@ void Darken(float& channel, float share) noexcept {
     channel -= share * std::max(channel, 0.0f);
 }
 
+bool IsStreamable(const DeepFrame& frame) noexcept {
+    constexpr std::uintptr_t kBytes = 16;
+    return frame.format.PixelBytes() == std::ptrdiff_t{kBytes} &&
+           reinterpret_cast<std::uintptr_t>(frame.destination.pixels) % kBytes == 0 &&
+           static_cast<std::uintptr_t>(frame.destination.rowStep) % kBytes == 0;
+}
+
 template <typename Change>
 void ChangePixel(DeepBlock& block, std::int32_t x, Change&& change) noexcept {
     change(block.red[x]);
@@ -63,11 +70,12 @@ void DeepSource::Read(std::int32_t y, std::int32_t from, std::int32_t count,
 }
 
 DeepRowProgram::DeepRowProgram(const DeepFrame& frame, const FramePlan& plan, DeepGlow& glow,
-                               const DeepKernels& kernels) noexcept
+                               const DeepKernels& kernels, bool streams) noexcept
     : m_frame(frame),
       m_plan(plan),
       m_glow(glow),
       m_kernels(kernels),
+      m_streams(streams && IsStreamable(frame)),
       m_tone(DeepToneOf(plan.colour, plan.tint)) {
     ForEachStage(plan, [this](const auto& stage) { Add(stage); });
 }
@@ -106,7 +114,11 @@ void DeepRowProgram::Run(const DeepSource& source, std::int32_t y) const noexcep
         for (std::size_t i = 0; i < m_count; ++i) (this->*m_steps[i].run)(row);
         if (format.isPremultiplied) m_kernels.multiply(row.block, 0, row.count);
         std::uint8_t* const pixels = m_frame.destination.Row(y) + row.from * format.PixelBytes();
-        m_kernels.store[SamplesOf(format)][ChannelsOf(format)](row.block, 0, pixels, row.count);
+        if (m_streams) {
+            m_kernels.stream(row.block, pixels, row.count);
+        } else {
+            m_kernels.store[SamplesOf(format)][ChannelsOf(format)](row.block, 0, pixels, row.count);
+        }
     }
 }
 

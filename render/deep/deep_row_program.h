@@ -34,14 +34,12 @@ class DeepSource final : public DeepBlockReader {
 
 class DeepRowProgram {
   public:
-    // Keeps references into the arguments.
-    DeepRowProgram(const DeepFrame& frame, const FramePlan& plan, DeepGlow& glow,
-                   const DeepKernels& kernels) noexcept;
+    // Keeps references into the arguments. `streams`: the results are too many to stay in the caches.
+    DeepRowProgram(const DeepFrame& frame, const FramePlan& plan, DeepGlow& glow, const DeepKernels& kernels,
+                   bool streams) noexcept;
     DeepRowProgram(const DeepRowProgram&) = delete;
     DeepRowProgram& operator=(const DeepRowProgram&) = delete;
 
-    // True if rows are only shifted.
-    [[nodiscard]] bool IsEmpty() const noexcept { return m_count == 0; }
     // Reads row `y` of the window from the source and writes it to the destination.
     void Run(const DeepSource& source, std::int32_t y) const noexcept;
 
@@ -88,6 +86,7 @@ class DeepRowProgram {
     const FramePlan& m_plan;
     DeepGlow& m_glow;
     const DeepKernels& m_kernels;
+    bool m_streams;
     DeepTone m_tone;  // of colour and tint, which are neighbours
     bool m_hasTone = false;
     std::array<Step, kMostSteps> m_steps{};

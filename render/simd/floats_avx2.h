@@ -68,6 +68,14 @@ inline void StoreFours(float* to, const FourFloats& x) noexcept {
     StoreBoth(to + 8, pixels.c);
     StoreBoth(to + 12, pixels.d);
 }
+// In the order of addresses.
+inline void StreamFours(float* to, const FourFloats& x) noexcept {
+    const FourFloats pixels = Transposed(x);
+    const Floats vectors[] = {pixels.a, pixels.b, pixels.c, pixels.d};
+    for (int i = 0; i < 4; ++i) _mm_stream_ps(to + 4 * i, _mm256_castps256_ps128(vectors[i]));
+    for (int i = 0; i < 4; ++i) _mm_stream_ps(to + 16 + 4 * i, _mm256_extractf128_ps(vectors[i], 1));
+}
+inline void EndStream() noexcept { _mm_sfence(); }
 inline void StoreFours(std::uint16_t* to, const FourFloats& x) noexcept {
     const FourFloats pixels = Transposed(x);
     const __m256i first = _mm256_packus_epi32(_mm256_cvttps_epi32(pixels.a), _mm256_cvttps_epi32(pixels.b));

@@ -47,6 +47,9 @@ inline void StoreFours(std::uint16_t* to, const FourFloats& x) noexcept {
     to[2] = number(x.c);
     to[3] = number(x.d);
 }
+// The same for pixels at a multiple of 16 bytes that will not be read again soon.
+inline void StreamFours(float* to, const FourFloats& x) noexcept { StoreFours(to, x); }
+inline void EndStream() noexcept {}
 inline Floats LoadBytes(const std::uint8_t* from) noexcept {
     return static_cast<float>(static_cast<std::int32_t>(*from));
 }

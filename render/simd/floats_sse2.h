@@ -47,6 +47,14 @@ inline void StoreFours(float* to, const FourFloats& x) noexcept {
     Store(to + 8, pixels.c);
     Store(to + 12, pixels.d);
 }
+inline void StreamFours(float* to, const FourFloats& x) noexcept {
+    const FourFloats pixels = Transposed(x);
+    _mm_stream_ps(to, pixels.a);
+    _mm_stream_ps(to + 4, pixels.b);
+    _mm_stream_ps(to + 8, pixels.c);
+    _mm_stream_ps(to + 12, pixels.d);
+}
+inline void EndStream() noexcept { _mm_sfence(); }
 // The pack is of signed numbers, so that they are moved into its range and back.
 inline void Store8(std::uint16_t* to, Floats a, Floats b) noexcept {
     const __m128i half = _mm_set1_epi32(32768);

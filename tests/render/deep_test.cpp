@@ -66,7 +66,8 @@ void Render(const DeepFrame& frame, const StageSettings& settings, SimdLevel lev
     state.random.Pin(3, context.FrameNumber());
     state.random.BeginFrame(context.FrameNumber());
     ASSERT_TRUE(frame.IsValid());
-    ASSERT_TRUE(RenderDeep(frame, context, settings, state, memory, {.level = level}));
+    ASSERT_TRUE(
+        RenderDeep(frame, context, settings, state, memory, {.level = level, .streamedBytes = 20000}));
 }
 
 Deep Rendered(Deep source, const StageSettings& settings, SimdLevel level = BestSimdLevel()) {
