@@ -8,14 +8,11 @@
 #include "text/number_text.h"
 #include "programs/reelfx/commands/command_line.h"
 #include "programs/reelfx/common/interrupt.h"
-
-extern "C" {
-#include <libavutil/log.h>
-}
+#include "programs/reelfx/media/library_log.h"
 
 int main(int count, char** arguments) {
     using namespace velmora::hosts;
-    av_log_set_level(AV_LOG_QUIET);  // one clear line of ours instead
+    KeepLibraryLog();  // one clear line of ours instead
     WatchInterrupts();
     try {
         const ExitCode code = RunCommand(ReadCommandLine(count, arguments));

@@ -19,6 +19,7 @@
 namespace velmora::hosts {
 namespace {
 
+constexpr char kRateText[] = "a rate like 25 or 30000/1001";
 constexpr char kTimeText[] = "seconds or HH:MM:SS";
 
 // Parses the text of an option; a failure is a usage error that says what is expected.
@@ -82,8 +83,11 @@ InputOptions ReadInput(const TypedOptions& typed) {
     if (!typed.size.empty()) {
         input.rawSize = Parsed("--size", typed.size, ParseSize, "a size like 1920x1080");
     }
-    if (!typed.rate.empty())
-        input.rate = Parsed("--rate", typed.rate, ParseRate, "a rate like 25 or 30000/1001");
+    if (!typed.rate.empty()) input.rate = Parsed("--rate", typed.rate, ParseRate, kRateText);
+    if (!typed.startNumber.empty()) {
+        input.startNumber = Parsed("--start-number", typed.startNumber, ParseInteger, "a whole number");
+        if (*input.startNumber < 0) throw UsageError("--start-number takes a number from 0");
+    }
     return input;
 }
 
@@ -175,6 +179,7 @@ OutputOptions ReadOutput(const TypedOptions& typed) {
     output.pixelFormat = Given(typed.pixelFormat);
     if (!typed.crf.empty()) output.crf = Parsed("--crf", typed.crf, ParseNumber, "a number");
     output.needsAlpha = typed.matte;
+    if (!typed.fps.empty()) output.fps = Parsed("--fps", typed.fps, ParseRate, kRateText);
     return output;
 }
 

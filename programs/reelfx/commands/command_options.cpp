@@ -10,12 +10,18 @@ namespace {
 
 void AddInput(CLI::App& command, TypedOptions& typed) {
     command
-        .add_option("IN", typed.input.path,
-                    "Clip, still picture, image sequence (frames-%03d.png) or - (YUV4MPEG2)")
+        .add_option(
+            "IN", typed.input.path,
+            "Clip, still picture, image sequence (frames-%03d.png, \"frames-*.png\", a folder) or - for "
+            "standard input")
         ->type_name("FILE")
         ->required();
     command.add_option("--size", typed.size, "IN is raw BGRA of this size")->type_name("WxH");
     command.add_option("--rate", typed.rate, "Frame rate of raw BGRA and image sequences")->type_name("FPS");
+    command
+        .add_option("--start-number", typed.startNumber,
+                    "First number of an image sequence; default: the first that exists")
+        ->type_name("N");
 }
 
 // An option of one value that each effect of a list can have.
@@ -84,7 +90,10 @@ void AddEffectList(CLI::App& command, TypedOptions& typed) {
 void AddRender(CLI::App& app, TypedOptions& typed) {
     CLI::App& render = *app.add_subcommand("render", "Render a clip through one or several effects");
     AddInput(render, typed);
-    render.add_option("OUT", typed.outPath, "File, image pattern, or - (YUV4MPEG2)")->type_name("FILE");
+    render
+        .add_option("OUT", typed.outPath,
+                    "File, image pattern, or - for standard output (YUV4MPEG2, or as --format says)")
+        ->type_name("FILE");
     render.add_option("MORE", typed.more, "With --into: further clips; OUT is one too")->type_name("FILE");
     render
         .add_option("--into", typed.into,
@@ -136,7 +145,22 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
     render.add_flag("--hash", typed.digests,
                     "Print the MD5 of each frame as the effects leave it: BGRA in 8 bits, RGBA in others; "
                     "OUT may be omitted");
-    render.add_flag("--no-sound", typed.noSound, "Leave out sound and subtitles");
+    render
+        .add_option("--audio", typed.output.audio,
+                    "Sound: auto copies it if OUT can hold it and encodes it otherwise; copy, none, or "
+                    "the name of an audio codec")
+        ->type_name("auto|copy|none")
+        ->capture_default_str();
+    render.add_flag("--no-sound", typed.noSound,
+                    "Leave out sound, subtitles and all else beside the picture");
+    render
+        .add_option("--fps", typed.fps,
+                    "Constant frame rate of OUT; frames are repeated or left out. Default: the frames' own "
+                    "times where OUT "
+                    "can hold them")
+        ->type_name("FPS");
+    render.add_flag("--upright", typed.output.isUpright,
+                    "Turn the pixels of a rotated clip, also where OUT can hold the rotation tag");
     render.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
     render
         .add_option(

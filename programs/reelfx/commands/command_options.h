@@ -53,6 +53,7 @@ struct TypedOptions {
     std::string outPath, into, size, rate, randomState, frames, farm, start, duration;
     std::string format, codec, crf, pixelFormat, progress = "auto", depth = "auto";
     int threads = 0;
+    std::string startNumber, fps;
     bool overwrite = false, noSound = false, digests = false, quiet = false, dryRun = false, matte = false;
     ListOptions list;
     std::string listEffect;

@@ -1,5 +1,6 @@
 #include "programs/reelfx/commands/render_command.h"
 
+#include <cmath>
 #include <cstdio>
 #include <thread>
 
@@ -21,12 +22,13 @@ class RenderRun {
         : m_options(options),
           m_effects(options.effects),
           m_section(options.section.farm
-                        ? ResolveFarm(*options.section.farm, MediaReader::FrameTimes(options.input))
+                        ? ResolveFarm(*options.section.farm, MediaReader::TimesOf(options.input))
                         : options.section),
           m_reader(options.input) {
+        ResolveStart(options.input, m_reader, m_section);
         if (options.isMatte) CheckMatte(m_effects.Choices());
         if (!options.output) return;
-        const std::int64_t firstImage = m_section.firstFrame + 1;
+        const std::int64_t firstImage = FirstImage();
         CheckIsNotInput(options.output->path, options.input.path, firstImage);
         if (options.isDryRun) {
             CheckOutputPlace(options.output->path, options.mayOverwrite, firstImage);
@@ -50,8 +52,13 @@ class RenderRun {
     }
 
     ExitCode Run() {
-        if (m_writer) m_writer->Begin();
-        Progress progress(ClipSection::FrameCountGuess(m_reader, m_section), m_options.progress);
+        const std::int64_t frames = ClipSection::FrameCountGuess(m_reader, m_section);
+        if (m_writer) {
+            m_writer->CheckFrameCount(frames);
+            m_writer->Begin();
+            Tell(m_writer->Notes());
+        }
+        Progress progress(frames, m_options.progress);
         RenderAll(progress);
         if (Interrupts() > 0) FinishPart("interrupted", kExitInterrupted);
         if (!m_reader.BreakOff().empty())
@@ -59,10 +66,11 @@ class RenderRun {
         if (m_frames == 0) FailEmpty();
         TellOfDamage();
         if (m_writer) {
-            m_writer->Finish();
+            m_writer->Finish(m_endSeconds);
             m_place->Keep();
         }
         progress.End();
+        TellLate();
         return kExitDone;
     }
 
@@ -75,6 +83,54 @@ class RenderRun {
             Write(*item);
             if (!item->packet) progress.Update(++m_frames);
         }
+        m_endSeconds = section.EndSeconds();
+    }
+
+    // Images are numbered as the frames are. Parts of a farm share a folder: each goes on where the one before it
+    // ends, with the frames that a constant rate repeats.
+    [[nodiscard]] std::int64_t FirstImage() const {
+        if (!m_options.section.farm) return m_section.firstFrame + 1;
+        const std::optional<FrameRate> fps = m_options.output->fps;
+        FrameClock clock(fps ? AVRational{fps->numerator, fps->denominator} : m_reader.FrameRateGuess(),
+                         true);
+        std::int64_t images = 0;
+        for (std::int64_t i = 0; i <= m_section.firstFrame; ++i) {
+            const std::int64_t pts = m_section.frameTimes.pts[static_cast<std::size_t>(i)];
+            const FrameClock::Step step = clock.Take(m_reader.SecondsOf(pts));
+            for (std::int64_t written = step.repeats + (step.isLeftOut ? 0 : 1); written > 0; --written)
+                images = clock.TakePlace() + 1;
+        }
+        return images;
+    }
+
+    // What is left out or changed on purpose, in one line.
+    void Tell(const std::vector<std::string>& notes) const {
+        std::string text;
+        for (const std::string& note : notes) text += (text.empty() ? "" : "; ") + note;
+        if (!text.empty()) std::fprintf(stderr, "reelfx: %s: %s\n", m_place->Name().c_str(), text.c_str());
+    }
+
+    void TellLate() const {
+        std::vector<std::string> notes;
+        if (m_writer) notes = m_writer->LateNotes();
+        if (m_writer && !m_reader.OtherSize().empty()) {
+            notes.push_back("the source changes to " + m_reader.OtherSize() +
+                            ", and those frames are scaled to the first one's size");
+        }
+        Tell(notes);
+    }
+
+    [[nodiscard]] MediaWriter::Section SectionAt(const PipelineItem& first) const {
+        MediaWriter::Section section = {.pts = first.frame->pts, .index = first.index, .endSeconds = {}};
+        const double rate = av_q2d(m_reader.FrameRateGuess());
+        if (m_section.duration) section.endSeconds = m_section.start.value_or(0.0) + *m_section.duration;
+        if (m_section.endFrame) {
+            const auto end = static_cast<std::size_t>(*m_section.endFrame);
+            const auto& times = m_section.frameTimes.pts;
+            section.endSeconds =
+                end < times.size() ? m_reader.SecondsOf(times[end]) : static_cast<double>(end) / rate;
+        }
+        return section;
     }
 
     [[nodiscard]] unsigned ThreadCount() const {
@@ -89,7 +145,7 @@ class RenderRun {
         const AVFrame& first = m_reader.FirstFrame();
         const FrameWorker::Job job = {.writer = m_writer ? &*m_writer : nullptr,
                                       .size = {first.width, first.height},
-                                      .quarterTurns = QuarterTurnsOf(m_reader.Picture()),
+                                      .turn = m_reader.Turn(),
                                       .withDigest = m_options.withDigests,
                                       .samples = SamplesOf(m_options, m_reader),
                                       .isMatte = m_options.isMatte};
@@ -110,7 +166,7 @@ class RenderRun {
             throw Failure(kExitOutput, "standard output cannot be written");
         }
         if (!m_writer) return;
-        if (m_frames == 0 && !m_section.IsWholeClip()) m_writer->StartAt(item.frame->pts);
+        if (m_frames == 0 && !m_section.IsWholeClip()) m_writer->StartAt(SectionAt(item));
         m_writer->WriteFrame(std::move(item.frame));
     }
 
@@ -132,7 +188,7 @@ class RenderRun {
         if (!m_writer || m_frames == 0 || m_place->ReplacesFile()) {
             throw Failure(code, why + "; nothing was written");
         }
-        m_writer->Finish();
+        m_writer->Finish(m_endSeconds);
         m_place->Keep();
         throw Failure(code, why + "; " + m_place->Name() + " contains the first " + std::to_string(m_frames) +
                                 " frames");
@@ -149,6 +205,7 @@ class RenderRun {
     MediaReader m_reader;
     std::optional<OutputPlace> m_place;
     std::optional<MediaWriter> m_writer;
+    std::optional<double> m_endSeconds;  // of the section
     std::int64_t m_frames = 0;
 };
 

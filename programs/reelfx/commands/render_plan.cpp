@@ -67,6 +67,8 @@ std::string PlanText(const RenderOptions& options, const SectionOptions& section
     text += Line("depth", DepthText(SamplesOf(options, reader)));
     text += Line("threads", std::to_string(threads));
     text += Line("output", writer ? writer->Description() : "digests on standard output");
+    for (const std::string& note : writer ? writer->Notes() : std::vector<std::string>())
+        text += Line("note", note);
     return text;
 }
 

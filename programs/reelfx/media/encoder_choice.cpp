@@ -1,9 +1,13 @@
 #include "programs/reelfx/media/encoder_choice.h"
 
+#include <algorithm>
+#include <cstdlib>
+#include <iterator>
 #include <vector>
 
 #include "text/number_text.h"
 #include "programs/reelfx/common/failure.h"
+#include "programs/reelfx/media/container_contents.h"
 #include "programs/reelfx/media/pixel_converter.h"
 
 extern "C" {
@@ -35,7 +39,7 @@ bool NeedsWholeChroma(const AVCodec& codec) {
     return codec.id == AV_CODEC_ID_H264 || codec.id == AV_CODEC_ID_HEVC || codec.id == AV_CODEC_ID_AV1;
 }
 
-bool Fits(const AVCodec& codec, AVPixelFormat format, const AVFrame& source) {
+bool Fits(const AVCodec& codec, AVPixelFormat format, const PictureSource& source) {
     const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
     if (!descriptor || (descriptor->flags & AV_PIX_FMT_FLAG_HWACCEL) != 0) return false;
     if (!NeedsWholeChroma(codec)) return true;
@@ -65,34 +69,100 @@ constexpr AlphaRow kAlphaCodecs[] = {
 constexpr char kAlphaHint[] =
     " does not support transparency; ffv1, png, qtrle, prores_ks and, in WebM, libvpx-vp9 do";
 
-bool CarriesAlpha(AVPixelFormat format) {
-    const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
-    constexpr std::uint64_t kWanted = AV_PIX_FMT_FLAG_ALPHA, kUnwanted = AV_PIX_FMT_FLAG_PAL;
-    return descriptor && (descriptor->flags & kWanted) != 0 && (descriptor->flags & kUnwanted) == 0;
-}
-
 // VP8 and VP9 store it in a second stream, which few containers support.
-void CheckAlphaHolds(const AVCodec& codec, const AVOutputFormat& container) {
-    if (codec.id != AV_CODEC_ID_VP8 && codec.id != AV_CODEC_ID_VP9) return;
+bool HoldsAlpha(const AVCodec& codec, const AVOutputFormat& container) {
+    if (codec.id != AV_CODEC_ID_VP8 && codec.id != AV_CODEC_ID_VP9) return true;
     const std::string name = container.name;
-    if (name == "webm" || name == "matroska") return;
-    throw Failure(kExitUsage, std::string("codec ") + codec.name + " in " + name + kAlphaHint);
+    return name == "webm" || name == "matroska";
 }
 
-AVPixelFormat AlphaPixelFormat(const AVCodec& codec, const AVOutputFormat& container,
-                               const std::vector<AVPixelFormat>& fitting) {
-    std::vector<AVPixelFormat> formats;
-    for (const AVPixelFormat format : fitting) {
-        if (CarriesAlpha(format)) formats.push_back(format);
-    }
-    if (formats.empty()) throw Failure(kExitUsage, std::string("codec ") + codec.name + kAlphaHint);
-    CheckAlphaHolds(codec, container);
+void CheckAlphaHolds(const AVCodec& codec, const AVOutputFormat& container) {
+    if (HoldsAlpha(codec, container)) return;
+    throw Failure(kExitUsage, std::string("codec ") + codec.name + " in " + container.name + kAlphaHint);
+}
+
+AVPixelFormat Closest(std::vector<AVPixelFormat> formats, AVPixelFormat wanted, bool withAlpha) {
     formats.push_back(AV_PIX_FMT_NONE);
     int loss = 0;
-    return avcodec_find_best_pix_fmt_of_list(formats.data(), AV_PIX_FMT_BGRA, 1, &loss);
+    return avcodec_find_best_pix_fmt_of_list(formats.data(), wanted, withAlpha ? 1 : 0, &loss);
 }
 
-AVPixelFormat AskedPixelFormat(const std::string& name, const AVCodec& codec, const AVFrame& source) {
+std::vector<AVPixelFormat> WithAlpha(const std::vector<AVPixelFormat>& formats) {
+    std::vector<AVPixelFormat> carrying;
+    for (const AVPixelFormat format : formats) {
+        if (CarriesAlpha(format)) carrying.push_back(format);
+    }
+    return carrying;
+}
+
+// The source's codec is kept if it is one of these: deeper, lossless or newer than a container's usual one, or the
+// usual one elsewhere. Cameras' and discs' older codecs are not.
+constexpr AVCodecID kKeptCodecs[] = {
+    AV_CODEC_ID_H264,       AV_CODEC_ID_HEVC,    AV_CODEC_ID_AV1,     AV_CODEC_ID_VP9,
+    AV_CODEC_ID_VP8,        AV_CODEC_ID_PRORES,  AV_CODEC_ID_FFV1,    AV_CODEC_ID_QTRLE,
+    AV_CODEC_ID_MPEG2VIDEO, AV_CODEC_ID_HUFFYUV, AV_CODEC_ID_FFVHUFF, AV_CODEC_ID_UTVIDEO,
+};
+
+// The encoder of a codec, where there are several and the libraries' first choice is slow or poor.
+const AVCodec* EncoderOf(AVCodecID id, const PictureSource& source) {
+    if (id == AV_CODEC_ID_PRORES) return avcodec_find_encoder_by_name("prores_ks");
+    constexpr int kLeast = 64;
+    const bool isWhole = source.width % 2 == 0 && source.height % 2 == 0;
+    if (id == AV_CODEC_ID_AV1 && isWhole && source.width >= kLeast && source.height >= kLeast) {
+        if (const AVCodec* fast = avcodec_find_encoder_by_name("libsvtav1")) return fast;
+    }
+    return avcodec_find_encoder(id);
+}
+
+const AVCodec* KeptCodec(const AVOutputFormat& container, const PictureSource& source) {
+    if (std::ranges::find(kKeptCodecs, source.codec) == std::end(kKeptCodecs)) return nullptr;
+    const AVCodecDescriptor* descriptor = avcodec_descriptor_get(source.codec);
+    // AVI has no times of display.
+    const bool isReordered = descriptor && (descriptor->props & AV_CODEC_PROP_REORDER) != 0;
+    const bool isAvi = std::string(container.name) == "avi";
+    if ((isAvi && isReordered) || !CanHold(container, source.codec)) return nullptr;
+    if (source.codec == AV_CODEC_ID_MPEG2VIDEO && container.video_codec != AV_CODEC_ID_MPEG1VIDEO)
+        return nullptr;
+    return EncoderOf(source.codec, source);
+}
+
+// For sources with transparency: a codec that keeps it, if the container has one.
+const AVCodec* AlphaCodec(const AVOutputFormat& container, const PictureSource& source) {
+    const AVCodec* kept = KeptCodec(container, source);
+    if (kept && HoldsAlpha(*kept, container) && !WithAlpha(FormatsOf(*kept)).empty()) return kept;
+    for (const AlphaRow& row : kAlphaCodecs) {
+        if (std::string(container.name) == row.container) return avcodec_find_encoder_by_name(row.codec);
+    }
+    return nullptr;
+}
+
+const AVCodec& AskedCodec(const std::string& name, const AVOutputFormat& container) {
+    const AVCodec* codec = avcodec_find_encoder_by_name(name.c_str());
+    if (!codec) {
+        const AVCodecDescriptor* descriptor = avcodec_descriptor_get_by_name(name.c_str());
+        if (descriptor) codec = avcodec_find_encoder(descriptor->id);
+    }
+    if (!codec || codec->type != AVMEDIA_TYPE_VIDEO)
+        throw Failure(kExitUsage, "unknown video codec \"" + name + "\"");
+    if (avformat_query_codec(&container, codec->id, FF_COMPLIANCE_NORMAL) == 0) {
+        throw Failure(kExitUsage,
+                      std::string("the format ") + container.name + " cannot hold " + codec->name);
+    }
+    return *codec;
+}
+
+// Effects colour grey pictures too, and grey has the depth of its counterpart in colour.
+AVPixelFormat InColour(AVPixelFormat format, bool isFilm) {
+    const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
+    if (!descriptor || descriptor->nb_components > 2 || (descriptor->flags & AV_PIX_FMT_FLAG_PAL) != 0)
+        return format;
+    const bool isDeep = descriptor->comp[0].depth > 8;
+    if (isFilm) return isDeep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P;
+    if (descriptor->nb_components == 2) return isDeep ? AV_PIX_FMT_RGBA64BE : AV_PIX_FMT_RGBA;
+    return isDeep ? AV_PIX_FMT_RGB48BE : AV_PIX_FMT_RGB24;
+}
+
+AVPixelFormat AskedPixelFormat(const std::string& name, const AVCodec& codec, const PictureSource& source) {
     const AVPixelFormat asked = av_get_pix_fmt(name.c_str());
     if (asked == AV_PIX_FMT_NONE) throw Failure(kExitUsage, "unknown pixel format \"" + name + '"');
     const std::vector<AVPixelFormat> formats = FormatsOf(codec);
@@ -131,6 +201,12 @@ std::string UsualQualities() {
     return text + "otherwise quantiser " + std::to_string(kQuantiser);
 }
 
+bool CarriesAlpha(AVPixelFormat format) {
+    const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
+    constexpr std::uint64_t kWanted = AV_PIX_FMT_FLAG_ALPHA, kUnwanted = AV_PIX_FMT_FLAG_PAL;
+    return descriptor && (descriptor->flags & kWanted) != 0 && (descriptor->flags & kUnwanted) == 0;
+}
+
 const AVOutputFormat& ChooseContainer(const OutputOptions& options) {
     const char* name = options.format ? options.format->c_str() : nullptr;
     if (options.isRawBgra) name = "rawvideo";
@@ -142,35 +218,31 @@ const AVOutputFormat& ChooseContainer(const OutputOptions& options) {
         throw Failure(kExitUsage,
                       options.path + ": unknown file name extension; choose the format with --format");
     }
-    if (format->video_codec == AV_CODEC_ID_NONE) {
+    // Formats of sound hold a picture as their cover.
+    const bool isSound = format->mime_type && std::string(format->mime_type).starts_with("audio/");
+    if (format->video_codec == AV_CODEC_ID_NONE || isSound) {
         throw Failure(kExitUsage, options.path + ": the format " + format->name + " cannot hold video");
     }
     return *format;
 }
 
-const AVCodec& ChooseCodec(const OutputOptions& options, const AVOutputFormat& container) {
+const AVCodec& ChooseCodec(const OutputOptions& options, const AVOutputFormat& container,
+                           const PictureSource& source) {
     if (options.isRawBgra) return *avcodec_find_encoder(AV_CODEC_ID_RAWVIDEO);
-    if (options.codec) {
-        const AVCodec* codec = avcodec_find_encoder_by_name(options.codec->c_str());
-        if (!codec) {
-            const AVCodecDescriptor* descriptor = avcodec_descriptor_get_by_name(options.codec->c_str());
-            if (descriptor) codec = avcodec_find_encoder(descriptor->id);
-        }
-        if (!codec || codec->type != AVMEDIA_TYPE_VIDEO) {
-            throw Failure(kExitUsage, "unknown video codec \"" + *options.codec + "\"");
-        }
-        if (avformat_query_codec(&container, codec->id, FF_COMPLIANCE_NORMAL) == 0) {
-            throw Failure(kExitUsage,
-                          std::string("the format ") + container.name + " cannot hold " + codec->name);
-        }
-        return *codec;
-    }
+    if (options.codec) return AskedCodec(*options.codec, container);
     for (const AlphaRow& row : kAlphaCodecs) {
         if (!options.needsAlpha || std::string(container.name) != row.container) continue;
         if (const AVCodec* codec = avcodec_find_encoder_by_name(row.codec)) return *codec;
     }
-    const AVCodecID id =
-        av_guess_codec(&container, nullptr, options.path.c_str(), nullptr, AVMEDIA_TYPE_VIDEO);
+    const bool isImage = (container.flags & AVFMT_NOTIMESTAMPS) != 0;
+    if (!isImage && !options.needsAlpha) {
+        const AVCodec* alpha = source.hasAlpha ? AlphaCodec(container, source) : nullptr;
+        if (alpha) return *alpha;
+        if (const AVCodec* kept = KeptCodec(container, source)) return *kept;
+    }
+    AVCodecID id = av_guess_codec(&container, nullptr, options.path.c_str(), nullptr, AVMEDIA_TYPE_VIDEO);
+    // MPEG-1 has no fields.
+    if (id == AV_CODEC_ID_MPEG1VIDEO && source.isInterlaced) id = AV_CODEC_ID_MPEG2VIDEO;
     const AVCodec* codec = avcodec_find_encoder(id);
     if (!codec) {
         throw Failure(kExitUsage, std::string("no codec available for the format ") + container.name);
@@ -179,7 +251,7 @@ const AVCodec& ChooseCodec(const OutputOptions& options, const AVOutputFormat& c
 }
 
 AVPixelFormat ChoosePixelFormat(const OutputOptions& options, const AVCodec& codec,
-                                const AVOutputFormat& container, const AVFrame& source) {
+                                const AVOutputFormat& container, const PictureSource& source) {
     if (options.isRawBgra) return AV_PIX_FMT_BGRA;
     if (options.pixelFormat) {
         const AVPixelFormat asked = AskedPixelFormat(*options.pixelFormat, codec, source);
@@ -190,30 +262,34 @@ AVPixelFormat ChoosePixelFormat(const OutputOptions& options, const AVCodec& cod
         if (options.needsAlpha) CheckAlphaHolds(codec, container);
         return asked;
     }
-    const auto wanted = static_cast<AVPixelFormat>(source.format);
-    std::vector<AVPixelFormat> fitting;
-    for (const AVPixelFormat format : FormatsOf(codec)) {
-        if (Fits(codec, format, source)) fitting.push_back(format);
-    }
-    if (options.needsAlpha) return AlphaPixelFormat(codec, container, fitting);
-    if (fitting.empty()) return wanted;
-    const auto has = [&](AVPixelFormat format) {
-        for (const AVPixelFormat each : fitting) {
-            if (each == format) return true;
-        }
-        return false;
-    };
-    if (has(wanted)) return wanted;
-    // Other sources get the format that every player supports, unless the output is still pictures.
     const bool isFilm = (container.flags & AVFMT_NOTIMESTAMPS) == 0;
-    if (IsRgb(wanted) && isFilm && has(AV_PIX_FMT_YUV420P)) return AV_PIX_FMT_YUV420P;
-    fitting.push_back(AV_PIX_FMT_NONE);
-    int loss = 0;
-    return avcodec_find_best_pix_fmt_of_list(fitting.data(), wanted, 0, &loss);
+    const AVPixelFormat wanted = InColour(source.format, isFilm);
+    std::vector<AVPixelFormat> fitting = FormatsOf(codec);
+    std::erase_if(fitting, [&](AVPixelFormat format) { return !Fits(codec, format, source); });
+    const auto isGrey = [&](AVPixelFormat format) { return InColour(format, isFilm) != format; };
+    if (!std::ranges::all_of(fitting, isGrey)) std::erase_if(fitting, isGrey);
+    if (options.needsAlpha) {
+        const std::vector<AVPixelFormat> carrying = WithAlpha(fitting);
+        if (carrying.empty()) throw Failure(kExitUsage, std::string("codec ") + codec.name + kAlphaHint);
+        CheckAlphaHolds(codec, container);
+        return Closest(carrying, AV_PIX_FMT_BGRA, true);
+    }
+    if (!HoldsAlpha(codec, container)) std::erase_if(fitting, CarriesAlpha);
+    if (source.hasAlpha && !WithAlpha(fitting).empty()) fitting = WithAlpha(fitting);
+    if (fitting.empty()) return wanted;
+    if (std::ranges::find(fitting, wanted) != fitting.end()) return wanted;
+    // The old formats of full range are only for sources that have it.
+    std::vector<AVPixelFormat> usual;
+    for (const AVPixelFormat format : fitting) {
+        if (!std::string(av_get_pix_fmt_name(format)).starts_with("yuvj")) usual.push_back(format);
+    }
+    return Closest(usual.empty() ? fitting : usual, wanted, source.hasAlpha);
 }
 
 void SetQuality(const OutputOptions& options, const AVCodec& codec, AVCodecContext& encoder) {
     encoder.thread_count = kEncoderThreads;
+    // These encoders write to standard error by themselves.
+    if (std::string(codec.name) == "libsvtav1") setenv("SVT_LOG", "1", 0);
     // Pictures that are never shown carry no transparency.
     if (codec.id == AV_CODEC_ID_VP8 && CarriesAlpha(encoder.pix_fmt)) {
         av_opt_set(encoder.priv_data, "auto-alt-ref", "0", 0);

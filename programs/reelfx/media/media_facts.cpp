@@ -65,11 +65,12 @@ MediaFacts FactsOf(const MediaReader& reader) {
         facts.bits = descriptor->comp[0].depth;
     }
     facts.size = facts.shownSize = {first.width, first.height};
-    const int quarters = QuarterTurnsOf(picture);
-    facts.turn = quarters * 90;
-    if (quarters % 2 != 0) std::swap(facts.shownSize.width, facts.shownSize.height);
-    const AVRational shape =
-        picture.sample_aspect_ratio.num > 0 ? picture.sample_aspect_ratio : AVRational{1, 1};
+    const PictureTurn turn = reader.Turn();
+    facts.turn = turn.Degrees();
+    facts.isMirrored = turn.IsMirrored();
+    if (turn.SwapsSides()) std::swap(facts.shownSize.width, facts.shownSize.height);
+    const AVRational guess = reader.PixelShape();
+    const AVRational shape = guess.num > 0 ? guess : AVRational{1, 1};
     facts.pixelShape = std::to_string(shape.num) + ":" + std::to_string(shape.den);
     const AVRational rate = reader.FrameRateGuess();
     facts.rate = {rate.num, rate.den};
@@ -112,7 +113,8 @@ std::vector<std::string> NotesOn(const MediaFacts& facts) {
     };
     note(facts.bits > 8, std::to_string(facts.bits) + " bits per channel: the effects work in floating point");
     note(facts.turn != 0, "rotation tag " + std::to_string(facts.turn) +
-                              " degrees: effects are applied to the upright picture, the tag is kept");
+                              " degrees: effects are applied to the upright picture");
+    note(facts.isMirrored, "mirroring tag: effects are applied to the picture as players show it");
     note(facts.isUnevenRate, "variable frame rate: the times of the frames are kept");
     note(facts.isInterlaced, "interlaced: both fields of a frame are rendered as one picture");
     note(facts.matrix == "unknown" && facts.assumedMatrix != "gbr",

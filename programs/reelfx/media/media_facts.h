@@ -24,9 +24,10 @@ struct MediaFacts {
     std::string pixelFormat;
     int bits = 8;  // of a sample
     FrameSize size;
-    FrameSize shownSize;     // turned upright; pixels are counted, not their shape
-    int turn = 0;            // degrees clockwise that make the picture upright
-    std::string pixelShape;  // "4:3"; "1:1" where the container does not tell
+    FrameSize shownSize;      // turned upright; pixels are counted, not their shape
+    int turn = 0;             // degrees clockwise that make the picture upright
+    bool isMirrored = false;  // left and right, before it is turned
+    std::string pixelShape;   // "4:3"; "1:1" where the container does not tell
     FrameRate rate;
     bool isUnevenRate = false;  // frames do not follow at a constant rate
     std::int64_t frames = 0;    // 0: not known

@@ -2,24 +2,69 @@
 
 #include <algorithm>
 #include <cstring>
-#include <filesystem>
 #include <numeric>
+#include <string>
 
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/interrupt.h"
+#include "programs/reelfx/media/library_log.h"
+
+extern "C" {
+#include <libavutil/pixdesc.h>
+}
 
 namespace velmora::hosts {
 namespace {
 
-// A file name may look like an address ("take:2.mov"); existing files count as files.
-std::string AddressOf(const std::string& path) {
-    std::error_code ignored;
-    return std::filesystem::exists(path, ignored) ? "file:" + path : path;
+// Packets lie in order of decoding: frames this much later may still be shown earlier.
+constexpr std::size_t kReorderedFrames = 64;
+constexpr double kReorderedSeconds = 5.0;
+
+// More frames without times than a decoder holds back have none at all.
+constexpr std::size_t kMostUntimed = 64;
+
+// Pixels that the rest of the program has no use for become others: colours of a palette are written out, and grey
+// without a tag is full range, as players take it.
+FramePtr Plain(FramePtr frame) {
+    const auto format = static_cast<AVPixelFormat>(frame->format);
+    const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
+    if (descriptor && descriptor->nb_components <= 2 && (descriptor->flags & AV_PIX_FMT_FLAG_PAL) == 0 &&
+        frame->color_range == AVCOL_RANGE_UNSPECIFIED) {
+        frame->color_range = AVCOL_RANGE_JPEG;
+    }
+    if (format != AV_PIX_FMT_PAL8) return frame;
+    std::uint32_t palette[AVPALETTE_COUNT];
+    std::memcpy(palette, frame->data[1], sizeof palette);
+    const bool isOpaque =
+        std::ranges::all_of(palette, [](std::uint32_t entry) { return entry >> 24 == 0xFF; });
+    FramePtr plain = NewFrame();
+    plain->width = frame->width;
+    plain->height = frame->height;
+    plain->format = isOpaque ? AV_PIX_FMT_RGB24 : AV_PIX_FMT_RGBA;
+    if (av_frame_get_buffer(plain.get(), 0) < 0 || av_frame_copy_props(plain.get(), frame.get()) < 0)
+        throw std::bad_alloc();
+    const int bytes = isOpaque ? 3 : 4;
+    for (int y = 0; y < frame->height; ++y) {
+        const std::uint8_t* from = frame->data[0] + std::ptrdiff_t{y} * frame->linesize[0];
+        std::uint8_t* to = plain->data[0] + std::ptrdiff_t{y} * plain->linesize[0];
+        for (int x = 0; x < frame->width; ++x, to += bytes) {
+            const std::uint32_t colour = palette[from[x]];
+            const std::uint8_t parts[4] = {
+                static_cast<std::uint8_t>(colour >> 16), static_cast<std::uint8_t>(colour >> 8),
+                static_cast<std::uint8_t>(colour), static_cast<std::uint8_t>(colour >> 24)};
+            std::memcpy(to, parts, static_cast<std::size_t>(bytes));
+        }
+    }
+    return plain;
 }
 
-const AVInputFormat* FormatOf(const InputOptions& options) {
-    if (options.rawSize) return av_find_input_format("rawvideo");
-    return options.path == "-" ? av_find_input_format("yuv4mpegpipe") : nullptr;
+// The libraries' own decoders of VP8 and VP9 leave out transparency, which these have.
+const AVCodec* DecoderOf(const AVStream& stream) {
+    const AVDictionaryEntry* alpha = av_dict_get(stream.metadata, "alpha_mode", nullptr, 0);
+    if (!alpha || std::string(alpha->value) != "1") return nullptr;
+    if (stream.codecpar->codec_id == AV_CODEC_ID_VP8) return avcodec_find_decoder_by_name("libvpx");
+    if (stream.codecpar->codec_id == AV_CODEC_ID_VP9) return avcodec_find_decoder_by_name("libvpx-vp9");
+    return nullptr;
 }
 
 }  // namespace
@@ -39,21 +84,8 @@ MediaReader::MediaReader(const InputOptions& options) : MediaReader(options, Clo
 }
 
 void MediaReader::Open(const InputOptions& options) {
-    std::error_code ignored;
-    if (std::filesystem::is_directory(options.path, ignored)) {
-        throw Failure(kExitInput,
-                      m_name + ": is a folder; use a file name or a pattern like frames-%03d.png");
-    }
-    AvOptions entries;
-    if (options.rawSize) {
-        entries.Set("pixel_format", "bgra");
-        entries.Set("video_size",
-                    std::to_string(options.rawSize->width) + "x" + std::to_string(options.rawSize->height));
-    }
-    if (options.rate) {
-        entries.Set("framerate", std::to_string(options.rate->numerator) + "/" +
-                                     std::to_string(options.rate->denominator));
-    }
+    InputAddress address;
+    Locate(options, address);
     AVFormatContext* container = avformat_alloc_context();
     if (!container) throw std::bad_alloc();
     container->interrupt_callback.callback = [](void*) { return Interrupts() > 0 ? 1 : 0; };
@@ -61,10 +93,12 @@ void MediaReader::Open(const InputOptions& options) {
         m_standardInput = OpenStandardInput();
         container->pb = m_standardInput.get();
     }
-    int error = avformat_open_input(&container, AddressOf(options.path).c_str(), FormatOf(options),
-                                    entries.Entries());
-    if (error < 0) FailReading("cannot be read: " + AvText(error), error);
+    int error =
+        avformat_open_input(&container, address.url.c_str(), address.format, address.entries.Entries());
+    if (error < 0) FailReading("cannot be read" + ErrorWords(error), error);
     m_container.reset(container);
+    CheckTaken(address);
+    m_timeLine = {};
     error = avformat_find_stream_info(container, nullptr);
     if (error < 0) FailReading("cannot be read: no known stream", error);
 }
@@ -81,15 +115,17 @@ void MediaReader::OpenDecoder() {
     const int index = av_find_best_stream(m_container.get(), AVMEDIA_TYPE_VIDEO, -1, -1, &codec, 0);
     if (index < 0 || !codec) throw Failure(kExitInput, m_name + ": contains no video that can be decoded");
     m_stream = m_container->streams[index];
+    if (const AVCodec* other = DecoderOf(*m_stream)) codec = other;
     m_decoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
     int error = avcodec_parameters_to_context(m_decoder.get(), m_stream->codecpar);
     m_decoder->pkt_timebase = m_stream->time_base;
     m_decoder->thread_count = 0;  // one per processor; the decoded frames do not depend on it
     if (error >= 0) error = avcodec_open2(m_decoder.get(), codec, nullptr);
-    if (error < 0) FailReading("cannot be decoded: " + AvText(error), error);
+    if (error < 0) FailReading("cannot be decoded" + ErrorWords(error), error);
 }
 
-std::vector<std::int64_t> MediaReader::FrameTimes(const InputOptions& options) {
+FrameTimes MediaReader::TimesOf(const InputOptions& options, std::optional<std::int64_t> frames,
+                                double seconds) {
     MediaReader reader(options, Closed{});
     if (options.path == "-")
         throw Failure(kExitInput, reader.m_name + ": its length is not known in advance");
@@ -97,21 +133,31 @@ std::vector<std::int64_t> MediaReader::FrameTimes(const InputOptions& options) {
     reader.OpenDecoder();
     AVFormatContext& container = *reader.m_container;
     const std::string format = container.iformat->name;
+    FrameTimes times;
     if (format == "image2" || format == "rawvideo") {  // one tick per frame, and too large to read twice
-        std::vector<std::int64_t> ticks(static_cast<std::size_t>(reader.FrameCountGuess()));
-        std::iota(ticks.begin(), ticks.end(), std::int64_t{0});
-        return ticks;
+        times.pts.resize(static_cast<std::size_t>(reader.FrameCountGuess()));
+        std::iota(times.pts.begin(), times.pts.end(), std::int64_t{0});
+        return times;
     }
     for (unsigned i = 0; i < container.nb_streams; ++i) {
         if (container.streams[i] != reader.m_stream) container.streams[i]->discard = AVDISCARD_ALL;
     }
-    std::vector<std::int64_t> times;
+    const auto ticks =
+        static_cast<std::int64_t>((seconds + kReorderedSeconds) / av_q2d(reader.m_stream->time_base));
+    const auto isEnough = [&] {
+        return frames && times.pts.size() > static_cast<std::size_t>(*frames) + kReorderedFrames &&
+               times.pts.back() - times.pts.front() > ticks;
+    };
     const PacketPtr packet = NewPacket();
     for (; av_read_frame(&container, packet.get()) >= 0; av_packet_unref(packet.get())) {
         const bool isShown = (packet->flags & AV_PKT_FLAG_DISCARD) == 0;
-        if (packet->stream_index == reader.m_stream->index && isShown) times.push_back(packet->pts);
+        if (packet->stream_index != reader.m_stream->index) continue;
+        reader.m_timeLine.Mend(container, *packet);
+        if (isShown) times.pts.push_back(packet->pts);
+        if (isEnough()) break;
     }
-    std::ranges::sort(times);
+    times.isContinuous = !reader.m_timeLine.HasJumped();
+    std::ranges::sort(times.pts);
     return times;
 }
 
@@ -130,9 +176,12 @@ void MediaReader::ReadMore() {
         ThrowIfNoMemory(error);
         m_ended = true;
         m_breakOff = BreakOffAt(error);
-        if (!m_pictureStopped) Decode(nullptr);
+        if (m_pictureStopped) return;
+        Decode(nullptr);
+        TakeUntimed(AV_NOPTS_VALUE);
         return;
     }
+    m_timeLine.Mend(*m_container, *packet);
     m_isLastPartial = (packet->flags & AV_PKT_FLAG_CORRUPT) != 0;
     m_packetsEnd = std::max(m_packetsEnd, packet->pos + packet->size);
     if (packet->pts != AV_NOPTS_VALUE) {
@@ -142,7 +191,25 @@ void MediaReader::ReadMore() {
     if (packet->stream_index != m_stream->index) {
         m_items.push_back({nullptr, std::move(packet)});
     } else if (!m_pictureStopped) {
+        if (!m_firstFrame) NoteExif(*packet);
         Decode(packet.get());
+    }
+}
+
+// JPEG: segments of a marker and a length, before the picture itself.
+void MediaReader::NoteExif(const AVPacket& packet) {
+    if (m_stream->codecpar->codec_id != AV_CODEC_ID_MJPEG || m_stream->nb_frames > 1) return;
+    constexpr char kName[] = "Exif\0";  // and another zero, which ends the text
+    for (int at = 2; at + 10 < packet.size && packet.data[at] == 0xFF && packet.data[at + 1] != 0xDA;) {
+        const int length = packet.data[at + 2] << 8 | packet.data[at + 3];
+        const bool isExif =
+            packet.data[at + 1] == 0xE1 && std::memcmp(packet.data + at + 4, kName, sizeof kName) == 0;
+        if (isExif && length > 8 && at + 2 + length <= packet.size) {
+            m_exif.assign(reinterpret_cast<const char*>(packet.data) + at + 10,
+                          static_cast<std::size_t>(length - 8));
+            return;
+        }
+        at += 2 + length;
     }
 }
 
@@ -163,18 +230,27 @@ std::string MediaReader::BreakOffAt(int error) const {
         const AVIndexEntry* const last = avformat_index_get_entry(stream, count - 1);
         if (last && last->pos + last->size > size) return "is cut off";
     }
+    if (EndsEarly(m_options.path, m_container->iformat->name)) return "is cut off";
     return {};
 }
 
 double MediaReader::MissingSeconds() const {
     constexpr double kTolerance = 0.5;  // headers round, and streams do not end together
     const AVFormatContext& container = *m_container;
-    const bool isTold =
-        container.duration > 0 && container.duration_estimation_method == AVFMT_DURATION_FROM_STREAM;
+    const bool isTold = container.duration > 0 && !m_timeLine.HasJumped() &&
+                        container.duration_estimation_method == AVFMT_DURATION_FROM_STREAM;
     if (!m_ended || m_pictureStopped || !isTold) return 0.0;
-    const std::int64_t start = container.start_time == AV_NOPTS_VALUE ? 0 : container.start_time;
-    const double missing = static_cast<double>(start + container.duration) / AV_TIME_BASE - m_secondsEnd;
+    const double missing = ContainerEnd() - m_secondsEnd;
     return missing > kTolerance ? missing : 0.0;
+}
+
+// Some containers count their length from 0 and some from their first time: what both ways agree on.
+double MediaReader::ContainerEnd() const {
+    const AVFormatContext& container = *m_container;
+    const std::int64_t start = container.start_time == AV_NOPTS_VALUE ? 0 : container.start_time;
+    const bool isEstimate = container.duration_estimation_method == AVFMT_DURATION_FROM_PTS;
+    const std::int64_t from = isEstimate ? start : std::min<std::int64_t>(start, 0);
+    return static_cast<double>(from + container.duration) / AV_TIME_BASE;
 }
 
 void MediaReader::Decode(const AVPacket* packet) {
@@ -198,22 +274,46 @@ void MediaReader::TakeFrames() {
             ++m_damaged;
             return;
         }
-        std::int64_t pts = frame->best_effort_timestamp;
-        if (pts == AV_NOPTS_VALUE || (m_lastPts != AV_NOPTS_VALUE && pts <= m_lastPts)) {
-            // The time is missing or does not advance: go one frame on by the rate.
-            const AVRational duration = av_inv_q(FrameRateGuess());
-            const std::int64_t step = av_rescale_q(1, duration, m_stream->time_base);
-            pts = m_lastPts == AV_NOPTS_VALUE ? 0 : m_lastPts + std::max<std::int64_t>(step, 1);
+        frame = Plain(std::move(frame));
+        if (m_lastPts == AV_NOPTS_VALUE && frame->best_effort_timestamp == AV_NOPTS_VALUE &&
+            m_untimed.size() < kMostUntimed) {
+            m_untimed.push_back(std::move(frame));
+            continue;
         }
-        frame->pts = m_lastPts = pts;
-        if (!m_firstFrame) m_firstFrame = Allocated<FramePtr>(av_frame_clone(frame.get()));
-        m_items.push_back({std::move(frame), nullptr});
+        TakeUntimed(frame->best_effort_timestamp);
+        TakeFrame(std::move(frame));
     }
 }
 
-void MediaReader::SeekBefore(double seconds) {
-    const double tick = av_q2d(m_stream->time_base);
-    Jump(m_firstFrame->pts + static_cast<std::int64_t>(seconds / tick));
+std::int64_t MediaReader::TicksPerFrame() const {
+    const std::int64_t step = av_rescale_q(1, av_inv_q(FrameRateGuess()), m_stream->time_base);
+    return std::max<std::int64_t>(step, 1);
+}
+
+// Frames at the start without times come at the clip's rate before the first that has one.
+void MediaReader::TakeUntimed(std::int64_t next) {
+    std::deque<FramePtr> frames;
+    frames.swap(m_untimed);
+    const std::int64_t step = TicksPerFrame();
+    std::int64_t pts = next == AV_NOPTS_VALUE ? 0 : next - step * static_cast<std::int64_t>(frames.size());
+    for (FramePtr& frame : frames) {
+        frame->best_effort_timestamp = pts;
+        pts += step;
+        TakeFrame(std::move(frame));
+    }
+}
+
+void MediaReader::TakeFrame(FramePtr frame) {
+    std::int64_t pts = frame->best_effort_timestamp;
+    if (pts == AV_NOPTS_VALUE || (m_lastPts != AV_NOPTS_VALUE && pts <= m_lastPts)) {
+        // The time is missing or does not advance: go one frame on by the rate.
+        pts = m_lastPts == AV_NOPTS_VALUE ? 0 : m_lastPts + TicksPerFrame();
+    }
+    frame->pts = m_lastPts = pts;
+    if (m_firstFrame && (frame->width != m_firstFrame->width || frame->height != m_firstFrame->height))
+        m_otherSize = std::to_string(frame->width) + "x" + std::to_string(frame->height);
+    if (!m_firstFrame) m_firstFrame = Allocated<FramePtr>(av_frame_clone(frame.get()));
+    m_items.push_back({std::move(frame), nullptr});
 }
 
 MediaReader::Landing MediaReader::SeekToFrame(std::int64_t pts) {
@@ -229,6 +329,7 @@ MediaReader::Landing MediaReader::SeekToFrame(std::int64_t pts) {
 
 void MediaReader::Rewind() {
     m_items.clear();
+    m_untimed.clear();
     m_lastPts = AV_NOPTS_VALUE;
     m_ended = false;
     m_breakOff.clear();
@@ -240,6 +341,8 @@ void MediaReader::Rewind() {
 bool MediaReader::Jump(std::int64_t pts) {
     if (av_seek_frame(m_container.get(), m_stream->index, pts, AVSEEK_FLAG_BACKWARD) < 0) return false;
     avcodec_flush_buffers(m_decoder.get());
+    m_timeLine.Forget();
+    m_untimed.clear();
     m_items.clear();
     m_lastPts = AV_NOPTS_VALUE;
     m_ended = false;
@@ -276,6 +379,10 @@ std::optional<double> MediaReader::SecondsOf(const AVPacket& packet) const {
            static_cast<double>(m_firstFrame->pts) * av_q2d(m_stream->time_base);
 }
 
+AVRational MediaReader::PixelShape() const {
+    return av_guess_sample_aspect_ratio(m_container.get(), m_stream, m_firstFrame.get());
+}
+
 AVRational MediaReader::FrameRateGuess() const {
     const AVRational rate = av_guess_frame_rate(m_container.get(), m_stream, nullptr);
     return rate.num > 0 && rate.den > 0 ? rate : AVRational{25, 1};
@@ -287,7 +394,9 @@ std::int64_t MediaReader::FrameCountGuess() const {
     if (m_stream->duration > 0) {
         seconds = static_cast<double>(m_stream->duration) * av_q2d(m_stream->time_base);
     } else if (m_container->duration > 0) {
-        seconds = static_cast<double>(m_container->duration) / AV_TIME_BASE;
+        const double start =
+            static_cast<double>(m_firstFrame ? m_firstFrame->pts : 0) * av_q2d(m_stream->time_base);
+        seconds = ContainerEnd() - std::max(start, 0.0);
     }
     return static_cast<std::int64_t>(seconds * av_q2d(FrameRateGuess()) + 0.5);
 }

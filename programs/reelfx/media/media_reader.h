@@ -1,6 +1,6 @@
 // Reads a clip: the frames of its picture in order of presentation, decoded, and the packets of its other
-// streams as they come. Reads whatever the media libraries read: files, image sequences ("frames-%03d.png"),
-// stills, addresses; "-" is YUV4MPEG2 on standard input; raw BGRA where a size is given.
+// streams as they come. Reads whatever the media libraries read: files, image sequences (see input_address.h),
+// stills, addresses; "-" is standard input; raw BGRA where a size is given.
 //
 // Times count in seconds from the presentation of the clip's first frame.
 #pragma once
@@ -11,16 +11,18 @@
 #include <string>
 #include <vector>
 
-#include "text/number_text.h"
 #include "programs/reelfx/media/av_handles.h"
+#include "programs/reelfx/media/input_address.h"
+#include "programs/reelfx/media/picture_turn.h"
 #include "programs/reelfx/media/standard_input.h"
+#include "programs/reelfx/media/time_line.h"
 
 namespace velmora::hosts {
 
-struct InputOptions {
-    std::string path;
-    std::optional<FrameSize> rawSize;  // the input is raw BGRA of this size
-    std::optional<FrameRate> rate;     // of raw input and image sequences
+// The times of a clip's frames in order, in its picture's time base, as its packets give them.
+struct FrameTimes {
+    std::vector<std::int64_t> pts;
+    bool isContinuous = true;  // false: the clock jumps, so that no frame can be found by its time
 };
 
 class MediaReader {
@@ -35,17 +37,14 @@ class MediaReader {
     // no frame.
     explicit MediaReader(const InputOptions& options);
 
-    // The times of the input's frames in order, in the picture's time base, as its packets give them. If two
-    // have the same time or one has none, only their count is meaningful. Reads the whole input without
-    // decoding it, except for image sequences. Throws Failure (kExitInput), also for an input that can be
-    // read only once.
-    static std::vector<std::int64_t> FrameTimes(const InputOptions& options);
+    // If two frames have the same time or one has none, only their count is meaningful. Reads the whole input
+    // without decoding it, except for image sequences; with `frames` and `seconds`, only until the clip has more
+    // frames and has lasted longer. Throws Failure (kExitInput), also for an input that can be read only once.
+    static FrameTimes TimesOf(const InputOptions& options, std::optional<std::int64_t> frames = {},
+                              double seconds = 0.0);
 
     Item Next();
 
-    // Continues reading somewhere before `seconds` if the input can jump, otherwise from the current
-    // position. The caller skips frames that are too early.
-    void SeekBefore(double seconds);
     enum class Landing {
         kStayed,     // the input cannot jump
         kBefore,     // at the frame or one before it
@@ -63,6 +62,9 @@ class MediaReader {
     [[nodiscard]] AVStream& Picture() const { return *m_stream; }
     // Size, pixel format and colours are those of the first frame.
     [[nodiscard]] const AVFrame& FirstFrame() const { return *m_firstFrame; }
+    // How players turn the picture.
+    [[nodiscard]] PictureTurn Turn() const { return TurnOf(*m_stream, *m_firstFrame); }
+    [[nodiscard]] AVRational PixelShape() const;  // 0/1 if unknown
     [[nodiscard]] double SecondsOf(std::int64_t pts) const;
     // The time of a packet of any stream, for cutting; nothing if it has none.
     [[nodiscard]] std::optional<double> SecondsOf(const AVPacket& packet) const;
@@ -75,6 +77,10 @@ class MediaReader {
     // Seconds that are missing compared with the length in the container's header; 0 if nothing is known to
     // be missing.
     [[nodiscard]] double MissingSeconds() const;
+    // "128x96" if a later frame has another size than the first; it was scaled. Otherwise empty.
+    [[nodiscard]] const std::string& OtherSize() const { return m_otherSize; }
+    // The EXIF block of a photograph, without its marker; empty if there is none.
+    [[nodiscard]] const std::string& Exif() const { return m_exif; }
     // Why reading stopped early: the file is cut off or was removed. Empty if the clip is complete as far as
     // known.
     [[nodiscard]] const std::string& BreakOff() const { return m_breakOff; }
@@ -93,10 +99,15 @@ class MediaReader {
     const AVFrame* Peek();
     [[noreturn]] void FailReading(const std::string& text, int error = 0) const;
     [[nodiscard]] std::string BreakOffAt(int error) const;
+    [[nodiscard]] double ContainerEnd() const;
+    void NoteExif(const AVPacket& packet);
     void OpenDecoder();
     void ReadMore();  // advances by at least one packet
     void Decode(const AVPacket* packet);
     void TakeFrames();
+    void TakeUntimed(std::int64_t next);
+    void TakeFrame(FramePtr frame);
+    [[nodiscard]] std::int64_t TicksPerFrame() const;
 
     InputOptions m_options;
     std::string m_name;
@@ -105,8 +116,12 @@ class MediaReader {
     std::unique_ptr<AVFormatContext, CloseInput> m_container;
     AVStream* m_stream = nullptr;
     CodecPtr m_decoder;
-    std::deque<Item> m_items;  // read ahead
+    std::deque<Item> m_items;        // read ahead
+    std::deque<FramePtr> m_untimed;  // decoded before any that has a time
     FramePtr m_firstFrame;
+    TimeLine m_timeLine;
+    std::string m_otherSize;
+    std::string m_exif;
     std::int64_t m_lastPts = AV_NOPTS_VALUE;
     std::int64_t m_damaged = 0;
     std::int64_t m_packetsEnd = 0;  // position in the file after the last packet

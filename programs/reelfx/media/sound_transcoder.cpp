@@ -37,22 +37,48 @@ CodecPtr OpenDecoder(const AVStream& source) {
     return decoder;
 }
 
+// The source's channels if the codec takes as many, otherwise the most that it takes.
+void ChooseLayout(const AVCodec& codec, const AVCodecContext& decoder, AVCodecContext& encoder) {
+    constexpr int kMostChannels = 8;
+    const int channels = std::min(decoder.ch_layout.nb_channels, kMostChannels);
+    const AVChannelLayout* chosen = nullptr;
+    for (const AVChannelLayout* layout = codec.ch_layouts; layout && layout->nb_channels > 0; ++layout) {
+        const bool isSame = av_channel_layout_compare(layout, &decoder.ch_layout) == 0;
+        const bool isCloser =
+            layout->nb_channels <= channels && (!chosen || layout->nb_channels > chosen->nb_channels);
+        if (isSame || isCloser) chosen = layout;
+        if (isSame) break;
+    }
+    if (chosen) {
+        av_channel_layout_copy(&encoder.ch_layout, chosen);
+    } else {
+        av_channel_layout_default(&encoder.ch_layout, channels);
+    }
+}
+
+// Lossless codecs keep the depth that the source has.
+AVSampleFormat ClosestFormat(const AVCodec& codec, AVSampleFormat wanted) {
+    if (!codec.sample_fmts) return wanted;
+    for (const AVSampleFormat* format = codec.sample_fmts; *format != AV_SAMPLE_FMT_NONE; ++format) {
+        if (av_get_packed_sample_fmt(*format) == av_get_packed_sample_fmt(wanted)) return *format;
+    }
+    return codec.sample_fmts[0];
+}
+
 }  // namespace
 
-SoundTranscoder::SoundTranscoder(const AVStream& source, AVCodecID target, bool globalHeader)
+SoundTranscoder::SoundTranscoder(const AVStream& source, const AVCodec& target, bool globalHeader)
     : m_sourceBase(source.time_base), m_decoder(OpenDecoder(source)) {
-    const AVCodec* codec = avcodec_find_encoder(target);
-    if (!codec) throw Failure(kExitOutput, "the sound cannot be encoded; use --no-sound to leave it out");
-    m_encoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
-    const int channels = std::min(m_decoder->ch_layout.nb_channels, 8);
-    av_channel_layout_default(&m_encoder->ch_layout, channels);
-    m_encoder->sample_rate = NearestRate(*codec, m_decoder->sample_rate);
-    m_encoder->sample_fmt = codec->sample_fmts ? codec->sample_fmts[0] : m_decoder->sample_fmt;
+    m_encoder = Allocated<CodecPtr>(avcodec_alloc_context3(&target));
+    ChooseLayout(target, *m_decoder, *m_encoder);
+    const int channels = m_encoder->ch_layout.nb_channels;
+    m_encoder->sample_rate = NearestRate(target, m_decoder->sample_rate);
+    m_encoder->sample_fmt = ClosestFormat(target, m_decoder->sample_fmt);
     m_encoder->bit_rate = kBitRatePerChannel * channels;
     m_encoder->time_base = {1, m_encoder->sample_rate};
     m_encoder->thread_count = 1;
     if (globalHeader) m_encoder->flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
-    const int error = avcodec_open2(m_encoder.get(), codec, nullptr);
+    const int error = avcodec_open2(m_encoder.get(), &target, nullptr);
     ThrowIfNoMemory(error);
     if (error < 0) {
         throw Failure(kExitOutput, "the sound cannot be encoded; use --no-sound to leave it out");

@@ -1,7 +1,6 @@
 #include "programs/reelfx/pipeline/clip_pictures.h"
 
 #include <algorithm>
-#include <filesystem>
 #include <utility>
 
 #include "text/number_text.h"
@@ -18,20 +17,13 @@ void FailIfInterrupted() {
     if (Interrupts() > 0) throw Failure(kExitInterrupted, "interrupted; nothing was written");
 }
 
-bool CanBeReadTwice(const std::string& path) {
-    namespace fs = std::filesystem;
-    std::error_code ignored;
-    const fs::file_status status = fs::status(path, ignored);
-    return path != "-" && !fs::is_fifo(status) && !fs::is_character_file(status) && !fs::is_socket(status);
-}
-
 SectionOptions SectionOf(const InputOptions& input, const FramePlace& place, std::int64_t count) {
     SectionOptions section;
     section.firstFrame = place.frame.value_or(0);
     section.start = place.start;
     if (place.frame || place.start || !CanBeReadTwice(input.path)) return section;
-    section.frameTimes = MediaReader::FrameTimes(input);
-    const auto frames = static_cast<std::int64_t>(section.frameTimes.size());
+    section.frameTimes = MediaReader::TimesOf(input);
+    const auto frames = static_cast<std::int64_t>(section.frameTimes.pts.size());
     section.firstFrame = std::max<std::int64_t>(0, (frames - count) / 2);
     return section;
 }
@@ -39,7 +31,12 @@ SectionOptions SectionOf(const InputOptions& input, const FramePlace& place, std
 }  // namespace
 
 ClipPictures::ClipPictures(const InputOptions& input, const FramePlace& place, std::int64_t count)
-    : m_place(SectionOf(input, place, count)), m_reader(input), m_section(m_reader, m_place) {}
+    : m_place(SectionOf(input, place, count)), m_reader(input), m_section(m_reader, Resolved(input)) {}
+
+const SectionOptions& ClipPictures::Resolved(const InputOptions& input) {
+    ResolveStart(input, m_reader, m_place);
+    return m_place;
+}
 
 std::optional<ClipPicture> ClipPictures::Next() {
     PipelineItemPtr item;
@@ -54,7 +51,7 @@ std::optional<ClipPicture> ClipPictures::Next() {
     BgraPicture lying(first.width, first.height);
     PixelConverter().ToBgra(*item->frame, lying);
     ClipPicture result = {.picture = {}, .seconds = item->seconds, .index = item->index};
-    TurnPicture(lying, QuarterTurnsOf(m_reader.Picture()), result.picture);
+    TurnPicture(lying, m_reader.Turn(), result.picture);
     return result;
 }
 

@@ -35,6 +35,7 @@ class ClipPictures {
 
   private:
     [[noreturn]] void FailWithoutFrame() const;
+    const SectionOptions& Resolved(const InputOptions& input);
 
     SectionOptions m_place;
     MediaReader m_reader;

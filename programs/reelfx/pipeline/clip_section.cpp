@@ -2,9 +2,14 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstring>
 
 #include "text/number_text.h"
 #include "programs/reelfx/common/interrupt.h"
+
+extern "C" {
+#include <libavutil/intreadwrite.h>
+}
 
 namespace velmora::hosts {
 namespace {
@@ -20,8 +25,8 @@ constexpr int kFramesAhead = 32;
 
 }  // namespace
 
-SectionOptions ResolveFarm(const FarmPart& farm, std::vector<std::int64_t> frameTimes) {
-    const auto frames = static_cast<std::int64_t>(frameTimes.size());
+SectionOptions ResolveFarm(const FarmPart& farm, FrameTimes frameTimes) {
+    const auto frames = static_cast<std::int64_t>(frameTimes.pts.size());
     if (frames < farm.parts) {
         throw UsageError("--farm: a clip of " + std::to_string(frames) + " frames cannot be split into " +
                          std::to_string(farm.parts) + " parts");
@@ -35,22 +40,30 @@ SectionOptions ResolveFarm(const FarmPart& farm, std::vector<std::int64_t> frame
     return section;
 }
 
+void ResolveStart(const InputOptions& input, const MediaReader& reader, SectionOptions& section) {
+    const double start = section.start.value_or(0.0);
+    const bool isLate = start > 0.0 || section.firstFrame > 0;
+    if (!isLate || !section.frameTimes.pts.empty() || !CanBeReadTwice(input.path)) return;
+    section.frameTimes = MediaReader::TimesOf(input, section.firstFrame, start);
+    const std::vector<std::int64_t>& times = section.frameTimes.pts;
+    if (!section.start) return;
+    const auto first = std::ranges::find_if(
+        times, [&](std::int64_t pts) { return reader.SecondsOf(pts) >= start - kTimeTolerance; });
+    section.firstFrame = first - times.begin();
+}
+
 ClipSection::ClipSection(MediaReader& reader, const SectionOptions& options)
     : m_reader(reader), m_options(options) {
-    if (options.start && *options.start > 0.0) {
-        m_hasJumped = true;
-        reader.SeekBefore(std::max(0.0, *options.start - kFramesAhead / av_q2d(reader.FrameRateGuess())));
-    }
-    if (options.firstFrame > 0 && !options.frameTimes.empty()) JumpToFirstFrame();
+    if (options.firstFrame > 0 && !options.frameTimes.pts.empty()) JumpToFirstFrame();
 }
 
 void ClipSection::JumpToFirstFrame() {
-    const std::vector<std::int64_t>& times = m_options.frameTimes;
+    const std::vector<std::int64_t>& times = m_options.frameTimes.pts;
     // Each frame must have a unique time, and the first decoded frame must be the first of these.
-    const bool isClear = times.front() == m_reader.FirstFrame().pts &&
+    const bool isClear = m_options.frameTimes.isContinuous && times.front() == m_reader.FirstFrame().pts &&
                          std::ranges::adjacent_find(times, std::ranges::equal_to()) == times.end();
-    if (!isClear) return;
     const auto goal = std::max<std::int64_t>(m_options.firstFrame - kFramesAhead, 0);
+    if (!isClear || goal >= static_cast<std::int64_t>(times.size())) return;
     const auto landing = m_reader.SeekToFrame(times[static_cast<std::size_t>(goal)]);
     m_isByFrameTime = landing == MediaReader::Landing::kBefore;
     if (landing == MediaReader::Landing::kElsewhere) m_reader.Rewind();
@@ -67,6 +80,7 @@ PipelineItemPtr ClipSection::Next() {
             m_isOver = true;
         }
     }
+    if (m_isOver && !m_endSeconds && m_firstSeconds) EndWithClip();
     if (m_ready.empty() || Interrupts() != 0) return nullptr;
     PipelineItemPtr item = std::move(m_ready.front());
     m_ready.pop_front();
@@ -86,12 +100,14 @@ bool ClipSection::IsBehind(std::int64_t index, double seconds) const {
 void ClipSection::TakeFrame(FramePtr frame) {
     if (m_endSeconds) return;
     const double seconds = m_reader.SecondsOf(frame->pts);
-    const std::int64_t index = IndexOf(frame->pts, seconds);
+    const std::int64_t index = IndexOf(frame->pts);
     if (IsBefore(index, seconds)) return;
+    m_lastSeconds = seconds;
     if (IsBehind(index, seconds)) {
         m_endSeconds = seconds;
         m_reader.StopPicture();
         m_isOver = m_reader.Container().nb_streams == 1;
+        ReleaseHeld();
         return;
     }
     auto item = std::make_unique<PipelineItem>();
@@ -99,19 +115,26 @@ void ClipSection::TakeFrame(FramePtr frame) {
     item->index = index;
     item->seconds = seconds;
     m_ready.push_back(std::move(item));
-    if (m_firstSeconds) return;
-    m_firstSeconds = seconds;
-    for (PacketPtr& packet : m_held) TakePacket(std::move(packet));
+    if (!m_firstSeconds) m_firstSeconds = seconds;
+    ReleaseHeld();
+}
+
+// The clip has ended before the section: what was held plays after the last frame.
+void ClipSection::EndWithClip() {
+    for (PacketPtr& packet : m_held) Put(std::move(packet));
     m_held.clear();
 }
 
-std::int64_t ClipSection::IndexOf(std::int64_t pts, double seconds) {
-    if (m_isByFrameTime) {
-        const std::vector<std::int64_t>& times = m_options.frameTimes;
-        return std::ranges::lower_bound(times, pts) - times.begin();
-    }
-    // After a jump the frames before it have not been counted.
-    if (m_hasJumped) return std::llround(seconds * av_q2d(m_reader.FrameRateGuess()));
+void ClipSection::ReleaseHeld() {
+    std::deque<PacketPtr> held;
+    held.swap(m_held);
+    for (PacketPtr& packet : held) TakePacket(std::move(packet));
+}
+
+std::int64_t ClipSection::IndexOf(std::int64_t pts) {
+    const std::vector<std::int64_t>& times = m_options.frameTimes.pts;
+    if (m_isByFrameTime && pts <= times.back())
+        m_nextIndex = std::ranges::lower_bound(times, pts) - times.begin();
     return m_nextIndex++;
 }
 
@@ -120,14 +143,35 @@ void ClipSection::TakePacket(PacketPtr packet) {
         Put(std::move(packet));
         return;
     }
-    if (!m_firstSeconds) {
+    const double seconds = m_reader.SecondsOf(*packet).value_or(m_lastSeconds);
+    if (m_endSeconds && seconds > *m_endSeconds + kInterleaving) m_isOver = true;
+    // Whether a packet is still part of the section is known only when the picture has come as far.
+    const bool isBehindHeld = std::ranges::any_of(
+        m_held, [&](const PacketPtr& held) { return held->stream_index == packet->stream_index; });
+    if (!m_firstSeconds || (!m_endSeconds && (seconds > m_lastSeconds || isBehindHeld))) {
         m_held.push_back(std::move(packet));
         return;
     }
-    const double seconds = m_reader.SecondsOf(*packet).value_or(*m_firstSeconds);
-    if (m_endSeconds && seconds > *m_endSeconds + kInterleaving) m_isOver = true;
-    const bool isAudible = seconds >= *m_firstSeconds && (!m_endSeconds || seconds < *m_endSeconds);
-    if (isAudible) Put(std::move(packet));
+    if (seconds < *m_firstSeconds || (m_endSeconds && seconds >= *m_endSeconds)) return;
+    Cut(*packet, seconds);
+    Put(std::move(packet));
+}
+
+// Sound ends with the section's last frame, not with its own packet.
+void ClipSection::Cut(AVPacket& packet, double seconds) const {
+    const AVStream& stream = *m_reader.Container().streams[packet.stream_index];
+    const AVCodecParameters& parameters = *stream.codecpar;
+    if (!m_endSeconds || packet.duration <= 0) return;
+    const double length = static_cast<double>(packet.duration) * av_q2d(stream.time_base);
+    const double over = seconds + length - *m_endSeconds;
+    if (over <= 0.0) return;
+    packet.duration -= std::llround(over / av_q2d(stream.time_base));
+    if (parameters.codec_type != AVMEDIA_TYPE_AUDIO || parameters.sample_rate <= 0) return;
+    constexpr int kSkipBytes = 10;  // samples to skip at the start and at the end, and two bytes of reasons
+    std::uint8_t* skip = av_packet_new_side_data(&packet, AV_PKT_DATA_SKIP_SAMPLES, kSkipBytes);
+    if (!skip) throw std::bad_alloc();
+    std::memset(skip, 0, kSkipBytes);
+    AV_WL32(skip + 4, static_cast<std::uint32_t>(std::llround(over * parameters.sample_rate)));
 }
 
 void ClipSection::Put(PacketPtr packet) {
@@ -141,7 +185,7 @@ std::int64_t ClipSection::FrameCountGuess(const MediaReader& reader, const Secti
     const double rate = av_q2d(reader.FrameRateGuess());
     if (options.endFrame) count = count > 0 ? std::min(count, *options.endFrame) : *options.endFrame;
     if (count > 0) count -= options.firstFrame;
-    if (count > 0 && options.start) count -= std::llround(*options.start * rate);
+    if (count > 0 && options.start && options.firstFrame == 0) count -= std::llround(*options.start * rate);
     if (options.duration) {
         const std::int64_t asked = std::llround(*options.duration * rate);
         count = count > 0 ? std::min(count, asked) : asked;

@@ -26,8 +26,9 @@ FrameWorker::FrameWorker(EffectListSession session, const Job& job)
 void FrameWorker::Work(PipelineItem& item) {
     const BgraPicture& result = Result(item);
     if (m_job.withDigest) {
-        item.digest = FrameDigest(result.Row(0), static_cast<std::int32_t>(result.RowBytes() / 4),
-                                  result.Height(), result.Stride());
+        const BgraPicture& stored = AsStored(result);
+        item.digest = FrameDigest(stored.Row(0), static_cast<std::int32_t>(stored.RowBytes() / 4),
+                                  stored.Height(), stored.Stride());
     }
     if (!m_job.writer) return;
     // An unchanged frame keeps its own samples, including those that the picture cannot hold.
@@ -53,13 +54,23 @@ BgraPicture& FrameWorker::Result(const PipelineItem& item) {
 
 BgraPicture& FrameWorker::Apply(const PipelineItem& item) {
     BgraPicture* input = &m_source;
-    if (m_job.quarterTurns != 0) {
-        TurnPicture(m_source, m_job.quarterTurns, m_upright);
+    if (!m_job.turn.IsNone()) {
+        TurnPicture(m_source, m_job.turn, m_upright);
         input = &m_upright;
     }
     m_effects.Render(*input, m_result, {.frame = item.index, .seconds = item.seconds});
-    if (m_job.quarterTurns == 0) return m_result;
-    TurnPicture(m_result, 4 - m_job.quarterTurns, m_source);
+    if (m_job.turn.IsNone() || StaysUpright()) return m_result;
+    TurnPicture(m_result, m_job.turn.Back(), m_source);
+    return m_source;
+}
+
+bool FrameWorker::StaysUpright() const {
+    return !m_job.turn.IsNone() && m_job.writer && m_job.writer->IsUpright();
+}
+
+const BgraPicture& FrameWorker::AsStored(const BgraPicture& result) {
+    if (!StaysUpright()) return result;
+    TurnPicture(result, m_job.turn.Back(), m_source);
     return m_source;
 }
 

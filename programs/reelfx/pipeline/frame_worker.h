@@ -8,6 +8,7 @@
 #include "programs/reelfx/pipeline/effect_list.h"
 #include "programs/reelfx/pipeline/frame_pipeline.h"
 #include "programs/reelfx/media/media_writer.h"
+#include "programs/reelfx/media/picture_turn.h"
 #include "programs/reelfx/media/pixel_converter.h"
 
 namespace velmora::hosts {
@@ -17,7 +18,7 @@ class FrameWorker {
     struct Job {
         const MediaWriter* writer = nullptr;  // null: only digests are wanted
         FrameSize size = {};                  // of the source's frames
-        int quarterTurns = 0;                 // see QuarterTurnsOf
+        PictureTurn turn = {};                // which makes the picture upright
         bool withDigest = false;
         SampleType samples = SampleType::kBytes;  // that the effects work on
         bool isMatte = false;                     // the result is only the damage, see matte.h
@@ -29,7 +30,11 @@ class FrameWorker {
 
   private:
     BgraPicture& Result(const PipelineItem& item);
-    BgraPicture& Apply(const PipelineItem& item);  // the result for m_source, turned as the source is
+    // The result for m_source, turned as the output is.
+    BgraPicture& Apply(const PipelineItem& item);
+    [[nodiscard]] bool StaysUpright() const;
+    // Turned as the source is: digests do not depend on the output.
+    const BgraPicture& AsStored(const BgraPicture& result);
 
     EffectListSession m_effects;
     Job m_job;

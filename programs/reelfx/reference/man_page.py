@@ -7,7 +7,8 @@ DATE = "2026-11-22"
 
 DESCRIPTION = """\
 reelfx makes video look like old film: shake, dust, scratches, worn emulsion, flicker, faded colours and glow. It reads
-everything that FFmpeg can read and keeps sound, size, frame rate, times and colours.
+everything that FFmpeg can read and keeps sound, subtitles, chapters, size, frame rate, times and colours. What OUT cannot hold
+is converted or left out, and said on one line on standard error.
 
 The same settings, seed and frames give the same bytes on every machine and with any number of threads, whether a part of a
 clip or the whole clip is rendered. Another seed gives other shake, flicker, wear, spots and scratches. With seed 0, flicker
@@ -36,6 +37,10 @@ frames (their total number, if known), seconds and fps (since the start), and pr
 been written. A command that fails writes one line of text instead of end. With --into, an object with the fields clip, clips, input
 and output comes before each clip.
 
+An image sequence is a pattern with a number (frames-%03d.png), a pattern in quotes ("frames-*.png") or a folder. It begins with
+the first number that exists. Images of a sequence that is written are numbered from 1, or from the frame after A with --frames
+A:B; where a clip has a variable frame rate, frames are repeated so that images come at a constant rate.
+
 With --hash, a line is printed on standard output for each frame: the word frame, its number in the clip from 0, the word md5,
 and the MD5 of its rows of blue, green, red and alpha bytes. FFmpeg's framemd5 gives the same MD5 for the pixel format bgra.
 """
@@ -53,6 +58,9 @@ EXAMPLES = (
      'reelfx strip in.mp4 strip.png -e "Film Damage" -p Shredded --crop 150x500+600+0'),
     ("Use reelfx between two other programs:",
      'ffmpeg -i in.mov -f yuv4mpegpipe - | reelfx render - - -e "Film Look" -p Sepia | ffplay -'),
+    ("Send MP4 with sound to another program:",
+     'reelfx render in.mkv - -e "Film Look" -p Sepia --format mp4 | ffplay -'),
+    ("Render all scans of a folder as a film:", 'reelfx render scans out.mov -e "Film Pro" -p "Super 8" --rate 24'),
 )
 
 

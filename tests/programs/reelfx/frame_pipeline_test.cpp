@@ -71,12 +71,12 @@ TEST(PictureTurn, QuartersGoClockwise) {
     // 3 4 5 -> 4 1
     //          5 2
     BgraPicture upright, back;
-    TurnPicture(lying, 1, upright);
+    TurnPicture(lying, {0, -1, 1, 0}, upright);
     ASSERT_EQ(upright.Width(), 2);
     ASSERT_EQ(upright.Height(), 3);
     const std::uint8_t expected[] = {3, 0, 4, 1, 5, 2};
     for (int i = 0; i < 6; ++i) EXPECT_EQ(upright.Row(i / 2)[i % 2 * 4], expected[i]);
-    TurnPicture(upright, 3, back);
+    TurnPicture(upright, PictureTurn{0, -1, 1, 0}.Back(), back);
     for (std::uint8_t i = 0; i < 6; ++i) EXPECT_EQ(back.Row(i / 3)[i % 3 * 4], i);
 }
 

@@ -176,11 +176,11 @@ class Input(Commands):
         for source in ("-", self.out / "cut.y4m"):
             done = reelfx("frame", source, self.out / "x.png", *DAMAGE, "--frame", 40, input=y4m[:len(y4m) // 2])
             self.check_failed(done, [3], "inside a frame")
-        # This container stores its length, but not where its last frame is.
+        # This container stores its own length, but not where its last frame is.
         film = self.out / "film.mkv"
         ffmpeg("-i", clips.small, "-c", "copy", film)
         (self.out / "cut.mkv").write_bytes(film.read_bytes()[:film.stat().st_size * 4 // 10])
-        self.check_failed(reelfx("render", self.out / "cut.mkv", self.out / "x.mp4", *DAMAGE), [0], "s early")
+        self.check_failed(reelfx("render", self.out / "cut.mkv", self.out / "x.mp4", *DAMAGE), [3], "cut off", "first")
 
     def while_it_runs(self, args, action):
         """Runs a render and lets `action` happen once it has begun to write, while it is paused."""

@@ -1,0 +1,104 @@
+#include "programs/reelfx/media/container_contents.h"
+
+#include <algorithm>
+#include <initializer_list>
+
+#include "programs/reelfx/media/library_log.h"
+
+namespace velmora::hosts {
+namespace {
+
+// Formats whose writers take any codec, also those that no player finds again.
+struct ContentsRow {
+    const char* format;
+    std::initializer_list<AVCodecID> codecs;
+};
+const ContentsRow kContents[] = {
+    {"mpegts", {AV_CODEC_ID_MPEG1VIDEO,   AV_CODEC_ID_MPEG2VIDEO,   AV_CODEC_ID_MPEG4,
+                AV_CODEC_ID_H264,         AV_CODEC_ID_HEVC,         AV_CODEC_ID_DIRAC,
+                AV_CODEC_ID_VC1,          AV_CODEC_ID_MP1,          AV_CODEC_ID_MP2,
+                AV_CODEC_ID_MP3,          AV_CODEC_ID_AAC,          AV_CODEC_ID_AAC_LATM,
+                AV_CODEC_ID_AC3,          AV_CODEC_ID_EAC3,         AV_CODEC_ID_DTS,
+                AV_CODEC_ID_TRUEHD,       AV_CODEC_ID_OPUS,         AV_CODEC_ID_S302M,
+                AV_CODEC_ID_DVB_SUBTITLE, AV_CODEC_ID_DVB_TELETEXT, AV_CODEC_ID_HDMV_PGS_SUBTITLE,
+                AV_CODEC_ID_SMPTE_KLV,    AV_CODEC_ID_TIMED_ID3}},
+    {"mpeg",
+     {AV_CODEC_ID_MPEG1VIDEO, AV_CODEC_ID_MPEG2VIDEO, AV_CODEC_ID_MP1, AV_CODEC_ID_MP2, AV_CODEC_ID_MP3,
+      AV_CODEC_ID_AC3, AV_CODEC_ID_DTS, AV_CODEC_ID_DVD_SUBTITLE}},
+    {"ogg",
+     {AV_CODEC_ID_THEORA, AV_CODEC_ID_VP8, AV_CODEC_ID_VORBIS, AV_CODEC_ID_OPUS, AV_CODEC_ID_FLAC,
+      AV_CODEC_ID_SPEEX}},
+    {"mxf",
+     {AV_CODEC_ID_MPEG2VIDEO, AV_CODEC_ID_H264, AV_CODEC_ID_DNXHD, AV_CODEC_ID_PRORES, AV_CODEC_ID_PCM_S16LE,
+      AV_CODEC_ID_PCM_S24LE}},
+};
+
+bool IsOneOf(const AVOutputFormat& format, std::initializer_list<const char*> names) {
+    return std::ranges::find(names, std::string(format.name)) != names.end();
+}
+
+AVStream* AddStream(AVFormatContext& container, const AVCodecParameters& parameters, AVRational timeBase) {
+    AVStream* stream = avformat_new_stream(&container, nullptr);
+    if (!stream || avcodec_parameters_copy(stream->codecpar, &parameters) < 0) throw std::bad_alloc();
+    stream->codecpar->codec_tag = 0;
+    stream->time_base = timeBase;
+    return stream;
+}
+
+}  // namespace
+
+bool CanHold(const AVOutputFormat& format, AVCodecID codec) {
+    const int known = avformat_query_codec(&format, codec, FF_COMPLIANCE_NORMAL);
+    const std::string name = IsOneOf(format, {"vob", "dvd", "svcd", "vcd"}) ? "mpeg" : format.name;
+    for (const ContentsRow& row : kContents) {
+        if (name == row.format) return std::ranges::find(row.codecs, codec) != row.codecs.end();
+    }
+    return known == 1;
+}
+
+bool CanBegin(const AVOutputFormat& format, const AVCodecParameters& picture, const AVStream& other) {
+    AVFormatContext* container = nullptr;
+    if (avformat_alloc_output_context2(&container, &format, nullptr, nullptr) < 0) throw std::bad_alloc();
+    const std::unique_ptr<AVFormatContext, void (*)(AVFormatContext*)> owner(container,
+                                                                             avformat_free_context);
+    AVStream* shown = AddStream(*container, picture, {1, 25});
+    shown->avg_frame_rate = {25, 1};
+    AddStream(*container, *other.codecpar, other.time_base)->disposition = other.disposition;
+    int error = avio_open_dyn_buf(&container->pb);
+    if (error >= 0) error = avformat_write_header(container, nullptr);
+    std::uint8_t* bytes = nullptr;
+    if (container->pb) avio_close_dyn_buf(container->pb, &bytes);
+    av_free(bytes);
+    container->pb = nullptr;
+    ThrowIfNoMemory(error);
+    ForgetLibraryErrors();
+    return error >= 0;
+}
+
+bool IsMovFamily(const AVOutputFormat& format) {
+    return IsOneOf(format, {"mov", "mp4", "ipod", "3gp", "3g2", "psp", "ismv", "f4v"});
+}
+
+bool HoldsTurn(const AVOutputFormat& format) {
+    return IsMovFamily(format);
+}
+
+bool HoldsRange(const AVOutputFormat& format, AVCodecID codec) {
+    switch (codec) {
+        case AV_CODEC_ID_H264:
+        case AV_CODEC_ID_HEVC:
+        case AV_CODEC_ID_AV1:
+        case AV_CODEC_ID_VP9:
+        case AV_CODEC_ID_MJPEG:
+            return true;
+        default:
+            break;
+    }
+    return IsOneOf(format, {"matroska", "webm", "yuv4mpegpipe", "image2", "gif", "apng", "webp"});
+}
+
+bool HoldsOtherStreams(const AVOutputFormat& format) {
+    return format.audio_codec != AV_CODEC_ID_NONE;
+}
+
+}  // namespace velmora::hosts

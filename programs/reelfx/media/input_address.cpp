@@ -1,0 +1,166 @@
+#include "programs/reelfx/media/input_address.h"
+
+#include <algorithm>
+#include <array>
+#include <cctype>
+#include <filesystem>
+#include <fstream>
+#include <map>
+
+#include "programs/reelfx/common/failure.h"
+
+namespace velmora::hosts {
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr char kFileScheme[] = "file:";
+// Sequences often begin at 1001 or at a time code. Each number is tried until a file is found.
+constexpr char kFirstNumbers[] = "1000000";
+
+bool IsAddress(const std::string& path) {
+    return path.find("://") != std::string::npos;
+}
+
+bool IsImageName(const std::string& name) {
+    const AVOutputFormat* images = av_guess_format("image2", nullptr, nullptr);
+    return images && av_match_ext(name.c_str(), images->extensions) != 0;
+}
+
+std::string Escaped(const std::string& path) {
+    std::string text;
+    for (const char letter : path) {
+        if (std::string("\\*?[]{}").find(letter) != std::string::npos) text += '\\';
+        text += letter;
+    }
+    return text;
+}
+
+// A pattern of all images in the folder, which are of one kind.
+std::string PatternOfFolder(const std::string& folder) {
+    std::map<std::string, int> kinds;
+    std::error_code ignored;
+    for (fs::directory_iterator entry(folder, ignored), end; !ignored && entry != end;
+         entry.increment(ignored)) {
+        const std::string name = entry->path().filename().string();
+        if (name.front() != '.' && IsImageName(name)) ++kinds[entry->path().extension().string()];
+    }
+    if (kinds.empty()) {
+        throw Failure(kExitInput, folder +
+                                      ": is a folder without images; use a file name or a pattern like "
+                                      "frames-%03d.png");
+    }
+    if (kinds.size() > 1) {
+        throw Failure(kExitInput, folder + ": the folder has images of several kinds; use a pattern like " +
+                                      (fs::path(folder) / "*").string() + kinds.begin()->first);
+    }
+    return Escaped(fs::path(folder).string()) + "/*" + kinds.begin()->first;
+}
+
+void LocateImages(const std::string& pattern, InputAddress& address) {
+    address.url = pattern;
+    address.format = av_find_input_format("image2");
+    address.entries.Set("pattern_type", "glob");
+}
+
+std::uint64_t BigEndian(const std::uint8_t* bytes, int count) {
+    std::uint64_t value = 0;
+    for (int i = 0; i < count; ++i) value = value << 8 | bytes[i];
+    return value;
+}
+
+// An EBML number at `at`, which is moved behind it. All ones mean that it is unknown: 0.
+std::uint64_t EbmlSize(const std::uint8_t* bytes, std::size_t& at) {
+    int length = 1;
+    while (length < 8 && (bytes[at] & (0x80 >> (length - 1))) == 0) ++length;
+    const std::uint64_t mask = (std::uint64_t{1} << (7 * length)) - 1;
+    const std::uint64_t value = BigEndian(bytes + at, length) & mask;
+    at += static_cast<std::size_t>(length);
+    return value == mask ? 0 : value;
+}
+
+std::uint64_t MatroskaLength(const std::uint8_t* head, std::size_t size) {
+    constexpr std::size_t kLongestNumber = 12;
+    if (BigEndian(head, 4) != 0x1A45DFA3) return 0;
+    std::size_t at = 4;
+    const std::uint64_t header = EbmlSize(head, at);
+    if (header > size - at - kLongestNumber) return 0;
+    at += static_cast<std::size_t>(header);
+    if (BigEndian(head + at, 4) != 0x18538067) return 0;
+    at += 4;
+    const std::uint64_t segment = EbmlSize(head, at);
+    return segment == 0 ? 0 : at + segment;
+}
+
+std::uint64_t AviLength(const std::uint8_t* head) {
+    if (BigEndian(head, 4) != 0x52494646) return 0;  // "RIFF"
+    return std::uint64_t{8} + (head[4] | head[5] << 8 | head[6] << 16 | std::uint64_t{head[7]} << 24);
+}
+
+}  // namespace
+
+bool CanBeReadTwice(const std::string& path) {
+    std::error_code ignored;
+    const fs::file_status status = fs::status(path, ignored);
+    return path != "-" && !fs::is_fifo(status) && !fs::is_character_file(status) && !fs::is_socket(status);
+}
+
+void Locate(const InputOptions& options, InputAddress& address) {
+    const std::string& path = options.path;
+    std::error_code ignored;
+    // A file name may look like an address ("take:2.mov") or a pattern; existing files count as files.
+    const bool isThere = path != "-" && fs::exists(path, ignored);
+    address.url = isThere ? kFileScheme + path : path;
+    if (options.rawSize) {
+        address.format = av_find_input_format("rawvideo");
+        address.entries.Set("pixel_format", "bgra");
+        address.entries.Set("video_size", std::to_string(options.rawSize->width) + "x" +
+                                              std::to_string(options.rawSize->height));
+    } else if (isThere && fs::is_directory(path, ignored)) {
+        LocateImages(PatternOfFolder(path), address);
+    } else if (!isThere && !IsAddress(path) && path.find_first_of("*?[") != std::string::npos) {
+        LocateImages(path, address);
+    } else if (options.startNumber) {
+        address.entries.Set("start_number", std::to_string(*options.startNumber));
+    } else if (!isThere && path.find('%') != std::string::npos && IsImageName(path)) {
+        address.format = av_find_input_format("image2");
+        address.entries.Set("start_number_range", kFirstNumbers);
+    }
+    if (options.rate) {
+        address.entries.Set("framerate", std::to_string(options.rate->numerator) + "/" +
+                                             std::to_string(options.rate->denominator));
+    }
+}
+
+void CheckTaken(InputAddress& address) {
+    AVDictionary* const left = *address.entries.Entries();
+    if (av_dict_get(left, "framerate", nullptr, 0)) {
+        throw Failure(
+            kExitUsage,
+            "--rate is for raw BGRA and image sequences; a clip has its own rate, and --fps changes it");
+    }
+    if (av_dict_get(left, "start_number", nullptr, 0))
+        throw Failure(kExitUsage, "--start-number is for numbered image sequences");
+}
+
+bool EndsEarly(const std::string& path, const std::string& format) {
+    std::error_code error;
+    if (!fs::is_regular_file(path, error)) return false;
+    const std::uintmax_t size = fs::file_size(path, error);
+    if (error) return false;
+    if (format == "mpegts") {
+        constexpr std::array kPacketSizes = {188, 192,
+                                             204};  // plain, with a time stamp, with error correction
+        return std::ranges::all_of(kPacketSizes,
+                                   [&](auto each) { return size % static_cast<unsigned>(each) != 0; });
+    }
+    std::array<std::uint8_t, 512> head = {};
+    std::ifstream(path, std::ios::binary).read(reinterpret_cast<char*>(head.data()), head.size());
+    const bool isMatroska = format.find("matroska") != std::string::npos;
+    const std::uint64_t told = isMatroska        ? MatroskaLength(head.data(), head.size())
+                               : format == "avi" ? AviLength(head.data())
+                                                 : 0;
+    return told > size;
+}
+
+}  // namespace velmora::hosts

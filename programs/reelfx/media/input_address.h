@@ -1,0 +1,40 @@
+// Where an input lies: a file, an address, standard input, or a sequence of images, which is given by a pattern
+// ("frames-%03d.png", "frames-*.png") or a folder.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+#include <string>
+
+#include "text/number_text.h"
+#include "programs/reelfx/media/av_handles.h"
+
+namespace velmora::hosts {
+
+struct InputOptions {
+    std::string path;
+    std::optional<FrameSize> rawSize;              // the input is raw BGRA of this size
+    std::optional<FrameRate> rate;                 // of raw input and image sequences
+    std::optional<std::int64_t> startNumber = {};  // of the first image of a numbered sequence
+};
+
+struct InputAddress {
+    std::string url;
+    const AVInputFormat* format = nullptr;  // null: found by the contents
+    AvOptions entries;  // of the container; those that it does not know stay after opening
+};
+
+// Throws Failure (kExitInput) for a folder without images of one kind.
+void Locate(const InputOptions& options, InputAddress& address);
+
+// Throws Failure (kExitUsage) if the opened container did not know an option that the user gave.
+void CheckTaken(InputAddress& address);
+
+// False for standard input, pipes and devices.
+bool CanBeReadTwice(const std::string& path);
+
+// True if a file ends before the length that its own header gives, or inside a packet of a format whose packets have
+// one size. Only for formats whose readers do not report it: Matroska, AVI and MPEG-TS.
+bool EndsEarly(const std::string& path, const std::string& format);
+
+}  // namespace velmora::hosts
