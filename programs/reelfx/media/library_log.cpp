@@ -49,6 +49,7 @@ std::string ErrorWords(int error) {
     const bool isVague = error == AVERROR(EINVAL) || error == AVERROR_EXTERNAL || error == AVERROR_UNKNOWN ||
                          error == AVERROR_EXPERIMENTAL || error == AVERROR_INVALIDDATA ||
                          error == AVERROR_BUG;
+    if (error == AVERROR(EPERM) && !lastError.empty()) return ": " + lastError;
     if (!isVague) return ": " + AvText(error);
     return lastError.empty() ? " (the library gives no reason)" : ": " + lastError;
 }

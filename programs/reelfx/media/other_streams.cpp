@@ -33,9 +33,10 @@ bool IsWrittenAnew(const AVStream& stream, const AVFormatContext& container) {
 }
 
 const AVCodec& AskedSoundCodec(const std::string& name, const AVOutputFormat& format) {
-    const AVCodec* codec = avcodec_find_encoder_by_name(name.c_str());
+    // A codec's own name comes first: an encoder of the same name may be an experimental one.
     const AVCodecDescriptor* descriptor = avcodec_descriptor_get_by_name(name.c_str());
-    if (!codec && descriptor) codec = avcodec_find_encoder(descriptor->id);
+    const AVCodec* codec = descriptor ? avcodec_find_encoder(descriptor->id) : nullptr;
+    if (!codec) codec = avcodec_find_encoder_by_name(name.c_str());
     if (!codec || codec->type != AVMEDIA_TYPE_AUDIO)
         throw Failure(kExitUsage, "--audio takes auto, copy, none or an audio codec, not \"" + name + '"');
     if (!CanHold(format, codec->id))
