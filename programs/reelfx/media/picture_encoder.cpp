@@ -33,11 +33,11 @@ bool IsGrey(AVPixelFormat format) {
     return DescriptorOf(format).nb_components <= 2 && !IsRgb(format);
 }
 
-// Pictures with transparency by their format. GIFs all have such a format, and few are transparent.
+// Pictures with transparency by their format. GIFs and raw BGRA all have such a format, and few are transparent.
 bool HasAlpha(const MediaReader& source) {
     const AVFrame& first = source.FirstFrame();
     const bool carries = CarriesAlpha(static_cast<AVPixelFormat>(first.format));
-    if (!carries || source.Picture().codecpar->codec_id != AV_CODEC_ID_GIF) return carries;
+    if (first.format != AV_PIX_FMT_BGRA) return carries;
     for (int y = 0; y < first.height; ++y) {
         const std::uint8_t* row = first.data[0] + std::ptrdiff_t{y} * first.linesize[0];
         for (int x = 0; x < first.width; ++x) {
