@@ -24,6 +24,12 @@ put_tree() {
     while IFS= read -r file; do put "$1/$file" "$2/$file"; done < <(cd "$1" && find . -type f -printf '%P\n')
 }
 
+# put_obs DIST PLACE: the filters for OBS, with the licence of the library that they are a part of when they run
+put_obs() {
+    put_tree "$1/obs" "$2"
+    put /usr/share/common-licenses/GPL-2 "$2/velmora-reel-effects-obs/data/GPL-2.txt"
+}
+
 # put_help PLACE READER...: the help pages for these readers
 put_help() {
     local pages

@@ -1,15 +1,17 @@
 ; The Windows installer. Built by packaging/pack-windows, which defines VERSION, STAGE (the folder of files to install),
 ; LISTS (the folder of the two generated lists), KILOBYTES (the size of the files) and OUTPUT.
 ;
-;   setup.exe [/S] [/AllUsers | /CurrentUser] [/OpenFX] [/D=folder]
+;   setup.exe [/S] [/AllUsers | /CurrentUser] [/OpenFX] [/NoObs] [/D=folder]
 ;
 ; /S shows no dialogs. Unless one of the two is given, a run with administrator rights installs for all users, any other
 ; for the current user. /OpenFX chooses the OpenFX plug-ins, which are left out otherwise: their hosts look in one folder for
 ; all users, so they need 64-bit Windows and an installation for all users. /D= comes last and is never quoted. Exit codes: 0 done, 1 cancelled by the user, 2 nothing was
 ; changed because a program is using the library, or a file could not be written.
 ;
+; Where OBS Studio is installed, its filters are copied to its folder of plug-ins, unless the user or /NoObs says no.
+;
 ; The library needs no registry entries: users choose its folder in the editor. The only entries are the uninstaller's, whose
-; "InstallLocation" names the folder, and reelview's under "Open with".
+; "InstallLocation" names the folder and "ObsPlugins" the one with the filters for OBS, and reelview's under "Open with".
 
 Unicode true
 SetCompressor /SOLID lzma
@@ -19,7 +21,7 @@ ManifestDPIAware true
 !define FOLDER "Velmora\Reel Effects"
 !define FOLDER_LENGTH 21 ; with the separator before it
 !define UNINSTALL_KEY "Software\Microsoft\Windows\CurrentVersion\Uninstall\VelmoraReelEffects"
-!define IN_USE "A program is using ${PRODUCT}. Close the video editor that uses it, and start again."
+!define IN_USE "A program is using ${PRODUCT}. Close the video editor or OBS, and start again."
 
 !define MULTIUSER_EXECUTIONLEVEL Highest
 !define MULTIUSER_MINWIN 0x600
@@ -68,12 +70,15 @@ VIAddVersionKey "LegalCopyright" "Copyright Velmora. MIT licence."
 
 Var GivenFolder ; from /D=, or the folder of the uninstaller
 Var EarlierFolder
+Var ObsPlugins ; empty without OBS
+
+!define OBS_MODULE "velmora-reel-effects-obs\bin\64bit\velmora-reel-effects-obs.dll"
 
 ; A loaded library cannot be opened for writing. This is checked before anything is changed.
-!macro STOP_WHEN_IN_USE FOLDER
-    ${If} ${FileExists} "${FOLDER}\VMReelEffects.dll"
+!macro STOP_WHEN_LOADED FILE
+    ${If} ${FileExists} "${FILE}"
         ClearErrors
-        FileOpen $0 "${FOLDER}\VMReelEffects.dll" a
+        FileOpen $0 "${FILE}" a
         ${If} ${Errors}
             SetErrorLevel 2
             MessageBox MB_OK|MB_ICONEXCLAMATION "${IN_USE}" /SD IDOK
@@ -81,6 +86,9 @@ Var EarlierFolder
         ${EndIf}
         FileClose $0
     ${EndIf}
+!macroend
+!macro STOP_WHEN_IN_USE FOLDER
+    !insertmacro STOP_WHEN_LOADED "${FOLDER}\VMReelEffects.dll"
 !macroend
 
 ; Where OpenFX hosts look.
@@ -104,6 +112,9 @@ Section "${PRODUCT}"
     SectionIn RO
     ReadRegStr $EarlierFolder SHCTX "${UNINSTALL_KEY}" "InstallLocation"
     !insertmacro STOP_WHEN_IN_USE "$INSTDIR"
+    ${If} $ObsPlugins != ""
+        !insertmacro STOP_WHEN_LOADED "$ObsPlugins\${OBS_MODULE}"
+    ${EndIf}
     ${If} $EarlierFolder != ""
         !insertmacro STOP_WHEN_IN_USE "$EarlierFolder"
     ${EndIf}
@@ -158,6 +169,30 @@ Section /o "OpenFX plug-ins (64-bit, for all users)" OpenFX
     ${EndIf}
 SectionEnd
 
+Section "Filters for OBS Studio" FILTERS_FOR_OBS
+    CreateDirectory "$ObsPlugins"
+    CopyFiles /SILENT "$INSTDIR\64-bit\obs\velmora-reel-effects-obs" "$ObsPlugins"
+    WriteRegStr SHCTX "${UNINSTALL_KEY}" "ObsPlugins" "$ObsPlugins"
+SectionEnd
+
+; OBS enters its folder in the registry, in the 32-bit or the 64-bit part. It finds plug-ins in a folder that all its users
+; share.
+Function FindObs
+    StrCpy $ObsPlugins ""
+    ReadRegStr $0 HKLM "Software\OBS Studio" ""
+    ${If} $0 == ""
+        SetRegView 64
+        ReadRegStr $0 HKLM "Software\OBS Studio" ""
+        SetRegView default
+    ${EndIf}
+    ${If} $0 != ""
+        ReadEnvStr $1 ProgramData
+        ${If} $1 != ""
+            StrCpy $ObsPlugins "$1\obs-studio\plugins"
+        ${EndIf}
+    ${EndIf}
+FunctionEnd
+
 Function .onInit
     ; MULTIUSER_INIT replaces $INSTDIR with the default folder of its mode.
     StrCpy $GivenFolder $INSTDIR
@@ -170,7 +205,17 @@ Function .onInit
     ${If} $0 == 1
         !insertmacro SelectSection ${OpenFX}
     ${EndIf}
+    Call FindObs
     ${GetParameters} $0
+    ClearErrors
+    ${GetOptions} $0 "/NoObs" $1
+    ${IfNot} ${Errors}
+        StrCpy $ObsPlugins ""
+    ${EndIf}
+    ${If} $ObsPlugins == ""
+        !insertmacro UnselectSection ${FILTERS_FOR_OBS}
+        SectionSetText ${FILTERS_FOR_OBS} "" ; not offered
+    ${EndIf}
     ClearErrors
     ${GetOptions} $0 "/OpenFX" $1
     ${IfNot} ${Errors}
@@ -196,6 +241,16 @@ FunctionEnd
 ; Keeps the presets that users saved beside the library, their settings, and anything else that was not installed.
 Section Uninstall
     !insertmacro STOP_WHEN_IN_USE "$INSTDIR"
+    ReadRegStr $0 SHCTX "${UNINSTALL_KEY}" "InstallLocation"
+    ReadRegStr $ObsPlugins SHCTX "${UNINSTALL_KEY}" "ObsPlugins"
+    ${If} $0 == $INSTDIR
+    ${AndIf} $ObsPlugins != ""
+        !insertmacro STOP_WHEN_LOADED "$ObsPlugins\${OBS_MODULE}"
+        !include "${LISTS}/uninstall-obs.nsh"
+        SetOutPath "$TEMP"
+        RMDir "$ObsPlugins"
+        RMDir "$ObsPlugins\.."
+    ${EndIf}
     !include "${LISTS}/uninstall.nsh"
     Delete "$INSTDIR\uninstall.exe"
     SetOutPath "$TEMP"

@@ -31,6 +31,11 @@ DEB_FILES = [*(f"usr/bin/{name}" for name in NAMES), *(f"usr/share/man/man1/{nam
                ("copyright", "changelog.gz", "changelog.Debian.gz", "help/start.html"))]
 
 
+OBS = "velmora-reel-effects-obs"
+OBS_FILES = {f"usr/lib/x86_64-linux-gnu/obs-plugins/{OBS}.so", f"usr/share/obs/obs-plugins/{OBS}/locale/de-DE.ini",
+             f"usr/share/doc/{OBS}/obs.md", f"usr/share/doc/{OBS}/copyright"}
+
+
 def digests(reelfx, *environment):
     return run("env", *environment, reelfx, "render", CLIP, "--effect", "Film Pro", "--preset", "Super 8", "--seed", "7",
                "--duration", "0.3", "--hash")
@@ -66,6 +71,8 @@ def check_tarball(path, work, expected):
     assert digests(home / ".local/bin/reelfx") == expected
     page = run(home / ".local/bin/reelfx", "studio", "--path").strip()
     assert page == str(home / ".local/share/velmora-reel-effects/reel.html"), page
+    module = home / ".config/obs-studio/plugins" / OBS
+    assert (module / "bin/64bit" / f"{OBS}.so").is_file() and (module / "data/locale/ko-KR.ini").is_file()
     # FFmpeg finds the plug-in by itself, and its frames are those of reelfx.
     run("ffmpeg", "-nostdin", "-v", "error", "-i", CLIP, "-vf", "frei0r=velmora_film_pro:super8|7", "-frames:v", "2",
         "-f", "null", "-", env=environment)
@@ -92,16 +99,15 @@ def check_page(page):
     assert "melt" in page.read_text()
 
 
-def check_deb(path, work, expected):
-    unpacked = work / "deb"
+def check_deb(path, unpacked, must_have, libraries):
     run("dpkg-deb", "-R", path, unpacked)
     files = files_below(unpacked)
-    assert not set(DEB_FILES) - set(files), set(DEB_FILES) - set(files)
+    assert not set(must_have) - set(files), set(must_have) - set(files)
     sums = dict(reversed(line.split("  ", 1)) for line in (unpacked / "DEBIAN/md5sums").read_text().splitlines())
     assert sums == {name: hashlib.md5((unpacked / name).read_bytes()).hexdigest()
                     for name in files if not name.startswith("DEBIAN/")}
     control = (unpacked / "DEBIAN" / "control").read_text()
-    for library in ("libavcodec", "libavformat", "libcairo2", "libtinyxml", "libc6"):
+    for library in (*libraries, "libtinyxml", "libc6"):
         assert re.search(rf"^Depends: .*\b{library}", control, re.M), f"{library} is not among the dependencies"
     owners = {line.split()[1] for line in run("dpkg-deb", "-c", path).splitlines()}
     assert owners == {"root/root"}, owners
@@ -110,8 +116,6 @@ def check_deb(path, work, expected):
             assert (unpacked / name).read_bytes()[4:8] == bytes(4), name
             gzip.decompress((unpacked / name).read_bytes())
     check_no_build_paths(unpacked)
-    check_page(unpacked / "usr/share/doc/velmora-reel-effects/hosts.md")
-    assert digests(unpacked / "usr/bin/reelfx") == expected
 
 
 def check_lintian(path):
@@ -125,13 +129,17 @@ def main():
     with tempfile.TemporaryDirectory(prefix="linux-", dir=os.environ["WORK"]) as folder:
         work = Path(folder)
         packages = pack_twice(work, "pack-linux", "pack-debian")
-        assert set(packages) == {f"{PRODUCT}.tar.xz", "velmora-reel-effects_1.0-1_amd64.deb"}, packages
-        tarball, deb = packages[f"{PRODUCT}.tar.xz"], packages["velmora-reel-effects_1.0-1_amd64.deb"]
+        tarball, deb, obs = (f"{PRODUCT}.tar.xz", "velmora-reel-effects_1.0-1_amd64.deb", f"{OBS}_1.0-1_amd64.deb")
+        assert set(packages) == {tarball, deb, obs}, packages
         expected = digests(DIST / "reelfx")
         assert len(set(expected.splitlines())) > 3, expected
-        check_tarball(tarball, work, expected)
-        check_deb(deb, work, expected)
-        check_lintian(deb)
+        check_tarball(packages[tarball], work, expected)
+        check_deb(packages[deb], work / "deb", DEB_FILES, ("libavcodec", "libavformat", "libcairo2"))
+        check_page(work / "deb/usr/share/doc/velmora-reel-effects/hosts.md")
+        assert digests(work / "deb/usr/bin/reelfx") == expected
+        check_deb(packages[obs], work / "obs", OBS_FILES, ("libobs0",))
+        check_lintian(packages[deb])
+        check_lintian(packages[obs])
         for name, path in sorted(packages.items()):
             print(f"{name}: {path.stat().st_size} bytes, sha256 {hashlib.sha256(path.read_bytes()).hexdigest()}")
 

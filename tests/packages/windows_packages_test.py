@@ -23,6 +23,8 @@ MUST_HAVE = """VMReelEffects.dll VMLang.dll VMReelEffectsLang.xml resources.dll 
     64-bit/reelcheck.exe 64-bit/frei0r/velmora_film_pro.dll docs/openfx.txt
     64-bit/VelmoraReelEffects.ofx.bundle/Contents/Info.plist
     64-bit/VelmoraReelEffects.ofx.bundle/Contents/Win64/VelmoraReelEffects.ofx
+    64-bit/obs/velmora-reel-effects-obs/bin/64bit/velmora-reel-effects-obs.dll docs/obs.txt
+    64-bit/obs/velmora-reel-effects-obs/data/locale/ja-JP.ini 64-bit/obs/velmora-reel-effects-obs/data/GPL-2.txt
     docs/help/start.html README.txt reel.html LICENSE.txt third-party.txt SHA256SUMS""".split()
 UNINSTALL = r"Software\Microsoft\Windows\CurrentVersion\Uninstall"
 OWN_KEY = UNINSTALL + r"\VelmoraReelEffects"
@@ -67,7 +69,7 @@ class Prefix:
         return {line for line in lines if "\\Software\\Wine\\" not in line[0]}
 
     def write_registry(self, key, name, value):
-        assert self.run("reg", "add", key, "/v", name, "/d", value, "/f") == 0
+        assert self.run("reg", "add", key, *(("/v", name) if name else ("/ve",)), "/d", value, "/f") == 0
 
 
 class Installation:
@@ -115,7 +117,7 @@ def check_zip(path, work):
     # The OpenFX plug-ins as they lie in the package, by the program beside them.
     run(ROOT / "scripts" / "wine64", unpacked / "64-bit" / "reelcheck.exe", "--level", "1", "--seed", "1")
     for module in [*unpacked.glob("*.dll"), *unpacked.glob("*.exe"), *unpacked.glob("**/frei0r/*.dll"),
-                   *unpacked.glob("64-bit/*.exe"), *unpacked.glob("**/*.ofx")]:
+                   *unpacked.glob("64-bit/*.exe"), *unpacked.glob("**/*.ofx"), *unpacked.glob("64-bit/obs/**/*.dll")]:
         head = module.read_bytes()[:0x400]
         stamp = head.index(b"PE\0\0") + 8
         assert head[stamp:stamp + 4] == bytes(4), f"{module.name} bears the time of its build"
@@ -162,6 +164,19 @@ def check_installation(installation, packed, expected, place=()):
     assert digests(installation.prefix.start, installation.folder / "reelhost.exe") == expected
 
 
+def check_obs(prefix, installation, packed):
+    """Where OBS is installed, setup copies the filters to its plug-ins, unless it is told not to, and takes them away."""
+    plugins = prefix.drive / "ProgramData/obs-studio/plugins"
+    assert not plugins.exists()
+    prefix.write_registry("HKLM\\Software\\OBS Studio", "", "C:\\OBS")
+    assert installation.install("/NoObs") == 0 and not plugins.exists()
+    assert installation.install() == 0
+    inside = "64-bit/obs/"
+    expected = {name.removeprefix(inside): digest for name, digest in packed.items() if name.startswith(inside)}
+    assert files_below(plugins) == expected, set(files_below(plugins)) ^ set(expected)
+    assert prefix.run("reg", "delete", "HKLM\\Software\\OBS Studio", "/f") == 0
+
+
 def check_life(prefix, setup, packed, expected):
     """One installation for the user, in a folder with spaces and letters of two scripts, beside one for all users."""
     user = Installation(prefix, setup, "\u00dcbung mit Film\\\u6620\u753b Effects", "HKCU", "/CurrentUser")
@@ -172,6 +187,7 @@ def check_life(prefix, setup, packed, expected):
     check_installation(user, packed, expected, place=f"/D={user.name}".split(" "))
     check_in_use(user)
     check_installation(everyone, packed, expected)
+    check_obs(prefix, everyone, packed)
 
     preset = user.folder / "docs" / "My look.fxprelb"
     preset.write_text("a user's own")
