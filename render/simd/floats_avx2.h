@@ -1,7 +1,7 @@
 // Eight floats in a vector (floats_plain.h says what the functions do).
 
 using Floats = __m256;
-constexpr std::int32_t kFloats = 8;
+inline constexpr std::int32_t kFloats = 8;
 
 inline Floats All(float x) noexcept { return _mm256_set1_ps(x); }
 inline Floats Load(const float* from) noexcept { return _mm256_loadu_ps(from); }

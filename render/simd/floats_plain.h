@@ -2,7 +2,7 @@
 // functions for vectors. Numbers add, subtract, multiply and divide by the operators of the language.
 
 using Floats = float;
-constexpr std::int32_t kFloats = 1;
+inline constexpr std::int32_t kFloats = 1;
 
 inline Floats All(float x) noexcept { return x; }
 inline Floats Load(const float* from) noexcept { return *from; }

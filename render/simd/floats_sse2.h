@@ -1,7 +1,7 @@
 // Four floats in a vector (floats_plain.h says what the functions do).
 
 using Floats = __m128;
-constexpr std::int32_t kFloats = 4;
+inline constexpr std::int32_t kFloats = 4;
 
 inline Floats All(float x) noexcept { return _mm_set1_ps(x); }
 inline Floats Load(const float* from) noexcept { return _mm_loadu_ps(from); }

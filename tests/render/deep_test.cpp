@@ -343,8 +343,7 @@ TEST(DeepPicture, DividesAndMultipliesPremultipliedColours) {
     Deep straight(90, 40, {});
     Deep multiplied(90, 40, {DeepSamples::kFloat, 4, true});
     std::mt19937 numbers(2);
-    for (std::size_t i = 0; i < straight.samples.size(); ++i)
-        straight.samples[i] = static_cast<float>(numbers() % 256) / 256.0f;
+    for (float& sample : straight.samples) sample = static_cast<float>(numbers() % 256) / 256.0f;
     for (std::size_t i = 0; i < straight.samples.size(); ++i) {
         multiplied.samples[i] = straight.samples[i] * (i % 4 == 3 ? 1.0f : straight.samples[i | 3]);
         if (straight.samples[i | 3] == 0.0f && i % 4 != 3) straight.samples[i] = 0.0f;
