@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <utility>
 
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/container_contents.h"
@@ -48,8 +49,8 @@ const AVCodec& AskedSoundCodec(const std::string& name, const AVOutputFormat& fo
 }  // namespace
 
 OtherStreams::OtherStreams(AVFormatContext& container, const AVCodecParameters& picture,
-                           const MediaReader& source, const std::string& audio)
-    : m_container(container), m_picture(picture), m_source(source), m_audio(audio) {
+                           const MediaReader& source, std::string audio)
+    : m_container(container), m_picture(picture), m_source(source), m_audio(std::move(audio)) {
     const AVFormatContext& from = source.Container();
     for (unsigned i = 0; i < from.nb_streams; ++i) {
         const AVStream& stream = *from.streams[i];

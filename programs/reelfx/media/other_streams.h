@@ -23,7 +23,7 @@ class OtherStreams {
     // Adds the streams to `container`. `picture` is the encoded picture; `audio` is the user's wish, "auto", "copy",
     // "none" or a codec. Throws Failure. `source` must outlive the object.
     OtherStreams(AVFormatContext& container, const AVCodecParameters& picture, const MediaReader& source,
-                 const std::string& audio);
+                 std::string audio);
 
     // The pictures of covers, which come before all else.
     void WriteCovers(const Sink& sink) const;

@@ -20,7 +20,7 @@ int PictureTurn::Degrees() const {
 }
 
 std::string PictureTurn::Words() const {
-    const std::string rotated = Degrees() == 0 ? "" : "rotated by " + std::to_string(Degrees()) + " degrees";
+    std::string rotated = Degrees() == 0 ? "" : "rotated by " + std::to_string(Degrees()) + " degrees";
     if (!IsMirrored()) return rotated;
     return rotated.empty() ? "mirrored" : "mirrored and " + rotated;
 }

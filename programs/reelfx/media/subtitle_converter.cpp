@@ -15,6 +15,11 @@ bool IsText(AVCodecID codec) {
     return descriptor && (descriptor->props & AV_CODEC_PROP_TEXT_SUB) != 0;
 }
 
+[[noreturn]] void FailToConvert() {
+    throw Failure(kExitOutput,
+                  "subtitles cannot be converted; use --no-sound to leave out what is beside the picture");
+}
+
 }  // namespace
 
 AVCodecID SubtitleConverter::TargetOf(const AVStream& source, const AVOutputFormat& format) {
@@ -30,14 +35,11 @@ SubtitleConverter::SubtitleConverter(const AVStream& source, AVCodecID target)
     : m_sourceBase(source.time_base) {
     const AVCodec* from = avcodec_find_decoder(source.codecpar->codec_id);
     const AVCodec* to = avcodec_find_encoder(target);
-    const Failure failure(kExitOutput,
-                          "subtitles cannot be converted; use --no-sound to leave out what is beside "
-                          "the picture");
-    if (!from || !to) throw failure;
+    if (!from || !to) FailToConvert();
     m_decoder = Allocated<CodecPtr>(avcodec_alloc_context3(from));
     avcodec_parameters_to_context(m_decoder.get(), source.codecpar);
     m_decoder->pkt_timebase = source.time_base;
-    if (avcodec_open2(m_decoder.get(), from, nullptr) < 0) throw failure;
+    if (avcodec_open2(m_decoder.get(), from, nullptr) < 0) FailToConvert();
     m_encoder = Allocated<CodecPtr>(avcodec_alloc_context3(to));
     m_encoder->time_base = kTimeBase;
     if (m_decoder->subtitle_header_size > 0) {
@@ -47,7 +49,7 @@ SubtitleConverter::SubtitleConverter(const AVStream& source, AVCodecID target)
         std::copy_n(m_decoder->subtitle_header, size, m_encoder->subtitle_header);
         m_encoder->subtitle_header_size = m_decoder->subtitle_header_size;
     }
-    if (avcodec_open2(m_encoder.get(), to, nullptr) < 0) throw failure;
+    if (avcodec_open2(m_encoder.get(), to, nullptr) < 0) FailToConvert();
 }
 
 void SubtitleConverter::Send(const AVPacket& packet, const Sink& sink) {
