@@ -50,17 +50,25 @@ double Typical(std::vector<double> values) {
     return values[values.size() * 3 / 4];
 }
 
-void PrintTable() {
-    const BenchCase& test = EverythingCase();
-    FramePool pool(kFullHd);
+void PrintRows(const BenchCase& test, PictureSize size) {
+    FramePool pool(size);
     std::vector<double> one, two;
-    for (int round = 0; round < kRounds; ++round) {
+    const int rounds = size.width == kFullHd.width ? kRounds : kRounds / 2;
+    for (int round = 0; round < rounds; ++round) {
         one.push_back(FramesPerSecond(pool, test, 1));
         two.push_back(FramesPerSecond(pool, test, 2));
     }
+    const double alone = Typical(one), both = Typical(two);
+    std::printf("| %dx%d, one worker | %.0f | |\n", size.width, size.height, alone);
+    std::printf("| %dx%d, two workers (goal 1.9) | %.0f | %.2f |\n", size.width, size.height, both,
+                both / alone);
+}
+
+void PrintTable() {
+    const BenchCase& test = EverythingCase();
     std::printf("| %s | frames a second | x one worker |\n|---|---|---|\n", test.name);
-    std::printf("| one worker | %.0f | |\n", Typical(one));
-    std::printf("| two workers (goal 1.9) | %.0f | %.2f |\n", Typical(two), Typical(two) / Typical(one));
+    PrintRows(test, kFullHd);
+    PrintRows(test, kUltraHd);
 }
 
 }  // namespace
