@@ -9,9 +9,10 @@ namespace velmora::effects {
 namespace {
 
 std::optional<std::uint32_t> Find(std::span<const char* const> names, std::string_view name) {
-    const auto found = std::ranges::find_if(names, [&](const char* one) { return IsSameName(one, name); });
-    if (found == names.end()) return std::nullopt;
-    return static_cast<std::uint32_t>(found - names.begin());
+    for (std::size_t i = 0; i < names.size(); ++i) {
+        if (IsSameName(names[i], name)) return static_cast<std::uint32_t>(i);
+    }
+    return std::nullopt;
 }
 
 }  // namespace
@@ -24,7 +25,7 @@ std::string UniqueName(const EffectTable& effect, const ParamRow& param) {
     const auto sharesName = [&](const ParamRow& other) {
         return &other != &param && HoldsValue(other) && IsSameName(other.name, param.name);
     };
-    if (!std::ranges::any_of(effect.params, sharesName)) return param.name;
+    if (std::none_of(effect.params.begin(), effect.params.end(), sharesName)) return param.name;
     return std::string(param.name) + (param.kind == kKindColour ? " Colour" : " Amount");
 }
 

@@ -16,7 +16,8 @@ namespace velmora {
 }
 
 [[nodiscard]] inline bool IsSameButForCase(std::string_view a, std::string_view b) noexcept {
-    return std::ranges::equal(a, b, {}, ToLower, ToLower);
+    return std::equal(a.begin(), a.end(), b.begin(), b.end(),
+                      [](char one, char other) { return ToLower(one) == ToLower(other); });
 }
 
 // Only letters and digits count, in either case: "60s-memories" matches "60's Memories", so command lines need no
