@@ -94,7 +94,9 @@ std::uint64_t MatroskaLength(const std::uint8_t* head, std::size_t size) {
 
 std::uint64_t AviLength(const std::uint8_t* head) {
     if (BigEndian(head, 4) != 0x52494646) return 0;  // "RIFF"
-    return std::uint64_t{8} + (head[4] | head[5] << 8 | head[6] << 16 | std::uint64_t{head[7]} << 24);
+    std::uint64_t length = 0;
+    for (int i = 7; i >= 4; --i) length = length << 8 | head[i];
+    return 8 + length;
 }
 
 }  // namespace
