@@ -65,7 +65,7 @@ bool OnLoad(void* action, obs_properties_t* properties, obs_property_t*, obs_dat
         obs_property_set_visible(obs_properties_get(properties, kMessageKey), false);
         TakeOver(PanelOf(action));
     } else {
-        ShowMessage(properties, "This is no preset file of this effect.", OBS_TEXT_INFO_WARNING);
+        ShowMessage(properties, "This is not a preset file of this effect.", OBS_TEXT_INFO_WARNING);
     }
     return true;
 }
@@ -75,7 +75,7 @@ bool OnSave(void* action, obs_properties_t* properties, obs_property_t*, obs_dat
     if (path.empty()) return false;
     obs_data_set_string(settings, kSavePresetKey, "");
     if (SavePresetFile(PanelOf(action).filter, path, settings)) {
-        ShowMessage(properties, "The preset file is saved.", OBS_TEXT_INFO_NORMAL);
+        ShowMessage(properties, "The preset file was saved.", OBS_TEXT_INFO_NORMAL);
     } else {
         ShowMessage(properties, "The preset file could not be written.", OBS_TEXT_INFO_WARNING);
     }
@@ -98,7 +98,7 @@ bool OnNewSeed(obs_properties_t*, obs_property_t*, void* action) {
 void AddPresets(obs_properties_t* properties, Panel* panel) {
     obs_property_t* list = obs_properties_add_list(properties, kPresetKey, Text("Preset"),
                                                    OBS_COMBO_TYPE_LIST, OBS_COMBO_FORMAT_STRING);
-    obs_property_list_add_string(list, Text("Own settings"), "");
+    obs_property_list_add_string(list, Text("Custom settings"), "");
     for (const char* name : panel->filter.effect.presetNames) obs_property_list_add_string(list, name, name);
     obs_property_set_modified_callback2(list, OnPreset, panel);
 }
@@ -155,10 +155,9 @@ void AddSeedAndTime(obs_properties_t* properties, Panel* panel) {
     obs_properties_add_int(properties, kSeedKey, Text("Seed"), 0, std::numeric_limits<int>::max(), 1);
     obs_properties_add_button2(properties, kNewSeedKey, Text("New seed"), OnNewSeed, panel);
     obs_property_t* time =
-        obs_properties_add_bool(properties, kSourceTimeKey, Text("Run with the source's time"));
-    obs_property_set_long_description(
-        time,
-        Text("Damage follows the position of a film and stops with it. Other sources run with the clock."));
+        obs_properties_add_bool(properties, kSourceTimeKey, Text("Follow the source's time"));
+    obs_property_set_long_description(time, Text("Damage follows the position of a film and stops with it. "
+                                                 "With other sources it follows the clock."));
 }
 
 void AddPresetFiles(obs_properties_t* properties, Panel* panel) {

@@ -17,7 +17,8 @@ class EffectSession;
 // text stays valid and unchanged.
 VM_PAGE const char* DescribeEffects();
 
-// A session of the effect with the parameters' defaults and seed 0; null past the last effect or when memory is short.
+// A session of the effect with the parameters' defaults and seed 0; null past the last effect or without
+// memory.
 VM_PAGE velmora::effects::EffectSession* NewSession(std::uint32_t effect);
 // Takes null too.
 VM_PAGE void DeleteSession(velmora::effects::EffectSession* session);

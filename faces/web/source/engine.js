@@ -82,7 +82,7 @@ class Engine {
 
     #session(effect) {
         this.#sessions[effect] ??= this.#calls.NewSession(effect);
-        if (!this.#sessions[effect]) throw new Error('memory is short');
+        if (!this.#sessions[effect]) throw new Error('not enough memory');
         return this.#sessions[effect];
     }
 }
@@ -120,6 +120,6 @@ class EnginePicture {
         this.#source = this.#calls.NewPixels(bytes);
         this.#target = this.#calls.NewPixels(bytes);
         this.#capacity = this.#source && this.#target ? bytes : 0;
-        if (this.#capacity === 0) throw new Error('memory is short');
+        if (this.#capacity === 0) throw new Error('not enough memory');
     }
 }

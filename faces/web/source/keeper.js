@@ -103,7 +103,7 @@ export class Keeper {
         try {
             const {blob, ending, hasLostSound} = await writer.write(source);
             download(blob, `${stem(source.name)}-film.${ending}`);
-            if (hasLostSound) this.#say('The clip is saved, but its sound could not be kept.');
+            if (hasLostSound) this.#say('The clip was saved, but without its sound.');
         } catch (error) {
             if (!(error instanceof Cancelled)) this.#say('The clip could not be saved.');
         }

@@ -175,7 +175,7 @@ class Page {
         if (wanted.length < 2 || wanted === this.address) return;
         const read = readAddress(this.effects, wanted);
         if (read === null) {
-            say('This link holds no look.');
+            say('This link does not contain a look.');
             return;
         }
         const {effect, values, seed} = read;
@@ -212,11 +212,11 @@ class Page {
 
     async openDropped(file) {
         if (!isPresetFileName(file.name)) {
-            return this.open(() => openFile(file), 'This file holds no picture or clip that this browser can show.');
+            return this.open(() => openFile(file), 'This file contains no picture or clip that this browser can show.');
         }
         const read = await readPresetFile(this.effects, file);
         if (read === null) {
-            say('This is no preset file of these effects.');
+            say('This is not a preset file of these effects.');
             return;
         }
         this.looks.setValues(read.effect, read.values);

@@ -65,7 +65,7 @@ inline constexpr char kSaving[] = "Saving";
 inline constexpr char kSaved[] = "Saved";
 inline constexpr char kCopied[] = "Copied";
 inline constexpr char kNotNumbered[] =
-    "reelfx takes several pictures only if they are numbered without gaps.";
+    "reelfx accepts several pictures only if they are numbered without gaps.";
 inline constexpr char kCancel[] = "Cancel";
 
 // File types
@@ -80,18 +80,18 @@ inline constexpr char kY4mFilm[] = "YUV4MPEG2 film";
 // Errors
 inline constexpr char kCannotOpen[] = "The file cannot be opened.";
 inline constexpr char kCannotRead[] = "The file is damaged, or this system does not know its format.";
-inline constexpr char kNoFrames[] = "The file holds no pictures.";
+inline constexpr char kNoFrames[] = "The file contains no pictures.";
 inline constexpr char kTooLarge[] = "The picture is too large.";
 inline constexpr char kCannotReadFrame[] = "This frame cannot be read.";
-inline constexpr char kOtherSize[] = "The pictures are not of one size.";
+inline constexpr char kOtherSize[] = "The pictures are not all the same size.";
 inline constexpr char kNoDecoder[] = "This system has no decoder for this film.";
 inline constexpr char kNoMemory[] = "There is not enough memory.";
 inline constexpr char kCannotWrite[] = "The file cannot be written.";
-inline constexpr char kFilesExist[] = "There are files of these names already. Choose another name.";
-inline constexpr char kAviTooLarge[] = "An AVI film holds at most 2 GB. Save another kind of file.";
-inline constexpr char kCodecRefuses[] = "The codec does not take this film.";
+inline constexpr char kFilesExist[] = "Files with these names already exist. Choose another name.";
+inline constexpr char kAviTooLarge[] = "An AVI file can hold at most 2 GB. Choose another file type.";
+inline constexpr char kCodecRefuses[] = "The codec does not accept this film.";
 inline constexpr char kLibraryFailed[] = "The effect library failed. Start the program again.";
-inline constexpr char kEffectRefuses[] = "The effect does not render this frame.";
+inline constexpr char kEffectRefuses[] = "The effect cannot render this frame.";
 inline constexpr char kLibrarySilent[] = "The effect library does not answer.";
 
 }  // namespace velmora::reelview::text
