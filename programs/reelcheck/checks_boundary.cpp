@@ -24,7 +24,7 @@ void CheckExports(CheckContext& context) {
         Require(bool{Reference<IVideoEffect>::Adopt(second->CreateEffect(i))}, "an effect is missing");
     }
     for (const std::uint32_t index : {std::uint32_t{kEffectCount}, 100u, 0x80000000u, 0xFFFFFFFFu}) {
-        Require(second->CreateEffect(index) == nullptr, "there is an effect behind the last");
+        Require(second->CreateEffect(index) == nullptr, "there is an effect after the last");
     }
     second.Reset();
     Require(library.canUnload(), "the library may not be unloaded when its last object is gone");
@@ -89,8 +89,8 @@ void CheckNullArguments(CheckContext& context) {
         const Reference<IVideoEffect> effect = library.Effect(i);
         SetPlace("%s", effect->GetName());
         PlayingHost host;
-        Require(!effect->GetParamInfo(0, nullptr), "describes a parameter into nothing");
-        Require(!effect->GetPresetValue(0, 0, nullptr), "copies a preset's value into nothing");
+        Require(!effect->GetParamInfo(0, nullptr), "describes a parameter without a record");
+        Require(!effect->GetPresetValue(0, 0, nullptr), "copies a preset's value without a record");
         Require(!effect->Process(&host, nullptr, nullptr, &record, &timing), "renders without a source");
         Require(!effect->Process(&host, &record, nullptr, nullptr, &timing), "renders without a destination");
         Require(!effect->Process(&host, &record, nullptr, &record, nullptr), "renders without a time");
@@ -99,7 +99,7 @@ void CheckNullArguments(CheckContext& context) {
                 "does not render without a host");
         void* found = nullptr;
         Require(effect->QueryInterface(&kStranger, &found) == kStatusNoInterface,
-                "asks a host that there is not about a stranger");
+                "answers to an unknown identifier without a host");
     }
     SetPlace("frame processor");
     const Reference<IFrameProcessor> processor = library.Processor();
@@ -107,7 +107,7 @@ void CheckNullArguments(CheckContext& context) {
                 !processor->ConvertYcbcrToBgra(&record, nullptr, 0) &&
                 !processor->ConvertBgraToYcbcr(nullptr, &record, 0) &&
                 !processor->ConvertBgraToYcbcr(&record, nullptr, 0),
-            "converts from or to nothing");
+            "converts without a source or destination");
     Require(!processor->Reserved3(nullptr, nullptr, 0) && !processor->Reserved4(nullptr, nullptr, 0) &&
                 !processor->Reserved5(nullptr, nullptr, 0),
             "a reserved operation does something");
@@ -117,11 +117,11 @@ void CheckNullArguments(CheckContext& context) {
     char16_t buffer[4] = {u'?', u'?', u'?', u'?'};
     for (const char* code : {static_cast<const char*>(nullptr), "", "x", "en", "english", "\xFF\xFF"}) {
         for (const char* key : {static_cast<const char*>(nullptr), "", "no such key"}) {
-            Require(texts->GetText(code, 4, key, buffer, 4) == 0, "finds a text for nothing");
-            Require(texts->GetText(code, -1, key, nullptr, 4) == 0, "writes a text to nowhere");
+            Require(texts->GetText(code, 4, key, buffer, 4) == 0, "finds a text without a key");
+            Require(texts->GetText(code, -1, key, nullptr, 4) == 0, "writes a text without a buffer");
             Require(texts->GetText(code, 4, key, buffer, -5) == 0, "writes a text of negative size");
             Require(texts->LookUpText(code, 4, key, nullptr, nullptr, 0, nullptr) == 0,
-                    "finds a text for nothing");
+                    "finds a text without a key");
         }
     }
 }

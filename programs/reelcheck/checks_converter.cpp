@@ -65,7 +65,7 @@ void ConvertInPlace(IFrameProcessor& processor, const Layout& size, Dice& dice) 
         std::equal(apart.Bytes(),
                    apart.Bytes() + std::min<std::size_t>(used, 4 * static_cast<std::size_t>(size.width) / 2),
                    shared.Bytes()),
-        "in place the first row is another one");
+        "in place the first row differs");
 }
 
 }  // namespace

@@ -78,7 +78,7 @@ struct Desk {
   private:
     static void Judge(const DialogAnswers& answers, std::int32_t result, std::int32_t expected) {
         if (result != expected) Fail(Text("result %d instead of %d", result, expected));
-        Require(answers.Messages() == (expected == kDone ? 0 : 1), "the user is told something else");
+        Require(answers.Messages() == (expected == kDone ? 0 : 1), "another message is shown");
     }
 };
 
@@ -114,7 +114,7 @@ void CheckPresetFiles(CheckContext& context) {
         const char* const nowhere = missing.c_str();
         desk.Save(nowhere, index, &read, kFailed);
         desk.Load(nowhere, index, &read, kFailed);
-        SetPlace("%s, an effect that there is not", facts.name.c_str());
+        SetPlace("%s, an effect that does not exist", facts.name.c_str());
         read.count = 3;
         desk.Save(desk.folder.PathOf("two.preset").c_str(), 77, &read, kDone);
     }
@@ -128,7 +128,7 @@ void CheckPresetFiles(CheckContext& context) {
         desk.saver->SavePreset(nullptr, nullptr, 0, &record, "de");
         desk.saver->LoadPreset(nullptr, nullptr, 0, &record, "de");
         Require(record.count <= kPresetCellCapacity || record.count == count,
-                "a count behind the record's end");
+                "a count past the record's end");
     }
 }
 
@@ -156,7 +156,7 @@ void CheckPresetFailures(CheckContext& context) {
             }
             Require(result == kDone || (failing != 0 && (result == kFailed || result == kOtherEffect)),
                     "another result");
-            Require((answers.Messages() != 0) == (result != kDone), "the user is told something else");
+            Require((answers.Messages() != 0) == (result != kDone), "another message is shown");
             return std::pair(count, result);
         };
         FailEach(
@@ -220,7 +220,7 @@ void CheckSystemDialogs(CheckContext& context) {
             Require(desk.saver->LoadPreset(nullptr, desk.library.Get(), 0, &record, language) == kDone,
                     "loading does not end as cancelled");
             Require(desk.saver->LoadPreset(nullptr, desk.library.Get(), 0, nullptr, language) == kFailed,
-                    "loading into nothing does not fail");
+                    "loading without a record does not fail");
             Require(desk.library->GetShellServices()->ShowOptions(nullptr) == 0,
                     "options do not end as cancelled");
             Require(canceller.Cancelled() >= 4, "a dialog did not appear");

@@ -175,7 +175,7 @@ void CheckInPlace(CheckContext& context) {
             same.CopyRegion(source);
             Require(Process(effect, &host, same.Record(), same.Record(), i / 3.0),
                     "the effect refuses the frame");
-            Require(same.Digest() == apart.Digest(), "in place the picture is another one");
+            Require(same.Digest() == apart.Digest(), "in place the picture differs");
         }
     });
 }
@@ -198,7 +198,7 @@ void CheckOverlaps(CheckContext& context) {
             Require(Process(effect, &host, shared.RecordAt(from, size), shared.RecordAt(to, size), i / 30.0),
                     "the effect refuses the frame");
             std::memcpy(result.Bytes(), shared.Bytes() + to, result.Size());
-            Require(result.Digest() == apart.Digest(), "the picture is another one than apart");
+            Require(result.Digest() == apart.Digest(), "the picture differs from that of separate frames");
         }
     });
 }

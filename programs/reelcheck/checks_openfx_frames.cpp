@@ -116,7 +116,7 @@ void CheckOpenfxSpaces(CheckContext& context) {
     for (int y = 0; y < 10; ++y) std::copy_n(straight.Pixel(0, y), 80, multiplied.Pixel(0, y));
     busy.instance.RenderWhole(straight, one, kTime);
     busy.instance.RenderWhole(multiplied, other, kTime);
-    Require(one.IsSameAs(other), "values are not taken as they are");
+    Require(one.IsSameAs(other), "raw values are converted");
     RequireNothingHeld();
 }
 

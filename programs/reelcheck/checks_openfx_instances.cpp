@@ -56,7 +56,7 @@ void CheckOpenfxIdentity(CheckContext& context) {
         Require(!instance.IsIdentity(3.0) && instance.IsIdentity(10.0),
                 "the mix is not read at the frame's time");
         instance.RenderWhole(source, output, 10.0);
-        Require(output.IsSameAs(source), "a frame mixed in by nothing is not the source");
+        Require(output.IsSameAs(source), "a frame with a mix of 0 is not the source");
         Arguments out;
         out.Add(kOfxImageEffectFrameVarying, {0});
         plugin.Expect(kOfxStatOK, kOfxImageEffectActionGetClipPreferences, instance.Effect().Handle(),
@@ -106,7 +106,7 @@ void CheckOpenfxMemory(CheckContext& context) {
         State().allocations = 0;
         State().failingAllocation = failing;
         Require(busy.instance.Render(kTime, output.shape.bounds) == kOfxStatErrMemory,
-                "not an error of memory");
+                "not the status for too little memory");
         State().failingAllocation = 0;
         RequireNothingHeld();
     }
@@ -119,7 +119,7 @@ void CheckOpenfxMemory(CheckContext& context) {
         other.RenderWhole(source, output, kTime);
         State().missingSuite.clear();
         State().hasEmptySuite = false;
-        Require(output.IsSameAs(whole), "another picture in other memory");
+        Require(output.IsSameAs(whole), "another picture in memory of the host");
     }
     RequireNothingHeld();
 }

@@ -116,7 +116,8 @@ std::uint64_t TryEffect(const Caller& caller, IEffectLibrary* library, std::uint
                 "the effect refuses the frame");
         if (!spoils) digest = pictures.destination.Digest();
     }
-    Require(pictures.destination.Digest() == digest, "what a host's answers leave in the processor shows");
+    Require(pictures.destination.Digest() == digest,
+            "what a host's answers leave in the processor affects the picture");
     for (std::uint32_t left = 3; left-- > 0;) {
         if (caller.Slot("Release", effect, kDrop, {}) != left) Fail("Release counts wrongly");
     }

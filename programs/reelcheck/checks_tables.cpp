@@ -32,7 +32,7 @@ void RequireFits(const ParamDescriptor& param, ValueWord value) {
             Require(IsUnit(value.number), "a slider's value outside 0..1");
             break;
         case kKindMenu:
-            Require(value.bits < param.minimum.count, "a menu's value behind its last item");
+            Require(value.bits < param.minimum.count, "a menu's value after its last item");
             break;
         case kKindCheckBox:
             Require(value.flag <= 1, "a check box that is neither on nor off");
@@ -43,7 +43,7 @@ void RequireFits(const ParamDescriptor& param, ValueWord value) {
 }
 
 void CheckParam(const ParamDescriptor& param) {
-    Require(param.kind >= kKindMenu && param.kind <= kKindGroup, "a kind that there is not");
+    Require(param.kind >= kKindMenu && param.kind <= kKindGroup, "a kind that does not exist");
     Require(param.visible == 1 && param.second == 0, "a field has a value of its own");
     if (param.kind == kKindGroup) {
         Require(param.minimum.flag <= 1, "a group marker that neither begins nor ends");
@@ -80,10 +80,10 @@ void CheckRecordEdges(IVideoEffect& effect, std::uint32_t count) {
         }
         std::memset(memory.Data(), 0x5A, memory.Size());
         for (const std::uint32_t index : {count, count + 1, 0x7FFFFFFFu, 0x80000000u, 0xFFFFFFFFu}) {
-            Require(!effect.GetParamInfo(index, descriptor), "a parameter behind the last");
+            Require(!effect.GetParamInfo(index, descriptor), "a parameter after the last");
             Require(std::all_of(memory.Data(), memory.Data() + memory.Size(),
                                 [](std::uint8_t byte) { return byte == 0x5A; }),
-                    "a parameter behind the last writes its record");
+                    "a parameter after the last writes its record");
         }
     }
 }
@@ -99,7 +99,7 @@ void CheckPresetValues(IVideoEffect& effect, const EffectFacts& facts, std::uint
         RequireFits(facts.params[i], cell->value);
     }
     Require(!effect.GetPresetValue(preset, count, cell) && !effect.GetPresetValue(preset, 0xFFFFFFFFu, cell),
-            "a preset has a value for a parameter that there is not");
+            "a preset has a value for a parameter that does not exist");
 }
 
 }  // namespace
@@ -138,7 +138,7 @@ void CheckPresets(CheckContext& context) {
         PresetCell cell = {};
         for (const std::uint32_t behind : {count, count + 1, 0x80000000u, 0xFFFFFFFFu}) {
             Require(effect->GetPresetName(behind) == nullptr && !effect->GetPresetValue(behind, 0, &cell),
-                    "a preset behind the last");
+                    "a preset after the last");
         }
     }
 }

@@ -112,7 +112,7 @@ void CheckTimes(CheckContext& context) {
         SetPlace("%s", bench.facts.name.c_str());
         const std::uint64_t atZero = bench.DigestAt(0.0);
         Require(bench.DigestAt(std::numeric_limits<double>::quiet_NaN()) == atZero,
-                "no number is not time 0");
+                "NaN does not count as time 0");
     });
 }
 
@@ -127,9 +127,9 @@ void CheckMenus(CheckContext& context) {
                 const std::uint64_t digest = bench.DigestAt(1.0);
                 for (const std::int32_t beyond :
                      {-1, count, count + 1, 10, 1000, 2000, 0x7FFFFFFF, -0x7FFFFFFF - 1}) {
-                    SetPlace("%s, item %d behind %d", bench.facts.name.c_str(), beyond, item);
+                    SetPlace("%s, item %d after %d", bench.facts.name.c_str(), beyond, item);
                     bench.host.values[i].item = beyond;
-                    Require(bench.DigestAt(1.0) == digest, "an item that there is not changes the choice");
+                    Require(bench.DigestAt(1.0) == digest, "an item that does not exist changes the choice");
                 }
             }
         }
@@ -173,7 +173,7 @@ void CheckAlternating(CheckContext& context) {
             Bench& bench = *benches[i];
             RenderInside(*bench.effect, bench.host, source, destination, time);
             SetPlace("%s, round %d", bench.facts.name.c_str(), round);
-            Require(bench.DigestAt(time) == digests[i], "what another effect rendered shows");
+            Require(bench.DigestAt(time) == digests[i], "another effect's frames affect the picture");
         }
     }
 }

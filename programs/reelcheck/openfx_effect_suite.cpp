@@ -124,7 +124,7 @@ OfxStatus MemoryAlloc(void*, std::size_t bytes, void** out) {
 OfxStatus MemoryFree(void* memory) {
     const std::scoped_lock lock(TheBlocks().mutex);
     if (TheBlocks().all.erase(memory) == 0)
-        return Complain("frees memory that is none"), kOfxStatErrBadHandle;
+        return Complain("frees memory that the host did not allocate"), kOfxStatErrBadHandle;
     --State().blocks;
     return kOfxStatOK;
 }

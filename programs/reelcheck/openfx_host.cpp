@@ -186,7 +186,7 @@ bool OpenfxInstance::IsIdentity(double time) {
     out.Add(kOfxPropName, {std::string()}).Add(kOfxPropTime, {-1.0});
     const OfxStatus status = m_plugin.Call(kOfxImageEffectActionIsIdentity, m_effect.Handle(), &in, &out);
     if (status == kOfxStatReplyDefault) return false;
-    Require(status == kOfxStatOK, "an odd answer whether the picture stays");
+    Require(status == kOfxStatOK, "an invalid answer to whether the picture stays the same");
     Require(out.Set().Text(kOfxPropName) == kOfxImageEffectSimpleSourceClipName &&
                 out.Set().Number(kOfxPropTime) == time,
             "a wrong picture instead of the source");

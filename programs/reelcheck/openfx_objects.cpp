@@ -117,8 +117,7 @@ bool Handled::IsLiving(const void* handle, Kind kind) {
     const std::scoped_lock lock(registry.mutex);
     const auto found = registry.living.find(handle);
     const bool isLiving = found != registry.living.end() && found->second == kind;
-    if (!isLiving && registry.falseHandles == 0)
-        registry.complaints.emplace_back("uses a handle that is none");
+    if (!isLiving && registry.falseHandles == 0) registry.complaints.emplace_back("uses an invalid handle");
     return isLiving;
 }
 

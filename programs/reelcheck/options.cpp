@@ -8,17 +8,17 @@
 namespace velmora::reelcheck {
 
 const char* const kHelp =
-    "reelcheck: tries whether the library and the OpenFX plug-ins keep their promises to a host,\n"
+    "reelcheck: checks that the library and the OpenFX plug-ins honour their contract with hosts,\n"
     "whatever the host does.\n"
     "\n"
     "  reelcheck [--level N] [--seed S] [--timeout SECONDS] [--only NAME]... [--json] [--library PATH]\n"
     "            [--bundle PATH]\n"
     "  reelcheck --list\n"
     "\n"
-    "  --level     from 1, a first look, to 10, everything and long (default 5)\n"
-    "  --seed      brings back the random values of an earlier run, which printed it\n"
+    "  --level     from 1, a quick look, to 10, everything, which takes minutes (default 5)\n"
+    "  --seed      repeat the random values of an earlier run, which printed its seed\n"
     "  --timeout   seconds that one check may take before it counts as hanging (default 900)\n"
-    "  --only      run this check, whatever its level; several are possible\n"
+    "  --only      run this check, whatever its level; may be repeated\n"
     "  --json      print the results as one JSON object\n"
     "  --library   the library to check (Windows; default: the one beside this program)\n"
     "  --bundle    the OpenFX bundle to check (default: the one beside this program)\n"
@@ -31,7 +31,7 @@ const char* const kHelp =
 #else
     "This is the 64-bit program: it checks the OpenFX plug-ins. The library needs the 32-bit one.\n"
 #endif
-    "The checks run in a process of their own: when the library crashes or hangs, that is a result.\n"
+    "The checks run in a separate process: if the library crashes or hangs, that is a result.\n"
     "Exit codes: 0 all checks passed, 1 a check failed, 2 command line.\n";
 
 namespace {

@@ -61,13 +61,13 @@ class FindsFaults(unittest.TestCase):
         code, output = run("none", *[word for check in checks for word in ("--only", check)])
         self.assertEqual(code, 0, output)
 
-    def test_the_page_tells_of_every_check(self):
+    def test_the_page_lists_every_check(self):
         listed = subprocess.run([*COMMAND, "--list"], stdout=subprocess.PIPE, text=True, check=True).stdout
         rows = [line.split(None, 2) for line in listed.splitlines()]
         table = "".join(f"| {name} | {level} | {what} |\n" for level, name, what in rows)
         self.assertIn(table, PAGE.read_text())
 
-    def test_a_wrong_command_line_is_told(self):
+    def test_a_wrong_command_line_is_reported(self):
         for words in (["--level", "11"], ["--level"], ["--only", "no-such-check"], ["--seed", "x"], ["--what"]):
             with self.subTest(words=words):
                 result = subprocess.run([*COMMAND, *words], stdout=subprocess.PIPE, stderr=subprocess.PIPE, text=True)
