@@ -143,7 +143,7 @@ int main(int count, char** arguments) {
         std::fprintf(stderr, "reelhost: %s\n", error.what());
         return 2;
     } catch (const std::bad_alloc&) {
-        std::fprintf(stderr, "reelhost: memory is short\n");
+        std::fprintf(stderr, "reelhost: not enough memory\n");
         return 1;
     } catch (const std::exception& error) {
         std::fprintf(stderr, "reelhost: %s\n", error.what());
