@@ -12,6 +12,7 @@
 
 int main(int count, char** arguments) {
     using namespace velmora::hosts;
+    OccupyStandardStreams();
     KeepLibraryLog();  // one clear line of ours instead
     WatchInterrupts();
     try {

@@ -35,7 +35,7 @@ inline constexpr std::array kExitMeanings = {
         "invalid command line: an unknown effect, preset, parameter or option, or a value out of range"},
     ExitMeaning{kExitInput, "input", "the input cannot be read or contains no video"},
     ExitMeaning{kExitOutput, "output", "the output already exists or cannot be written, or the disk is full"},
-    ExitMeaning{kExitInterrupted, "interrupted", "interrupted by SIGINT or SIGTERM"},
+    ExitMeaning{kExitInterrupted, "interrupted", "interrupted by SIGINT, SIGTERM or SIGHUP"},
 };
 
 inline constexpr char kOnInterrupt[] =

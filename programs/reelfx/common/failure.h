@@ -1,6 +1,8 @@
 // How a command ends: the exit codes, and the exception that carries one with its single line of text.
 #pragma once
 
+#include <cerrno>
+#include <cstring>
 #include <stdexcept>
 #include <string>
 
@@ -12,7 +14,7 @@ enum ExitCode : int {
     kExitUsage = 2,   // invalid command line: unknown effect, preset, parameter or option, value out of range
     kExitInput = 3,   // the input cannot be read or contains no video
     kExitOutput = 4,  // the output already exists or cannot be written, or the disk is full
-    kExitInterrupted = 130,  // SIGINT or SIGTERM
+    kExitInterrupted = 130,  // SIGINT, SIGTERM or SIGHUP
 };
 
 class Failure : public std::runtime_error {
@@ -23,5 +25,10 @@ class Failure : public std::runtime_error {
   private:
     ExitCode m_code;
 };
+
+// The system's reason for the call that failed last: ": No space left on device"; empty if there is none.
+inline std::string SystemReason() {
+    return errno == 0 ? std::string() : std::string(": ") + std::strerror(errno);
+}
 
 }  // namespace velmora::hosts

@@ -2,6 +2,8 @@
 
 #include <atomic>
 #include <csignal>
+#include <fcntl.h>
+#include <unistd.h>
 
 namespace velmora::hosts {
 namespace {
@@ -17,9 +19,19 @@ extern "C" void CountInterrupt(int number) {
 
 }  // namespace
 
+void OccupyStandardStreams() {
+    for (const int stream : {STDIN_FILENO, STDOUT_FILENO, STDERR_FILENO}) {
+        if (fcntl(stream, F_GETFD) >= 0) continue;
+        // The lowest free number is taken, which is this one.
+        if (open("/dev/null", stream == STDIN_FILENO ? O_WRONLY : O_RDONLY) != stream) return;
+    }
+}
+
 void WatchInterrupts() {
     std::signal(SIGINT, CountInterrupt);
     std::signal(SIGTERM, CountInterrupt);
+    // The terminal was closed; nohup ignores that.
+    if (std::signal(SIGHUP, CountInterrupt) == SIG_IGN) std::signal(SIGHUP, SIG_IGN);
     // A closed pipe and a file size limit are write errors, like a full disk.
     std::signal(SIGPIPE, SIG_IGN);
     std::signal(SIGXFSZ, SIG_IGN);

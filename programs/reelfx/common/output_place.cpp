@@ -47,6 +47,15 @@ fs::path FileOf(const std::string& path, std::int64_t first, std::int64_t last) 
     return path;
 }
 
+// What a symbolic link points to in the end, also if that does not exist; another path itself.
+fs::path TargetOf(fs::path path) {
+    constexpr int kMostLinks = 40;  // as the system counts
+    std::error_code error;
+    for (int i = 0; i < kMostLinks && fs::is_symlink(path, error); ++i)
+        path = path.parent_path() / fs::read_symlink(path, error);
+    return path;
+}
+
 constexpr std::int64_t kLastStart = 4;  // where the numbers of a sequence may begin at most
 
 constexpr char kHiddenFolder[] = ".reelfx-XXXXXX";
@@ -160,8 +169,8 @@ OutputPlace::OutputPlace(const std::string& path, bool mayOverwrite, std::int64_
     m_replaces = SomethingStandsAt(path, firstImage);
     // Absolute, because a relative name with a colon could be taken for an address.
     m_path = fs::absolute(m_path);
-    // A symbolic link is kept; its target is replaced.
-    if (const fs::path target = fs::canonical(m_path, ignored); !target.empty()) m_path = target;
+    // A symbolic link is kept; its target is replaced, or made.
+    m_path = TargetOf(m_path);
     RemoveLeftOvers(m_path.parent_path());
     m_folder = MakeHiddenFolder(m_path.parent_path(), m_name, m_lock);
 }

@@ -70,8 +70,9 @@ void SavePresetFile(const std::string& path, const std::string& name, const Effe
     for (std::size_t i = 0; i < effect.params.size(); ++i) {
         record.values[i] = {values[i], 0, effect.params[i].kind};
     }
+    errno = 0;
     if (!WritePreset(place.Address().c_str(), &record)) {
-        throw Failure(kExitOutput, path + ": cannot be written");
+        throw Failure(kExitOutput, path + ": cannot be written" + SystemReason());
     }
     place.Keep();
 }

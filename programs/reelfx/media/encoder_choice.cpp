@@ -156,8 +156,13 @@ AVPixelFormat InColour(AVPixelFormat format, bool isFilm) {
     const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
     if (!descriptor || descriptor->nb_components > 2 || (descriptor->flags & AV_PIX_FMT_FLAG_PAL) != 0)
         return format;
-    const bool isDeep = descriptor->comp[0].depth > 8;
-    if (isFilm) return isDeep ? AV_PIX_FMT_YUV420P10 : AV_PIX_FMT_YUV420P;
+    const int depth = descriptor->comp[0].depth;
+    const bool isDeep = depth > 8;
+    if (isFilm)
+        return depth > 12   ? AV_PIX_FMT_YUV420P16
+               : depth > 10 ? AV_PIX_FMT_YUV420P12
+               : isDeep     ? AV_PIX_FMT_YUV420P10
+                            : AV_PIX_FMT_YUV420P;
     if (descriptor->nb_components == 2) return isDeep ? AV_PIX_FMT_RGBA64BE : AV_PIX_FMT_RGBA;
     return isDeep ? AV_PIX_FMT_RGB48BE : AV_PIX_FMT_RGB24;
 }
@@ -213,6 +218,8 @@ const AVOutputFormat& ChooseContainer(const OutputOptions& options) {
     if (!name && options.path == "-") name = "yuv4mpegpipe";
     const AVOutputFormat* format = name ? av_guess_format(name, nullptr, nullptr)
                                         : av_guess_format(nullptr, options.path.c_str(), nullptr);
+    // "mkv" for matroska: what the extension of a file would choose.
+    if (!format && name) format = av_guess_format(nullptr, ("." + std::string(name)).c_str(), nullptr);
     if (!format && name) throw Failure(kExitUsage, std::string("unknown format \"") + name + '"');
     if (!format) {
         throw Failure(kExitUsage,

@@ -51,6 +51,8 @@ std::string ErrorWords(int error) {
                          error == AVERROR_BUG;
     if (error == AVERROR(EPERM) && !lastError.empty()) return ": " + lastError;
     if (!isVague) return ": " + AvText(error);
+    if (lastError.empty() && error == AVERROR_INVALIDDATA)
+        return ": not a clip or picture in a format that is known";
     return lastError.empty() ? " (the library gives no reason)" : ": " + lastError;
 }
 

@@ -1,9 +1,12 @@
 #include "programs/reelfx/media/media_reader.h"
 
 #include <algorithm>
+#include <array>
 #include <cstring>
 #include <numeric>
+#include <span>
 #include <string>
+#include <string_view>
 
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/interrupt.h"
@@ -65,6 +68,19 @@ const AVCodec* DecoderOf(const AVStream& stream) {
     if (stream.codecpar->codec_id == AV_CODEC_ID_VP8) return avcodec_find_decoder_by_name("libvpx");
     if (stream.codecpar->codec_id == AV_CODEC_ID_VP9) return avcodec_find_decoder_by_name("libvpx-vp9");
     return nullptr;
+}
+
+// True for a JPEG file that is cut off: the decoder fills the missing part with grey. After the start of the picture
+// the bytes of the end marker cannot occur before the end.
+bool LacksEnd(const AVFormatContext& container, const AVPacket& packet) {
+    const std::string_view format = container.iformat->name;
+    const bool isStill = format == "image2" || format == "jpeg_pipe";
+    const std::span data(packet.data, static_cast<std::size_t>(packet.size));
+    if (!isStill || container.streams[packet.stream_index]->codecpar->codec_id != AV_CODEC_ID_MJPEG)
+        return false;
+    constexpr std::array<std::uint8_t, 2> kScan = {0xFF, 0xDA}, kEnd = {0xFF, 0xD9};
+    const auto scan = std::ranges::find_end(data, kScan);
+    return scan.empty() || std::ranges::search(std::span(scan.begin(), data.end()), kEnd).empty();
 }
 
 }  // namespace
@@ -182,7 +198,7 @@ void MediaReader::ReadMore() {
         return;
     }
     m_timeLine.Mend(*m_container, *packet);
-    m_isLastPartial = (packet->flags & AV_PKT_FLAG_CORRUPT) != 0;
+    m_isLastPartial = (packet->flags & AV_PKT_FLAG_CORRUPT) != 0 || LacksEnd(*m_container, *packet);
     m_packetsEnd = std::max(m_packetsEnd, packet->pos + packet->size);
     if (packet->pts != AV_NOPTS_VALUE) {
         const double tick = av_q2d(m_container->streams[packet->stream_index]->time_base);

@@ -191,7 +191,8 @@ void PictureEncoder::NoteLosses(const AVOutputFormat& container) {
     const bool isCoarser = has.log2_chroma_w > had.log2_chroma_w || has.log2_chroma_h > had.log2_chroma_h;
     const bool isShallower = has.comp[0].depth < had.comp[0].depth;
     const bool isFromRgb = IsRgb(from) && !IsRgb(to);
-    if (!IsGrey(from) && (isCoarser || isShallower || isFromRgb)) m_notes.push_back(change);
+    // Chroma that a grey picture does not have cannot be lost.
+    if (isShallower || (!IsGrey(from) && (isCoarser || isFromRgb))) m_notes.push_back(change);
     const bool isMatteFormat = CarriesAlpha(to);
     if (HasAlpha(m_source) && !isMatteFormat) {
         m_notes.push_back("transparency is left out: " + std::string(container.name) + " with " +

@@ -74,10 +74,11 @@ void CheckStillName(const std::string& path) {
 void WriteStill(const BgraPicture& picture, const std::string& path, bool mayOverwrite) {
     OutputPlace place(path, mayOverwrite);
     const PacketPtr packet = Encode(picture, FormatOf(path));
+    errno = 0;
     std::ofstream file(place.Address(), std::ios::binary);
     file.write(reinterpret_cast<const char*>(packet->data), packet->size);
     file.close();
-    if (!file) throw Failure(kExitOutput, path + ": cannot be written");
+    if (!file) throw Failure(kExitOutput, path + ": cannot be written" + SystemReason());
     place.Keep();
 }
 

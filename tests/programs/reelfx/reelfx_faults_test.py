@@ -121,6 +121,22 @@ class Places(Commands):
                 done = subprocess.run([REELFX, *map(str, args)], stdout=full, stderr=subprocess.PIPE, timeout=300)
                 self.check_failed(done, [4], "cannot be written")
 
+    def test_closed_streams(self):
+        """Files get no number of a standard stream, and no message is written into them."""
+        options = (*DAMAGE, "--codec", "libx265")  # an encoder that warns at this size
+        tiny = self.out / "tiny.mkv"
+        ffmpeg("-i", clips.small, "-frames:v", "3", "-s", "64x48", "-c:v", "ffv1", tiny)
+        for name, redirection in (("open.mkv", "2> /dev/null"), ("closed.mkv", "<&- >&- 2>&-")):
+            script = f'exec "$@" {redirection}'
+            self.assertEqual(run("sh", "-c", script, "sh", REELFX, "render", tiny, self.out / name, *options).returncode, 0)
+        self.assertEqual((self.out / "open.mkv").read_bytes(), (self.out / "closed.mkv").read_bytes())
+
+    def test_link_to_nothing(self):
+        link = self.out / "link.mp4"
+        link.symlink_to("target.mp4")
+        self.assertEqual(reelfx("render", clips.small, link, *DAMAGE).returncode, 0)
+        self.assertEqual((link.is_symlink(), (self.out / "target.mp4").is_file()), (True, True))
+
     def test_places_that_cannot_be_written(self):
         locked = self.out / "locked"
         locked.mkdir(mode=0o555)
@@ -183,6 +199,11 @@ class Input(Commands):
         for source in ("-", self.out / "cut.y4m"):
             done = reelfx("frame", source, self.out / "x.png", *DAMAGE, "--frame", 40, input=y4m[:len(y4m) // 2])
             self.check_failed(done, [3], "inside a frame")
+        # Its decoder fills what is missing with grey.
+        photo = self.out / "photo.jpg"
+        ffmpeg("-i", clips.small, "-frames:v", "1", "-q:v", "2", photo)
+        (self.out / "cut.jpg").write_bytes(photo.read_bytes()[:-2000])
+        self.check_failed(reelfx("render", self.out / "cut.jpg", self.out / "x.jpg", *DAMAGE), [3], "inside a frame")
         # This container stores its own length, but not where its last frame is.
         film = self.out / "film.mkv"
         ffmpeg("-i", clips.small, "-c", "copy", film)
@@ -287,7 +308,7 @@ class Signals(Commands):
         left = 0
         for _ in range(OPTIONS.rounds):
             which = numbers.choice([0, 0, 0, 1, 2, 2, 3, 4, 5])
-            sent = numbers.choice([signal.SIGINT, signal.SIGTERM, signal.SIGKILL])
+            sent = numbers.choice([signal.SIGINT, signal.SIGTERM, signal.SIGHUP, signal.SIGKILL])
             seconds, whole = references[which]
             left += self.check_round(*rows[which], sent, numbers.uniform(0, 1.1 * seconds), whole)
             for name in self.left_over():
