@@ -38,6 +38,8 @@ class GlowLayerMaker {
 
     void ReadRow(int reduction, std::int32_t y, CellRow out) noexcept;
     void ReadBlocks(std::int32_t y, CellRow out) noexcept;
+    void AverageCopies(const ShiftedRow (&rows)[4], std::int32_t first, std::int32_t end,
+                       CellRow out) noexcept;
     void ReadSmallBlocks(int side, std::int32_t y, CellRow out) noexcept;
     void BlurAlong(CellRow row, CellRow out, std::int32_t width, const GlowTaps& taps) const noexcept;
     void BlurAcross(const CellPlane& from, const CellPlane& to, const GlowTaps& taps) const noexcept;
@@ -56,12 +58,13 @@ class GlowLayerMaker {
     CellPlane m_work[kLevels];           // of the same sizes
     CellPlane m_halves[kMostReduction];  // two rows each, of pictures reduced by more than four
     CellPlane m_rows;                    // two rows as wide as the widest
-    Bgra* m_pixels = nullptr;            // four rows
+    Bgra* m_pixels = nullptr;            // four rows, with up to three more pixels
 };
 
 bool GlowLayerMaker::Allocate(GlowMemory& memory) noexcept {
     std::int32_t width = ReducedSize(m_width, m_reduction), height = ReducedSize(m_height, m_reduction);
-    std::uint64_t lanes = static_cast<std::uint64_t>(m_width) * 4 * (sizeof(Bgra) / sizeof(std::uint16_t));
+    std::uint64_t lanes =
+        (static_cast<std::uint64_t>(m_width) + 3) * 4 * (sizeof(Bgra) / sizeof(std::uint16_t));
     for (int level = 0; level < kLevels; ++level) {
         m_levels[level] = m_work[level] = {nullptr, width, height};
         lanes += 2 * m_levels[level].Lanes();
@@ -111,22 +114,40 @@ void GlowLayerMaker::ReadRow(int reduction, std::int32_t y, CellRow out) noexcep
     }
 }
 
-// Blocks of 4 × 4 pixels; those at the right and bottom edges repeat the last pixels.
+// Blocks of 4 × 4 pixels; those at the right and bottom edges repeat the last pixels. Blocks of source pixels are read
+// in place, those with a border from copies.
 void GlowLayerMaker::ReadBlocks(std::int32_t y, CellRow out) noexcept {
-    const Bgra* rows[4];
+    ShiftedRow rows[4];
+    bool areAligned = true;
     for (std::int32_t i = 0; i < 4; ++i) {
         const std::int64_t row = std::min(std::int64_t{y} * 4 + i, std::int64_t{m_height} - 1);
-        rows[i] = m_input.Read(static_cast<std::int32_t>(row), m_pixels + std::ptrdiff_t{m_width} * i);
+        rows[i] = m_input.RowAt(static_cast<std::int32_t>(row));
+        areAligned = areAligned && rows[i].start == rows[0].start && rows[i].count == rows[0].count;
     }
-    const std::int32_t whole = m_width / 4;
-    m_kernels.averageBlocks(rows, out, whole);
-    if (m_width % 4 == 0) return;
-    Bgra edge[4][4];
-    const Bgra* edges[4] = {edge[0], edge[1], edge[2], edge[3]};
-    for (std::int32_t i = 0; i < 16; ++i) {
-        edge[i / 4][i % 4] = rows[i / 4][std::min(whole * 4 + i % 4, m_width - 1)];
+    const std::int32_t cells = m_width / 4 + (m_width % 4 != 0 ? 1 : 0);
+    const std::int32_t first = areAligned ? (rows[0].start + 3) / 4 : cells;
+    const std::int32_t end = std::max(first, areAligned ? (rows[0].start + rows[0].count) / 4 : cells);
+    if (first != end) {
+        const Bgra* pixels[4];
+        for (int i = 0; i < 4; ++i) pixels[i] = rows[i].pixels + (4 * first - rows[i].start);
+        m_kernels.averageBlocks(pixels, out + first * std::ptrdiff_t{kCellLanes}, end - first);
     }
-    m_kernels.averageBlocks(edges, out + whole * std::ptrdiff_t{kCellLanes}, 1);
+    AverageCopies(rows, 0, std::min(first, cells), out);
+    AverageCopies(rows, end, cells, out);
+}
+
+void GlowLayerMaker::AverageCopies(const ShiftedRow (&rows)[4], std::int32_t first, std::int32_t end,
+                                   CellRow out) noexcept {
+    if (first >= end) return;
+    const std::int32_t columns = 4 * (end - first), read = std::min(columns, m_width - 4 * first);
+    const Bgra* pixels[4];
+    for (int i = 0; i < 4; ++i) {
+        Bgra* const copy = m_pixels + (std::ptrdiff_t{m_width} + 3) * i;
+        rows[i].Copy(4 * first, 4 * first + read, copy);
+        std::fill(copy + read, copy + columns, copy[read - 1]);
+        pixels[i] = copy;
+    }
+    m_kernels.averageBlocks(pixels, out + first * std::ptrdiff_t{kCellLanes}, end - first);
 }
 
 // One pixel per cell, or 2 × 2: in small pictures only.
@@ -134,7 +155,10 @@ void GlowLayerMaker::ReadSmallBlocks(int side, std::int32_t y, CellRow out) noex
     const Bgra* rows[2];
     for (std::int32_t i = 0; i < 2; ++i) {
         const std::int32_t row = std::min(y * side + i * (side - 1), m_height - 1);
-        rows[i] = m_input.Read(row, m_pixels + std::ptrdiff_t{m_width} * i);
+        const ShiftedRow shifted = m_input.RowAt(row);
+        Bgra* const copy = m_pixels + std::ptrdiff_t{m_width} * i;
+        if (shifted.count != m_width) shifted.Copy(0, m_width, copy);
+        rows[i] = shifted.count != m_width ? copy : shifted.pixels;
     }
     // A single pixel counts four times.
     constexpr int kScale = 128 / 4;

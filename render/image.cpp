@@ -1,10 +1,27 @@
 #include "render/image.h"
 
 #include <algorithm>
+#include <bit>
 #include <cstddef>
+#include <cstring>
 #include <limits>
 
 namespace velmora::render {
+static_assert(std::endian::native == std::endian::little, "border words are written as bytes");
+
+void FillPixels(Bgra* pixels, std::int32_t count, std::uint32_t colour) noexcept {
+    for (std::int32_t x = 0; x < count; ++x) std::memcpy(pixels + x, &colour, sizeof colour);
+}
+
+void ShiftedRow::Copy(std::int32_t from, std::int32_t to, Bgra* out) const noexcept {
+    const std::int32_t first = std::clamp(start, from, to), last = std::clamp(start + count, first, to);
+    FillPixels(out, first - from, border);
+    if (first != last) {
+        std::memcpy(out + (first - from), pixels + (first - start),
+                    static_cast<std::size_t>(last - first) * sizeof(Bgra));
+    }
+    FillPixels(out + (last - from), to - last, border);
+}
 
 Rectangle Rectangle::Clipped(const Rectangle& bounds) const noexcept {
     return {std::max(top, bounds.top), std::min(bottom, bounds.bottom), std::max(left, bounds.left),

@@ -71,12 +71,26 @@ struct ImageView {
 [[nodiscard]] ImageView ViewOf(const FrameDescription& frame, std::int32_t width, std::int32_t height,
                                RowBytesOf rowBytes = BgraRowBytes) noexcept;
 
-// Rows of a picture, read one at a time by a stage that needs its neighbours.
+// A row of a picture that may be shifted: `count` pixels from `pixels` start at column `start`, and the border fills
+// the other columns.
+struct ShiftedRow {
+    const Bgra* pixels;
+    std::int32_t start;
+    std::int32_t count;
+    std::uint32_t border;
+
+    // Writes columns `from` to `to`, which is exclusive, to `out`.
+    void Copy(std::int32_t from, std::int32_t to, Bgra* out) const noexcept;
+};
+
+// Writes the word to `count` pixels.
+void FillPixels(Bgra* pixels, std::int32_t count, std::uint32_t colour) noexcept;
+
+// Rows of a picture, for a stage that needs their neighbours.
 class RowReader {
   public:
-    // Row `y` of the processed rectangle, from 0. Returns either a pointer into the picture, or `scratch` (a whole
-    // row) with the row written to it.
-    virtual const Bgra* Read(std::int32_t y, Bgra* scratch) const noexcept = 0;
+    // Row `y` of the processed rectangle, from 0.
+    [[nodiscard]] virtual ShiftedRow RowAt(std::int32_t y) const noexcept = 0;
 
   protected:
     ~RowReader() = default;

@@ -10,18 +10,6 @@
 
 namespace velmora::render {
 
-// A row of the shaken picture: `count` source pixels from `pixels` start at column `start`, and the border fills the
-// other columns.
-struct ShiftedRow {
-    const Bgra* pixels;
-    std::int32_t start;
-    std::int32_t count;
-    std::uint32_t border;
-};
-
-// Writes the word to `count` pixels.
-void FillPixels(Bgra* pixels, std::int32_t count, std::uint32_t colour) noexcept;
-
 class JitterStage {
   public:
     static constexpr bool kIsDamage = false;
@@ -39,11 +27,7 @@ class JitterStage {
     [[nodiscard]] std::uint32_t Border() const noexcept { return m_border; }
 
     // Row `y` of the shaken picture of `source`'s region.
-    ShiftedRow Shifted(const ImageView& source, std::int32_t y) const noexcept;
-
-    // Row `y` of the shaken picture, as wide as `source`'s region. Either written to `out`, or a pointer into the
-    // source if the row is already there unchanged.
-    const Bgra* Row(const ImageView& source, Bgra* out, std::int32_t y) const noexcept;
+    [[nodiscard]] ShiftedRow Shifted(const ImageView& source, std::int32_t y) const noexcept;
 
   private:
     std::int32_t m_dy = 0;
@@ -59,8 +43,8 @@ class ShakenRows final : public RowReader {
   public:
     ShakenRows(const ImageView& source, const JitterStage& jitter) noexcept
         : m_source(source), m_jitter(jitter) {}
-    const Bgra* Read(std::int32_t y, Bgra* scratch) const noexcept override {
-        return m_jitter.Row(m_source, scratch, y);
+    [[nodiscard]] ShiftedRow RowAt(std::int32_t y) const noexcept override {
+        return m_jitter.Shifted(m_source, y);
     }
 
   private:

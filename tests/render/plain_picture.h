@@ -36,7 +36,9 @@ class PlainPicture final : public render::RowReader {
     [[nodiscard]] const render::Bgra* Row(std::int32_t y) const {
         return m_pixels.data() + static_cast<std::ptrdiff_t>(m_width) * y;
     }
-    const render::Bgra* Read(std::int32_t y, render::Bgra*) const noexcept override { return Row(y); }
+    [[nodiscard]] render::ShiftedRow RowAt(std::int32_t y) const noexcept override {
+        return {Row(y), 0, m_width, 0};
+    }
 
     [[nodiscard]] render::FrameDescription Description() {
         return {m_pixels.data(), m_width, m_height, m_width * 4, 0, 0};
