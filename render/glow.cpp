@@ -77,7 +77,7 @@ bool GlowLayerMaker::Allocate(GlowMemory& memory) noexcept {
     }
     // A doubled row may be one cell wider than needed.
     m_rows = {nullptr, ReducedSize(m_width, std::min(m_reduction, 2) == 2 ? 2 : 0) + 1, 2};
-    lanes += m_rows.Lanes();
+    lanes += m_rows.Lanes() + kPlanesRead;
 
     std::uint16_t* next = memory.Reserve(lanes);
     if (next == nullptr) return false;
@@ -91,7 +91,7 @@ bool GlowLayerMaker::Allocate(GlowMemory& memory) noexcept {
     }
     for (int reduction = 2; reduction < m_reduction; ++reduction) take(m_halves[reduction]);
     take(m_rows);
-    m_pixels = reinterpret_cast<Bgra*>(next);
+    m_pixels = reinterpret_cast<Bgra*>(next + kPlanesRead);
     return true;
 }
 
@@ -254,18 +254,25 @@ GlowStage GlowLayerMaker::Make() noexcept {
 
 }  // namespace
 
-void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
+// A hash, so that rows form no pattern; it depends only on the row, so the result does not depend on how the work is
+// divided.
+std::uint16_t GlowStage::Dither(std::int32_t y) noexcept {
+    return static_cast<std::uint16_t>(MixBits(static_cast<std::uint32_t>(y)));
+}
+
+// The row's distance from the middle of its cells decides the share of the neighbouring cells.
+GlowStage::Neighbours GlowStage::NeighboursOf(std::int32_t y) const noexcept {
     const std::int32_t side = 1 << m_reduction;
     const std::int32_t cell = y >> m_reduction;
-    // The row's distance from the middle of its cells, in half pixels. It decides the share of the neighbouring cells.
-    const std::int32_t away = 2 * (y & (side - 1)) + 1 - side;
-    const std::int16_t share = static_cast<std::int16_t>(std::int64_t{std::abs(away)} * 32768 / side);
-    // A hash, so that rows form no pattern; it depends only on the row, so the result does not depend on how the work
-    // is divided.
-    const auto dither = static_cast<std::uint16_t>(MixBits(static_cast<std::uint32_t>(y)));
+    const std::int32_t away = 2 * (y & (side - 1)) + 1 - side;  // in half pixels
+    return {m_layer.Row(cell), m_layer.Row(away < 0 ? cell - 1 : cell + 1),
+            static_cast<std::int16_t>(std::int64_t{std::abs(away)} * 32768 / side)};
+}
+
+GlowRow GlowStage::Over(std::int32_t width, std::int32_t y) const noexcept {
     CellRow row = m_rows.Row(0), other = m_rows.Row(1);
-    m_kernels->approach(m_layer.Row(cell), m_layer.Row(away < 0 ? cell - 1 : cell + 1), row, m_layer.width,
-                        share);
+    const Neighbours from = NeighboursOf(y);
+    m_kernels->approach(from.near, from.far, row, m_layer.width, from.share);
     std::int32_t cells = m_layer.width;
     const int wanted = m_reduction < 2 ? 0 : 2;  // one cell per pixel, or per four pixels
     for (int reduction = m_reduction; reduction > wanted; --reduction) {
@@ -274,9 +281,29 @@ void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t 
         std::swap(row, other);
         cells = ReducedSize(width, reduction - 1);
     }
-    if (wanted == 0) return m_kernels->screen(in, out, row, width, dither);
     ContinueEnds(row, cells);
-    m_kernels->screenFourfold(in, out, row, width, dither);
+    return {m_kernels, row, wanted == 0 ? 1 : 4, Dither(y)};
+}
+
+GlowPlanes GlowStage::PlanesOver(std::int32_t width, std::int32_t y, SplitGlow split) const noexcept {
+    const std::int32_t cells = ReducedSize(width, 2);
+    Neighbours from = NeighboursOf(y);
+    // A row of finer cells is split as it is.
+    if (m_reduction > 2) from.near = from.far = Over(width, y).cells;
+    const CellRow taken = m_rows.Row(0);
+    std::uint16_t* const first = m_rows.Row(from.near == taken ? 1 : 0);
+    const std::ptrdiff_t step = std::ptrdiff_t{cells} + 2 * kCellPad;
+    std::uint16_t* const planes[3] = {first, first + step, first + 2 * step};
+    split(from.near, from.far, planes, cells, from.share);
+    for (std::uint16_t* plane : planes) {
+        plane[-1] = plane[0];
+        plane[cells] = plane[cells - 1];
+    }
+    return {planes[0], planes[1], planes[2], Dither(y)};
+}
+
+void GlowStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
+    Over(width, y).Screen(in, out, width);
 }
 
 GlowStage PrepareGlow(float amount, const RowReader& input, std::int32_t width, std::int32_t height,

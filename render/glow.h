@@ -67,11 +67,24 @@ class GlowStage {
         : m_layer(layer), m_rows(rows), m_reduction(reduction), m_kernels(&kernels) {}
 
     [[nodiscard]] bool IsActive() const noexcept { return m_kernels != nullptr; }
-    // Row `y` of the processed rectangle; `in` may be `out`. Uses scratch rows in the memory passed when the stage was
-    // prepared, so only one row of a picture can be processed at a time.
+    // The layer over row `y` of the processed rectangle. It is made in scratch rows in the memory passed when the stage
+    // was prepared, so only one row of a picture can be processed at a time.
+    [[nodiscard]] GlowRow Over(std::int32_t width, std::int32_t y) const noexcept;
+    // The same in planes, if the layer has a cell for four pixels or more.
+    [[nodiscard]] bool HasPlanes() const noexcept { return m_reduction >= 2; }
+    [[nodiscard]] GlowPlanes PlanesOver(std::int32_t width, std::int32_t y, SplitGlow split) const noexcept;
+    // Processes row `y`; `in` may be `out`.
     void Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
 
   private:
+    // Rows of cells above and below a row of pixels, and the share of the farther one.
+    struct Neighbours {
+        ConstCellRow near, far;
+        std::int16_t share;
+    };
+    [[nodiscard]] Neighbours NeighboursOf(std::int32_t y) const noexcept;
+    [[nodiscard]] static std::uint16_t Dither(std::int32_t y) noexcept;
+
     CellPlane m_layer;
     CellPlane m_rows;
     int m_reduction = 0;

@@ -120,10 +120,6 @@ std::uint8_t Screened(std::uint32_t channel, std::uint32_t layer, std::uint16_t 
     return static_cast<std::uint8_t>(channel + (added >> 7));
 }
 
-std::uint16_t DitherAt(std::uint16_t first, std::int32_t x) noexcept {
-    return static_cast<std::uint16_t>(first + static_cast<std::uint32_t>(x) * kDitherStep);
-}
-
 void Screen(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width,
             std::uint16_t dither) noexcept {
     for (std::int32_t x = 0; x < width; ++x, layer += kCellLanes) {
@@ -150,5 +146,20 @@ void ScreenFourfold(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t 
 const GlowKernels kPlainGlow = {AverageBlocks, KeepHighlights, Filter,      HalveRows,
                                 HalveAlong,    Between,        DoubleAlong, Mix,
                                 Lift,          Approach,       Screen,      ScreenFourfold};
+
+GlowRow GlowRow::From(std::int32_t x) const noexcept {
+    GlowRow rest = *this;
+    rest.cells += std::ptrdiff_t{x / pixels} * kCellLanes;
+    rest.dither = DitherAt(dither, x);
+    return rest;
+}
+
+void GlowRow::Screen(const Bgra* in, Bgra* out, std::int32_t width) const noexcept {
+    (pixels == 1 ? kernels->screen : kernels->screenFourfold)(in, out, cells, width, dither);
+}
+
+GlowPlanes GlowPlanes::From(std::int32_t x) const noexcept {
+    return {blue + x / 4, green + x / 4, red + x / 4, DitherAt(dither, x)};
+}
 
 }  // namespace velmora::render

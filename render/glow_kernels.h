@@ -44,6 +44,11 @@ inline constexpr std::int32_t kLumaBlue = 29, kLumaGreen = 150, kLumaRed = 77;  
 inline constexpr std::uint16_t kDitherStep = 40503;
 inline constexpr int kDitherShift = 9;
 
+// The number of the pixel `x` columns after the one with the number `first`.
+constexpr std::uint16_t DitherAt(std::uint16_t first, std::int32_t x) noexcept {
+    return static_cast<std::uint16_t>(first + static_cast<std::uint32_t>(x) * kDitherStep);
+}
+
 struct GlowKernels {
     // Means of 4 × 4 pixels.
     void (*averageBlocks)(const Bgra* const rows[4], CellRow cells, std::int32_t count) noexcept;
@@ -78,5 +83,34 @@ struct GlowKernels {
     void (*screenFourfold)(const Bgra* in, Bgra* out, ConstCellRow layer, std::int32_t width,
                            std::uint16_t dither) noexcept;
 };
+
+// A glow layer over a row of pixels.
+struct GlowRow {
+    const GlowKernels* kernels;
+    ConstCellRow cells;   // with their ends continued
+    std::int32_t pixels;  // per cell: 1 or 4
+    std::uint16_t dither;
+
+    // From column `x`, a multiple of `pixels`.
+    [[nodiscard]] GlowRow From(std::int32_t x) const noexcept;
+    void Screen(const Bgra* in, Bgra* out, std::int32_t width) const noexcept;
+};
+
+// The same with one cell per four pixels, by channels. Each plane continues its ends by one number; kernels may read
+// kPlanesRead numbers after the last one.
+struct GlowPlanes {
+    const std::uint16_t* blue;
+    const std::uint16_t* green;
+    const std::uint16_t* red;
+    std::uint16_t dither;
+
+    // From column `x`, a multiple of four.
+    [[nodiscard]] GlowPlanes From(std::int32_t x) const noexcept;
+};
+inline constexpr std::int32_t kPlanesRead = 64;
+
+// As GlowKernels::approach, with the result separated into planes of blue, green and red.
+using SplitGlow = void (*)(ConstCellRow near, ConstCellRow far, std::uint16_t* const planes[3],
+                           std::int32_t count, std::int16_t share) noexcept;
 
 }  // namespace velmora::render

@@ -15,5 +15,7 @@ extern const Kernels kAvx512Kernels;
 void DrawScratchesSse2(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
                        const ScratchRowPlace& place) noexcept;
 extern const GlowKernels kAvx2Glow;
+void SplitGlowAvx2(const std::uint16_t* near, const std::uint16_t* far, std::uint16_t* const planes[3],
+                   std::int32_t count, std::int16_t share) noexcept;
 
 }  // namespace velmora::render

@@ -48,8 +48,8 @@ void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) no
 
 }  // namespace
 
-const Kernels kPlainKernels = {ToneRow, WearRow,      DrawScratchesPlain, CopyRow,
-                               CopyRow, NothingToEnd, &kPlainGlow,        &kPlainYcbcr};
+const Kernels kPlainKernels = {ToneRow,      WearRow,     DrawScratchesPlain, CopyRow, CopyRow,
+                               NothingToEnd, &kPlainGlow, &kPlainYcbcr,       nullptr};
 
 namespace {
 

@@ -73,6 +73,8 @@ struct Tone {
 };
 
 struct GlowKernels;
+struct GlowPlanes;
+struct GlowedTone;
 struct YcbcrKernels;
 struct ScratchLine;
 struct ScratchRowPlace;
@@ -93,8 +95,18 @@ struct Kernels {
     // After the last row of a frame, `endStream` makes the rows visible to other threads.
     void (*stream)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
     void (*endStream)() noexcept;
-    const GlowKernels* glow;    // render/glow_kernels.h
-    const YcbcrKernels* ycbcr;  // render/ycbcr.h
+    const GlowKernels* glow;       // render/glow_kernels.h
+    const YcbcrKernels* ycbcr;     // render/ycbcr.h
+    const GlowedTone* glowedTone;  // null if the level has none
+};
+
+// Glow and tone in one step, for layers in planes (render/glow_kernels.h).
+struct GlowedTone {
+    void (*split)(const std::uint16_t* near, const std::uint16_t* far, std::uint16_t* const planes[3],
+                  std::int32_t count, std::int16_t share) noexcept;
+    // Screens a row with the layer, then applies the tone.
+    void (*tone)(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone,
+                 const GlowPlanes& layer) noexcept;
 };
 
 // The kernels of a level. If this build lacks the level, the next lower one is used. The processor must support the

@@ -30,16 +30,27 @@ namespace {
 #include "render/simd/mix.inc"
 #include "render/simd/mix_channels.inc"
 #include "render/simd/table_shuffles.inc"
+#include "render/simd/glow_channels.inc"
 #include "render/simd/tone_channels.inc"
 #include "render/simd/glow.inc"
+#include "render/simd/glow_split.inc"
 #include "render/simd/ycbcr.inc"
 
 }  // namespace
 
+void SplitGlowAvx2(ConstCellRow near, ConstCellRow far, std::uint16_t* const planes[3], std::int32_t count,
+                   std::int16_t share) noexcept {
+    SplitCells(near, far, planes, count, share);
+}
+
+namespace {
+constexpr GlowedTone kGlowedTone = {SplitGlowAvx2, ToneUnderGlow};
+}  // namespace
+
 const GlowKernels kAvx2Glow = kGlow;
 
-const Kernels kAvx2Kernels = {ToneRow,   WearRow,   DrawScratchesSse2, CopyRow,
-                              StreamRow, EndStream, &kAvx2Glow,        &kYcbcr};
+const Kernels kAvx2Kernels = {ToneRow,   WearRow,    DrawScratchesSse2, CopyRow,     StreamRow,
+                              EndStream, &kAvx2Glow, &kYcbcr,           &kGlowedTone};
 
 }  // namespace velmora::render
 

@@ -30,13 +30,16 @@ namespace {
 #include "render/simd/mix.inc"
 #include "render/simd/mix_channels.inc"
 #include "render/simd/table_permutes.inc"
+#include "render/simd/glow_channels.inc"
 #include "render/simd/tone_channels.inc"
 #include "render/simd/ycbcr.inc"
 
+constexpr GlowedTone kGlowedTone = {SplitGlowAvx2, ToneUnderGlow};
+
 }  // namespace
 
-const Kernels kAvx512Kernels = {ToneRow,   WearRow,   DrawScratchesSse2, CopyRow,
-                                StreamRow, EndStream, &kAvx2Glow,        &kYcbcr};
+const Kernels kAvx512Kernels = {ToneRow,   WearRow,    DrawScratchesSse2, CopyRow,     StreamRow,
+                                EndStream, &kAvx2Glow, &kYcbcr,           &kGlowedTone};
 
 }  // namespace velmora::render
 

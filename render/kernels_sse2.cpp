@@ -42,8 +42,8 @@ void DrawScratchesSse2(const ScratchLine* lines, std::uint32_t count, Bgra* row,
     DrawLines(lines, count, row, width, place);
 }
 
-const Kernels kSse2Kernels = {ToneRow, WearRow, DrawScratchesSse2, CopyRow, StreamRow, EndStream,
-                              &kGlow,  &kYcbcr};
+const Kernels kSse2Kernels = {ToneRow,   WearRow, DrawScratchesSse2, CopyRow, StreamRow,
+                              EndStream, &kGlow,  &kYcbcr,           nullptr};
 
 }  // namespace velmora::render
 

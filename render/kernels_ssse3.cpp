@@ -37,8 +37,8 @@ namespace {
 
 }  // namespace
 
-const Kernels kSsse3Kernels = {ToneRow, WearRow, DrawScratchesSse2, CopyRow, StreamRow, EndStream,
-                               &kGlow,  &kYcbcr};
+const Kernels kSsse3Kernels = {ToneRow,   WearRow, DrawScratchesSse2, CopyRow, StreamRow,
+                               EndStream, &kGlow,  &kYcbcr,           nullptr};
 
 }  // namespace velmora::render
 

@@ -87,18 +87,13 @@ void RowProgram::Stream(const ShiftedRow& in, Bgra* scratch, Bgra* out, std::int
     m_kernels.stream(scratch, out, width);
 }
 
-// The first step reads directly from the source if it can.
 void RowProgram::Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     const bool isWhole = in.count == width;
-    const Reads reads = IsEmpty() ? Reads::kInPlace : m_steps[0].reads;
     const Bgra* row = out;
     std::size_t next = 0;
-    if (reads == Reads::kPixels) {
-        const Step& first = m_steps[next++];
-        FetchThrough(in, out, width, [&](const Bgra* from, Bgra* to, std::int32_t count) {
-            first.run(*this, first.stage, from, to, count, y);
-        });
-    } else if (reads == Reads::kRow && isWhole) {
+    if (m_glow != nullptr || (m_count != 0 && m_steps[0].reads == Reads::kPixels)) {
+        next = RunFirst(in, out, width, y);
+    } else if (m_count != 0 && m_steps[0].reads == Reads::kRow && isWhole) {
         row = in.pixels;
     } else if (!isWhole || in.pixels != out) {
         FetchThrough(in, out, width, m_kernels.copy);
@@ -107,6 +102,55 @@ void RowProgram::Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::i
         m_steps[next].run(*this, m_steps[next].stage, row, out, width, y);
         row = out;
     }
+}
+
+// Glow and tone in one step, if possible.
+bool RowProgram::TonesUnderGlow() const noexcept {
+    return m_kernels.glowedTone != nullptr && m_hasTone && FitsKernel(m_tone.weight) && m_glow->HasPlanes();
+}
+
+// Glow or tone, or both, directly from the source. Returns the number of steps done.
+std::size_t RowProgram::RunFirst(const ShiftedRow& in, Bgra* out, std::int32_t width,
+                                 std::int32_t y) const noexcept {
+    if (m_glow == nullptr) {
+        FetchParts(in, out, width,
+                   [&](const Bgra* from, Bgra* to, std::int32_t count) { RunTone(from, to, count); });
+        return 1;
+    }
+    if (TonesUnderGlow()) {
+        const GlowPlanes layer = m_glow->PlanesOver(width, y, m_kernels.glowedTone->split);
+        FetchParts(in, out, width, [&](const Bgra* from, Bgra* to, std::int32_t count) {
+            m_kernels.glowedTone->tone(from, to, count, m_tone,
+                                       layer.From(static_cast<std::int32_t>(to - out)));
+        });
+        return 1;
+    }
+    const GlowRow layer = m_glow->Over(width, y);
+    FetchParts(in, out, width, [&](const Bgra* from, Bgra* to, std::int32_t count) {
+        layer.From(static_cast<std::int32_t>(to - out)).Screen(from, to, count);
+    });
+    return 0;
+}
+
+// Calls work(from, to, count) for parts of the row that begin at multiples of kPart columns: for those with border
+// pixels in place, for the others from the source.
+template <typename Work>
+void RowProgram::FetchParts(const ShiftedRow& in, Bgra* out, std::int32_t width, Work&& work) const noexcept {
+    constexpr std::int32_t kPart = 64;  // the longest step of a kernel: only a row's end is shorter
+    const std::int32_t end = in.start + in.count == width ? width : (in.start + in.count) / kPart * kPart;
+    const std::int32_t first = std::min((in.start + kPart - 1) / kPart * kPart, width);
+    if (first >= end) {
+        in.Copy(0, width, out);
+        return work(out, out, width);
+    }
+    const auto inPlace = [&](std::int32_t from, std::int32_t to) {
+        if (from == to) return;
+        in.Copy(from, to, out + from);
+        work(out + from, out + from, to - from);
+    };
+    inPlace(0, first);
+    work(in.pixels + (first - in.start), out + first, end - first);
+    inPlace(end, width);
 }
 
 template <typename Work>

@@ -19,7 +19,7 @@ class RowProgram {
     RowProgram& operator=(const RowProgram&) = delete;
 
     // True if rows are not changed.
-    [[nodiscard]] bool IsEmpty() const noexcept { return m_count == 0; }
+    [[nodiscard]] bool IsEmpty() const noexcept { return m_count == 0 && m_glow == nullptr; }
     // Row `y`. The source pixels may be exactly where the result goes but must not overlap it otherwise.
     void Run(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
     // The same for a result that will not be read again soon. `scratch` holds one row, used if there is work.
@@ -43,8 +43,8 @@ class RowProgram {
     };
     static constexpr std::size_t kMostSteps = 8;
 
-    void Add(const JitterStage&) noexcept {}  // rows come in shifted
-    void Add(const GlowStage& stage) noexcept { AddStage(stage, Reads::kRow); }
+    void Add(const JitterStage&) noexcept {}                        // rows come in shifted
+    void Add(const GlowStage& stage) noexcept { m_glow = &stage; }  // always the first step
     void Add(const ColourStage&) noexcept { AddTone(); }
     void Add(const TintStage&) noexcept { AddTone(); }
     void Add(const WearStage& stage) noexcept { AddStage(stage, Reads::kRow); }
@@ -57,11 +57,16 @@ class RowProgram {
     void PlanTone(const ColourStage& colour, const TintStage& tint) noexcept;
     template <typename Work>
     void FetchThrough(const ShiftedRow& in, Bgra* out, std::int32_t width, Work&& work) const noexcept;
+    template <typename Work>
+    void FetchParts(const ShiftedRow& in, Bgra* out, std::int32_t width, Work&& work) const noexcept;
+    [[nodiscard]] bool TonesUnderGlow() const noexcept;
+    std::size_t RunFirst(const ShiftedRow& in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept;
     void RunTone(const Bgra* in, Bgra* out, std::int32_t width) const noexcept;
 
     const Kernels& m_kernels;
     std::array<Step, kMostSteps> m_steps{};
     std::size_t m_count = 0;
+    const GlowStage* m_glow = nullptr;
     Tone m_tone;             // of colour and tint, which are neighbours
     bool m_hasTone = false;  // among the steps
     ChannelTables m_before;  // the mix

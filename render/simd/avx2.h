@@ -107,3 +107,14 @@ inline Vec SelectBySign8(Vec sign, Vec a, Vec b) noexcept {
 inline Vec RepeatBlock(const void* from) noexcept {
     return _mm256_broadcastsi128_si256(_mm_load_si128(static_cast<const __m128i*>(from)));
 }
+// Eight 16-bit numbers, for PickNumbers.
+inline Vec LoadNumbersAround(const void* from) noexcept {
+    return _mm256_broadcastsi128_si256(_mm_loadu_si128(static_cast<const __m128i*>(from)));
+}
+// Those numbers at `places`, each of which is a PlaceOfNumber.
+inline Vec PickNumbers(Vec numbers, Vec places) noexcept {
+    return ShuffleBytes(numbers, places);
+}
+constexpr std::uint16_t PlaceOfNumber(std::int32_t index) noexcept {
+    return static_cast<std::uint16_t>(index * 0x0202 + 0x0100);
+}

@@ -72,3 +72,13 @@ inline void StoreLow64(void* to, Vec v) noexcept {
 inline Vec LoadBytes16(const void* from) noexcept {
     return _mm512_cvtepu8_epi16(_mm256_loadu_si256(static_cast<const __m256i*>(from)));
 }
+// As in avx2.h, with sixteen numbers.
+inline Vec LoadNumbersAround(const void* from) noexcept {
+    return _mm512_castsi256_si512(_mm256_loadu_si256(static_cast<const __m256i*>(from)));
+}
+inline Vec PickNumbers(Vec numbers, Vec places) noexcept {
+    return _mm512_permutexvar_epi16(places, numbers);
+}
+constexpr std::uint16_t PlaceOfNumber(std::int32_t index) noexcept {
+    return static_cast<std::uint16_t>(index);
+}

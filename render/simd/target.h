@@ -34,6 +34,8 @@
 #define VM_PRAGMA(text) _Pragma(#text)
 // For functions that keep their state in registers only if inlined.
 #define VM_ALWAYS_INLINE __attribute__((always_inline)) inline
+// For functions that would otherwise be copied into many loops.
+#define VM_NOINLINE __attribute__((noinline))
 // For a loop whose steps depend on each other, so that unrolling only costs registers.
 #if defined(__clang__)
 #define VM_DO_NOT_UNROLL VM_PRAGMA(clang loop unroll(disable))

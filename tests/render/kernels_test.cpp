@@ -6,9 +6,11 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <cstring>
 #include <functional>
 #include <limits>
+#include <memory>
 #include <random>
 #include <vector>
 
@@ -106,35 +108,51 @@ ChannelTables SmoothTables(std::mt19937& numbers, std::size_t steepest) {
     return result;
 }
 
-TEST(Kernels, ToneIsThePlainOneOnEveryLevel) {
-    std::mt19937 numbers(4);
-    const ChannelTables before = AnyTables(numbers), after = AnyTables(numbers),
-                        gentle = SmoothTables(numbers, 30), steep = SmoothTables(numbers, 45);
-    EXPECT_EQ(after.shuffles, ShuffleTable::Kind::kAny);
-    EXPECT_EQ(gentle.shuffles, ShuffleTable::Kind::kGentle);
-    EXPECT_EQ(steep.shuffles, ShuffleTable::Kind::kSteep);
-    // Kinds of lines that kernels compute, and one that they do not.
-    const ToneLine up = {200 << 8, 3000, 0, 8}, cut = {60000, 0, 9000, 6}, sharp = {53248, 0, 10200, 7},
-                   other = {60000, 2000, 0, 6};
-    std::vector<Tone> tones = {{&before, true, 40, &after},   {nullptr, true, -127, &after},
-                               {&before, true, 127, nullptr}, {&before, false, 0, nullptr},
-                               {nullptr, false, 0, &after},   {nullptr, true, -1, nullptr},
-                               {nullptr, true, 0, nullptr},   {nullptr, true, -60, &gentle},
-                               {nullptr, false, 0, &gentle},  {nullptr, false, 0, &steep}};
-    // Lines and the table they make.
-    const std::vector<ToneLine> lines[] = {{up}, {cut}, {up, cut}, {sharp}, {up, sharp}, {other}, {cut, up}};
-    ChannelTables tables[std::size(lines)];
-    for (std::size_t i = 0; i < std::size(lines); ++i) {
-        ByteTable table;
-        for (std::size_t entry = 0; entry < table.size(); ++entry) {
-            table[entry] = static_cast<std::uint8_t>(entry);
-            for (const ToneLine& line : lines[i]) table[entry] = EntryOf(line, table[entry]);
+// Tones of all kinds, with the tables that they point to.
+class SomeTones {
+  public:
+    SomeTones() {
+        std::mt19937 numbers(4);
+        before = AnyTables(numbers);
+        after = AnyTables(numbers);
+        gentle = SmoothTables(numbers, 30);
+        steep = SmoothTables(numbers, 45);
+        tones = {{&before, true, 40, &after},  {nullptr, true, -127, &after}, {&before, true, 127, nullptr},
+                 {&before, false, 0, nullptr}, {nullptr, false, 0, &after},   {nullptr, true, -1, nullptr},
+                 {nullptr, true, 0, nullptr},  {nullptr, true, -60, &gentle}, {nullptr, false, 0, &gentle},
+                 {nullptr, false, 0, &steep}};
+        for (std::size_t i = 0; i < lines.size(); ++i) {
+            ByteTable table;
+            for (std::size_t entry = 0; entry < table.size(); ++entry) {
+                table[entry] = static_cast<std::uint8_t>(entry);
+                for (const ToneLine& line : lines[i]) table[entry] = EntryOf(line, table[entry]);
+            }
+            tables[i].Set(table, table, table);
+            tones.push_back({&tables[i], i != 0, i % 2 == 0 ? 40 : -40, i != 0 ? &after : nullptr, lines[i]});
+            tones.push_back({&tables[i], false, 0, nullptr, lines[i]});
         }
-        tables[i].Set(table, table, table);
-        tones.push_back({&tables[i], i != 0, i % 2 == 0 ? 40 : -40, i != 0 ? &after : nullptr, lines[i]});
-        tones.push_back({&tables[i], false, 0, nullptr, lines[i]});
     }
-    for (const Tone& tone : tones) {
+    SomeTones(const SomeTones&) = delete;
+    SomeTones& operator=(const SomeTones&) = delete;
+
+    ChannelTables before, after, gentle, steep;
+    std::vector<Tone> tones;
+
+  private:
+    // Kinds of lines that kernels compute, and one that they do not. `tables` are what they make.
+    static constexpr ToneLine kUp = {200 << 8, 3000, 0, 8}, kCut = {60000, 0, 9000, 6},
+                              kSharp = {53248, 0, 10200, 7}, kOther = {60000, 2000, 0, 6};
+    const std::array<std::vector<ToneLine>, 7> lines = {
+        {{kUp}, {kCut}, {kUp, kCut}, {kSharp}, {kUp, kSharp}, {kOther}, {kCut, kUp}}};
+    std::array<ChannelTables, 7> tables;
+};
+
+TEST(Kernels, ToneIsThePlainOneOnEveryLevel) {
+    const auto some = std::make_unique<SomeTones>();
+    EXPECT_EQ(some->after.shuffles, ShuffleTable::Kind::kAny);
+    EXPECT_EQ(some->gentle.shuffles, ShuffleTable::Kind::kGentle);
+    EXPECT_EQ(some->steep.shuffles, ShuffleTable::Kind::kSteep);
+    for (const Tone& tone : some->tones) {
         ExpectEqualPixels([&](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
             kernels.tone(in, out, width, tone);
         });
@@ -331,6 +349,44 @@ TEST(Kernels, GlowsPixelsArePlainOnesOnEveryLevel) {
             if (!cells.empty()) std::memcpy(out, cells.data(), cells.size() * sizeof(std::uint16_t));
         },
         sizeof(Bgra), sizeof(Bgra));
+}
+
+// The layer between two rows of cells, screened in steps or, where the level can, in one with the tone.
+void ToneUnderGlow(const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone,
+                   CellsOf::Fill fill) {
+    constexpr std::int16_t kShare = 12288;
+    constexpr std::uint16_t kDither = 40000;
+    const std::int32_t cells = (width + 3) / 4;
+    CellsOf near(cells, fill, 1), far(cells, fill, 2), over(cells, fill, 3);
+    if (width == 0) return;
+    const CellRow row = over.Row(), last = row + (cells - 1) * kCellLanes;
+    if (kernels.glowedTone == nullptr) {
+        kernels.glow->approach(near.Row(), far.Row(), row, cells, kShare);
+        std::copy_n(row, kCellLanes, row - kCellLanes);
+        std::copy_n(last, kCellLanes, last + kCellLanes);
+        kernels.glow->screenFourfold(in, out, row, width, kDither);
+        return kernels.tone(out, out, width, tone);
+    }
+    std::vector<std::uint16_t> planes[3];
+    for (auto& plane : planes) plane.resize(static_cast<std::size_t>(cells + 1 + kPlanesRead), 0xFFFF);
+    std::uint16_t* const first[3] = {planes[0].data() + 1, planes[1].data() + 1, planes[2].data() + 1};
+    kernels.glowedTone->split(near.Row(), far.Row(), first, cells, kShare);
+    for (std::uint16_t* plane : first) {
+        plane[-1] = plane[0];
+        plane[cells] = plane[cells - 1];
+    }
+    kernels.glowedTone->tone(in, out, width, tone, {first[0], first[1], first[2], kDither});
+}
+
+TEST(Kernels, ToneUnderGlowIsOneAfterTheOther) {
+    const auto some = std::make_unique<SomeTones>();
+    const auto fills = {CellsOf::Fill::kRandom, CellsOf::Fill::kWhite, CellsOf::Fill::kEither};
+    for (std::size_t i = 0; i < some->tones.size(); ++i) {
+        const CellsOf::Fill fill = fills.begin()[i % fills.size()];
+        ExpectEqualPixels([&](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
+            ToneUnderGlow(kernels, in, out, width, some->tones[i], fill);
+        });
+    }
 }
 
 TEST(WearFactor, AddsWhatShadingDoes) {
