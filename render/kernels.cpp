@@ -104,10 +104,10 @@ void ChannelTables::Set(const ByteTable& b, const ByteTable& g, const ByteTable&
     greenShuffles.Set(g);
     redShuffles.Set(r);
     shuffles = std::max({blueShuffles.kind, greenShuffles.kind, redShuffles.kind});
-    for (std::size_t i = 0; i < 256; ++i) {
-        blueWord[i] = b[i];
-        greenWord[i] = std::uint32_t{g[i]} << 8;
-        redWord[i] = std::uint32_t{r[i]} << 16;
+    for (std::uint32_t i = 0; i < 256; ++i) {
+        blueWord[i] = i ^ b[i];
+        greenWord[i] = (i ^ g[i]) << 8;
+        redWord[i] = (i ^ r[i]) << 16;
     }
 }
 

@@ -49,7 +49,8 @@ struct ChannelTables {
     ShuffleTable greenShuffles;
     ShuffleTable redShuffles;
     ShuffleTable::Kind shuffles;  // the last of the three tables' kinds
-    // For lookups without byte shuffles: each entry at its channel's place in a pixel word.
+    // For lookups without byte shuffles: what each entry changes in a pixel word, by XOR, so that the other channels
+    // and alpha stay.
     std::array<std::uint32_t, 256> blueWord;
     std::array<std::uint32_t, 256> greenWord;
     std::array<std::uint32_t, 256> redWord;
