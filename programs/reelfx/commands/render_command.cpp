@@ -56,7 +56,7 @@ class RenderRun {
         if (m_writer) {
             m_writer->CheckFrameCount(frames);
             m_writer->Begin();
-            Tell(m_writer->Notes());
+            Report(m_writer->Notes());
         }
         Progress progress(frames, m_options.progress);
         RenderAll(progress);
@@ -64,13 +64,13 @@ class RenderRun {
         if (!m_reader.BreakOff().empty())
             FinishPart(m_reader.Name() + ": " + m_reader.BreakOff(), kExitInput);
         if (m_frames == 0) FailEmpty();
-        TellOfDamage();
+        ReportDamage();
         if (m_writer) {
             m_writer->Finish(m_endSeconds);
             m_place->Keep();
         }
         progress.End();
-        TellLate();
+        ReportLateNotes();
         return kExitDone;
     }
 
@@ -86,8 +86,8 @@ class RenderRun {
         m_endSeconds = section.EndSeconds();
     }
 
-    // Images are numbered as the frames are. Parts of a farm share a folder: each goes on where the one before it
-    // ends, with the frames that a constant rate repeats.
+    // Images have the numbers of their frames, plus 1. Parts of a farm share a folder: each continues where the previous
+    // one ends, counting the frames that a constant rate repeats.
     [[nodiscard]] std::int64_t FirstImage() const {
         if (!m_options.section.farm) return m_section.firstFrame + 1;
         const std::optional<FrameRate> fps = m_options.output->fps;
@@ -96,7 +96,11 @@ class RenderRun {
         std::int64_t images = 0;
         for (std::int64_t i = 0; i <= m_section.firstFrame; ++i) {
             const std::int64_t pts = m_section.frameTimes.pts[static_cast<std::size_t>(i)];
-            const FrameClock::Step step = clock.Take(m_reader.SecondsOf(pts));
+            // Frames of a raw stream have no times; they follow at its rate.
+            const double seconds = pts == AV_NOPTS_VALUE
+                                       ? static_cast<double>(i) / av_q2d(m_reader.FrameRateGuess())
+                                       : m_reader.SecondsOf(pts);
+            const FrameClock::Step step = clock.Take(seconds);
             for (std::int64_t written = step.repeats + (step.isLeftOut ? 0 : 1); written > 0; --written)
                 images = clock.TakePlace() + 1;
         }
@@ -104,20 +108,20 @@ class RenderRun {
     }
 
     // What is left out or changed on purpose, in one line.
-    void Tell(const std::vector<std::string>& notes) const {
+    void Report(const std::vector<std::string>& notes) const {
         std::string text;
         for (const std::string& note : notes) text += (text.empty() ? "" : "; ") + note;
         if (!text.empty()) std::fprintf(stderr, "reelfx: %s: %s\n", m_place->Name().c_str(), text.c_str());
     }
 
-    void TellLate() const {
+    void ReportLateNotes() const {
         std::vector<std::string> notes;
         if (m_writer) notes = m_writer->LateNotes();
         if (m_writer && !m_reader.OtherSize().empty()) {
             notes.push_back("the source changes to " + m_reader.OtherSize() +
                             ", and those frames are scaled to the first one's size");
         }
-        Tell(notes);
+        Report(notes);
     }
 
     [[nodiscard]] MediaWriter::Section SectionAt(const PipelineItem& first) const {
@@ -171,7 +175,7 @@ class RenderRun {
     }
 
     // One line that says what is wrong with the clip.
-    void TellOfDamage() const {
+    void ReportDamage() const {
         const double missing = m_reader.MissingSeconds();
         std::string what;
         if (m_reader.DamagedPackets() > 0) {

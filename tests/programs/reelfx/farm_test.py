@@ -93,6 +93,13 @@ class Parts(FarmTest):
         for image in whole.iterdir():
             self.assertEqual(image.read_bytes(), (self.root / image.name).read_bytes(), image.name)
 
+    def test_images_of_a_stream_without_times(self):
+        raw = self.root / "raw.h264"
+        ffmpeg("-i", clips.small, "-frames:v", "12", "-c:v", "libx264", raw)
+        for part in (1, 2, 3):
+            reelfx("render", raw, self.root / "r-%03d.png", "-e", "Film Camera", "--farm", f"{part}/3")
+        self.assertEqual(sorted(os.listdir(self.root)), [f"r-{n:03}.png" for n in range(1, 13)] + ["raw.h264"])
+
     def test_wrong_wishes(self):
         for code, word, options in (
                 (2, "N/M", ("--farm", "5/4")), (2, "N/M", ("--farm", "4")), (2, "41 frames", ("--farm", "1/42")),
