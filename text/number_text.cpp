@@ -16,6 +16,7 @@ std::optional<Number> ParseWhole(std::string_view text, Format... format) {
 }
 
 constexpr std::int64_t kLargestSide = 32768;
+constexpr double kLongestTime = 1e9;  // seconds; times in the ticks of any clip then fit 64 bits
 
 }  // namespace
 
@@ -72,6 +73,7 @@ std::optional<double> ParseTime(std::string_view text) {
         const auto value = ParseNumber(text.substr(0, colon));
         if (!value || *value < 0.0 || (!isLast && *value != std::floor(*value))) return std::nullopt;
         seconds = seconds * 60.0 + *value;
+        if (seconds > kLongestTime) return std::nullopt;
         if (isLast) return seconds;
         text.remove_prefix(colon + 1);
     }

@@ -44,7 +44,7 @@ TEST(NumberText, ReadsTimes) {
     EXPECT_EQ(ParseTime("1.5"), 1.5);
     EXPECT_EQ(ParseTime("1:30"), 90.0);
     EXPECT_EQ(ParseTime("01:00:02.25"), 3602.25);
-    for (const char* text : {"", "-1", "1.5:00", "1:2:3:4", "1:"}) EXPECT_FALSE(ParseTime(text)) << text;
+    for (const char* text : {"", "-1", "1.5:00", "1:2:3:4", "1:", "1e300"}) EXPECT_FALSE(ParseTime(text)) << text;
 }
 
 }  // namespace
