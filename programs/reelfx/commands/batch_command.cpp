@@ -49,7 +49,8 @@ class Batch {
             if (!fs::exists(out, ignored)) continue;
             for (const std::string& input : options.inputs) CheckIsNotInput(out, input);
         }
-        const EffectList effects(options.render.effects);  // what is wrong with these is said once
+        const EffectList effects(
+            options.render.effects);  // reports an error in these once, not for each clip
     }
 
     ExitCode Run() {
@@ -73,6 +74,8 @@ class Batch {
             Report(input, failure.what(), failure.Code());
         } catch (const UsageError& error) {
             Report(input, error.what(), kExitUsage);
+        } catch (const std::bad_alloc&) {
+            Report(input, "not enough memory", kExitInternal);
         } catch (const std::exception& error) {
             Report(input, error.what(), kExitInternal);
         }
@@ -95,7 +98,7 @@ class Batch {
         const bool isNamed = what.starts_with(input) || what.starts_with(BatchOutput(m_options, input));
         std::fprintf(stderr, "reelfx: %s%s%s\n", isNamed ? "" : input.c_str(), isNamed ? "" : ": ",
                      what.c_str());
-        // An interrupt ends the whole.
+        // An interrupt stops all clips.
         if (m_result == kExitDone || code == kExitInterrupted) m_result = code;
     }
 

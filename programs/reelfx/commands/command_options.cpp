@@ -46,16 +46,15 @@ void AddPresetOf(CLI::App& command, TypedOptions& typed) {
 void AddSettings(CLI::App& command, TypedOptions& typed) {
     AddOfEach(command, "--set,-s", typed.settings,
               "Set one parameter, overriding the preset; may be repeated. NAME=\"V@T V@T\" changes it evenly "
-              "from one "
-              "value to the next; T is a frame of the clip, counted from 0, or with an s a time of the clip "
-              "in seconds: "
-              "Wear=\"10@0 60@5s\"")
+              "from one value to the next; T is a frame of the clip, counted from 0, or a time in seconds, "
+              "followed by s: Wear=\"10@0 60@5s\"")
         .type_name("NAME=VALUE");
 }
 
 void AddMix(CLI::App& command, TypedOptions& typed) {
-    AddOfEach(command, "--mix", typed.mixes,
-              "How much of the effect is mixed into the picture, 0 to 100; may change over time as --set may")
+    AddOfEach(
+        command, "--mix", typed.mixes,
+        "How much of the effect is mixed into the picture, 0 to 100; may change over time, as with --set")
         .type_name("N")
         ->default_str("100");
 }
@@ -63,8 +62,7 @@ void AddMix(CLI::App& command, TypedOptions& typed) {
 void AddRandom(CLI::App& command, TypedOptions& typed) {
     AddOfEach(command, "--seed", typed.seeds,
               "Another seed gives other shake, flicker and damage; with 0, flicker and scratches are those "
-              "that the "
-              "effects have in Windows editors")
+              "of the effects in Windows editors")
         .type_name("N")
         ->default_str("0")
         ->envname("REELFX_SEED");
@@ -83,8 +81,8 @@ void AddEffectList(CLI::App& command, TypedOptions& typed) {
     AddRandom(command, typed);
     command.add_flag(
         "--then", typed.thens,
-        "Another effect follows, applied to the result of those before: -e A -p B --then -e C. Without a "
-        "--seed of its own it has that of the effect before");
+        "Apply another effect to the result so far: -e A -p B --then -e C. Without a --seed of its own it "
+        "uses that of the previous effect");
 }
 
 void AddRender(CLI::App& app, TypedOptions& typed) {
@@ -94,12 +92,12 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         .add_option("OUT", typed.outPath,
                     "File, image pattern, or - for standard output (YUV4MPEG2, or as --format says)")
         ->type_name("FILE");
-    render.add_option("MORE", typed.more, "With --into: further clips; OUT is one too")->type_name("FILE");
+    render.add_option("MORE", typed.more, "With --into: more clips; OUT is then a clip, too")
+        ->type_name("FILE");
     render
         .add_option("--into", typed.into,
-                    "Render each of the clips to a file of its name in this folder; --format chooses another "
-                    "container. "
-                    "A clip that fails does not stop the others")
+                    "Render each clip to a file of the same name in this folder; --format chooses another "
+                    "container. A clip that fails does not stop the others")
         ->type_name("FOLDER");
     AddEffectList(render, typed);
     render
@@ -109,20 +107,19 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
     render
         .add_option("--farm", typed.farm,
                     "Render part N of M parts of about the same length, without sound, for rendering one "
-                    "clip on many "
-                    "machines; reelfx-farm-join joins the parts")
+                    "clip on many machines; reelfx-farm-join joins the parts")
         ->type_name("N/M");
     render.add_option("--start", typed.start, "Start at this time of the clip")->type_name("TIME");
-    render.add_option("--duration", typed.duration, "Render only this long")->type_name("TIME");
+    render.add_option("--duration", typed.duration, "Length of the part to render")->type_name("TIME");
     render
         .add_option(
             "--depth", typed.depth,
-            "What the effects work in: 8 or 16 bits or float. Default: float for clips of more than 8 "
+            "Precision of the effects: 8 bits, 16 bits or float. Default: float for clips of more than 8 "
             "bits, else 8")
         ->type_name("auto|8|16|float")
         ->check(CLI::IsMember({"auto", "8", "16", "float"}))
         ->capture_default_str();
-    render.add_option("--threads,-j", typed.threads, "Frames rendered at once; 0: all processors")
+    render.add_option("--threads,-j", typed.threads, "Frames rendered at once; 0: one per processor")
         ->type_name("N")
         ->check(CLI::Range(0, 256))
         ->envname("REELFX_THREADS");
@@ -142,9 +139,10 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         "Write only the damage (wear, spots, scratches) on a transparent background, with straight alpha "
         "and without sound, for compositing in other programs");
     render.add_flag("--raw-bgra", typed.output.isRawBgra, "OUT is raw BGRA frames");
-    render.add_flag("--hash", typed.digests,
-                    "Print the MD5 of each frame as the effects leave it: BGRA in 8 bits, RGBA in others; "
-                    "OUT may be omitted");
+    render.add_flag(
+        "--hash", typed.digests,
+        "Print the MD5 of each frame as the effects leave it: BGRA at 8 bits, RGBA at other depths; "
+        "OUT may be omitted");
     render
         .add_option("--audio", typed.output.audio,
                     "Sound: auto copies it if OUT can hold it and encodes it otherwise; copy, none, or "
@@ -152,15 +150,14 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         ->type_name("auto|copy|none")
         ->capture_default_str();
     render.add_flag("--no-sound", typed.noSound,
-                    "Leave out sound, subtitles and all else beside the picture");
+                    "Leave out sound, subtitles and everything else but the picture");
     render
         .add_option("--fps", typed.fps,
                     "Constant frame rate of OUT; frames are repeated or left out. Default: the frames' own "
-                    "times where OUT "
-                    "can hold them")
+                    "times where OUT can hold them")
         ->type_name("FPS");
     render.add_flag("--upright", typed.output.isUpright,
-                    "Turn the pixels of a rotated clip, also where OUT can hold the rotation tag");
+                    "Turn the pixels of a rotated clip, even if OUT can hold the rotation tag");
     render.add_flag("--overwrite,-y", typed.overwrite, "Replace an existing OUT");
     render
         .add_option(
@@ -237,8 +234,7 @@ void AddPictures(CLI::App& app, TypedOptions& typed) {
         {.what = "Write successive frames through an effect side by side at 100 %, to judge motion",
          .out = "PNG or JPEG",
          .frame = "First frame, counted from 0; default: the frames in the middle of the clip, or the first "
-                  "ones of "
-                  "a pipe"});
+                  "ones of a pipe"});
     AddEffectList(strip, typed);
     strip.add_option("--frames", typed.stripFrames, "Number of frames; fewer if the clip ends earlier")
         ->type_name("N")
@@ -246,9 +242,9 @@ void AddPictures(CLI::App& app, TypedOptions& typed) {
         ->check(CLI::Range(1, 240));
     strip
         .add_option("--crop", typed.crop,
-                    "The part that each picture shows, in pixels from the left and the top; without +X+Y, in "
-                    "the middle. "
-                    "Default: the middle, 540 pixels high and wide enough for a row of 1920 pixels")
+                    "Part of the frame that each picture shows: its size, and its distance from the left and "
+                    "top, in pixels; without +X+Y, the middle. Default: the middle, 540 pixels high and wide "
+                    "enough for a row of 1920 pixels")
         ->type_name("WxH+X+Y");
     AddColumns(strip, typed, "Pictures per row; default: all");
 }
@@ -306,7 +302,7 @@ void AddCommands(CLI::App& app, TypedOptions& typed) {
     AddPreset(app, typed);
     AddInfo(app, typed);
     app.add_subcommand("studio", "Open the effects as a page in the browser")
-        ->add_flag("--path", typed.studio.isPathOnly, "Print where the page lies instead");
+        ->add_flag("--path", typed.studio.isPathOnly, "Print the path of the page instead");
 }
 
 }  // namespace velmora::hosts

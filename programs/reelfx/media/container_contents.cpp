@@ -8,7 +8,7 @@
 namespace velmora::hosts {
 namespace {
 
-// Formats whose writers take any codec, also those that no player finds again.
+// Formats whose writers accept any codec, even those that no player supports.
 struct ContentsRow {
     const char* format;
     std::initializer_list<AVCodecID> codecs;

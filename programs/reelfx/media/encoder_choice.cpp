@@ -151,7 +151,7 @@ const AVCodec& AskedCodec(const std::string& name, const AVOutputFormat& contain
     return *codec;
 }
 
-// Effects colour grey pictures too, and grey has the depth of its counterpart in colour.
+// Effects add colour to grey pictures, so grey becomes a colour format of the same depth.
 AVPixelFormat InColour(AVPixelFormat format, bool isFilm) {
     const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
     if (!descriptor || descriptor->nb_components > 2 || (descriptor->flags & AV_PIX_FMT_FLAG_PAL) != 0)
@@ -225,7 +225,7 @@ const AVOutputFormat& ChooseContainer(const OutputOptions& options) {
         throw Failure(kExitUsage,
                       options.path + ": unknown file name extension; choose the format with --format");
     }
-    // Formats of sound hold a picture as their cover.
+    // Audio formats take a picture as cover art.
     const bool isSound = format->mime_type && std::string(format->mime_type).starts_with("audio/");
     if (format->video_codec == AV_CODEC_ID_NONE || isSound) {
         throw Failure(kExitUsage, options.path + ": the format " + format->name + " cannot hold video");
@@ -295,7 +295,7 @@ AVPixelFormat ChoosePixelFormat(const OutputOptions& options, const AVCodec& cod
 
 void SetQuality(const OutputOptions& options, const AVCodec& codec, AVCodecContext& encoder) {
     encoder.thread_count = kEncoderThreads;
-    // These encoders write to standard error by themselves.
+    // This encoder writes to standard error.
     if (std::string(codec.name) == "libsvtav1") setenv("SVT_LOG", "1", 0);
     // Pictures that are never shown carry no transparency.
     if (codec.id == AV_CODEC_ID_VP8 && CarriesAlpha(encoder.pix_fmt)) {

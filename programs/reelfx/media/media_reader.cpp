@@ -26,8 +26,8 @@ constexpr double kReorderedSeconds = 5.0;
 // More frames without times than a decoder holds back have none at all.
 constexpr std::size_t kMostUntimed = 64;
 
-// Pixels that the rest of the program has no use for become others: colours of a palette are written out, and grey
-// without a tag is full range, as players take it.
+// Converts what the rest of the program does not handle: palettes become RGB, and untagged grey counts as full range,
+// as in players.
 FramePtr Plain(FramePtr frame) {
     const auto format = static_cast<AVPixelFormat>(frame->format);
     const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(format);
@@ -161,8 +161,9 @@ FrameTimes MediaReader::TimesOf(const InputOptions& options, std::optional<std::
     const auto ticks =
         static_cast<std::int64_t>((seconds + kReorderedSeconds) / av_q2d(reader.m_stream->time_base));
     const auto isEnough = [&] {
-        return frames && times.pts.size() > static_cast<std::size_t>(*frames) + kReorderedFrames &&
-               times.pts.back() - times.pts.front() > ticks;
+        if (!frames || times.pts.size() <= static_cast<std::size_t>(*frames) + kReorderedFrames) return false;
+        const std::int64_t first = times.pts.front(), last = times.pts.back();
+        return first != AV_NOPTS_VALUE && last != AV_NOPTS_VALUE && last - first > ticks;
     };
     const PacketPtr packet = NewPacket();
     for (; av_read_frame(&container, packet.get()) >= 0; av_packet_unref(packet.get())) {

@@ -42,7 +42,7 @@ const AVCodec& AskedSoundCodec(const std::string& name, const AVOutputFormat& fo
         throw Failure(kExitUsage, "--audio takes auto, copy, none or an audio codec, not \"" + name + '"');
     if (!CanHold(format, codec->id))
         throw Failure(kExitUsage,
-                      std::string("the format ") + format.name + " cannot hold sound as " + codec->name);
+                      std::string("the format ") + format.name + " cannot hold " + codec->name + " sound");
     return *codec;
 }
 
@@ -94,9 +94,8 @@ void OtherStreams::AddSound(const AVStream& source) {
     const bool canCopy = CanCopy(source);
     const std::string from = avcodec_get_name(source.codecpar->codec_id);
     if (m_audio == "copy" && !canCopy) {
-        throw Failure(kExitUsage, std::string("the format ") + m_container.oformat->name +
-                                      " cannot hold sound as " + from +
-                                      "; leave out --audio copy to encode it");
+        throw Failure(kExitUsage, std::string("the format ") + m_container.oformat->name + " cannot hold " +
+                                      from + " sound; leave out --audio copy to encode it");
     }
     Stream stream;
     if (m_audio == "auto" ? !canCopy : m_audio != "copy") {

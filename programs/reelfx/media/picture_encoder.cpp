@@ -203,7 +203,7 @@ void PictureEncoder::NoteLosses(const AVOutputFormat& container) {
 void PictureEncoder::Describe(AVStream& stream) const {
     const AVStream& from = m_source.Picture();
     avcodec_parameters_from_context(stream.codecpar, m_encoder.get());
-    // Players of this family know HEVC with its headers in the container only by this tag.
+    // Players of this family recognise HEVC with its headers in the container only by this tag.
     if (m_isMovFamily && m_encoder->codec_id == AV_CODEC_ID_HEVC)
         stream.codecpar->codec_tag = MKTAG('h', 'v', 'c', '1');
     stream.time_base = m_encoder->time_base;

@@ -17,7 +17,7 @@ bool IsText(AVCodecID codec) {
 
 [[noreturn]] void FailToConvert() {
     throw Failure(kExitOutput,
-                  "subtitles cannot be converted; use --no-sound to leave out what is beside the picture");
+                  "subtitles cannot be converted; use --no-sound to leave out everything but the picture");
 }
 
 }  // namespace
@@ -59,7 +59,7 @@ void SubtitleConverter::Send(const AVPacket& packet, const Sink& sink) {
     const int error = avcodec_decode_subtitle2(m_decoder.get(), &subtitle, &isWhole, copy.get());
     if (error < 0 || isWhole == 0) return;  // a damaged line is left out
     const std::unique_ptr<AVSubtitle, void (*)(AVSubtitle*)> owner(&subtitle, avsubtitle_free);
-    if (subtitle.num_rects == 0) return;
+    if (subtitle.num_rects == 0 || packet.pts == AV_NOPTS_VALUE) return;
     const std::int64_t length =
         subtitle.end_display_time != UINT32_MAX && subtitle.end_display_time > subtitle.start_display_time
             ? subtitle.end_display_time - subtitle.start_display_time
