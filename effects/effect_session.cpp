@@ -107,7 +107,8 @@ bool EffectSession::RenderDeep(const render::DeepFrame& frame, double seconds) n
     if (m_isPinned) m_state.random.Pin(m_seed, render::TruncateTolerant(seconds * render::kFramesPerSecond));
     MasterHost host(m_effect, m_values);
     const std::uint32_t hostSeed = m_isPinned ? m_seed : 0;
-    return RenderDeepFrame({&m_settings, &m_state, m_options, hostSeed}, m_deep, host, frame, seconds);
+    return RenderDeepFrame({&m_settings, &m_state, m_options, hostSeed, m_arrangement}, m_deep, host, frame,
+                           seconds);
 }
 
 bool EffectSession::IsNeutral() noexcept {

@@ -31,6 +31,7 @@ bool RenderDeepFrame(const RenderSession& session, render::DeepMemory& memory, I
     session.settings->ReadFromHost(host);
     render::StageSettings settings = ReadStageSettings(*session.settings);
     settings.hostSeed = session.hostSeed;
+    settings.arrangement = session.arrangement;
     return render::RenderDeep(frame, context, settings, *session.state, memory, session.options);
 }
 
