@@ -11,8 +11,7 @@
 #include "api/host_api.h"
 #include "effects/master_settings.h"
 #include "effects/render_options.h"
-#include "render/deep/deep_frame.h"
-#include "render/deep/deep_memory.h"
+#include "render/deep/deep_renderer.h"
 #include "render/render_state.h"
 #include "render/stage_settings.h"
 
@@ -65,8 +64,10 @@ class EffectSession {
     // there is not enough memory.
     [[nodiscard]] bool RenderDeep(const render::DeepFrame& frame, double seconds) noexcept;
 
-  private:
+    // What the stages get from the current values, without seed and arrangement.
     [[nodiscard]] render::StageSettings PresentSettings() noexcept;
+
+  private:
     explicit EffectSession(const EffectTable& effect) noexcept;
 
     const EffectTable& m_effect;

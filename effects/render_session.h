@@ -7,8 +7,7 @@
 
 #include "api/host_api.h"
 #include "effects/master_settings.h"
-#include "render/deep/deep_frame.h"
-#include "render/deep/deep_memory.h"
+#include "render/deep/deep_renderer.h"
 #include "render/image.h"
 #include "render/render_state.h"
 #include "render/renderer.h"

@@ -36,7 +36,7 @@ class DeepLayerMaker {
         while (ReducedSize(height, m_reduction) > kMostGlowRows) ++m_reduction;
     }
 
-    [[nodiscard]] bool Allocate(DeepGlowMemory& memory) noexcept;
+    [[nodiscard]] bool Allocate(GrowingMemory<float>& memory) noexcept;
     [[nodiscard]] DeepGlow Make() noexcept;
 
   private:
@@ -65,7 +65,7 @@ class DeepLayerMaker {
     DeepCells m_rows;                    // two rows as wide as the widest
 };
 
-bool DeepLayerMaker::Allocate(DeepGlowMemory& memory) noexcept {
+bool DeepLayerMaker::Allocate(GrowingMemory<float>& memory) noexcept {
     std::int32_t width = ReducedSize(m_width, m_reduction), height = ReducedSize(m_height, m_reduction);
     std::uint64_t size = 0;
     const auto plan = [&size](DeepCells& cells, std::int32_t w, std::int32_t h) {
@@ -285,7 +285,7 @@ void DeepGlow::Screen(DeepBlock& block, std::int32_t from, std::int32_t count) c
 }
 
 DeepGlow PrepareDeepGlow(float amount, const DeepBlockReader& input, std::int32_t width, std::int32_t height,
-                         DeepGlowMemory& memory, const DeepGlowKernels& kernels) noexcept {
+                         GrowingMemory<float>& memory, const DeepGlowKernels& kernels) noexcept {
     if (!(amount > 0.0f) || width < 1 || height < 1) return {};
     DeepLayerMaker maker(std::min<double>(amount, 1.0), input, width, height, kernels);
     if (!maker.Allocate(memory)) return {};

@@ -5,21 +5,23 @@
 
 #include <cstdint>
 
-#include "render/deep/deep_block.h"
 #include "render/deep/deep_kernels.h"
-#include "render/deep/deep_memory.h"
+#include "render/growing_memory.h"
 
 namespace velmora::render {
 
 // Rows of cells, three channels after each other in each row, with padding at both ends of each channel.
 struct DeepCells {
-    static constexpr std::int32_t kPad = 24;
+    static constexpr std::int32_t kPad = 48;  // kernels read and write whole vectors
 
     float* base = nullptr;
     std::int32_t width = 0;
     std::int32_t height = 0;
 
-    [[nodiscard]] std::ptrdiff_t ChannelStep() const noexcept { return std::ptrdiff_t{width} + 2 * kPad; }
+    [[nodiscard]] std::ptrdiff_t ChannelStep() const noexcept {
+        constexpr std::ptrdiff_t kLine = 16;  // of the caches, in numbers
+        return (std::ptrdiff_t{width} + kLine - 1) / kLine * kLine + 2 * kPad;
+    }
     [[nodiscard]] std::uint64_t Size() const noexcept {
         return static_cast<std::uint64_t>(ChannelStep()) * 3 * static_cast<std::uint64_t>(height);
     }
@@ -66,7 +68,7 @@ class DeepGlow {
 // Makes the layer of a picture for an amount in 0..1; inactive if there is nothing to do or not enough memory. It points
 // into `memory` and is valid until the memory is used again.
 [[nodiscard]] DeepGlow PrepareDeepGlow(float amount, const DeepBlockReader& input, std::int32_t width,
-                                       std::int32_t height, DeepGlowMemory& memory,
+                                       std::int32_t height, GrowingMemory<float>& memory,
                                        const DeepGlowKernels& kernels) noexcept;
 
 }  // namespace velmora::render

@@ -17,6 +17,9 @@ namespace {
 const DeepKernels kDeepPlainKernels = kKernels;
 
 const DeepKernels& DeepKernelsOf([[maybe_unused]] SimdLevel level) noexcept {
+#if VM_HAS_AVX512
+    if (level >= SimdLevel::kAvx512) return kDeepAvx512Kernels;
+#endif
 #if VM_HAS_AVX2
     if (level >= SimdLevel::kAvx2) return kDeepAvx2Kernels;
 #endif

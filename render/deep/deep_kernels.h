@@ -1,16 +1,30 @@
 // The row operations of deep pictures. There is one source (deep_kernels.inc), compiled with the vectors of each SIMD
 // level; all levels do the same arithmetic in the same order and so give the same bytes.
 //
-// Blocks and rows of floats are written up to the end of a vector, at most 7 numbers (14 when doubled) beyond the last.
+// Blocks and rows of floats are written up to the end of a vector, at most 15 numbers (30 when doubled) beyond the last.
 #pragma once
 
 #include <cstdint>
 
-#include "render/deep/deep_block.h"
 #include "render/deep/deep_tone.h"
 #include "render/simd/level.h"
 
 namespace velmora::render {
+
+// A part of a row on its way through the stages: one plane of floats for each channel, small enough for the
+// first-level cache. Colours are 0 for black and 1 for white, not multiplied by alpha, and may be outside. Never NaN or
+// infinite.
+inline constexpr std::int32_t kDeepBlock = 512;  // pixels; a multiple of the glow's cells
+struct DeepBlock {
+    static constexpr std::int32_t kPad = 16;  // kernels may write whole vectors
+
+    alignas(64) float red[kDeepBlock + kPad];
+    alignas(64) float green[kDeepBlock + kPad];
+    alignas(64) float blue[kDeepBlock + kPad];
+    alignas(64) float alpha[kDeepBlock + kPad];
+    // All colours are known to be within 0..1, which saves work. What the stages make of a pixel does not depend on it.
+    bool isInside = true;
+};
 
 // Weights of a symmetric filter: the middle and the pairs around it, from the middle outward.
 struct DeepTaps {
@@ -43,7 +57,8 @@ struct DeepGlowKernels {
 };
 
 struct DeepKernels {
-    // Between pixels and the planes of a block from place `at` on, by DeepSamples and by channels - 3.
+    // Between pixels and the planes of a block from place `at` on, by DeepSamples and by channels - 3. Loading what is
+    // not within 0..1 takes back `isInside`.
     void (*load[2][2])(const void* pixels, DeepBlock& block, std::int32_t at, std::int32_t count) noexcept;
     void (*store[2][2])(const DeepBlock& block, std::int32_t at, void* pixels, std::int32_t count) noexcept;
     // Stores the first pixels of a block as four floats at a multiple of 16 bytes, bypassing the caches if the level can.
@@ -70,5 +85,6 @@ struct DeepKernels {
 extern const DeepKernels kDeepPlainKernels;
 extern const DeepKernels kDeepSse2Kernels;
 extern const DeepKernels kDeepAvx2Kernels;
+extern const DeepKernels kDeepAvx512Kernels;
 
 }  // namespace velmora::render

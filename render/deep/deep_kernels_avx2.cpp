@@ -1,4 +1,4 @@
-// The deep kernels with AVX2. Longer vectors would not speed them up: they wait for memory.
+// The deep kernels with AVX2.
 
 #include "render/deep/deep_kernels.h"
 

@@ -52,6 +52,7 @@ void ChangePixel(DeepBlock& block, std::int32_t x, Change&& change) noexcept {
 
 void DeepSource::Read(std::int32_t y, std::int32_t from, std::int32_t count,
                       DeepBlock& block) const noexcept {
+    block.isInside = true;
     const DeepFormat& format = m_frame.format;
     const std::int32_t row = y - m_jitter.Dy();
     // The columns of the block that the source has.
@@ -167,7 +168,7 @@ void DeepRowProgram::RunScratches(Row& row) const noexcept {
         const std::int32_t skipped = row.from + start - span.first;
         const std::int32_t count = std::min(line.pixels - skipped, row.count - start);
         if (count <= 0) continue;
-        float shares[kMostScratchPixels + 8] = {};
+        float shares[kMostScratchPixels + DeepBlock::kPad] = {};
         const float strength = static_cast<float>(span.strength) * (1.0f / 4294967296.0f);
         for (std::int32_t i = 0; i < count; ++i)
             shares[i] = static_cast<float>(span.weights[skipped + i]) * strength;

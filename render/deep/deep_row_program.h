@@ -7,7 +7,7 @@
 #include <cstdint>
 
 #include "render/chain.h"
-#include "render/deep/deep_frame.h"
+#include "render/deep/deep_renderer.h"
 #include "render/deep/deep_glow.h"
 #include "render/deep/deep_kernels.h"
 #include "render/deep/deep_tone.h"

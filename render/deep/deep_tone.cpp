@@ -22,8 +22,12 @@ DeepTone::Line LineOf(const ColourStage& colour) noexcept {
     const double truncated = colour.Gain() ? kHalfLevel : 0.0;
     const double plus = gain * (std::max(offset, 0.0) - 0.5) + 0.5 - truncated;
     const bool isClamped = gain > 1.0;
-    return {static_cast<float>(times), static_cast<float>(plus), isClamped ? 0.0f : -kNoBound,
-            isClamped ? 1.0f : kNoBound};
+    DeepTone::Line line = {static_cast<float>(times), static_cast<float>(plus), isClamped ? 0.0f : -kNoBound,
+                           isClamped ? 1.0f : kNoBound, false};
+    // White stays white to the last bit, so that what follows finds it inside.
+    if (!colour.Gain() && offset > 0.0) line.times = 1.0f - line.plus;
+    line.staysInside = line.plus >= 0.0f && line.times + line.plus <= 1.0f;
+    return line;
 }
 
 DeepTone::Mix MixOf(std::int32_t weight) noexcept {

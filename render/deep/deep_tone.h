@@ -15,8 +15,8 @@
 // What the settings narrow (w and o are whole numbers) stays narrowed for the same reason.
 //
 // Below 0 and above 1 brightness and contrast continue as lines, except that a clamped contrast stays at black and
-// white. The saturation's bounds widen to the range of the pixel's own channels, so that bright greys stay greys. Gamma
-// and tint continue, as one stage, with their slopes at 0 and 1; a tint that crushes blacks stays at black.
+// white. What a channel is beyond 0 or 1 passes the saturation's shares without the clamp. Gamma and tint continue, as
+// one stage, with their slopes at 0 and 1; a tint that crushes blacks stays at black.
 #pragma once
 
 #include "render/colour.h"
@@ -28,6 +28,9 @@ struct DeepTone {
     // Brightness, flicker and contrast in one line: clamp(times x + plus, least, most).
     struct Line {
         float times, plus, least, most;
+        bool staysInside;  // takes 0..1 into 0..1
+
+        [[nodiscard]] bool IsClamped() const noexcept { return least == 0.0f; }
     };
     // The saturation's shares.
     struct Mix {

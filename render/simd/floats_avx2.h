@@ -14,6 +14,15 @@ inline Floats WherePositive(Floats sign, Floats x) noexcept {
     return _mm256_and_ps(_mm256_cmp_ps(sign, _mm256_setzero_ps(), _CMP_GT_OQ), x);
 }
 
+inline constexpr std::int32_t kBitsOf1 = 0x3F800000;
+using Marks = __m256i;
+inline Marks NoMarks() noexcept { return _mm256_setzero_si256(); }
+inline Marks Marked(Marks marks, Floats x) noexcept {
+    const __m256i bits = _mm256_castps_si256(x);
+    return _mm256_or_si256(marks, _mm256_or_si256(bits, _mm256_sub_epi32(_mm256_set1_epi32(kBitsOf1), bits)));
+}
+inline bool AreMarked(Marks marks) noexcept { return _mm256_movemask_ps(_mm256_castsi256_ps(marks)) != 0; }
+
 // The 64-bit halves of both blocks, in the order 0 2 1 3.
 inline Floats InOrder(Floats x) noexcept {
     return _mm256_castpd_ps(_mm256_permute4x64_pd(_mm256_castps_pd(x), _MM_SHUFFLE(3, 1, 2, 0)));

@@ -16,6 +16,18 @@ inline Floats NumberOr0(Floats x) noexcept { return x == x ? x : 0.0f; }
 // x where `sign` is above 0, else 0.
 inline Floats WherePositive(Floats sign, Floats x) noexcept { return sign > 0.0f ? x : 0.0f; }
 
+// Numbers from 0 to 1 have the bits of whole numbers from 0 to kBitsOf1; those of all others are larger, or negative as
+// whole numbers. A mark is negative from the first such number on.
+inline constexpr std::uint32_t kBitsOf1 = 0x3F800000;
+using Marks = std::uint32_t;
+inline Marks NoMarks() noexcept { return 0; }
+inline Marks Marked(Marks marks, Floats x) noexcept {
+    std::uint32_t bits;
+    __builtin_memcpy(&bits, &x, sizeof bits);
+    return marks | bits | (kBitsOf1 - bits);
+}
+inline bool AreMarked(Marks marks) noexcept { return marks >> 31 != 0; }
+
 // Of the numbers of a, then of b: those with even places, those with odd places, and the two in turn.
 inline Floats Evens(Floats a, Floats) noexcept { return a; }
 inline Floats Odds(Floats, Floats b) noexcept { return b; }

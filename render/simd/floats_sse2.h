@@ -14,6 +14,15 @@ inline Floats WherePositive(Floats sign, Floats x) noexcept {
     return _mm_and_ps(_mm_cmpgt_ps(sign, _mm_setzero_ps()), x);
 }
 
+inline constexpr std::int32_t kBitsOf1 = 0x3F800000;
+using Marks = __m128i;
+inline Marks NoMarks() noexcept { return _mm_setzero_si128(); }
+inline Marks Marked(Marks marks, Floats x) noexcept {
+    const __m128i bits = _mm_castps_si128(x);
+    return _mm_or_si128(marks, _mm_or_si128(bits, _mm_sub_epi32(_mm_set1_epi32(kBitsOf1), bits)));
+}
+inline bool AreMarked(Marks marks) noexcept { return _mm_movemask_ps(_mm_castsi128_ps(marks)) != 0; }
+
 inline Floats Evens(Floats a, Floats b) noexcept { return _mm_shuffle_ps(a, b, _MM_SHUFFLE(2, 0, 2, 0)); }
 inline Floats Odds(Floats a, Floats b) noexcept { return _mm_shuffle_ps(a, b, _MM_SHUFFLE(3, 1, 3, 1)); }
 inline void StoreInTurn(float* to, Floats a, Floats b) noexcept {

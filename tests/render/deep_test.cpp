@@ -4,16 +4,39 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <atomic>
 #include <cmath>
+#include <cstdlib>
 #include <cstring>
 #include <limits>
+#include <new>
 #include <numbers>
 #include <random>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "render/deep/deep_renderer.h"
 #include "tests/render/plain_picture.h"
+
+namespace {
+std::atomic<std::size_t> allocations;
+}
+
+void* operator new[](std::size_t size, const std::nothrow_t&) noexcept {
+    ++allocations;
+    return std::malloc(size);
+}
+void* operator new[](std::size_t size) {
+    if (void* memory = operator new[](size, std::nothrow)) return memory;
+    throw std::bad_alloc();
+}
+void operator delete[](void* memory) noexcept {
+    std::free(memory);
+}
+void operator delete[](void* memory, std::size_t) noexcept {
+    std::free(memory);
+}
 
 namespace velmora::render {
 namespace {
@@ -107,6 +130,35 @@ TEST(DeepLevels, GiveTheSameBytes) {
             }
         }
     }
+}
+
+// Any number of workers, each with memory of its own, gives the same frames.
+TEST(DeepFrame, CanBeRenderedByManyThreads) {
+    const Deep source = Noise(333, 210, {});
+    const Deep alone = Rendered(source, Everything());
+    std::vector<Deep> results(6, source);
+    std::vector<std::thread> workers;
+    for (Deep& result : results)
+        workers.emplace_back([&source, &result] { result = Rendered(source, Everything()); });
+    for (std::thread& worker : workers) worker.join();
+    for (const Deep& result : results) EXPECT_TRUE(result == alone);
+}
+
+TEST(DeepFrame, AllocatesOnlyForTheFirst) {
+    Deep source = Noise(400, 700, {}), result = source;
+    RenderState state;
+    DeepMemory memory;
+    FrameContext context(400, 700);
+    std::size_t before = 0;
+    for (int frame = 0; frame < 40; ++frame) {
+        context.SetTime(frame / 30.0);
+        state.random.BeginFrame(context.FrameNumber());
+        ASSERT_TRUE(RenderDeep(DeepFrame::Whole(400, 700, {}, result.Picture(), result.Picture()), context,
+                               Everything(), state, memory));
+        if (frame == 0) before = allocations;
+    }
+    EXPECT_GT(before, 0u);
+    EXPECT_EQ(allocations, before);
 }
 
 // Tiles, bottom-up rows and work in place give the bytes of the whole frame.
@@ -312,6 +364,46 @@ TEST(DeepLook, ContinuesInLinesOutside) {
     StageSettings clamped;
     clamped.contrast = 0.8f;
     EXPECT_EQ(Greys({-1.0f, 0.0f, 1.0f, 4.0f}, clamped), (std::vector<float>{0.0f, 0.0f, 1.0f, 1.0f}));
+}
+
+// A colour whose red goes beyond white through a saturation, and flat light through a full glow layer.
+TEST(DeepLook, ContinuesInLinesAboveWhite) {
+    StageSettings saturated;
+    for (const float saturation : {-0.7f, 0.8f}) {
+        saturated.saturation = saturation;
+        Deep colours(6, 1, {DeepSamples::kFloat, 3, false});
+        const float reds[] = {0.99999f, 1.0f, 1.00001f, 2.0f, 3.0f, 4.0f};
+        for (std::size_t i = 0; i < 18; ++i) colours.samples[i] = i % 3 == 0 ? reds[i / 3] : 0.4f;
+        const std::vector<float> y = Rendered(colours, saturated).samples;
+        for (std::size_t c = 0; c < 3; ++c) {
+            EXPECT_NEAR(y[3 * 5 + c] - y[3 * 4 + c], y[3 * 4 + c] - y[3 * 3 + c], 1e-6) << c;
+            EXPECT_NEAR(y[c], y[3 * 2 + c], 1e-4) << c;
+        }
+        EXPECT_GT(y[3 * 4], y[3 * 3]);
+    }
+    StageSettings misty;
+    misty.glow = 1.0f;
+    const auto flat = [&misty](float grey) { return Greys(std::vector<float>(9, grey), misty)[4]; };
+    EXPECT_EQ(flat(1.0f), 1.0f);
+    EXPECT_NEAR(flat(3.0f) - flat(2.0f), flat(2.0f) - flat(1.0f), 1e-6);
+    EXPECT_GT(flat(2.0f), 1.2f);
+    EXPECT_LT(flat(-1.0f), 0.0f);
+}
+
+// Whether a block has a pixel outside 0..1 makes no difference to the pixels inside.
+TEST(DeepLook, DoesNotDependOnTheNeighbours) {
+    std::mt19937 numbers(4);
+    for (int round = 0; round < 40; ++round) {
+        StageSettings settings = RandomLook(numbers);
+        settings.tintBlue = 0.7f;
+        std::vector<float> greys;
+        for (int i = 0; i < 300; ++i) greys.push_back(static_cast<float>(numbers() % 1001) / 1000.0f);
+        std::vector<float> outside = greys;
+        outside[7] = 1.5f;
+        outside[8] = kNotANumber;
+        const std::vector<float> a = Greys(greys, settings), b = Greys(outside, settings);
+        for (std::size_t i = 9; i < a.size(); ++i) ASSERT_EQ(a[i], b[i]) << round << ' ' << i;
+    }
 }
 
 TEST(DeepDamage, StopsAtWhiteAndKeepsAlpha) {

@@ -8,7 +8,7 @@
 
 #include "api/host_api.h"
 #include "programs/reelfx/conversion/picture_view.h"
-#include "render/deep/deep_frame.h"
+#include "render/deep/deep_renderer.h"
 
 namespace velmora::hosts {
 
