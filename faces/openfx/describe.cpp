@@ -1,9 +1,7 @@
-#include "faces/openfx/describe.h"
-
 #include <string>
 
+#include "faces/openfx/actions.h"
 #include "faces/openfx/plugin_params.h"
-#include "faces/openfx/plugin_texts.h"
 #include "platform/platform.h"
 
 namespace velmora::hosts::openfx {

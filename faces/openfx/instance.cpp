@@ -7,7 +7,7 @@
 #include <string_view>
 
 #include "effects/effect_queries.h"
-#include "faces/openfx/describe.h"
+#include "faces/openfx/actions.h"
 #include "platform/platform.h"
 #include "text/number_text.h"
 

@@ -10,9 +10,8 @@
 #include <utility>
 
 #include "api/host_api.h"
-#include "faces/openfx/describe.h"
+#include "faces/openfx/actions.h"
 #include "faces/openfx/instance.h"
-#include "faces/openfx/render.h"
 
 #ifdef _WIN32
 #define VELMORA_EXPORT

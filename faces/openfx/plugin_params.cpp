@@ -6,7 +6,6 @@
 
 #include "effects/effect_names.h"
 #include "faces/openfx/ofx_api.h"
-#include "faces/openfx/plugin_texts.h"
 #include "text/names.h"
 
 namespace velmora::hosts::openfx {

@@ -16,6 +16,7 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "effects/effect_table.h"
@@ -57,6 +58,13 @@ struct PluginParam {
 
 // Groups stand before their members.
 [[nodiscard]] std::vector<PluginParam> DescribeParams(const effects::EffectTable& effect);
+
+// What the effect's parameter of that title does: one or two sentences, the same as on the help page. This and the next
+// are in a file that write_texts.py makes from the help pages and the language file.
+[[nodiscard]] std::string HintOf(std::string_view effect, std::string_view title);
+
+// The label of a parameter, group or menu item in a language (two letters); in English where there is none.
+[[nodiscard]] std::string LabelOf(std::string_view language, std::string_view english);
 
 // A slider's value between the table's stored format and the shown one. Stored values survive the way there and back.
 [[nodiscard]] double ShownSlider(const effects::ParamRow& slider, ValueWord stored);

@@ -1,12 +1,10 @@
-#include "faces/openfx/render.h"
-
 #include <algorithm>
 #include <cstring>
 #include <limits>
 #include <optional>
 #include <string>
 
-#include "faces/openfx/describe.h"
+#include "faces/openfx/actions.h"
 #include "faces/openfx/host_image.h"
 #include "faces/openfx/pixel_rows.h"
 #include "platform/float_guard.h"

@@ -47,7 +47,7 @@ def quoted(words):
 
 
 def main(folder, languages, output):
-    lines = ['#include "faces/openfx/plugin_texts.h"', "", "namespace velmora::hosts::openfx {", "namespace {", "",
+    lines = ['#include "faces/openfx/plugin_params.h"', "", "namespace velmora::hosts::openfx {", "namespace {", "",
              "struct Hint {", "    std::string_view effect, title, text;", "};", "constexpr Hint kHints[] = {"]
     for effect in EFFECTS:
         page = Path(folder, effect.lower().replace(" ", "-") + ".html").read_text(encoding="utf-8")
