@@ -112,21 +112,25 @@ bool EffectSession::RenderDeep(const render::DeepFrame& frame, double seconds) n
 }
 
 bool EffectSession::IsNeutral() noexcept {
-    const FloatGuard guard;
-    MasterHost host(m_effect, m_values);
-    m_settings.ReadFromHost(host);
-    return LeavesPicturesAlone(ReadStageSettings(m_settings));
+    return LeavesPicturesAlone(PresentSettings());
 }
 
-bool EffectSession::Render(const FrameRecord& source, const FrameRecord& destination,
-                           double seconds) noexcept {
+bool EffectSession::NeedsWholePicture() noexcept {
+    const render::StageSettings settings = PresentSettings();
+    return settings.glow > 0.0f || settings.xJitter != 0 || settings.yJitter != 0;
+}
+
+bool EffectSession::Render(const FrameRecord& source, const FrameRecord& destination, double seconds,
+                           const render::RowRange& rows) noexcept {
     const FloatGuard guard;
     if (m_isPinned) m_state.random.Pin(m_seed, render::TruncateTolerant(seconds * render::kFramesPerSecond));
     MasterHost host(m_effect, m_values);
     const TimingRecord timing = {0.0, 0.0, seconds};
     const std::uint32_t hostSeed = m_isPinned ? m_seed : 0;
-    return RenderFrame({&m_settings, &m_state, m_options, hostSeed, m_arrangement}, host, &source,
-                       &destination, &timing);
+    render::RenderOptions options = m_options;
+    options.rows = rows;
+    return RenderFrame({&m_settings, &m_state, options, hostSeed, m_arrangement}, host, &source, &destination,
+                       &timing);
 }
 
 }  // namespace velmora::effects

@@ -47,18 +47,22 @@ class EffectSession {
     // From now on scratches keep the places and flicker the rhythm that the present values give them, while values
     // change from frame to frame. There are at most as many scratches as now, unless a frame has more, which moves all.
     void KeepArrangement() noexcept;
+    // From now on they follow the values again.
+    void ReleaseArrangement() noexcept { m_arrangement.reset(); }
 
     // Whether the current values leave every picture as it is, at any time.
     [[nodiscard]] bool IsNeutral() noexcept;
+    // Whether a pixel of the result depends on more of the source than the same pixel there: with jitter or diffusion.
+    [[nodiscard]] bool NeedsWholePicture() noexcept;
 
     // From now on only wear, scratches and spots are drawn, with the same positions and strength as in the whole
     // effect; nothing moves the picture or changes its colours.
     void KeepDamageOnly() noexcept { m_options.isDamageOnly = true; }
 
-    // Renders the frame at a clip time: the frame number is seconds * 30, truncated. False, with nothing
-    // written, when a frame record is invalid.
-    [[nodiscard]] bool Render(const FrameRecord& source, const FrameRecord& destination,
-                              double seconds) noexcept;
+    // Renders the frame at a clip time: the frame number is seconds * 30, truncated. With `rows`, only these are sure to
+    // be written. False, with nothing written, when a frame record is invalid.
+    [[nodiscard]] bool Render(const FrameRecord& source, const FrameRecord& destination, double seconds,
+                              const render::RowRange& rows = {}) noexcept;
 
     // The same for a deep frame (render/deep/deep_renderer.h). False, with nothing written, when the frame is invalid or
     // there is not enough memory.

@@ -18,7 +18,7 @@ bool RenderFrame(const RenderSession& session, IVideoHost& host, const FrameReco
     settings.hostSeed = session.hostSeed;
     settings.arrangement = session.arrangement;
     render::RenderStages(context, settings, *session.state, session.options);
-    context.Finish();
+    context.Finish(session.options.rows);
     return true;
 }
 

@@ -46,22 +46,25 @@ bool FrameContext::DetachSource() noexcept {
     return true;
 }
 
-void FrameContext::Finish() noexcept {
+void FrameContext::Finish(const RowRange& rows) noexcept {
     if (m_outputWritten) return;
     m_outputWritten = true;
+    const std::int32_t first = std::max(rows.first, 0), count = std::min(rows.end, m_height) - first;
+    if (count <= 0) return;
     const std::size_t rowBytes = static_cast<std::size_t>(m_width) * sizeof(Bgra);
     const auto isGapless = [rowBytes](const ImageView& view) {
         return static_cast<std::size_t>(view.rowStep) == rowBytes;
     };
     if (isGapless(m_source) && isGapless(m_destination)) {
         // One long copy is cheaper than many short ones.
-        std::memmove(m_destination.Row(0), m_source.Row(0), rowBytes * static_cast<std::size_t>(m_height));
+        std::memmove(m_destination.Row(first), m_source.Row(first),
+                     rowBytes * static_cast<std::size_t>(count));
         return;
     }
     // If the pictures overlap, the order must not overwrite source rows that are still to be copied.
     const bool upward = m_destination.Row(0) > m_source.Row(0);
-    for (std::int32_t i = 0; i < m_height; ++i) {
-        const std::int32_t y = upward ? m_height - 1 - i : i;
+    for (std::int32_t i = 0; i < count; ++i) {
+        const std::int32_t y = first + (upward ? count - 1 - i : i);
         std::memmove(m_destination.Row(y), m_source.Row(y), rowBytes);
     }
 }

@@ -38,8 +38,8 @@ class FrameContext {
     const ImageView& ClaimDestination() noexcept;
     // Replaces the source with a private copy. Returns false if there is not enough memory.
     [[nodiscard]] bool DetachSource() noexcept;
-    // Copies the source through when no stage has written the destination.
-    void Finish() noexcept;
+    // Copies these rows of the source through when no stage has written the destination.
+    void Finish(const RowRange& rows = {}) noexcept;
 
   private:
     struct Copy {

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <cstdint>
+#include <limits>
 
 namespace velmora::render {
 
@@ -19,6 +20,12 @@ using RowBytesOf = std::int64_t (*)(std::int32_t width) noexcept;
 [[nodiscard]] constexpr std::int64_t BgraRowBytes(std::int32_t width) noexcept {
     return std::int64_t{width} * 4;
 }
+
+// Rows from `first` to before `end`, counted from the top; both may lie outside the picture.
+struct RowRange {
+    std::int32_t first = 0;
+    std::int32_t end = std::numeric_limits<std::int32_t>::max();
+};
 
 // Rows and columns of a buffer; bottom and right are exclusive.
 struct Rectangle {

@@ -1,5 +1,7 @@
 #include "render/renderer.h"
 
+#include <algorithm>
+
 #include "render/row_program.h"
 
 namespace velmora::render {
@@ -50,7 +52,8 @@ void RenderByRows(FrameContext& context, const FramePlan& plan, const RenderOpti
     if (own == nullptr && !plan.jitter.IsActive() && program.IsEmpty()) return;
     const ImageView& source = context.Source();
     const ImageView& destination = context.ClaimDestination();
-    for (std::int32_t y = 0; y < context.Height(); ++y) {
+    const std::int32_t end = std::min(context.Height(), options.rows.end);
+    for (std::int32_t y = std::max(options.rows.first, 0); y < end; ++y) {
         const ShiftedRow row = plan.jitter.Shifted(source, y);
         if (own == nullptr) {
             program.Run(row, destination.Row(y), context.Width(), y);

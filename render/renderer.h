@@ -20,6 +20,8 @@ struct RenderOptions {
     std::int64_t streamedBytes = std::int64_t{6} << 20;
     // Only wear, scratches and spots, placed as when all stages run.
     bool isDamageOnly = false;
+    // The rows that an 8-bit render has to write. Without jitter and glow it reads no others.
+    RowRange rows = {};
 };
 
 // Whether a stage runs with these options.

@@ -238,6 +238,21 @@ Seen SeenIn(EffectSession& session, int frame) {
     return seen;
 }
 
+// The same of a deep picture; scratches alone.
+std::set<std::int32_t> DeepColumnsIn(EffectSession& session, int frame) {
+    constexpr std::ptrdiff_t kStep = kWidth * 4 * sizeof(float);
+    std::vector<float> source(static_cast<std::size_t>(kWidth) * kHeight * 4, 0.5f), result(source.size());
+    const render::DeepFormat format = {render::DeepSamples::kFloat, 4};
+    EXPECT_TRUE(session.RenderDeep(
+        render::DeepFrame::Whole(kWidth, kHeight, format, {source.data(), kStep}, {result.data(), kStep}),
+        SecondsOf(frame)));
+    std::set<std::int32_t> columns;
+    for (std::size_t i = 0; i < result.size(); i += 4) {
+        if (result[i] != 0.5f) columns.insert(static_cast<std::int32_t>(i / 4 % kWidth));
+    }
+    return columns;
+}
+
 // A fade that rearranged everything in every frame would not look like one.
 TEST(EffectSession, ValuesMayChangeInAKeptArrangement) {
     auto constant = EffectSession::Create(kFilmDamage), fading = EffectSession::Create(kFilmDamage);
@@ -249,12 +264,15 @@ TEST(EffectSession, ValuesMayChangeInAKeptArrangement) {
     fading->KeepArrangement();
     for (int frame = 0; frame < 90; frame += 10) {
         const auto all = SeenIn(*constant, frame).columns;
+        const auto allDeep = DeepColumnsIn(*constant, frame);
         fading->SetValue(depth, {.number = 0.9f});
         const auto same = SeenIn(*fading, frame).columns;  // but for edges that are now too faint
         EXPECT_TRUE(same.size() * 4 > all.size() * 3 && std::ranges::includes(all, same)) << frame;
         fading->SetValue(density, {.number = 0.25f});
         const auto some = SeenIn(*fading, frame).columns;
         EXPECT_TRUE(some.size() < all.size() && std::ranges::includes(all, some)) << frame;
+        const auto someDeep = DeepColumnsIn(*fading, frame);
+        EXPECT_TRUE(someDeep.size() < allDeep.size() && std::ranges::includes(allDeep, someDeep)) << frame;
         fading->SetValue(density, {.number = 0.75f});
     }
     auto whole = EffectSession::Create(kFilmCamera), half = EffectSession::Create(kFilmCamera);
