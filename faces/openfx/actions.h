@@ -1,8 +1,8 @@
 // The actions of a plug-in that describe it and that concern pictures. They throw ActionFailed.
 //
 // The picture of an effect is the source's region of definition, in pixels of the scale that the host renders at: sizes
-// of spots, shifts and scratches are those that a picture of so many pixels has in every other program of ours. All of
-// it is asked for and rendered, whatever part of it the host wants.
+// of spots, shifts and scratches are those that a picture of so many pixels has in every other program of ours. A host
+// may want a part of it. With jitter or diffusion all of it is asked for and rendered, otherwise that part alone.
 #pragma once
 
 #include <string_view>
@@ -22,7 +22,7 @@ void DescribeInContext(const Suites& suites, OfxImageEffectHandle descriptor,
 
 // The answers for an instance (render.cpp). A host reads its usual answer where they give kOfxStatReplyDefault.
 OfxStatus AnswerRegionOfDefinition(const Instance& instance, const Properties& in, const Properties& out);
-OfxStatus AnswerRegionsOfInterest(const Instance& instance, const Properties& in, const Properties& out);
+OfxStatus AnswerRegionsOfInterest(Instance& instance, const Properties& in, const Properties& out);
 OfxStatus AnswerIsIdentity(Instance& instance, const Properties& in, const Properties& out);
 
 // Renders the window that the host names, if it is not stopped before. From any number of threads at once.

@@ -17,7 +17,7 @@ Properties DefineClip(const Suites& suites, OfxImageEffectHandle effect, const c
     OfxPropertySetHandle handle = nullptr;
     Require(suites.effect->clipDefine(effect, name, &handle));
     Properties clip(suites, handle);
-    clip.Offer(kOfxImageEffectPropSupportsTiles, 0);
+    clip.Offer(kOfxImageEffectPropSupportsTiles, 1);
     return clip;
 }
 
@@ -143,9 +143,9 @@ void Describe(const Suites& suites, OfxImageEffectHandle descriptor, const effec
     plugin.Set(kOfxImageEffectPluginPropHostFrameThreading, 0);
     plugin.Set(kOfxImageEffectPluginRenderThreadSafety, kOfxImageEffectRenderFullySafe);
     plugin.Set(kOfxImageEffectPropSupportsMultiResolution, 1);
-    // Diffusion and jitter read the picture far from where they write, and damage lies where the whole picture's size
-    // puts it, so every stage starts from the whole picture.
-    plugin.Set(kOfxImageEffectPropSupportsTiles, 0);
+    // Diffusion and jitter read the picture far from where they write: with them a tile asks for the whole picture
+    // (AnswerRegionsOfInterest).
+    plugin.Set(kOfxImageEffectPropSupportsTiles, 1);
     plugin.Set(kOfxImageEffectPropTemporalClipAccess, 0);
     plugin.Set(kOfxImageEffectPluginPropFieldRenderTwiceAlways, 0);
     plugin.Set(kOfxImageEffectPropSupportsMultipleClipDepths, 0);

@@ -106,10 +106,37 @@ ValueWord Instance::OwnAt(std::size_t index, OfxTime time) const {
     }
 }
 
+// Nothing for a parameter that is not animated, or when the host does not tell its keys.
+std::optional<ValueWord> Instance::LargestKey(std::size_t index) const {
+    const OfxParameterSuiteV1& suite = *m_suites.parameter;
+    unsigned int count = 0;
+    if (suite.paramGetNumKeys == nullptr || suite.paramGetKeyTime == nullptr ||
+        suite.paramGetNumKeys(m_handles[index], &count) != kOfxStatOK || count < 2) {
+        return std::nullopt;
+    }
+    const bool isSlider = m_effect.params[m_params[index].own].kind == kKindSlider;
+    std::optional<ValueWord> largest;
+    for (unsigned int key = 0; key < count; ++key) {
+        OfxTime time = 0.0;
+        if (suite.paramGetKeyTime(m_handles[index], key, &time) != kOfxStatOK) continue;
+        const ValueWord value = OwnAt(index, time);
+        const bool isLarger =
+            !largest || (isSlider ? value.number > largest->number : value.bits > largest->bits);
+        if (isLarger) largest = value;
+    }
+    return largest;
+}
+
 FrameValues Instance::ValuesAt(OfxTime time) const {
     FrameValues values;
     for (std::size_t i = 0; i < m_params.size(); ++i) {
         if (m_params[i].role == ParamRole::kOwn) values.own[m_params[i].own] = OwnAt(i, time);
+    }
+    for (std::size_t i = 0; i < m_params.size(); ++i) {
+        const auto largest = m_params[i].role == ParamRole::kOwn ? LargestKey(i) : std::nullopt;
+        if (!largest) continue;
+        if (!values.largest) values.largest = values.own;
+        (*values.largest)[m_params[i].own] = *largest;
     }
     double percent = 100.0;
     Require(m_suites.parameter->paramGetValueAtTime(Of(ParamRole::kMix), time, &percent));
@@ -211,7 +238,16 @@ Instance::Borrowed Instance::Session(const FrameValues& values) {
     }
     if (session == nullptr) session = effects::EffectSession::Create(m_effect);
     if (session == nullptr) throw std::bad_alloc();
-    for (std::uint32_t i = 0; i < m_effect.params.size(); ++i) session->SetValue(i, values.own[i]);
+    const auto set = [&](const FrameValues::Own& own) {
+        for (std::uint32_t i = 0; i < m_effect.params.size(); ++i) session->SetValue(i, own[i]);
+    };
+    session->ReleaseArrangement();
+    if (values.largest) {
+        // Else every frame of an animation would have scratches and flicker of its own.
+        set(*values.largest);
+        session->KeepArrangement();
+    }
+    set(values.own);
     session->PinRandom(values.seed);
     return {*this, std::move(session)};
 }

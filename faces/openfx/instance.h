@@ -17,8 +17,11 @@ namespace velmora::hosts::openfx {
 
 // What a frame is rendered with.
 struct FrameValues {
-    std::array<ValueWord, kPresetCellCapacity> own{};  // by parameter of the effect
-    double mix = 1.0;                                  // 0..1
+    using Own = std::array<ValueWord, kPresetCellCapacity>;  // by parameter of the effect
+    Own own{};
+    // With the largest values that animated parameters have at their keys; nothing when none is animated.
+    std::optional<Own> largest;
+    double mix = 1.0;  // 0..1
     std::uint32_t seed = 0;
     int startFrame = 0;
     WorkingSpace space = WorkingSpace::kDisplay;
@@ -56,6 +59,7 @@ class Instance {
     [[nodiscard]] OfxImageClipHandle Clip(const char* name) const;
     [[nodiscard]] OfxParamHandle Param(const PluginParam& param) const;
     [[nodiscard]] ValueWord OwnAt(std::size_t index, OfxTime time) const;
+    [[nodiscard]] std::optional<ValueWord> LargestKey(std::size_t index) const;
     void SetOwn(std::size_t index, ValueWord stored) const;
     [[nodiscard]] int IntOf(ParamRole role) const;
     [[nodiscard]] OfxParamHandle Of(ParamRole role) const;
@@ -80,6 +84,7 @@ class Instance::Borrowed {
     Borrowed& operator=(const Borrowed&) = delete;
 
     effects::EffectSession* operator->() const noexcept { return m_session.get(); }
+    effects::EffectSession& operator*() const noexcept { return *m_session; }
 
   private:
     Instance& m_owner;

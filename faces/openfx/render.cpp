@@ -30,13 +30,20 @@ OfxRectI Intersection(const OfxRectI& a, const OfxRectI& b) {
     return {std::max(a.x1, b.x1), std::max(a.y1, b.y1), std::min(a.x2, b.x2), std::min(a.y2, b.y2)};
 }
 
-// A buffer for a whole picture: rows from the top, without padding.
+bool IsEmpty(const OfxRectI& r) {
+    return r.x1 >= r.x2 || r.y1 >= r.y2;
+}
+
+// A buffer for rows of a picture, whole ones: from the top, without padding.
 class Canvas {
   public:
-    Canvas(const Instance& instance, const OfxRectI& region, std::size_t pixelBytes)
+    // The rows are those of `part`.
+    Canvas(const Instance& instance, const OfxRectI& region, const OfxRectI& part, std::size_t pixelBytes)
         : m_region(region),
+          m_top(part.y2),
           m_pixelBytes(pixelBytes),
-          m_memory(instance.Host(), instance.Handle(), RowBytes() * static_cast<std::size_t>(Height())) {}
+          m_memory(instance.Host(), instance.Handle(),
+                   RowBytes() * static_cast<std::size_t>(part.y2 - part.y1)) {}
 
     [[nodiscard]] int Width() const noexcept { return m_region.x2 - m_region.x1; }
     [[nodiscard]] int Height() const noexcept { return m_region.y2 - m_region.y1; }
@@ -45,13 +52,18 @@ class Canvas {
     }
     [[nodiscard]] std::byte* Pixel(int x, int y) const noexcept {
         return static_cast<std::byte*>(m_memory.Data()) +
-               static_cast<std::size_t>(m_region.y2 - 1 - y) * RowBytes() +
+               static_cast<std::size_t>(m_top - 1 - y) * RowBytes() +
                static_cast<std::size_t>(x - m_region.x1) * m_pixelBytes;
     }
-    [[nodiscard]] void* Data() const noexcept { return m_memory.Data(); }
+    // Where the picture's first row is, or would be.
+    [[nodiscard]] void* FirstRow() const noexcept {
+        const auto above = static_cast<std::uintptr_t>(m_region.y2 - m_top) * RowBytes();
+        return reinterpret_cast<void*>(reinterpret_cast<std::uintptr_t>(m_memory.Data()) - above);
+    }
 
   private:
     const OfxRectI m_region;
+    const int m_top;
     const std::size_t m_pixelBytes;
     const HostMemory m_memory;
 };
@@ -76,22 +88,33 @@ class FrameRender {
     }
 
     void Run() {
-        if (m_window.x1 >= m_window.x2 || m_window.y1 >= m_window.y2) return;
-        const Canvas source(m_instance, m_region, m_format.WorkBytes());
-        const Canvas result(m_instance, m_region, m_format.WorkBytes());
-        Load(source);
+        if (IsEmpty(m_window)) return;
+        if (IsEmpty(Inside())) return Clear(m_window);
+        const auto session = m_instance.Session(m_values);
+        if (!session->NeedsWholePicture()) {
+            const Canvas part(m_instance, m_region, Inside(), m_format.WorkBytes());
+            return Run(*session, Inside(), part, part);
+        }
+        const Canvas source(m_instance, m_region, m_region, m_format.WorkBytes());
+        const Canvas result(m_instance, m_region, m_region, m_format.WorkBytes());
+        Run(*session, m_region, source, result);
+    }
+
+  private:
+    void Run(effects::EffectSession& session, const OfxRectI& needed, const Canvas& source,
+             const Canvas& result) const {
+        Load(needed, source);
         StopIfAborted(m_instance);
-        Render(source, result);
+        Render(session, source, result);
         StopIfAborted(m_instance);
         Store(result);
     }
 
-  private:
-    // What the host does not give of the picture is black.
-    void Load(const Canvas& source) const {
-        const OfxRectI there = Intersection(m_region, m_source.Bounds());
+    // What the host does not give of the picture, and what is not needed of a row, is black.
+    void Load(const OfxRectI& needed, const Canvas& source) const {
+        const OfxRectI there = Intersection(needed, m_source.Bounds());
         const bool isWhole = there.x1 == m_region.x1 && there.x2 == m_region.x2;
-        for (int y = m_region.y1; y < m_region.y2; ++y) {
+        for (int y = needed.y1; y < needed.y2; ++y) {
             if (y % kRowsPerQuestion == 0) StopIfAborted(m_instance);
             const bool isThere = y >= there.y1 && y < there.y2 && there.x1 < there.x2;
             if (!isThere || !isWhole) std::memset(source.Pixel(m_region.x1, y), 0, source.RowBytes());
@@ -105,53 +128,56 @@ class FrameRender {
         return Intersection(m_window, Intersection(m_region, m_source.Bounds()));
     }
 
-    void Render(const Canvas& source, const Canvas& result) const {
+    void Render(effects::EffectSession& session, const Canvas& source, const Canvas& result) const {
         const OfxRectI inside = Inside();
-        if (inside.x1 >= inside.x2 || inside.y1 >= inside.y2) return;
-        const auto session = m_instance.Session(m_values);
+        const render::Rectangle window = {m_region.y2 - inside.y2, m_region.y2 - inside.y1,
+                                          inside.x1 - m_region.x1, inside.x2 - m_region.x1};
         const double seconds = m_instance.ClipSeconds(m_time, m_values.startFrame);
         const auto step = static_cast<std::int32_t>(source.RowBytes());
         bool isRendered = false;
         if (m_format.work == WorkKind::kBytes) {
-            const FrameRecord from = {source.Data(), source.Width(), source.Height(), step, 0, 0, 0};
-            const FrameRecord to = {result.Data(), result.Width(), result.Height(), step, 0, 0, 0};
-            isRendered = session->Render(from, to, seconds);
+            const FrameRecord from = {source.FirstRow(), source.Width(), source.Height(), step, 0, 0, 0};
+            const FrameRecord to = {result.FirstRow(), result.Width(), result.Height(), step, 0, 0, 0};
+            isRendered = session.Render(from, to, seconds, {window.top, window.bottom});
         } else {
             const render::DeepFormat format = {m_format.work == WorkKind::kShorts
                                                    ? render::DeepSamples::kUnsigned16
                                                    : render::DeepSamples::kFloat,
                                                m_format.channels, m_format.isDividedByRenderer};
-            const render::Rectangle window = {m_region.y2 - inside.y2, m_region.y2 - inside.y1,
-                                              inside.x1 - m_region.x1, inside.x2 - m_region.x1};
-            isRendered = session->RenderDeep({source.Width(),
-                                              source.Height(),
-                                              format,
-                                              {source.Data(), step},
-                                              {result.Data(), step},
-                                              window},
-                                             seconds);
+            isRendered = session.RenderDeep({source.Width(),
+                                             source.Height(),
+                                             format,
+                                             {source.FirstRow(), step},
+                                             {result.FirstRow(), step},
+                                             window},
+                                            seconds);
         }
         if (!isRendered) throw ActionFailed{kOfxStatFailed};
     }
 
     void Store(const Canvas& result) const {
         const OfxRectI inside = Inside();
-        const std::size_t pixelBytes = m_format.HostBytes();
-        const auto width = static_cast<std::size_t>(m_window.x2 - m_window.x1);
-        const HostMemory shares(m_instance.Host(), m_instance.Handle(), width * sizeof(float));
+        const int count = inside.x2 - inside.x1;
+        const HostMemory shares(m_instance.Host(), m_instance.Handle(),
+                                static_cast<std::size_t>(count) * sizeof(float));
+        auto* const share = static_cast<float*>(shares.Data());
         for (int y = m_window.y1; y < m_window.y2; ++y) {
             if (y % kRowsPerQuestion == 0) StopIfAborted(m_instance);
-            if (m_field >= 0 && (y & 1) != m_field) continue;
-            const bool isInside = y >= inside.y1 && y < inside.y2 && inside.x1 < inside.x2;
-            if (!isInside || inside.x1 > m_window.x1 || inside.x2 < m_window.x2) {
-                std::memset(m_output.Pixel(m_window.x1, y), 0, width * pixelBytes);
-            }
-            if (!isInside) continue;
-            const int count = inside.x2 - inside.x1;
-            auto* const share = static_cast<float*>(shares.Data());
+            const bool isInside = y >= inside.y1 && y < inside.y2;
+            if (!isInside || count < m_window.x2 - m_window.x1) Clear({m_window.x1, y, m_window.x2, y + 1});
+            if (!isInside || !IsWritten(y)) continue;
             StoreRow(m_format, result.Pixel(inside.x1, y), m_source.Pixel(inside.x1, y),
                      FillShares(share, inside.x1, count, y) ? share : nullptr, m_output.Pixel(inside.x1, y),
                      count);
+        }
+    }
+
+    [[nodiscard]] bool IsWritten(int y) const { return m_field < 0 || (y & 1) == m_field; }
+
+    void Clear(const OfxRectI& part) const {
+        const std::size_t bytes = static_cast<std::size_t>(part.x2 - part.x1) * m_format.HostBytes();
+        for (int y = part.y1; y < part.y2; ++y) {
+            if (IsWritten(y)) std::memset(m_output.Pixel(part.x1, y), 0, bytes);
         }
     }
 
@@ -194,9 +220,11 @@ OfxStatus AnswerRegionOfDefinition(const Instance& instance, const Properties& i
     return kOfxStatOK;
 }
 
-OfxStatus AnswerRegionsOfInterest(const Instance& instance, const Properties& in, const Properties& out) {
-    OfxRectD region;
+OfxStatus AnswerRegionsOfInterest(Instance& instance, const Properties& in, const Properties& out) {
     const double time = TimeOf(in);
+    // A pixel of the other stages needs the same pixel of the source, which is the host's usual answer.
+    if (!instance.Session(instance.ValuesAt(time))->NeedsWholePicture()) return kOfxStatReplyDefault;
+    OfxRectD region;
     Require(instance.Host().effect->clipGetRegionOfDefinition(instance.Source(), time, &region));
     out.Set((std::string(kOfxImageClipPropRoI_) + kOfxImageEffectSimpleSourceClipName).c_str(), region);
     return kOfxStatOK;

@@ -74,6 +74,12 @@ void CheckOpenfxRefused(CheckContext& context);
 void CheckOpenfxFields(CheckContext& context);
 void CheckOpenfxMask(CheckContext& context);
 
+// checks_openfx_tiles.cpp
+void CheckOpenfxTiles(CheckContext& context);
+void CheckOpenfxScales(CheckContext& context);
+void CheckOpenfxTimes(CheckContext& context);
+void CheckOpenfxAnimation(CheckContext& context);
+
 // checks_openfx_instances.cpp
 void CheckOpenfxPresets(CheckContext& context);
 void CheckOpenfxIdentity(CheckContext& context);

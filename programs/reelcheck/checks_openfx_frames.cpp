@@ -11,24 +11,6 @@ namespace {
 
 constexpr const char* kDepths[] = {kOfxBitDepthByte, kOfxBitDepthShort, kOfxBitDepthFloat};
 
-// Whether `part` of two pictures is equal, and everything else in the first still has the fill byte.
-bool IsOnlyInside(const HostPicture& picture, const HostPicture& whole, const OfxRectI& part,
-                  std::uint8_t fill, int field = -1) {
-    const auto bytes = static_cast<std::size_t>(picture.PixelBytes());
-    const OfxRectI& b = picture.shape.bounds;
-    for (int y = b.y1; y < b.y2; ++y) {
-        for (int x = b.x1; x < b.x2; ++x) {
-            const bool isInside =
-                x >= part.x1 && x < part.x2 && y >= part.y1 && y < part.y2 && (field < 0 || (y & 1) == field);
-            const std::uint8_t* const pixel = picture.Pixel(x, y);
-            if (isInside && !std::equal(pixel, pixel + bytes, whole.Pixel(x, y))) return false;
-            if (!isInside && std::any_of(pixel, pixel + bytes, [fill](auto byte) { return byte != fill; }))
-                return false;
-        }
-    }
-    return true;
-}
-
 }  // namespace
 
 void CheckOpenfxFirstFrames(CheckContext& context) {

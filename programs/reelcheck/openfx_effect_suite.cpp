@@ -89,7 +89,8 @@ OfxStatus ClipGetRegionOfDefinition(OfxImageClipHandle handle, OfxTime time, Ofx
     const HostPicture* const picture = clip->At(time);
     if (picture == nullptr) return kOfxStatFailed;
     const OfxRectI region = picture->shape.Region();
-    *bounds = {double(region.x1), double(region.y1), double(region.x2), double(region.y2)};
+    const double width = State().canonicalWidth, height = State().canonicalHeight;
+    *bounds = {region.x1 * width, region.y1 * height, region.x2 * width, region.y2 * height};
     return kOfxStatOK;
 }
 

@@ -1,9 +1,9 @@
 #include "programs/reelcheck/openfx_host.h"
 
+#include <algorithm>
 #include <cstring>
 #include <filesystem>
 
-#include "effects/effect_session.h"
 #include "platform/platform.h"
 #include "programs/reelcheck/check.h"
 
@@ -51,6 +51,11 @@ const void* FetchSuite(OfxPropertySetHandle host, const char* name, int version)
     if (suite == kOfxParameterSuite) return isMissing ? &noParameters : &kHostParameters;
     if (suite == kOfxMemorySuite) return isMissing ? &noMemory : &kHostMemory;
     return nullptr;
+}
+
+OfxRectD RectangleIn(Arguments& arguments, const char* name) {
+    PropertySet& set = arguments.Set();
+    return {set.Number(name, 0), set.Number(name, 1), set.Number(name, 2), set.Number(name, 3)};
 }
 
 }  // namespace
@@ -193,6 +198,27 @@ bool OpenfxInstance::IsIdentity(double time) {
     return true;
 }
 
+OfxRectD OpenfxInstance::RegionOfDefinition(double time) {
+    Arguments in, out;
+    in.Add(kOfxPropTime, {time}).Add(kOfxImageEffectPropRenderScale, {1.0, 1.0});
+    out.Add(kOfxImageEffectPropRegionOfDefinition, {0.0, 0.0, 0.0, 0.0});
+    m_plugin.Expect(kOfxStatOK, kOfxImageEffectActionGetRegionOfDefinition, m_effect.Handle(), &in, &out);
+    return RectangleIn(out, kOfxImageEffectPropRegionOfDefinition);
+}
+
+OfxRectD OpenfxInstance::RegionOfInterest(double time, const OfxRectD& part) {
+    const std::string name = std::string(kOfxImageClipPropRoI_) + kOfxImageEffectSimpleSourceClipName;
+    Arguments in, out;
+    in.Add(kOfxPropTime, {time}).Add(kOfxImageEffectPropRenderScale, {1.0, 1.0});
+    in.Add(kOfxImageEffectPropRegionOfInterest, {part.x1, part.y1, part.x2, part.y2});
+    out.Add(name.c_str(), {part.x1, part.y1, part.x2, part.y2});
+    const OfxStatus status =
+        m_plugin.Call(kOfxImageEffectActionGetRegionsOfInterest, m_effect.Handle(), &in, &out);
+    if (status == kOfxStatReplyDefault) return part;
+    Require(status == kOfxStatOK, "does not say what a part needs");
+    return RectangleIn(out, name.c_str());
+}
+
 void RequireNothingHeld() {
     RequireNoComplaints();
     if (State().images != 0) Fail(Text("%d images are not given back", State().images.exchange(0)));
@@ -228,30 +254,52 @@ void CopyRows(const HostPicture& picture, std::vector<std::uint8_t>& rows) {
 
 }  // namespace
 
-void RenderExpected(const effects::EffectTable& effect, std::uint32_t preset, std::uint32_t seed,
-                    double seconds, const HostPicture& source, HostPicture& expected) {
+void RenderExpected(effects::EffectSession& session, double seconds, const HostPicture& source,
+                    HostPicture& expected) {
     const int width = source.shape.Width(), height = source.shape.Height();
     std::vector<std::uint8_t> from;
     CopyRows<true>(source, from);
     std::vector<std::uint8_t> to(from.size());
     const auto step = static_cast<std::int32_t>(from.size()) / height;
-    const auto session = effects::EffectSession::Create(effect);
-    session->ApplyPreset(preset);
-    session->PinRandom(seed);
     if (source.shape.SampleBytes() == 1) {
-        Require(session->Render({from.data(), width, height, step, 0, 0, 0},
-                                {to.data(), width, height, step, 0, 0, 0}, seconds),
+        Require(session.Render({from.data(), width, height, step, 0, 0, 0},
+                               {to.data(), width, height, step, 0, 0, 0}, seconds),
                 "the core does not render");
     } else {
         const render::DeepFormat format = {
             source.shape.SampleBytes() == 2 ? render::DeepSamples::kUnsigned16 : render::DeepSamples::kFloat,
             source.shape.Channels(), source.shape.isPremultiplied};
-        Require(session->RenderDeep(
+        Require(session.RenderDeep(
                     render::DeepFrame::Whole(width, height, format, {from.data(), step}, {to.data(), step}),
                     seconds),
                 "the core does not render");
     }
     CopyRows<false>(expected, to);
+}
+
+void RenderExpected(const effects::EffectTable& effect, std::uint32_t preset, std::uint32_t seed,
+                    double seconds, const HostPicture& source, HostPicture& expected) {
+    const auto session = effects::EffectSession::Create(effect);
+    session->ApplyPreset(preset);
+    session->PinRandom(seed);
+    RenderExpected(*session, seconds, source, expected);
+}
+
+bool IsOnlyInside(const HostPicture& picture, const HostPicture& whole, const OfxRectI& part,
+                  std::uint8_t fill, int field) {
+    const auto bytes = static_cast<std::size_t>(picture.PixelBytes());
+    const OfxRectI& b = picture.shape.bounds;
+    for (int y = b.y1; y < b.y2; ++y) {
+        for (int x = b.x1; x < b.x2; ++x) {
+            const bool isInside =
+                x >= part.x1 && x < part.x2 && y >= part.y1 && y < part.y2 && (field < 0 || (y & 1) == field);
+            const std::uint8_t* const pixel = picture.Pixel(x, y);
+            if (isInside && !std::equal(pixel, pixel + bytes, whole.Pixel(x, y))) return false;
+            if (!isInside && std::any_of(pixel, pixel + bytes, [fill](auto byte) { return byte != fill; }))
+                return false;
+        }
+    }
+    return true;
 }
 
 }  // namespace velmora::reelcheck

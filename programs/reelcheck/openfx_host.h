@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "effects/effect_session.h"
 #include "effects/effect_table.h"
 #include "programs/reelcheck/openfx_objects.h"
 
@@ -87,6 +88,10 @@ class OpenfxInstance {
     // Renders the whole output and fails unless that succeeds.
     void RenderWhole(HostPicture& source, HostPicture& output, double time);
     [[nodiscard]] bool IsIdentity(double time);
+    // What the plug-in answers for the source, in canonical coordinates: all of the picture, and what a part of the
+    // result needs.
+    [[nodiscard]] OfxRectD RegionOfDefinition(double time);
+    [[nodiscard]] OfxRectD RegionOfInterest(double time, const OfxRectD& part);
     [[nodiscard]] const OpenfxPlugin& Plugin() const { return m_plugin; }
 
   private:
@@ -97,7 +102,9 @@ class OpenfxInstance {
 // After a check: nothing is held, and nothing was complained of.
 void RequireNothingHeld();
 
-// What the effect makes of a picture with a preset: by the linked core, which is what reelfx uses.
+// What the linked core, which is what reelfx uses, makes of a picture: with a session's values, or those of a preset.
+void RenderExpected(effects::EffectSession& session, double seconds, const HostPicture& source,
+                    HostPicture& expected);
 void RenderExpected(const effects::EffectTable& effect, std::uint32_t preset, std::uint32_t seed,
                     double seconds, const HostPicture& source, HostPicture& expected);
 
@@ -118,6 +125,10 @@ class Busy {
     OpenfxPlugin plugin;
     OpenfxInstance instance;
 };
+
+// Whether a part of two pictures is equal, and everything else in the first still has the fill byte.
+[[nodiscard]] bool IsOnlyInside(const HostPicture& picture, const HostPicture& whole, const OfxRectI& part,
+                                std::uint8_t fill, int field = -1);
 
 inline OfxRectI Square(int x, int y, int width, int height) {
     return {x, y, x + width, y + height};

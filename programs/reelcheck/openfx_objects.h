@@ -108,6 +108,8 @@ class HostParam : public Handled {
     PropertySet properties{PropertySet::Of::kParam};
     double values[3] = {};
     double perFrame = 0.0;  // animation: added to each for every frame of time
+    std::vector<double>
+        keys;  // the animation's times, in order: it stands still before the first and after the last
 };
 
 class HostParamSet : public Handled {
@@ -203,6 +205,8 @@ struct HostState {
     std::atomic<int> blocks{0};  // of memory, allocated and not freed
     std::atomic<int> allocations{0};
     std::atomic<int> failingAllocation{0};  // counted from 1; 0: none
+    double canonicalWidth = 1.0,
+           canonicalHeight = 1.0;  // of a pixel, by the render scale and the pixels' shape
 };
 [[nodiscard]] HostState& State();
 

@@ -1,5 +1,6 @@
 // The property and parameter suites of our OpenFX host.
 
+#include <algorithm>
 #include <cstdarg>
 #include <cstring>
 
@@ -191,6 +192,7 @@ OfxStatus ParamProperties(OfxParamHandle handle, OfxPropertySetHandle* propertie
 OfxStatus Give(OfxParamHandle handle, double time, std::va_list values) {
     auto* const param = Handled::Of<HostParam>(handle);
     if (param == nullptr) return kOfxStatErrBadHandle;
+    if (!param->keys.empty()) time = std::clamp(time, param->keys.front(), param->keys.back());
     for (int i = 0; i < param->Dimension(); ++i) {
         const double value = param->values[i] + param->perFrame * time;
         if (param->IsDouble()) {
@@ -216,6 +218,21 @@ OfxStatus GetValueAtTime(OfxParamHandle handle, OfxTime time, ...) {
     const OfxStatus status = Give(handle, time, values);
     va_end(values);
     return status;
+}
+
+OfxStatus GetNumKeys(OfxParamHandle handle, unsigned int* count) {
+    const auto* const param = Handled::Of<HostParam>(handle);
+    if (param == nullptr) return kOfxStatErrBadHandle;
+    *count = static_cast<unsigned int>(param->keys.size());
+    return kOfxStatOK;
+}
+
+OfxStatus GetKeyTime(OfxParamHandle handle, unsigned int key, OfxTime* time) {
+    const auto* const param = Handled::Of<HostParam>(handle);
+    if (param == nullptr) return kOfxStatErrBadHandle;
+    if (key >= param->keys.size()) return Complain("asks for a key that is none"), kOfxStatErrBadIndex;
+    *time = param->keys[key];
+    return kOfxStatOK;
 }
 
 HostParamSet* g_edited = nullptr;  // the set with an open block
@@ -270,8 +287,8 @@ const OfxParameterSuiteV1 kHostParameters = {
     .paramGetIntegral = nullptr,
     .paramSetValue = SetValue,
     .paramSetValueAtTime = nullptr,
-    .paramGetNumKeys = nullptr,
-    .paramGetKeyTime = nullptr,
+    .paramGetNumKeys = GetNumKeys,
+    .paramGetKeyTime = GetKeyTime,
     .paramGetKeyIndex = nullptr,
     .paramDeleteKey = nullptr,
     .paramDeleteAllKeys = nullptr,

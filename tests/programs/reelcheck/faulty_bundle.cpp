@@ -74,9 +74,30 @@ OfxStatus NoteData(OfxPropertySetHandle set, const char* name, int index, void**
     }
     return status;
 }
-OfxStatus WholeField(OfxPropertySetHandle set, const char* name, int index, char** value) {
-    if (std::strcmp(name, kOfxImageEffectPropFieldToRender) == 0) return kOfxStatErrUnknown;
+OfxStatus HideText(OfxPropertySetHandle set, const char* name, int index, char** value) {
+    const char* const hidden =
+        FaultIs("ignores-fields") ? kOfxImageEffectPropFieldToRender : kOfxImageEffectPropPreMultiplication;
+    if (std::strcmp(name, hidden) == 0) return kOfxStatErrUnknown;
     return Real<OfxPropertySuiteV1>(kOfxPropertySuite).propGetString(set, name, index, value);
+}
+OfxStatus HideMask(OfxPropertySetHandle set, const char* name, int index, int* value) {
+    if (std::strcmp(name, kOfxImageClipPropConnected) == 0) return kOfxStatErrUnknown;
+    return Real<OfxPropertySuiteV1>(kOfxPropertySuite).propGetInt(set, name, index, value);
+}
+OfxStatus WholePixels(OfxImageClipHandle clip, OfxTime time, OfxRectD* region) {
+    const OfxStatus status =
+        Real<OfxImageEffectSuiteV1>(kOfxImageEffectSuite).clipGetRegionOfDefinition(clip, time, region);
+    region->x2 = region->x1 + 44.0;
+    return status;
+}
+OfxStatus TakeSeedForStart(OfxParamSetHandle set, const char* name, OfxParamHandle* param,
+                           OfxPropertySetHandle* properties) {
+    if (std::strcmp(name, "startFrame") == 0) name = "seed";
+    return Real<OfxParameterSuiteV1>(kOfxParameterSuite).paramGetHandle(set, name, param, properties);
+}
+OfxStatus NoKeys(OfxParamHandle, unsigned int* count) {
+    *count = 0;
+    return kOfxStatOK;
 }
 
 const void* FetchFaulty(OfxPropertySetHandle, const char* name, int version) {
@@ -92,18 +113,22 @@ const void* FetchFaulty(OfxPropertySetHandle, const char* name, int version) {
         if (FaultIs("reads-far")) g_properties.propGetInt = ReadFar;
         if (FaultIs("forgets-hints")) g_properties.propSetString = ForgetHint;
         if (FaultIs("writes-beside")) g_properties.propGetPointer = NoteData;
-        if (FaultIs("ignores-fields")) g_properties.propGetString = WholeField;
+        if (FaultIs("ignores-fields") || FaultIs("never-divides")) g_properties.propGetString = HideText;
+        if (FaultIs("ignores-mask")) g_properties.propGetInt = HideMask;
         return &g_properties;
     }
     if (suite == kOfxImageEffectSuite) {
         g_effects = *static_cast<const OfxImageEffectSuiteV1*>(real);
         if (FaultIs("keeps-images")) g_effects.clipReleaseImage = KeepImage;
         if (FaultIs("never-stops")) g_effects.abort = NeverStop;
+        if (FaultIs("counts-pixels")) g_effects.clipGetRegionOfDefinition = WholePixels;
         return &g_effects;
     }
     if (suite == kOfxParameterSuite) {
         g_parameters = *static_cast<const OfxParameterSuiteV1*>(real);
         if (FaultIs("many-steps")) g_parameters.paramEditBegin = EditNothing;
+        if (FaultIs("ignores-start")) g_parameters.paramGetHandle = TakeSeedForStart;
+        if (FaultIs("forgets-keys")) g_parameters.paramGetNumKeys = NoKeys;
         return &g_parameters;
     }
     g_memory = *static_cast<const OfxMemorySuiteV1*>(real);
@@ -127,6 +152,8 @@ OfxStatus Main(const char* action, const void* handle, OfxPropertySetHandle in, 
     if (FaultIs("throws") && handle == nullptr && name == kOfxActionCreateInstance)
         throw std::logic_error("a fault");
     if (FaultIs("stays") && name == kOfxActionDestroyInstance) return kOfxStatOK;
+    if (FaultIs("wants-tiles") && name == kOfxImageEffectActionGetRegionsOfInterest)
+        return kOfxStatReplyDefault;
     if (FaultIs("never-neutral") && name == kOfxImageEffectActionIsIdentity) return kOfxStatReplyDefault;
     if (name != kOfxImageEffectActionRender) return run();
     if (FaultIs("shares-state")) {
