@@ -77,7 +77,12 @@ class RenderRun {
   private:
     void RenderAll(Progress& progress) {
         ClipSection section(m_reader, m_section);
-        FramePipeline pipeline([&] { return section.Next(); }, MakeWorkers());
+        BatchStep batch;
+        if (m_options.withDigests) {
+            batch = {[&](std::span<PipelineItem* const> items) { m_digests.Compute(items); },
+                     FrameDigests::kBatch};
+        }
+        FramePipeline pipeline([&] { return section.Next(); }, MakeWorkers(), std::move(batch));
         while (const PipelineItemPtr item = pipeline.Next()) {
             if (Interrupts() > 1) throw Failure(kExitInterrupted, "interrupted; nothing was kept");
             Write(*item);
@@ -150,7 +155,7 @@ class RenderRun {
         const FrameWorker::Job job = {.writer = m_writer ? &*m_writer : nullptr,
                                       .size = {first.width, first.height},
                                       .turn = m_reader.Turn(),
-                                      .withDigest = m_options.withDigests,
+                                      .digests = m_options.withDigests ? &m_digests : nullptr,
                                       .samples = SamplesOf(m_options, m_reader),
                                       .isMatte = m_options.isMatte};
         std::vector<FramePipeline::Worker> workers;
@@ -210,6 +215,7 @@ class RenderRun {
     std::optional<OutputPlace> m_place;
     std::optional<MediaWriter> m_writer;
     std::optional<double> m_endSeconds;  // of the section
+    FrameDigests m_digests;
     std::int64_t m_frames = 0;
 };
 

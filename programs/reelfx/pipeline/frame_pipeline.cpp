@@ -5,9 +5,10 @@
 
 namespace velmora::hosts {
 
-FramePipeline::FramePipeline(Source source, std::vector<Worker> workers)
-    // Enough that no worker waits for another, few enough that large frames fit into memory.
-    : m_capacity(2 * workers.size() + 2) {
+FramePipeline::FramePipeline(Source source, std::vector<Worker> workers, BatchStep batch)
+    : m_batch(std::move(batch)),
+      // Enough that no worker waits for another, few enough that large frames fit into memory.
+      m_capacity(std::max(2 * workers.size() + 2, m_batch.most)) {
     try {
         Start(std::move(source), workers);
     } catch (...) {
@@ -58,11 +59,7 @@ void FramePipeline::Fill(const Source& source) {
         if (!hasWork) slot->stage = Stage::kDone;
         std::unique_lock lock(m_mutex);
         // Packets are small and many; only frames count against the capacity.
-        const auto isRoom = [&] {
-            const auto frames = std::ranges::count_if(
-                m_slots, [](const auto& each) { return each->item && !each->item->packet; });
-            return m_isStopping || !hasWork || static_cast<std::size_t>(frames) < m_capacity;
-        };
+        const auto isRoom = [&] { return m_isStopping || !hasWork || !IsFull(); };
         m_changed.wait(lock, isRoom);
         if (m_isStopping) return;
         m_slots.push_back(slot);
@@ -71,31 +68,72 @@ void FramePipeline::Fill(const Source& source) {
     }
 }
 
-FramePipeline::Slot* FramePipeline::FirstWaiting() {
+FramePipeline::Slot* FramePipeline::FirstWaiting() const {
     const auto found =
         std::ranges::find_if(m_slots, [](const auto& slot) { return slot->stage == Stage::kWaiting; });
     return found == m_slots.end() ? nullptr : found->get();
+}
+
+bool FramePipeline::IsFull() const {
+    const auto frames =
+        std::ranges::count_if(m_slots, [](const auto& each) { return each->item && !each->item->packet; });
+    return static_cast<std::size_t>(frames) >= m_capacity;
+}
+
+bool FramePipeline::Has(Stage stage) const {
+    return std::ranges::any_of(m_slots, [&](const auto& slot) { return slot->stage == stage; });
+}
+
+std::vector<FramePipeline::Slot*> FramePipeline::NextBatch() const {
+    std::vector<Slot*> slots;
+    for (const auto& slot : m_slots) {
+        if (slot->stage == Stage::kWorked && slots.size() < m_batch.most) slots.push_back(slot.get());
+    }
+    // Frames that are done but behind one that is not keep the queue full as well; then no more of them come.
+    const bool isBusy = Has(Stage::kWaiting) || Has(Stage::kInWork) || Has(Stage::kInBatch);
+    const bool isAll = !isBusy && (m_isFilled || IsFull());
+    return slots.size() == m_batch.most || isAll ? slots : std::vector<Slot*>();
 }
 
 void FramePipeline::Work(const Worker& worker) {
     std::unique_lock lock(m_mutex);
     for (;;) {
         Slot* slot = nullptr;
+        std::vector<Slot*> batch;
         m_changed.wait(lock, [&] {
-            slot = FirstWaiting();
-            return m_isStopping || slot || m_isFilled;
+            batch = NextBatch();
+            slot = batch.empty() ? FirstWaiting() : nullptr;
+            return m_isStopping || slot || !batch.empty() || (m_isFilled && !Has(Stage::kWorked));
         });
-        if (m_isStopping || !slot) return;
-        slot->stage = Stage::kInWork;  // it stays in the queue until it is done, so the pointer stays valid
+        if (m_isStopping || (!slot && batch.empty())) return;
+        // A slot stays in the queue until it is done, so the pointer stays valid.
+        if (slot) slot->stage = Stage::kInWork;
+        for (Slot* const each : batch) each->stage = Stage::kInBatch;
         lock.unlock();
-        try {
-            worker(*slot->item);
-        } catch (...) {
-            slot->error = std::current_exception();
-        }
+        slot ? WorkOn(*slot, worker) : WorkOn(batch);
         lock.lock();
-        slot->stage = Stage::kDone;
+        if (slot) slot->stage = m_batch.work && !slot->error ? Stage::kWorked : Stage::kDone;
+        for (Slot* const each : batch) each->stage = Stage::kDone;
         m_changed.notify_all();
+    }
+}
+
+void FramePipeline::WorkOn(Slot& slot, const Worker& worker) {
+    try {
+        worker(*slot.item);
+    } catch (...) {
+        slot.error = std::current_exception();
+    }
+}
+
+void FramePipeline::WorkOn(const std::vector<Slot*>& slots) const {
+    std::vector<PipelineItem*> items;
+    items.reserve(slots.size());
+    for (const Slot* const slot : slots) items.push_back(slot->item.get());
+    try {
+        m_batch.work(items);
+    } catch (...) {
+        for (Slot* const slot : slots) slot->error = std::current_exception();
     }
 }
 

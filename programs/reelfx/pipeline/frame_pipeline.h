@@ -9,11 +9,13 @@
 #include <functional>
 #include <memory>
 #include <mutex>
+#include <span>
 #include <string>
 #include <thread>
 #include <vector>
 
 #include "programs/reelfx/media/av_handles.h"
+#include "programs/reelfx/media/bgra_picture.h"
 
 namespace velmora::hosts {
 
@@ -23,16 +25,24 @@ struct PipelineItem {
     PacketPtr packet;        // set: there is nothing to work on
     std::int64_t index = 0;  // of the frame in the clip
     double seconds = 0.0;    // since the clip's first frame
+    BgraPicture picture;     // the result, while its digest waits for others; see FrameDigests
     std::string digest;      // if requested
 };
 using PipelineItemPtr = std::unique_ptr<PipelineItem>;
+
+// A second step on items, for which `most` of them wait for each other; fewer at the end, and when no other work is left
+// until they are through. It is done by the workers, so several threads call it.
+struct BatchStep {
+    std::function<void(std::span<PipelineItem* const>)> work = {};
+    std::size_t most = 1;
+};
 
 class FramePipeline {
   public:
     using Source = std::function<PipelineItemPtr()>;    // null at the end; called from one thread
     using Worker = std::function<void(PipelineItem&)>;  // each is called from one thread
 
-    FramePipeline(Source source, std::vector<Worker> workers);
+    FramePipeline(Source source, std::vector<Worker> workers, BatchStep batch = {});
     ~FramePipeline();  // stops at the next frame
     FramePipeline(const FramePipeline&) = delete;
     FramePipeline& operator=(const FramePipeline&) = delete;
@@ -42,7 +52,7 @@ class FramePipeline {
     PipelineItemPtr Next();
 
   private:
-    enum class Stage { kWaiting, kInWork, kDone };
+    enum class Stage { kWaiting, kInWork, kWorked, kInBatch, kDone };
     struct Slot {
         PipelineItemPtr item;
         Stage stage = Stage::kWaiting;
@@ -53,11 +63,17 @@ class FramePipeline {
     void Stop();
     void Fill(const Source& source);
     void Work(const Worker& worker);
-    Slot* FirstWaiting();
+    static void WorkOn(Slot& slot, const Worker& worker);
+    void WorkOn(const std::vector<Slot*>& slots) const;
+    [[nodiscard]] std::vector<Slot*> NextBatch() const;
+    [[nodiscard]] bool Has(Stage stage) const;
+    [[nodiscard]] bool IsFull() const;
+    [[nodiscard]] Slot* FirstWaiting() const;
 
     std::mutex m_mutex;
     std::condition_variable m_changed;
     std::deque<std::shared_ptr<Slot>> m_slots;
+    BatchStep m_batch;
     std::size_t m_capacity;
     bool m_isStopping = false;
     bool m_isFilled = false;         // the source has ended

@@ -1,8 +1,8 @@
 #include "programs/reelfx/pipeline/frame_worker.h"
 
 #include <cstring>
+#include <utility>
 
-#include "programs/common/digest.h"
 #include "programs/reelfx/pictures/matte.h"
 #include "programs/reelfx/media/picture_turn.h"
 
@@ -19,18 +19,29 @@ bool IsSame(const BgraPicture& a, const BgraPicture& b) {
 }  // namespace
 
 FrameWorker::FrameWorker(EffectListSession session, const Job& job)
-    : m_effects(std::move(session)), m_job(job), m_source(job.size.width, job.size.height, job.samples) {
+    : m_effects(std::move(session)), m_job(job) {
+    if (!job.digests) m_source = BgraPicture(job.size.width, job.size.height, job.samples);
     if (job.isMatte) m_effects.KeepDamageOnly();
 }
 
 void FrameWorker::Work(PipelineItem& item) {
-    const BgraPicture& result = Result(item);
-    if (m_job.withDigest) {
-        const BgraPicture& stored = AsStored(result);
-        item.digest = FrameDigest(stored.Row(0), static_cast<std::int32_t>(stored.RowBytes() / 4),
-                                  stored.Height(), stored.Stride());
+    if (m_job.digests) {
+        m_source = m_job.digests->Take(m_job.size.width, m_job.size.height, m_job.samples);
+        m_result = m_job.digests->Take(m_job.size.width, m_job.size.height, m_job.samples);
     }
-    if (!m_job.writer) return;
+    BgraPicture& result = Result(item);
+    if (m_job.writer)
+        Replace(item, result);
+    else
+        item.frame.reset();
+    if (!m_job.digests) return;
+    // Pictures in line for their digests and those of workers at rest would otherwise add up.
+    BgraPicture& stored = AsStored(result);
+    item.picture = std::exchange(stored, BgraPicture());
+    m_job.digests->GiveBack(&stored == &m_source ? m_result : m_source);
+}
+
+void FrameWorker::Replace(PipelineItem& item, const BgraPicture& result) {
     // An unchanged frame keeps its own samples, including those that the picture cannot hold.
     if (!m_job.isMatte && &result != &m_source && m_job.writer->TakesAsItIs(*item.frame) &&
         IsSame(m_source, result)) {
@@ -68,7 +79,7 @@ bool FrameWorker::StaysUpright() const {
     return !m_job.turn.IsNone() && m_job.writer && m_job.writer->IsUpright();
 }
 
-const BgraPicture& FrameWorker::AsStored(const BgraPicture& result) {
+BgraPicture& FrameWorker::AsStored(BgraPicture& result) {
     if (!StaysUpright()) return result;
     TurnPicture(result, m_job.turn.Back(), m_source);
     return m_source;

@@ -2,11 +2,14 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <atomic>
 #include <chrono>
 #include <stdexcept>
 
+#include "programs/common/digest.h"
 #include "programs/reelfx/media/picture_turn.h"
+#include "programs/reelfx/pipeline/frame_digests.h"
 #include "programs/reelfx/common/progress.h"
 
 namespace velmora::hosts {
@@ -39,6 +42,61 @@ TEST(FramePipeline, KeepsTheOrderWithAnyNumberOfWorkers) {
             EXPECT_EQ(item->digest, item->packet ? "" : std::to_string(i));
         }
         EXPECT_FALSE(pipeline.Next());
+    }
+}
+
+TEST(FramePipeline, GathersItemsForASecondStep) {
+    for (const std::size_t workers : {1u, 3u}) {
+        const BatchStep batch = {[&](std::span<PipelineItem* const> items) {
+                                     EXPECT_LE(items.size(), 4U);
+                                     for (PipelineItem* const item : items) item->digest += "!";
+                                 },
+                                 4};
+        FramePipeline pipeline(Counting(50), std::vector<FramePipeline::Worker>(workers, WorkUnevenly),
+                               batch);
+        for (std::int64_t i = 0; i < 50; ++i) {
+            const PipelineItemPtr item = pipeline.Next();
+            EXPECT_EQ(item->digest, item->packet ? "" : std::to_string(i) + "!");
+        }
+        EXPECT_FALSE(pipeline.Next());
+    }
+}
+
+// Item 3 waits for so many later ones that the queue is full of finished items behind it.
+TEST(FramePipeline, GathersFewerThanAskedRatherThanStop) {
+    std::atomic<bool> isLate = false;
+    const auto work = [&](PipelineItem& item) {
+        if (item.index == 8) isLate = true;
+        while (item.index == 3 && !isLate) std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    };
+    const auto source = [next = std::int64_t{0}]() mutable -> PipelineItemPtr {
+        auto item = std::make_unique<PipelineItem>();
+        item->index = next++;
+        return next > 20 ? nullptr : std::move(item);
+    };
+    FramePipeline pipeline(source, {work, work}, {[](std::span<PipelineItem* const>) {}, 4});
+    for (std::int64_t i = 0; i < 20; ++i) EXPECT_EQ(pipeline.Next()->index, i);
+    EXPECT_FALSE(pipeline.Next());
+}
+
+TEST(FrameDigests, AreThoseOfSinglePictures) {
+    FrameDigests digests;
+    for (const std::int32_t width : {1, 7, 13, 16, 29}) {  // ends of rows and of messages anywhere in a block
+        for (std::size_t count = 1; count <= FrameDigests::kBatch; ++count) {
+            PipelineItem items[FrameDigests::kBatch];
+            PipelineItem* const places[] = {&items[0], &items[1], &items[2]};
+            std::vector<std::string> expected;
+            for (std::size_t i = 0; i < count; ++i) {
+                BgraPicture picture = digests.Take(width, 9);
+                for (std::int32_t y = 0; y < 9; ++y)
+                    std::fill_n(picture.Row(y), width * 4,
+                                static_cast<std::uint8_t>(y * 50 + width + static_cast<int>(i)));
+                expected.push_back(FrameDigest(picture.Row(0), width, 9, picture.Stride()));
+                items[i].picture = std::move(picture);
+            }
+            digests.Compute(std::span(places).first(count));
+            for (std::size_t i = 0; i < count; ++i) EXPECT_EQ(items[i].digest, expected[i]);
+        }
     }
 }
 
