@@ -9,6 +9,7 @@
 extern "C" {
 #include <libavcodec/avcodec.h>
 #include <libavformat/avformat.h>
+#include <libavutil/buffer.h>
 #include <libavutil/frame.h>
 #include <libavutil/mem.h>
 #include <libswresample/swresample.h>
@@ -23,11 +24,13 @@ struct AvDelete {
     void operator()(AVCodecContext* codec) const { avcodec_free_context(&codec); }
     void operator()(SwsContext* scaler) const { sws_freeContext(scaler); }
     void operator()(SwrContext* resampler) const { swr_free(&resampler); }
+    void operator()(AVBufferPool* pool) const { av_buffer_pool_uninit(&pool); }  // after the last buffer's return
 };
 using FramePtr = std::unique_ptr<AVFrame, AvDelete>;
 using PacketPtr = std::unique_ptr<AVPacket, AvDelete>;
 using CodecPtr = std::unique_ptr<AVCodecContext, AvDelete>;
 using ScalerPtr = std::unique_ptr<SwsContext, AvDelete>;
+using BufferPoolPtr = std::unique_ptr<AVBufferPool, AvDelete>;
 using ResamplerPtr = std::unique_ptr<SwrContext, AvDelete>;
 
 // Throws std::bad_alloc for null: the libraries' allocators fail for no other reason.

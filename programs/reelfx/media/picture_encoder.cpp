@@ -13,6 +13,7 @@
 #include "programs/reelfx/media/pixel_converter.h"
 
 extern "C" {
+#include <libavutil/imgutils.h>
 #include <libavutil/opt.h>
 #include <libavutil/pixdesc.h>
 }
@@ -45,6 +46,22 @@ bool HasAlpha(const MediaReader& source) {
         }
     }
     return false;
+}
+
+// Encoders' vector code reads whole vectors and blocks of 32 rows.
+constexpr int kRowAlignment = 64;
+int PaddedHeight(const AVCodecContext& encoder) {
+    return FFALIGN(encoder.height, 32);
+}
+
+// Memory for all planes of a frame. Results are made by one thread and freed by another: the system's allocator would
+// either ask for new pages for each frame or keep those of many.
+BufferPoolPtr FramesFor(const AVCodecContext& encoder) {
+    const int size =
+        av_image_get_buffer_size(encoder.pix_fmt, encoder.width, PaddedHeight(encoder), kRowAlignment);
+    if (size < 0) throw std::bad_alloc();
+    return Allocated<BufferPoolPtr>(
+        av_buffer_pool_init(static_cast<std::size_t>(size) + kRowAlignment, nullptr));
 }
 
 // Side data that still holds for a picture that is encoded anew. Others describe the source's own stream.
@@ -80,6 +97,7 @@ PictureEncoder::PictureEncoder(const OutputOptions& options, const AVOutputForma
                                        std::to_string(m_encoder->height) + " " +
                                        av_get_pix_fmt_name(m_encoder->pix_fmt) + ErrorWords(error));
     }
+    m_buffers = FramesFor(*m_encoder);
     if (!said.empty()) m_notes.push_back(std::string(codec.name) + ": " + said);
     if (!options.needsAlpha) NoteLosses(container);
 }
@@ -227,7 +245,10 @@ FramePtr PictureEncoder::NewResult(const AVFrame& source) const {
     frame->width = m_encoder->width;
     frame->height = m_encoder->height;
     frame->format = m_encoder->pix_fmt;
-    if (av_frame_get_buffer(frame.get(), 0) < 0) throw std::bad_alloc();
+    frame->buf[0] = av_buffer_pool_get(m_buffers.get());
+    if (!frame->buf[0]) throw std::bad_alloc();
+    av_image_fill_arrays(frame->data, frame->linesize, frame->buf[0]->data, m_encoder->pix_fmt, frame->width,
+                         PaddedHeight(*m_encoder), kRowAlignment);
     frame->color_range = m_encoder->color_range;
     frame->colorspace = m_encoder->colorspace;
     frame->chroma_location = m_encoder->chroma_sample_location;

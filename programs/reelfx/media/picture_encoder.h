@@ -45,6 +45,7 @@ class PictureEncoder {
 
     const MediaReader& m_source;
     CodecPtr m_encoder;
+    BufferPoolPtr m_buffers;  // of results
     bool m_isUpright = false;
     bool m_hasConstantRate = false;
     bool m_isMovFamily = false;
