@@ -5,10 +5,18 @@
 
 namespace velmora::hosts {
 
+namespace {
+
+// Enough items that no worker waits for another, few enough that large frames fit into memory. Those that wait for a
+// second step are larger, and one worker in five is busy with it.
+std::size_t CapacityFor(std::size_t workers, const BatchStep& batch) {
+    return batch.work ? std::max(workers + workers / 2 + 2, batch.most) : 2 * workers + 2;
+}
+
+}  // namespace
+
 FramePipeline::FramePipeline(Source source, std::vector<Worker> workers, BatchStep batch)
-    : m_batch(std::move(batch)),
-      // Enough that no worker waits for another, few enough that large frames fit into memory.
-      m_capacity(std::max(2 * workers.size() + 2, m_batch.most)) {
+    : m_batch(std::move(batch)), m_capacity(CapacityFor(workers.size(), m_batch)) {
     try {
         Start(std::move(source), workers);
     } catch (...) {

@@ -66,7 +66,7 @@ TEST(FramePipeline, GathersItemsForASecondStep) {
 TEST(FramePipeline, GathersFewerThanAskedRatherThanStop) {
     std::atomic<bool> isLate = false;
     const auto work = [&](PipelineItem& item) {
-        if (item.index == 8) isLate = true;
+        if (item.index == 7) isLate = true;
         while (item.index == 3 && !isLate) std::this_thread::sleep_for(std::chrono::milliseconds(1));
     };
     const auto source = [next = std::int64_t{0}]() mutable -> PipelineItemPtr {
