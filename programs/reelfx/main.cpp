@@ -6,8 +6,8 @@
 #include <system_error>
 
 #include "text/number_text.h"
-#include "programs/reelfx/commands/command_line.h"
-#include "programs/reelfx/common/interrupt.h"
+#include "programs/reelfx/commands/commands.h"
+#include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/library_log.h"
 
 int main(int count, char** arguments) {

@@ -9,7 +9,7 @@
 #include <vector>
 
 #include "text/number_text.h"
-#include "programs/reelfx/commands/command_line.h"
+#include "programs/reelfx/commands/commands.h"
 #include "programs/reelhost/host_options.h"
 #include "tests/fuzz/fuzz_input.h"
 

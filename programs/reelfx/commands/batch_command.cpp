@@ -1,4 +1,4 @@
-#include "programs/reelfx/commands/batch_command.h"
+#include "programs/reelfx/commands/commands.h"
 
 #include <cstdio>
 #include <exception>
@@ -7,7 +7,7 @@
 #include <nlohmann/json.hpp>
 
 #include "text/number_text.h"
-#include "programs/reelfx/common/interrupt.h"
+#include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/output_place.h"
 #include "programs/reelfx/pipeline/effect_list.h"
 

@@ -1,4 +1,4 @@
-#include "programs/reelfx/commands/command_line.h"
+#include "programs/reelfx/commands/commands.h"
 
 #include <CLI/CLI.hpp>
 

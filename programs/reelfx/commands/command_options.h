@@ -5,15 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/commands/info_command.h"
-#include "programs/reelfx/commands/list_command.h"
-#include "programs/reelfx/commands/picture_commands.h"
-#include "programs/reelfx/commands/preset_command.h"
-#include "programs/reelfx/commands/presets_command.h"
-#include "programs/reelfx/commands/render_command.h"
-#include "programs/reelfx/commands/strip_command.h"
-#include "programs/reelfx/commands/studio_command.h"
+#include "programs/reelfx/commands/commands.h"
 
 namespace CLI {
 class App;

@@ -1,4 +1,4 @@
-#include "programs/reelfx/commands/info_command.h"
+#include "programs/reelfx/commands/commands.h"
 
 #include <cstdio>
 #include <nlohmann/json.hpp>

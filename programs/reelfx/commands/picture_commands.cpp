@@ -1,10 +1,9 @@
-#include "programs/reelfx/commands/picture_commands.h"
+#include "programs/reelfx/commands/commands.h"
 
-#include "programs/reelfx/common/interrupt.h"
-#include "programs/reelfx/pictures/picture_grid.h"
-#include "programs/reelfx/media/picture_turn.h"
+#include "programs/reelfx/common/failure.h"
+#include "programs/reelfx/pictures/still.h"
+#include "programs/reelfx/media/bgra_picture.h"
 #include "programs/reelfx/media/pixel_converter.h"
-#include "programs/reelfx/pictures/still_writer.h"
 #include <filesystem>
 #include <optional>
 #include <utility>

@@ -1,11 +1,11 @@
-#include "programs/reelfx/commands/preset_command.h"
+#include "programs/reelfx/commands/commands.h"
 
 #include <cstdio>
 #include <filesystem>
 #include <nlohmann/json.hpp>
 
 #include "text/number_text.h"
-#include "programs/reelfx/common/preset_io.h"
+#include "programs/reelfx/common/effect_choice.h"
 
 namespace velmora::hosts {
 namespace {

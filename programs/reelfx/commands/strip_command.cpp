@@ -1,4 +1,4 @@
-#include "programs/reelfx/commands/strip_command.h"
+#include "programs/reelfx/commands/commands.h"
 
 #include <algorithm>
 #include <cstring>
@@ -7,8 +7,7 @@
 
 #include "text/number_text.h"
 #include "programs/reelfx/common/output_place.h"
-#include "programs/reelfx/pictures/picture_grid.h"
-#include "programs/reelfx/pictures/still_writer.h"
+#include "programs/reelfx/pictures/still.h"
 
 namespace velmora::hosts {
 namespace {

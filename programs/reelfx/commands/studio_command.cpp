@@ -1,10 +1,11 @@
-#include "programs/reelfx/commands/studio_command.h"
+#include "programs/reelfx/commands/commands.h"
 
 #include <spawn.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
 #include <cstdio>
+#include <filesystem>
 #include <string>
 
 namespace velmora::hosts {
@@ -22,8 +23,8 @@ bool Open(const std::filesystem::path& page) {
     return waitpid(child, &status, 0) == child && WIFEXITED(status) && WEXITSTATUS(status) == 0;
 }
 
-}  // namespace
-
+// The page beside a program: in share/ below the program's folder, as the tarball has it, or below the folder above, as
+// installed. Empty when there is none.
 std::filesystem::path StudioPage(const std::filesystem::path& program) {
     const std::filesystem::path folder = program.parent_path();
     for (const std::filesystem::path& root : {folder, folder.parent_path()}) {
@@ -32,6 +33,8 @@ std::filesystem::path StudioPage(const std::filesystem::path& program) {
     }
     return {};
 }
+
+}  // namespace
 
 ExitCode Run(const StudioOptions& options) {
     std::error_code error;

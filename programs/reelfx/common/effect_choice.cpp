@@ -6,7 +6,6 @@
 #include "effects/effect_queries.h"
 #include "effects/effect_table.h"
 #include "text/number_text.h"
-#include "programs/reelfx/common/preset_io.h"
 
 namespace velmora::hosts {
 namespace {

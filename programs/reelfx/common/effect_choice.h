@@ -1,4 +1,4 @@
-// The effect and settings that a command applies, and the sessions that render it.
+// The effect and settings that a command applies, the sessions that render it, and the preset files that hold settings.
 #pragma once
 
 #include <cstdint>
@@ -8,6 +8,7 @@
 #include <utility>
 #include <vector>
 
+#include "api/host_api.h"
 #include "effects/effect_session.h"
 #include "programs/common/effect_info.h"
 #include "programs/common/settings.h"
@@ -73,5 +74,23 @@ class EffectChoice {
     std::vector<TimedSetting> m_settings;
     TimedSetting m_mix;
 };
+
+// Preset files on the command line: read, checked against an effect, and written (preset_io.cpp).
+
+// Throws Failure (kExitInput) when the file cannot be read or is not a preset.
+PresetRecord LoadPresetFile(const std::string& path);
+
+// The record's texts and values; names end at a zero or at the end of their field.
+std::string PresetName(const PresetRecord& record);
+std::string PresetEffect(const PresetRecord& record);
+
+// The record's values for the effect's parameters. Throws Failure (kExitInput) when the preset belongs to
+// another effect or library; `path` is for the message.
+std::vector<Setting> PresetSettings(const PresetRecord& record, const EffectInfo& effect,
+                                    const std::string& path);
+
+// `values` are stored forms in the effect's parameter order. Throws Failure (kExitOutput).
+void SavePresetFile(const std::string& path, const std::string& name, const EffectInfo& effect,
+                    const std::vector<ValueWord>& values, bool mayOverwrite);
 
 }  // namespace velmora::hosts

@@ -1,4 +1,5 @@
-// How a command ends: the exit codes, and the exception that carries one with its single line of text.
+// How a command ends: the exit codes, the exception that carries one with its single line of text, and the signals that
+// interrupt it.
 #pragma once
 
 #include <cerrno>
@@ -30,5 +31,17 @@ class Failure : public std::runtime_error {
 inline std::string SystemReason() {
     return errno == 0 ? std::string() : std::string(": ") + std::strerror(errno);
 }
+
+// SIGINT, SIGTERM, SIGHUP, broken pipes and closed standard streams (interrupt.cpp). The first signal asks the running
+// command to finish what it has begun, the second to give up at once; the third ends the program immediately.
+
+// Puts something that can neither be read nor written in the place of each standard stream that the caller has closed.
+// Files that are opened later would else get their numbers, and messages would be written into them. Called before
+// anything is opened.
+void OccupyStandardStreams();
+// Installs the handlers; called once at the start of the program.
+void WatchInterrupts();
+// The number of signals so far.
+int Interrupts();
 
 }  // namespace velmora::hosts

@@ -1,4 +1,4 @@
-#include "programs/reelfx/common/interrupt.h"
+#include "programs/reelfx/common/failure.h"
 
 #include <atomic>
 #include <csignal>

@@ -1,4 +1,4 @@
-#include "programs/reelfx/common/preset_io.h"
+#include "programs/reelfx/common/effect_choice.h"
 
 #include <algorithm>
 #include <filesystem>

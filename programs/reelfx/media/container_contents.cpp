@@ -1,4 +1,4 @@
-#include "programs/reelfx/media/container_contents.h"
+#include "programs/reelfx/media/container.h"
 
 #include <algorithm>
 #include <initializer_list>

@@ -7,7 +7,7 @@
 
 #include "text/number_text.h"
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/media/container_contents.h"
+#include "programs/reelfx/media/container.h"
 #include "programs/reelfx/media/pixel_converter.h"
 
 extern "C" {

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 #include <optional>
 #include <string>
 
@@ -36,5 +37,15 @@ bool CanBeReadTwice(const std::string& path);
 // True if a file ends before the length that its own header gives, or inside a packet of a format whose packets have
 // one size. Only for formats whose readers do not report it: Matroska, AVI and MPEG-TS.
 bool EndsEarly(const std::string& path, const std::string& format);
+
+// Standard input, read so that a signal ends the wait (standard_input.cpp).
+
+struct CloseInputStream {
+    void operator()(AVIOContext* stream) const;
+};
+using InputStreamPtr = std::unique_ptr<AVIOContext, CloseInputStream>;
+
+// Throws std::bad_alloc.
+InputStreamPtr OpenStandardInput();
 
 }  // namespace velmora::hosts

@@ -2,7 +2,7 @@
 
 #include <algorithm>
 
-#include "programs/reelfx/media/picture_turn.h"
+#include "programs/reelfx/media/bgra_picture.h"
 #include "programs/reelfx/media/pixel_converter.h"
 
 extern "C" {
@@ -111,7 +111,8 @@ std::vector<std::string> NotesOn(const MediaFacts& facts) {
     const auto note = [&](bool applies, const std::string& text) {
         if (applies) notes.push_back(text);
     };
-    note(facts.bits > 8, std::to_string(facts.bits) + " bits per channel: the effects work in floating point");
+    note(facts.bits > 8,
+         std::to_string(facts.bits) + " bits per channel: the effects work in floating point");
     note(facts.turn != 0, "rotation tag " + std::to_string(facts.turn) +
                               " degrees: effects are applied to the upright picture");
     note(facts.isMirrored, "mirroring tag: effects are applied to the picture as players show it");

@@ -9,7 +9,6 @@
 #include <string_view>
 
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/common/interrupt.h"
 #include "programs/reelfx/media/library_log.h"
 
 extern "C" {

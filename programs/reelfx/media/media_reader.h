@@ -13,9 +13,8 @@
 
 #include "programs/reelfx/media/av_handles.h"
 #include "programs/reelfx/media/input_address.h"
-#include "programs/reelfx/media/picture_turn.h"
-#include "programs/reelfx/media/standard_input.h"
-#include "programs/reelfx/media/time_line.h"
+#include "programs/reelfx/media/bgra_picture.h"
+#include "programs/reelfx/media/frame_times.h"
 
 namespace velmora::hosts {
 

@@ -5,10 +5,9 @@
 #include <iterator>
 
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/media/container_contents.h"
+#include "programs/reelfx/media/container.h"
 #include "programs/reelfx/media/exif.h"
 #include "programs/reelfx/media/library_log.h"
-#include "programs/reelfx/media/tags.h"
 
 extern "C" {
 #include <libavutil/pixdesc.h>

@@ -10,7 +10,7 @@
 
 #include "programs/reelfx/media/av_handles.h"
 #include "programs/reelfx/media/encoder_choice.h"
-#include "programs/reelfx/media/frame_clock.h"
+#include "programs/reelfx/media/frame_times.h"
 #include "programs/reelfx/media/media_reader.h"
 #include "programs/reelfx/media/other_streams.h"
 #include "programs/reelfx/media/picture_encoder.h"

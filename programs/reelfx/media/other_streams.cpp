@@ -5,8 +5,7 @@
 #include <utility>
 
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/media/container_contents.h"
-#include "programs/reelfx/media/tags.h"
+#include "programs/reelfx/media/container.h"
 
 namespace velmora::hosts {
 namespace {

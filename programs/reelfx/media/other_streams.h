@@ -10,8 +10,7 @@
 
 #include "programs/reelfx/media/av_handles.h"
 #include "programs/reelfx/media/media_reader.h"
-#include "programs/reelfx/media/sound_transcoder.h"
-#include "programs/reelfx/media/subtitle_converter.h"
+#include "programs/reelfx/media/transcoders.h"
 
 namespace velmora::hosts {
 

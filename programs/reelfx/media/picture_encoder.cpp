@@ -7,7 +7,7 @@
 #include <utility>
 
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/media/container_contents.h"
+#include "programs/reelfx/media/container.h"
 #include "programs/reelfx/media/hdr_metadata.h"
 #include "programs/reelfx/media/library_log.h"
 #include "programs/reelfx/media/pixel_converter.h"

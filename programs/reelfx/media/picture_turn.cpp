@@ -1,8 +1,10 @@
-#include "programs/reelfx/media/picture_turn.h"
+#include "programs/reelfx/media/bgra_picture.h"
 
 #include <cstdlib>
 #include <cstring>
 #include <string>
+
+#include "programs/reelfx/media/av_handles.h"
 
 namespace velmora::hosts {
 namespace {

@@ -1,4 +1,4 @@
-#include "programs/reelfx/media/sound_transcoder.h"
+#include "programs/reelfx/media/transcoders.h"
 
 #include <algorithm>
 

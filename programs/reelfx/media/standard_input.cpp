@@ -1,11 +1,11 @@
-#include "programs/reelfx/media/standard_input.h"
+#include "programs/reelfx/media/input_address.h"
 
 #include <cerrno>
 #include <new>
 #include <poll.h>
 #include <unistd.h>
 
-#include "programs/reelfx/common/interrupt.h"
+#include "programs/reelfx/common/failure.h"
 
 extern "C" {
 #include <libavutil/error.h>

@@ -1,9 +1,9 @@
-#include "programs/reelfx/media/subtitle_converter.h"
+#include "programs/reelfx/media/transcoders.h"
 
 #include <vector>
 
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/media/container_contents.h"
+#include "programs/reelfx/media/container.h"
 
 namespace velmora::hosts {
 namespace {

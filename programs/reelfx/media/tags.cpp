@@ -1,4 +1,4 @@
-#include "programs/reelfx/media/tags.h"
+#include "programs/reelfx/media/container.h"
 
 #include <algorithm>
 #include <cstdlib>

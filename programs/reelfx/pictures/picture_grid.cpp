@@ -1,4 +1,4 @@
-#include "programs/reelfx/pictures/picture_grid.h"
+#include "programs/reelfx/pictures/still.h"
 
 #include <algorithm>
 #include <cairo.h>

@@ -1,4 +1,4 @@
-#include "programs/reelfx/pictures/still_writer.h"
+#include "programs/reelfx/pictures/still.h"
 
 #include <filesystem>
 #include <fstream>

@@ -5,8 +5,7 @@
 
 #include "text/number_text.h"
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/common/interrupt.h"
-#include "programs/reelfx/media/picture_turn.h"
+#include "programs/reelfx/media/bgra_picture.h"
 #include "programs/reelfx/media/pixel_converter.h"
 
 namespace velmora::hosts {

@@ -5,7 +5,7 @@
 #include <cstring>
 
 #include "text/number_text.h"
-#include "programs/reelfx/common/interrupt.h"
+#include "programs/reelfx/common/failure.h"
 
 extern "C" {
 #include <libavutil/intreadwrite.h>

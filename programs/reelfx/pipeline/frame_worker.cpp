@@ -4,7 +4,7 @@
 #include <utility>
 
 #include "programs/reelfx/pictures/matte.h"
-#include "programs/reelfx/media/picture_turn.h"
+#include "programs/reelfx/media/bgra_picture.h"
 
 namespace velmora::hosts {
 namespace {

@@ -9,7 +9,6 @@
 #include "programs/reelfx/pipeline/frame_digests.h"
 #include "programs/reelfx/pipeline/frame_pipeline.h"
 #include "programs/reelfx/media/media_writer.h"
-#include "programs/reelfx/media/picture_turn.h"
 #include "programs/reelfx/media/pixel_converter.h"
 
 namespace velmora::hosts {

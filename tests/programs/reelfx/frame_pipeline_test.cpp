@@ -8,7 +8,7 @@
 #include <stdexcept>
 
 #include "programs/common/digest.h"
-#include "programs/reelfx/media/picture_turn.h"
+#include "programs/reelfx/media/bgra_picture.h"
 #include "programs/reelfx/pipeline/frame_digests.h"
 #include "programs/reelfx/common/progress.h"
 

@@ -1,7 +1,8 @@
-// Encodes the sound of a source stream with another codec when the output's container does not support its
-// own.
+// Streams that change their codec because the output's container does not hold their own: sound and text subtitles. The
+// picture has an encoder of its own (picture_encoder.h).
 #pragma once
 
+#include <cstdint>
 #include <functional>
 
 #include "programs/reelfx/media/av_handles.h"
@@ -10,6 +11,7 @@ struct AVAudioFifo;
 
 namespace velmora::hosts {
 
+// Sound, from the source's codec to another.
 class SoundTranscoder {
   public:
     using Sink = std::function<void(AVPacket&)>;  // times in the encoder's time base
@@ -36,6 +38,28 @@ class SoundTranscoder {
     ResamplerPtr m_resampler;
     AVAudioFifo* m_fifo = nullptr;
     std::int64_t m_nextPts = AV_NOPTS_VALUE;  // of the oldest sample in the queue, in samples
+};
+
+// Text subtitles, from the format of one container to that of another.
+class SubtitleConverter {
+  public:
+    using Sink = std::function<void(AVPacket&)>;  // times in TimeBase
+
+    // The text format that `format` holds for this source; AV_CODEC_ID_NONE if there is none or the subtitles are
+    // pictures.
+    static AVCodecID TargetOf(const AVStream& source, const AVOutputFormat& format);
+
+    // Throws Failure (kExitOutput) when a codec cannot be opened.
+    SubtitleConverter(const AVStream& source, AVCodecID target);
+
+    [[nodiscard]] const AVCodecContext& Encoder() const { return *m_encoder; }
+    void Send(const AVPacket& packet, const Sink& sink);
+
+    static constexpr AVRational kTimeBase = {1, 1000};
+
+  private:
+    AVRational m_sourceBase;
+    CodecPtr m_decoder, m_encoder;
 };
 
 }  // namespace velmora::hosts

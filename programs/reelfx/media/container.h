@@ -1,0 +1,49 @@
+// Containers, the formats of media files: what they can hold, and the texts and chapters that they carry.
+#pragma once
+
+#include <cstdint>
+#include <optional>
+
+#include "programs/reelfx/media/av_handles.h"
+
+namespace velmora::hosts {
+
+// What a container can hold (container_contents.cpp): by what the libraries say, and where they do not say it by trying to
+// write a header.
+
+// True if streams of the codec can be stored, as far as that depends on the codec alone.
+bool CanHold(const AVOutputFormat& format, AVCodecID codec);
+
+// True if a file of the format can begin with this picture and this other stream.
+bool CanBegin(const AVOutputFormat& format, const AVCodecParameters& picture, const AVStream& other);
+
+// True for containers that can say how players must turn the picture.
+bool HoldsTurn(const AVOutputFormat& format);
+
+// True if players learn from the container or the codec that values have full range.
+bool HoldsRange(const AVOutputFormat& format, AVCodecID codec);
+
+bool IsMovFamily(const AVOutputFormat& format);
+
+// False for formats of nothing but pictures.
+bool HoldsOtherStreams(const AVOutputFormat& format);
+
+// Names, dates and other text that containers hold, and chapters, as they go from a source to an output (tags.cpp).
+
+// Without what describes the source's own file.
+void CopyContainerTags(const AVFormatContext& from, AVFormatContext& to);
+// `isEncodedAnew`: without what describes the source's own encoding.
+void CopyStreamTags(const AVStream& from, AVStream& to, bool isEncodedAnew);
+
+// The part of the source that is written, in seconds of the source's clock.
+struct TagSpan {
+    double origin = 0.0;        // becomes 0
+    double begin = 0.0;         // chapters that end before are left out
+    std::optional<double> end;  // the end of the source if not given
+};
+void CopyChapters(const AVFormatContext& from, const TagSpan& span, AVFormatContext& to);
+
+// Moves the time code in `tags`, if there is one, by a number of frames.
+void MoveTimecode(AVDictionary*& tags, AVRational rate, std::int64_t frames);
+
+}  // namespace velmora::hosts
