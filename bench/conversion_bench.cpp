@@ -11,8 +11,7 @@
 #include <random>
 #include <stdexcept>
 
-#include "bench/conversion_candidates.h"
-#include "bench/conversion_reference.h"
+#include "bench/conversion.h"
 
 namespace velmora::bench {
 namespace {

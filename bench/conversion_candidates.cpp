@@ -1,4 +1,4 @@
-#include "bench/conversion_candidates.h"
+#include "bench/conversion.h"
 
 #include "programs/reelfx/media/pixel_converter.h"
 

@@ -1,4 +1,4 @@
-#include "bench/conversion_reference.h"
+#include "bench/conversion.h"
 
 #include <algorithm>
 #include <cmath>

@@ -5,7 +5,7 @@
 #include <array>
 #include <stdexcept>
 
-#include "bench/conversion_candidates.h"
+#include "bench/conversion.h"
 #include "programs/reelfx/conversion/frame_coding.h"
 
 namespace velmora::bench {

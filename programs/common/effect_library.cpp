@@ -2,10 +2,18 @@
 
 #include <stdexcept>
 
-#include "programs/common/library_file.h"
+#include "text/code_page.h"
 
 namespace velmora::hosts {
 namespace {
+
+constexpr wchar_t kFileName[] = L"VMReelEffects.dll";
+
+std::wstring BesideThisProgram() {
+    std::wstring path(32768, L'\0');
+    path.resize(GetModuleFileNameW(nullptr, path.data(), static_cast<DWORD>(path.size())));
+    return path.substr(0, path.find_last_of(L"\\/") + 1) + kFileName;
+}
 
 // A library that describes for ever is not followed.
 constexpr std::uint32_t kMostParams = kPresetCellCapacity, kMostPresets = 1000, kMostEffects = 100;
@@ -27,6 +35,16 @@ EffectInfo Describe(IVideoEffect& effect) {
 }
 
 }  // namespace
+
+std::wstring LibraryFile(const std::wstring& path) {
+    return path.empty() ? BesideThisProgram() : path;
+}
+
+std::wstring LibraryFile(const std::string& path) {
+    if (path.empty()) return BesideThisProgram();
+    const std::u16string wide = Widen(path);
+    return {wide.begin(), wide.end()};
+}
 
 EffectLibrary::EffectLibrary(const std::string& path) : EffectLibrary(LibraryFile(path)) {}
 

@@ -1,4 +1,5 @@
-// VMReelEffects.dll as an editor has it: loaded by LoadLibrary, used through its exports and interfaces alone.
+// VMReelEffects.dll as an editor has it: found beside the program, loaded by LoadLibrary, used through its exports and
+// interfaces alone. Windows only.
 #pragma once
 
 #include <cstdint>
@@ -12,6 +13,12 @@
 #include <windows.h>
 
 namespace velmora::hosts {
+
+// The file of the library. `path` is in the system's code page, as the command line gave it; empty: VMReelEffects.dll
+// beside this program.
+[[nodiscard]] std::wstring LibraryFile(const std::string& path);
+// The same for a path in 16-bit text.
+[[nodiscard]] std::wstring LibraryFile(const std::wstring& path);
 
 class EffectLibrary {
   public:

@@ -6,7 +6,7 @@
 #include "programs/reelcheck/fail_each.h"
 #include "programs/reelcheck/library.h"
 #include "programs/reelcheck/playing_host.h"
-#include "programs/reelcheck/process_figures.h"
+#include "programs/reelcheck/system.h"
 
 namespace velmora::reelcheck {
 namespace {

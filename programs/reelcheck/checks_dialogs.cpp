@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cstring>
 #include <filesystem>
+#include <random>
 #include <string>
 
 #include "programs/reelcheck/checks.h"
@@ -13,6 +14,31 @@
 
 namespace velmora::reelcheck {
 namespace {
+
+// A folder for this process's files; removed with its contents.
+class WorkFolder {
+  public:
+    WorkFolder() {
+        const std::filesystem::path base = std::filesystem::temp_directory_path();
+        std::random_device random;
+        std::filesystem::path folder;
+        do {
+            folder = base / ("reelcheck-" + std::to_string(random()));
+        } while (!std::filesystem::create_directory(folder));
+        m_folder = folder.string();
+    }
+    ~WorkFolder() {
+        std::error_code ignored;
+        std::filesystem::remove_all(m_folder, ignored);
+    }
+    WorkFolder(const WorkFolder&) = delete;
+    WorkFolder& operator=(const WorkFolder&) = delete;
+
+    [[nodiscard]] std::string PathOf(const char* name) const { return m_folder + "/" + name; }
+
+  private:
+    std::string m_folder;
+};
 
 // The system's XML library on native systems can leak the tree that it is reading; the product has its own, fixed XML
 // code.

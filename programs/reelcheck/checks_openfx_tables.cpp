@@ -7,7 +7,7 @@
 #include "effects/effect_names.h"
 #include "programs/reelcheck/checks.h"
 #include "programs/reelcheck/openfx_host.h"
-#include "programs/reelcheck/process_figures.h"
+#include "programs/reelcheck/system.h"
 #include "text/names.h"
 
 namespace velmora::reelcheck {

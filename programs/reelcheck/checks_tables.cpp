@@ -6,7 +6,7 @@
 #include <set>
 
 #include "programs/reelcheck/checks.h"
-#include "programs/reelcheck/guarded_memory.h"
+#include "programs/reelcheck/system.h"
 #include "programs/reelcheck/library.h"
 #include "programs/reelcheck/playing_host.h"
 

@@ -1,6 +1,7 @@
 // Runs this program again in a child process, which may crash or hang without affecting the parent.
 #pragma once
 
+#include <chrono>
 #include <memory>
 #include <string>
 #include <vector>
@@ -31,6 +32,24 @@ class ChildProcess {
     std::unique_ptr<System> m_system;
     std::string m_read;
 };
+
+inline ChildProcess::Read ChildProcess::ReadLine(std::string& line, double seconds) {
+    using Clock = std::chrono::steady_clock;
+    const auto end = Clock::now() + std::chrono::duration<double>(seconds);
+    bool isOpen = true;
+    for (;;) {
+        const std::size_t length = m_read.find('\n');
+        if (length != std::string::npos) {
+            line = m_read.substr(0, length);
+            if (line.ends_with('\r')) line.pop_back();
+            m_read.erase(0, length + 1);
+            return Read::kLine;
+        }
+        if (!isOpen) return Read::kEnd;
+        if (Clock::now() > end) return Read::kTimeout;
+        isOpen = ReadSome();
+    }
+}
 
 // In the child: a crash ends the process with a line "crash TEXT" on standard output.
 void ReportCrashes();

@@ -40,18 +40,4 @@ class DialogCanceller {
     [[maybe_unused]] void* m_hook;  // null where dialogs are linked in
 };
 
-// A folder for this process's files; removed with its contents.
-class WorkFolder {
-  public:
-    WorkFolder();
-    ~WorkFolder();
-    WorkFolder(const WorkFolder&) = delete;
-    WorkFolder& operator=(const WorkFolder&) = delete;
-
-    [[nodiscard]] std::string PathOf(const char* name) const { return m_folder + "/" + name; }
-
-  private:
-    std::string m_folder;
-};
-
 }  // namespace velmora::reelcheck

@@ -3,8 +3,8 @@
 
 #include <cstdint>
 
-#include "programs/reelcheck/dice.h"
-#include "programs/reelcheck/guarded_memory.h"
+#include "programs/reelcheck/check.h"
+#include "programs/reelcheck/system.h"
 #include "api/host_api.h"
 
 namespace velmora::reelcheck {

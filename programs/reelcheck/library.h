@@ -6,8 +6,16 @@
 #include <string>
 
 #include "api/reference.h"
+#include "programs/reelcheck/check.h"
 
 namespace velmora::reelcheck {
+
+// Takes over the reference to an object that the library gave out. Throws CheckFailed when it gave none.
+template <typename Interface>
+Reference<Interface> Given(Interface* object, const char* what) {
+    if (object == nullptr) Fail(std::string("the library gives no ") + what);
+    return Reference<Interface>::Adopt(object);
+}
 
 // Unloads the library in the destructor. Everything obtained from it must be released first.
 class Library {
@@ -25,7 +33,9 @@ class Library {
     CanUnloadDLLNowFunction canUnload = nullptr;
 
     // A library object. Throws CheckFailed when there is none.
-    [[nodiscard]] Reference<IEffectLibrary> Open() const;
+    [[nodiscard]] Reference<IEffectLibrary> Open() const {
+        return Given(getEffectsLibrary(), "library object");
+    }
 
   private:
     explicit Library(void* module) noexcept;
@@ -46,9 +56,15 @@ class OpenLibrary {
     // Releases the library object; objects it created may stay.
     void Close() noexcept { m_object.Reset(); }
     // Throws CheckFailed when there is none.
-    [[nodiscard]] Reference<IVideoEffect> Effect(std::uint32_t index) const;
-    [[nodiscard]] Reference<IFrameProcessor> Processor() const;
-    [[nodiscard]] Reference<IPresetSaver> Saver() const;
+    [[nodiscard]] Reference<IVideoEffect> Effect(std::uint32_t index) const {
+        return Given(m_object->CreateEffect(index), "effect");
+    }
+    [[nodiscard]] Reference<IFrameProcessor> Processor() const {
+        return Given(m_object->CreateFrameProcessor(), "frame processor");
+    }
+    [[nodiscard]] Reference<IPresetSaver> Saver() const {
+        return Given(m_object->CreatePresetSaver(), "preset saver");
+    }
 
   private:
     Library m_library;

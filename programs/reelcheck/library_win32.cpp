@@ -1,6 +1,6 @@
 #include <windows.h>
 
-#include "programs/common/library_file.h"
+#include "programs/common/effect_library.h"
 #include "programs/reelcheck/check.h"
 #include "programs/reelcheck/library.h"
 

@@ -12,8 +12,8 @@
 #include <vector>
 
 #include "faces/openfx/ofx_api.h"
-#include "programs/reelcheck/dice.h"
-#include "programs/reelcheck/guarded_memory.h"
+#include "programs/reelcheck/check.h"
+#include "programs/reelcheck/system.h"
 
 namespace velmora::reelcheck {
 

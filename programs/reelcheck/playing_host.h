@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "api/host_api.h"
-#include "programs/reelcheck/dice.h"
+#include "programs/reelcheck/check.h"
 #include "programs/reelcheck/frame.h"
 
 namespace velmora::reelcheck {

@@ -8,7 +8,7 @@
 #include <memory>
 #include <vector>
 
-#include "programs/common/library_file.h"
+#include "programs/common/effect_library.h"
 #include "programs/reelview/library/guarded_call_win32.h"
 #include "programs/reelview/base/com_win32.h"
 #include "programs/reelview/window/main_window_win32.h"

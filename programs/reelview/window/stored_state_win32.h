@@ -3,11 +3,36 @@
 
 #include <windows.h>
 
+#include <algorithm>
+#include <cstddef>
 #include <optional>
-
-#include "programs/reelview/document/recent_files.h"
+#include <string>
+#include <utility>
+#include <vector>
 
 namespace velmora::reelview {
+
+// Recently opened files, newest first.
+class RecentFiles {
+  public:
+    static constexpr std::size_t kCount = 8;
+
+    RecentFiles() = default;
+    explicit RecentFiles(std::vector<std::u16string> files) : m_files(std::move(files)) { Cut(); }
+
+    void Add(const std::u16string& file) {
+        Remove(file);
+        m_files.insert(m_files.begin(), file);
+        Cut();
+    }
+    void Remove(const std::u16string& file) { std::erase(m_files, file); }
+    [[nodiscard]] const std::vector<std::u16string>& Files() const { return m_files; }
+
+  private:
+    void Cut() { m_files.resize(std::min(m_files.size(), kCount)); }
+
+    std::vector<std::u16string> m_files;
+};
 
 [[nodiscard]] RecentFiles StoredRecentFiles();
 void StoreRecentFiles(const RecentFiles& files);

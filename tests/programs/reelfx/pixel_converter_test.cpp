@@ -7,7 +7,7 @@
 #include <cstring>
 #include <random>
 
-#include "bench/conversion_reference.h"
+#include "bench/conversion.h"
 
 extern "C" {
 #include <libavutil/pixdesc.h>
