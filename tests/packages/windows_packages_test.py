@@ -165,7 +165,7 @@ def check_installation(installation, packed, expected, place=()):
 
 
 def check_obs(prefix, installation, packed):
-    """Where OBS is installed, setup copies the filters to its plug-ins, unless it is told not to, and takes them away."""
+    """Where OBS is installed, setup copies the filters to its plug-ins, except with /NoObs; the uninstaller removes them."""
     plugins = prefix.drive / "ProgramData/obs-studio/plugins"
     assert not plugins.exists()
     prefix.write_registry("HKLM\\Software\\OBS Studio", "", "C:\\OBS")
