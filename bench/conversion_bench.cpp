@@ -12,6 +12,7 @@
 #include <stdexcept>
 
 #include "bench/conversion.h"
+#include "effects/render_session.h"
 
 namespace velmora::bench {
 namespace {
@@ -258,7 +259,7 @@ int Run(bool withCases) {
     std::vector<Result> results;
     for (const Candidate& candidate : Candidates()) results.push_back(Examine(candidate, kinds, rgb));
     for (const char* level : {"plain", "avx2", "avx512"}) {
-        setenv("VELMORA_FORM", level, 1);
+        setenv(kSimdVariable, level, 1);
         results.push_back(Examine(OwnCandidate(std::string("reelfx, ") + level), kinds, rgb));
     }
     std::printf(

@@ -8,6 +8,7 @@
 #include <random>
 
 #include "bench/conversion.h"
+#include "effects/render_session.h"
 
 extern "C" {
 #include <libavutil/pixdesc.h>
@@ -252,7 +253,7 @@ TEST(PixelConverter, GivesTheSameBytesAtEveryLevel) {
             std::vector<std::uint8_t> pixels;
             std::vector<int> codes;
             for (const char* level : {"plain", "avx2", "avx512"}) {
-                ASSERT_EQ(setenv("VELMORA_FORM", level, 1), 0);
+                ASSERT_EQ(setenv(kSimdVariable, level, 1), 0);
                 const FramePtr frame = FrameOf(test.format, 98, 11, test);
                 FillYcbcr(test, *frame);
                 Picture picture(98, 11, type);
@@ -266,7 +267,7 @@ TEST(PixelConverter, GivesTheSameBytesAtEveryLevel) {
                 if (pixels.empty()) pixels = picture.bytes, codes = found;
                 EXPECT_TRUE(picture.bytes == pixels && found == codes) << level;
             }
-            unsetenv("VELMORA_FORM");
+            unsetenv(kSimdVariable);
         }
     }
 }
