@@ -32,11 +32,11 @@ char16_t* Put(char16_t* out, std::u16string_view text) {
     return std::copy(text.begin(), text.end(), out);
 }
 
-// As much of a label word as fits in `room` characters, without half a surrogate pair at its end.
-std::u16string_view Cut(std::u16string_view word, std::size_t room) {
-    if (word.size() <= room) return word;
-    const bool isSplit = room > 0 && (word[room - 1] & 0xFC00) == 0xD800;
-    return word.substr(0, isSplit ? room - 1 : room);
+// As much of a label word as `capacity` characters hold, without half a surrogate pair at its end.
+std::u16string_view Cut(std::u16string_view word, std::size_t capacity) {
+    if (word.size() <= capacity) return word;
+    const bool isSplit = capacity > 0 && (word[capacity - 1] & 0xFC00) == 0xD800;
+    return word.substr(0, isSplit ? capacity - 1 : capacity);
 }
 
 }  // namespace
@@ -60,8 +60,8 @@ PresetFilter MakePresetFilter(const char* libraryName, std::uint32_t effectIndex
     const std::u16string_view word = labelWord != nullptr ? labelWord : u"Preset Files";
     // Everything but the word: " (*.", ")" and "*.", the extension twice and three terminators.
     PresetFilter filter = {};
-    const std::size_t room = filter.size() - (4 + 1 + 2 + 2 * extension.size() + 3);
-    char16_t* out = Put(Put(Put(Put(filter.data(), Cut(word, room)), u" (*."), extension), u")") + 1;
+    const std::size_t capacity = filter.size() - (4 + 1 + 2 + 2 * extension.size() + 3);
+    char16_t* out = Put(Put(Put(Put(filter.data(), Cut(word, capacity)), u" (*."), extension), u")") + 1;
     Put(Put(out, u"*."), extension);
     return filter;
 }

@@ -10,7 +10,7 @@
 #include "api/reference.h"
 #include "language/lang_parser.h"
 #include "desktop/bit_button.h"
-#include "desktop/options_dialog.h"
+#include "desktop/options.h"
 #include "desktop/resource_ids.h"
 
 namespace velmora::support::test {
@@ -96,7 +96,7 @@ void CheckLayout(HWND dialog) {
         RECT place = {};
         GetWindowRect(child, &place);
         MapWindowPoints(nullptr, dialog, reinterpret_cast<POINT*>(&place), 2);
-        const SIZE room = {place.right - place.left, place.bottom - place.top};
+        const SIZE field = {place.right - place.left, place.bottom - place.top};
         EXPECT_TRUE(place.left >= 0 && place.top >= 0 && place.right <= client.right &&
                     place.bottom <= client.bottom);
         for (const RECT& other : places) {
@@ -107,14 +107,14 @@ void CheckLayout(HWND dialog) {
         constexpr int kButtonBorders = 12;
         const int box = GetSystemMetrics(SM_CXMENUCHECK) + 8;
         const bool isCheckBox = id == VM_CHECK_KNOBS_VERTICAL;
-        const SIZE text = TextSize(child, isCheckBox ? room.cx - box : 0);
+        const SIZE text = TextSize(child, isCheckBox ? field.cx - box : 0);
         if (text.cx == 0) continue;
         const int borders = isCheckBox ? box
                             : id == VM_BUTTON_OK || id == VM_BUTTON_CANCEL || id == VM_BUTTON_HELP
                                 ? kButtonBorders
                                 : 0;
-        EXPECT_LE(text.cx + borders, room.cx);
-        EXPECT_LE(text.cy, room.cy);
+        EXPECT_LE(text.cx + borders, field.cx);
+        EXPECT_LE(text.cy, field.cy);
     }
     const char16_t knobs = AltLetter(TextOf(GetDlgItem(dialog, VM_CHECK_KNOBS_VERTICAL)));
     const char16_t help = AltLetter(TextOf(GetDlgItem(dialog, VM_BUTTON_HELP)));

@@ -4,7 +4,7 @@
 
 #include <gtest/gtest.h>
 
-#include "text/utf.h"
+#include "text/encodings.h"
 
 namespace velmora::language {
 namespace {
@@ -17,7 +17,7 @@ TEST(CopyText, CutsTerminatesAndStaysInside) {
         std::u16string written;
     };
     const Row rows[] = {
-        {"room to spare", u"abc", 10, u"abc"},
+        {"shorter than the buffer", u"abc", 10, u"abc"},
         {"exact", u"abc", 4, u"abc"},
         {"cut by one", u"abc", 3, u"ab"},
         {"terminator only", u"abc", 1, u""},

@@ -53,17 +53,17 @@ inline std::string AvText(int error) {
     return text;
 }
 
-// Where a library reports an error among others: that memory, or room for another thread, is short is no fault of
+// Where a library reports an error among others: that memory is short, or a thread cannot start, is no fault of
 // input or output. Some say only that something went wrong.
 inline void ThrowIfNoMemory(int error) {
-    constexpr std::size_t kWorkingRoom = std::size_t{64} << 20;
-    const auto isRoom = [] {
-        void* const room = av_malloc(kWorkingRoom);
-        av_free(room);
-        return room != nullptr;
+    constexpr std::size_t kWorkingMemory = std::size_t{64} << 20;
+    const auto isEnough = [] {
+        void* const block = av_malloc(kWorkingMemory);
+        av_free(block);
+        return block != nullptr;
     };
     const bool isShort = error == AVERROR(ENOMEM) || error == AVERROR(EAGAIN);
-    if (isShort || (error == AVERROR_EXTERNAL && !isRoom())) throw std::bad_alloc();
+    if (isShort || (error == AVERROR_EXTERNAL && !isEnough())) throw std::bad_alloc();
 }
 
 // A dictionary of options; what a call did not take stays in it.

@@ -40,7 +40,7 @@ bool HasBarShape(const ParamInfo& param) {
     return param.height > 0 && param.width >= 2 * param.height;
 }
 
-bool BarsHaveRoom(const std::vector<ParamInfo>& params) {
+bool BarsFit(const std::vector<ParamInfo>& params) {
     std::vector<Box> bars;
     for (const ParamInfo& param : params) {
         if (param.kind != kKindSlider || !param.isVisible) continue;
@@ -166,7 +166,7 @@ void KeepInsideFrames(PanelLayout& layout, std::int32_t gap) {
 }  // namespace
 
 PanelLayout LayOutPanel(const std::vector<ParamInfo>& params, UnitScale scale) {
-    const bool asBars = BarsHaveRoom(params);
+    const bool asBars = BarsFit(params);
     const Scaler scaler(scale);
     PanelLayout layout;
     std::vector<std::string> groups;

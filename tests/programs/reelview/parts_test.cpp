@@ -41,7 +41,7 @@ ValueWord Value(float number) {
     return word;
 }
 
-TEST(PanelLayout, SlidersAreBarsWhereTheyHaveRoom) {
+TEST(PanelLayout, SlidersAreBarsWhereTheyFit) {
     const auto shapeOf = [](const std::vector<hosts::ParamInfo>& params) {
         return LayOutPanel(params, {1.0, 1.0}).items.at(0).shape;
     };
