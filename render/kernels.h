@@ -12,7 +12,6 @@
 #include "render/colour.h"
 #include "render/simd/level.h"
 #include "render/image.h"
-#include "render/tone_line.h"
 #include "render/wear_factors.h"
 
 namespace velmora::render {

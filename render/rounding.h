@@ -2,6 +2,7 @@
 // width; none depends on the processor's rounding mode.
 #pragma once
 
+#include <cmath>
 #include <cstdint>
 #include <limits>
 
@@ -32,8 +33,23 @@ constexpr std::uint32_t RoundToUnsigned(double value) noexcept {
     return static_cast<std::uint32_t>(shifted);
 }
 
+// To the nearest whole number, halves to the even one.
+inline double NearestTiesToEven(double value) noexcept {
+    const double below = std::floor(value);
+    const double fraction = value - below;
+    if (fraction < 0.5) return below;
+    if (fraction > 0.5) return below + 1.0;
+    return std::fmod(below, 2.0) == 0.0 ? below : below + 1.0;
+}
+
 // Toward zero with a tolerance of 1e-12: a product that misses a whole number only by rounding error counts as that
 // number. Saturates like Truncate.
-std::int32_t TruncateTolerant(double value) noexcept;
+inline std::int32_t TruncateTolerant(double value) noexcept {
+    constexpr double kAlmostHalf = 0.499999999999;
+    if (value != value) return 0;
+    // Beyond this a double is too coarse for the correction, and the result saturates anyway.
+    if (value > 4294967296.0 || value < -4294967296.0) return Truncate(value);
+    return Truncate(NearestTiesToEven(value > 0.0 ? value - kAlmostHalf : value + kAlmostHalf));
+}
 
 }  // namespace velmora::render

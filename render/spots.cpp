@@ -4,7 +4,7 @@
 #include <cstring>
 
 #include "render/rounding.h"
-#include "render/shade.h"
+#include "render/image.h"
 
 namespace velmora::render {
 namespace {

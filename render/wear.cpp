@@ -1,7 +1,7 @@
 #include "render/wear.h"
 
 #include "render/kernels.h"
-#include "render/shade.h"
+#include "render/image.h"
 #include "render/wear_factors.h"
 
 namespace velmora::render {

@@ -7,7 +7,7 @@
 #include <vector>
 
 #include "render/kernels.h"
-#include "render/shade.h"
+#include "render/image.h"
 #include "render/spots.h"
 #include "render/wear.h"
 #include "render/wear_factors.h"
@@ -18,8 +18,8 @@ namespace {
 TEST(Shade, MatchesWholeNumbersOnExactFractions) {
     for (int sixtyFourths = -64; sixtyFourths <= 64; ++sixtyFourths) {
         for (int c = 0; c < 256; ++c) {
-            const int room = sixtyFourths > 0 ? 255 - c : c;
-            const int magnitude = (2 * room * std::abs(sixtyFourths) + 64) / 128;
+            const int distance = sixtyFourths > 0 ? 255 - c : c;
+            const int magnitude = (2 * distance * std::abs(sixtyFourths) + 64) / 128;
             const int expected = c + (sixtyFourths < 0 ? -magnitude : magnitude);
             ASSERT_EQ(ShadeChannel(static_cast<std::uint8_t>(c), static_cast<float>(sixtyFourths) / 64.0f),
                       expected)

@@ -16,7 +16,7 @@
 
 #include "render/glow_kernels.h"
 #include "render/scratch_line.h"
-#include "render/shade.h"
+#include "render/image.h"
 #include "render/wear_factors.h"
 #include "render/ycbcr.h"
 

@@ -8,7 +8,6 @@
 
 #include "render/colour.h"
 #include "render/tint.h"
-#include "render/tone_line.h"
 
 namespace velmora::render {
 namespace {
@@ -24,8 +23,8 @@ TEST(BrightnessTable, MatchesWholeNumbers) {
     for (std::int64_t sixtyFourths = -64; sixtyFourths <= 64; ++sixtyFourths) {
         const ByteTable table = BrightnessTable(static_cast<float>(sixtyFourths) / 64.0f);
         for (std::int64_t i = 0; i < 256; ++i) {
-            const std::int64_t room = sixtyFourths > 0 ? 255 - i : i;
-            ASSERT_EQ(table[static_cast<std::size_t>(i)], i + RoundRatio(room * sixtyFourths, 64))
+            const std::int64_t distance = sixtyFourths > 0 ? 255 - i : i;
+            ASSERT_EQ(table[static_cast<std::size_t>(i)], i + RoundRatio(distance * sixtyFourths, 64))
                 << sixtyFourths << ' ' << i;
         }
     }
