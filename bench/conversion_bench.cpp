@@ -12,7 +12,7 @@
 #include <stdexcept>
 
 #include "bench/conversion.h"
-#include "effects/render_session.h"
+#include "effects/render_options.h"
 
 namespace velmora::bench {
 namespace {

@@ -8,7 +8,7 @@
 #include <vector>
 
 #include "programs/common/frame_pool.h"
-#include "programs/common/bench_cases.h"
+#include "bench/session_of.h"
 #include "programs/reelfx/pipeline/frame_pipeline.h"
 
 namespace velmora::bench {

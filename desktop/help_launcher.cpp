@@ -6,7 +6,7 @@
 #include <optional>
 
 #include "platform/win32.h"
-#include "text/code_page.h"
+#include "text/encodings.h"
 
 namespace velmora::support {
 namespace {

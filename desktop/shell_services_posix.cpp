@@ -1,6 +1,5 @@
 // Without a Windows desktop there are no dialogs and no help control: the services only keep to their interface.
 #include "desktop/shell_services.h"
-#include "desktop/text_sources.h"
 
 namespace velmora::support {
 namespace {

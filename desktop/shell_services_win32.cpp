@@ -6,11 +6,9 @@
 #include "platform/float_guard.h"
 #include "desktop/bit_button.h"
 #include "desktop/help_launcher.h"
-#include "desktop/options_dialog.h"
-#include "desktop/preferences.h"
+#include "desktop/options.h"
 #include "desktop/resource_ids.h"
 #include "desktop/shell_services.h"
-#include "desktop/text_sources.h"
 #include "platform/win32.h"
 
 namespace velmora::support {

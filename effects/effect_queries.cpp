@@ -1,8 +1,12 @@
 #include "effects/effect_queries.h"
 
+#include <algorithm>
+#include <span>
+
 #include "platform/float_guard.h"
 #include "effects/params.h"
 #include "render/rounding.h"
+#include "text/names.h"
 
 namespace velmora::effects {
 namespace {
@@ -27,6 +31,13 @@ float DepthOfAmount(float amount) noexcept {
     const FloatGuard guard;
     const float rest = render::Narrow(1.0 - SanitizeNormalised(amount));
     return render::Narrow(1.0 - double{rest} * rest);
+}
+
+std::optional<std::uint32_t> Find(std::span<const char* const> names, std::string_view name) {
+    for (std::size_t i = 0; i < names.size(); ++i) {
+        if (IsSameName(names[i], name)) return static_cast<std::uint32_t>(i);
+    }
+    return std::nullopt;
 }
 
 }  // namespace
@@ -97,6 +108,32 @@ bool AnswerMaster(const EffectTable& effect, IVideoHost* host, std::uint32_t ind
             return true;
     }
     return false;
+}
+
+bool HoldsValue(const ParamRow& param) noexcept {
+    return param.kind != kKindGroup && param.kind != kKindNone;
+}
+
+std::string UniqueName(const EffectTable& effect, const ParamRow& param) {
+    const auto sharesName = [&](const ParamRow& other) {
+        return &other != &param && HoldsValue(other) && IsSameName(other.name, param.name);
+    };
+    if (std::none_of(effect.params.begin(), effect.params.end(), sharesName)) return param.name;
+    return std::string(param.name) + (param.kind == kKindColour ? " Colour" : " Amount");
+}
+
+std::string IdentifierOf(std::string_view name) {
+    std::string identifier;
+    for (const char c : name) identifier += c == ' ' ? '_' : ToLower(c);
+    return identifier;
+}
+
+std::optional<std::uint32_t> FindPreset(const EffectTable& effect, std::string_view name) {
+    return Find(effect.presetNames, name);
+}
+
+std::optional<std::uint32_t> FindItem(const ParamRow& menu, std::string_view text) {
+    return Find(menu.items, text);
 }
 
 }  // namespace velmora::effects

@@ -1,7 +1,11 @@
-// What a host can ask about an effect, answered from its table. Both the effect objects and the sessions use these.
+// What can be asked about an effect, answered from its table: by hosts through the effect objects and the sessions, and by
+// programs and plug-ins that show or look up parameters, presets and menu items by name.
 #pragma once
 
 #include <cstdint>
+#include <optional>
+#include <string>
+#include <string_view>
 
 #include "effects/effect_table.h"
 #include "api/host_api.h"
@@ -25,5 +29,21 @@ namespace velmora::effects {
 // a cell; also false for other indices and when the host has no answer.
 [[nodiscard]] bool AnswerMaster(const EffectTable& effect, IVideoHost* host, std::uint32_t index,
                                 ValueCell* cell, std::uint32_t kind);
+
+// Names.
+
+// False for group markers.
+[[nodiscard]] bool HoldsValue(const ParamRow& param) noexcept;
+
+// The parameter's name, unique in its effect: where a colour and its amount share a name, " Colour" or " Amount" is
+// added.
+[[nodiscard]] std::string UniqueName(const EffectTable& effect, const ParamRow& param);
+
+// "Film Pro" as a part of file names and identifiers: "film_pro".
+[[nodiscard]] std::string IdentifierOf(std::string_view name);
+
+// The preset or menu item of that name by the rule of text/names.h; nothing when there is none.
+[[nodiscard]] std::optional<std::uint32_t> FindPreset(const EffectTable& effect, std::string_view name);
+[[nodiscard]] std::optional<std::uint32_t> FindItem(const ParamRow& menu, std::string_view text);
 
 }  // namespace velmora::effects

@@ -9,7 +9,7 @@
 
 #include <tinyxml.h>
 
-#include "text/utf.h"
+#include "text/encodings.h"
 
 namespace velmora::language {
 namespace {

@@ -7,7 +7,7 @@
 #include <cstdint>
 #include <system_error>
 
-#include "text/utf.h"
+#include "text/encodings.h"
 
 namespace velmora::language {
 namespace {

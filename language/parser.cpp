@@ -11,7 +11,7 @@
 #include <utility>
 
 #include "api/com_object.h"
-#include "text/utf.h"
+#include "text/encodings.h"
 #include "language/lang_parser.h"
 #include "language/language_table.h"
 

@@ -5,8 +5,7 @@
 #include <sys/stat.h>
 #include <windows.h>
 
-#include "text/code_page.h"
-#include "text/utf.h"
+#include "text/encodings.h"
 
 namespace velmora {
 
@@ -19,7 +18,7 @@ bool MakeNativePath(const char* fileName, NativePath* path) {
 }
 
 std::optional<std::string> FileNameFromUtf8(const std::string& path) {
-    const auto wide = language::Utf16FromUtf8(path);
+    const auto wide = Utf16FromUtf8(path);
     return wide ? NarrowExactly(*wide) : std::nullopt;
 }
 

@@ -6,7 +6,7 @@
 #include <string>
 
 #include "presets/file_access.h"
-#include "text/c_locale_numbers.h"
+#include "text/number_text.h"
 #include "presets/preset_file.h"
 
 namespace velmora {

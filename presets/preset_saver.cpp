@@ -9,7 +9,7 @@
 #include "platform/float_guard.h"
 #include "presets/preset_file.h"
 #include "presets/dialogs.h"
-#include "text/code_page.h"
+#include "text/encodings.h"
 #include "text/strings.h"
 
 namespace velmora {

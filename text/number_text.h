@@ -1,4 +1,5 @@
-// Numbers, sizes and rates as typed on a command line, read and written independently of the locale.
+// Numbers as texts, independent of the locale: as typed on a command line, with sizes and rates, and as preset files hold
+// them.
 #pragma once
 
 #include <cstdint>
@@ -47,3 +48,22 @@ class UsageError : public std::runtime_error {
 };
 
 }  // namespace velmora::hosts
+
+namespace velmora {
+
+// Numbers in preset files (c_locale_numbers.cpp): always a point, never a comma.
+
+// Like "%d".
+[[nodiscard]] std::string FormatInteger(int value);
+// Like "%f": six digits after the point, "-0.000000" for negative zero; "nan", "-nan", "inf" and "-inf" for values that
+// are not finite.
+[[nodiscard]] std::string FormatNumber(double value);
+
+// Read the number at the start of a text, as scanf's "%d" and "%lf" do in the "C" locale: blanks and a sign may precede
+// it; anything after it is ignored. False, and nothing written, when there is no number. An integer that does not fit
+// becomes the nearest that does; a number that does not fit becomes infinite or 0. "inf", "nan" and hexadecimal numbers
+// are read too.
+[[nodiscard]] bool ParseInteger(const char* text, int* value) noexcept;
+[[nodiscard]] bool ParseNumber(const char* text, double* value) noexcept;
+
+}  // namespace velmora

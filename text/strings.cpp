@@ -6,7 +6,7 @@
 #include <new>
 #include <string>
 
-#include "text/code_page.h"
+#include "text/encodings.h"
 
 namespace velmora {
 

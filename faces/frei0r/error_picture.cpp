@@ -1,4 +1,4 @@
-#include "faces/frei0r/error_picture.h"
+#include "faces/frei0r/instance.h"
 
 #include <algorithm>
 #include <array>

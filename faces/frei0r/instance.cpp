@@ -6,7 +6,6 @@
 #include <limits>
 #include <new>
 
-#include "faces/frei0r/error_picture.h"
 #include "effects/effect_queries.h"
 #include "presets/file_access.h"
 #include "presets/preset_file.h"

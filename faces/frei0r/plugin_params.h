@@ -21,7 +21,7 @@
 #include <string_view>
 #include <vector>
 
-#include "effects/effect_names.h"
+#include "effects/effect_queries.h"
 #include "effects/effect_table.h"
 
 namespace velmora::hosts::frei0r {

@@ -5,8 +5,8 @@
 #include <random>
 #include <string>
 
-#include "effects/effect_names.h"
-#include "faces/obs/preset_files.h"
+#include "effects/effect_queries.h"
+#include "faces/obs/filter_settings.h"
 
 namespace velmora::hosts::obs {
 namespace {

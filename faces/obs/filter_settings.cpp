@@ -6,7 +6,6 @@
 #include <optional>
 #include <string_view>
 
-#include "effects/effect_names.h"
 #include "effects/effect_queries.h"
 
 namespace velmora::hosts::obs {

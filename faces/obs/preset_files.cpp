@@ -1,10 +1,10 @@
-#include "faces/obs/preset_files.h"
+#include "faces/obs/filter_settings.h"
 
 #include <algorithm>
 #include <filesystem>
 #include <vector>
 
-#include "effects/effect_names.h"
+#include "effects/effect_queries.h"
 #include "presets/dialogs.h"
 #include "presets/file_access.h"
 #include "presets/preset_file.h"

@@ -4,7 +4,7 @@
 #include <limits>
 #include <string_view>
 
-#include "effects/effect_names.h"
+#include "effects/effect_queries.h"
 #include "faces/openfx/ofx_api.h"
 #include "text/names.h"
 

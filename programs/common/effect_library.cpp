@@ -2,7 +2,7 @@
 
 #include <stdexcept>
 
-#include "text/code_page.h"
+#include "text/encodings.h"
 
 namespace velmora::hosts {
 namespace {

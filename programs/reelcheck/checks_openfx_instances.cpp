@@ -4,7 +4,7 @@
 #include <cmath>
 #include <thread>
 
-#include "effects/effect_names.h"
+#include "effects/effect_queries.h"
 #include "programs/reelcheck/checks.h"
 #include "programs/reelcheck/openfx_host.h"
 

@@ -5,7 +5,7 @@
 
 #include "api/host_api.h"
 #include "desktop/bit_button_state.h"
-#include "desktop/text_sources.h"
+#include "desktop/shell_services.h"
 
 namespace velmora::support {
 namespace {

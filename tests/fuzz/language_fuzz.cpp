@@ -7,7 +7,7 @@
 #include <string>
 #include <string_view>
 
-#include "text/utf.h"
+#include "text/encodings.h"
 #include "language/language_table.h"
 
 namespace {
@@ -21,7 +21,7 @@ void Require(bool holds) {
 void CheckCut(const char16_t* text, std::int32_t capacity) {
     const std::u16string_view whole(text);
     std::u16string buffer(static_cast<std::size_t>(capacity) + 1, u'\xCCCC');
-    const std::int32_t length = velmora::language::CopyText(text, buffer.data(), capacity);
+    const std::int32_t length = velmora::CopyText(text, buffer.data(), capacity);
     Require(length >= 0 && length < capacity);
     const auto written = static_cast<std::size_t>(length);
     Require(whole.substr(0, written) == std::u16string_view(buffer.data(), written));

@@ -1,4 +1,4 @@
-#include "text/c_locale_numbers.h"
+#include "text/number_text.h"
 
 #include <gtest/gtest.h>
 

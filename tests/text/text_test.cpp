@@ -4,7 +4,7 @@
 #include <string>
 #include <type_traits>
 
-#include "text/code_page.h"
+#include "text/encodings.h"
 #include "text/strings.h"
 #include "language/translation.h"
 #include "tests/presets/fake_library.h"

@@ -9,7 +9,7 @@
 #include <memory>
 #include <set>
 
-#include "effects/effect_names.h"
+#include "effects/effect_queries.h"
 #include "effects/effect_session.h"
 #include "tests/faces/obs/obs_host.h"
 

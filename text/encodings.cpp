@@ -1,9 +1,9 @@
-#include "text/utf.h"
+#include "text/encodings.h"
 
 #include <cstddef>
 #include <cstdint>
 
-namespace velmora::language {
+namespace velmora {
 namespace {
 
 // What a first byte implies. Overlong sequences are found by the lowest value that needs so many bytes.
@@ -58,6 +58,32 @@ std::optional<std::uint32_t> TakeCharacter(std::string_view& text) {
 
 }  // namespace
 
+std::u16string Widen(std::string_view text) {
+    const auto length = static_cast<std::uint32_t>(text.size());
+    std::u16string wide(length, u'\0');  // no 8-bit code page needs more
+    wide.resize(WidenText(text.data(), length, wide.data(), length));
+    return wide;
+}
+
+std::optional<std::string> NarrowExactly(std::u16string_view text) {
+    if (text.empty()) return std::string();
+    constexpr std::uint32_t kMostBytes = 4;  // per character, in any code page
+    const auto length = static_cast<std::uint32_t>(text.size());
+    std::string narrow(std::size_t{length} * kMostBytes, '\0');
+    narrow.resize(NarrowText(text.data(), length, narrow.data(), length * kMostBytes));
+    if (narrow.empty()) return std::nullopt;
+    return narrow;
+}
+
+bool NarrowFileName(const char16_t* name, char* buffer, std::uint32_t capacity) noexcept {
+    if (name == nullptr) return false;
+    const std::size_t length = std::char_traits<char16_t>::length(name);
+    if (length == 0 || length >= capacity) return false;
+    if (NarrowText(name, static_cast<std::uint32_t>(length), buffer, capacity) != length) return false;
+    buffer[length] = '\0';
+    return true;
+}
+
 bool IsUtf8(std::string_view text) noexcept {
     while (!text.empty()) {
         if (!TakeCharacter(text)) return false;
@@ -88,4 +114,4 @@ std::int32_t CopyText(const char16_t* text, char16_t* buffer, std::int32_t capac
     return length;
 }
 
-}  // namespace velmora::language
+}  // namespace velmora
