@@ -3,7 +3,6 @@
 #include <algorithm>
 #include <cstring>
 
-#include "render/kernel_levels.h"
 #include "render/simd/target.h"
 
 namespace velmora::render {

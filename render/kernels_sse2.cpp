@@ -11,7 +11,7 @@
 
 #include "render/glow_kernels.h"
 #include "render/scratch_span.h"
-#include "render/kernel_levels.h"
+#include "render/kernels.h"
 #include "render/simd/target.h"
 #include "render/ycbcr.h"
 

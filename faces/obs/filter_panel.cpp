@@ -1,4 +1,4 @@
-#include "faces/obs/filter_panel.h"
+#include "faces/obs/filter_settings.h"
 
 #include <limits>
 #include <memory>
@@ -6,7 +6,6 @@
 #include <string>
 
 #include "effects/effect_queries.h"
-#include "faces/obs/filter_settings.h"
 
 namespace velmora::hosts::obs {
 namespace {

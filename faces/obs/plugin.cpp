@@ -6,7 +6,6 @@
 
 #include "effects/effect_table.h"
 #include "faces/obs/film_filter.h"
-#include "faces/obs/filter_panel.h"
 #include "faces/obs/filter_settings.h"
 
 OBS_DECLARE_MODULE()

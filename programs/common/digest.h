@@ -14,9 +14,19 @@ std::string FrameDigest(const std::uint8_t* pixels, std::int32_t width, std::int
                         std::ptrdiff_t strideBytes);
 
 // The line that both programs print for a frame, without the line's end: "frame 12 md5 9e10...".
-std::string DigestLine(std::int64_t frame, const std::string& digest);
+inline std::string DigestLine(std::int64_t frame, const std::string& digest) {
+    return "frame " + std::to_string(frame) + " md5 " + digest;
+}
 
 // Shared by the two implementations of FrameDigest.
-std::string HexOf(const std::uint8_t* bytes, std::size_t count);
+inline std::string HexOf(const std::uint8_t* bytes, std::size_t count) {
+    static constexpr char kDigits[] = "0123456789abcdef";
+    std::string text;
+    for (std::size_t i = 0; i < count; ++i) {
+        text += kDigits[bytes[i] >> 4];
+        text += kDigits[bytes[i] & 15];
+    }
+    return text;
+}
 
 }  // namespace velmora::hosts

@@ -8,7 +8,7 @@
 #include "text/number_text.h"
 #include "programs/reelfx/commands/commands.h"
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/media/library_log.h"
+#include "programs/reelfx/media/av_handles.h"
 
 int main(int count, char** arguments) {
     using namespace velmora::hosts;

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <initializer_list>
 
-#include "programs/reelfx/media/library_log.h"
+#include "programs/reelfx/media/av_handles.h"
 
 namespace velmora::hosts {
 namespace {

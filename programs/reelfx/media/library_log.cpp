@@ -1,12 +1,10 @@
-#include "programs/reelfx/media/library_log.h"
+#include "programs/reelfx/media/av_handles.h"
 
 #include <cstdarg>
 #include <cstdio>
 #include <cstdlib>
 #include <mutex>
 #include <unistd.h>
-
-#include "programs/reelfx/media/av_handles.h"
 
 extern "C" {
 #include <libavutil/log.h>

@@ -9,7 +9,7 @@
 #include <string_view>
 
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/media/library_log.h"
+#include "programs/reelfx/media/av_handles.h"
 
 extern "C" {
 #include <libavutil/pixdesc.h>

@@ -7,7 +7,7 @@
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/container.h"
 #include "programs/reelfx/media/exif.h"
-#include "programs/reelfx/media/library_log.h"
+#include "programs/reelfx/media/av_handles.h"
 
 extern "C" {
 #include <libavutil/pixdesc.h>

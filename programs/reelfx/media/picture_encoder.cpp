@@ -9,7 +9,7 @@
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/container.h"
 #include "programs/reelfx/media/hdr_metadata.h"
-#include "programs/reelfx/media/library_log.h"
+#include "programs/reelfx/media/av_handles.h"
 #include "programs/reelfx/media/pixel_converter.h"
 
 extern "C" {
