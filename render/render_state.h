@@ -14,16 +14,38 @@
 
 namespace velmora::render {
 
+// Spreads the bits of seed and number, so that neighbouring frames and seeds have nothing in common (an
+// integer hash: two rounds of multiply and fold).
+inline std::uint32_t SeedOf(std::uint32_t seed, std::uint32_t number) noexcept {
+    std::uint64_t x = (std::uint64_t{seed} << 32 | number) + 0x9E3779B97F4A7C15u;
+    x = (x ^ x >> 30) * 0xBF58476D1CE4E5B9u;
+    x = (x ^ x >> 27) * 0x94D049BB133111EBu;
+    return static_cast<std::uint32_t>(x ^ x >> 31);
+}
+
 // The random sequence of jitter, wear and spots. A frame rendered twice in a row gets the same random numbers again;
 // any other frame continues where the previous one left off.
 class FrameRandom {
   public:
     // Starts the sequence. The first frame continues from here.
-    void Seed(std::uint32_t state) noexcept;
+    void Seed(std::uint32_t state) noexcept {
+        m_current = m_saved = Random(state);
+        m_lastFrame = 0;
+    }
     // Makes the next frame's random numbers depend only on `seed` and the frame number, not on earlier frames.
-    void Pin(std::uint32_t seed, std::int32_t frameNumber) noexcept;
+    void Pin(std::uint32_t seed, std::int32_t frameNumber) noexcept {
+        m_current = m_saved = Random(SeedOf(seed, static_cast<std::uint32_t>(frameNumber)));
+        m_lastFrame = frameNumber;
+    }
     // Called once for each frame, before its first draw.
-    void BeginFrame(std::int32_t frameNumber) noexcept;
+    void BeginFrame(std::int32_t frameNumber) noexcept {
+        if (frameNumber == m_lastFrame) {
+            m_current = m_saved;
+        } else {
+            m_saved = m_current;
+        }
+        m_lastFrame = frameNumber;
+    }
 
     [[nodiscard]] Random& Numbers() noexcept { return m_current; }
     [[nodiscard]] const Random& Numbers() const noexcept { return m_current; }

@@ -12,7 +12,7 @@
 #include "programs/reelview/library/guarded_call_win32.h"
 #include "programs/reelview/base/com_win32.h"
 #include "programs/reelview/window/main_window_win32.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 
 namespace velmora::reelview {
 namespace {

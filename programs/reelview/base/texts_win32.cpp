@@ -1,10 +1,8 @@
-#include "programs/reelview/base/texts_win32.h"
+#include "programs/reelview/base/texts.h"
 
 #include <windows.h>
 
 #include <utility>
-
-#include "programs/reelview/base/text_keys.h"
 
 namespace velmora::reelview {
 namespace {

@@ -7,7 +7,7 @@
 
 #include "programs/reelview/keeper/frame_sink.h"
 #include "programs/reelview/source/open_clip_win32.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 #include "platform/win32.h"
 
 namespace velmora::reelview {

@@ -2,7 +2,7 @@
 #include <new>
 
 #include "programs/reelview/keeper/export_job_win32.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 
 namespace velmora::reelview {
 namespace {

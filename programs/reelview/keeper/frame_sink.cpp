@@ -6,7 +6,7 @@
 #include <utility>
 #include <vector>
 
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 #include "programs/reelview/source/clip_source.h"
 
 namespace velmora::reelview {

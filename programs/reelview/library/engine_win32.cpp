@@ -4,7 +4,7 @@
 
 #include "programs/reelview/library/engine.h"
 #include "programs/reelview/library/guarded_call_win32.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 
 namespace velmora::reelview {
 namespace {

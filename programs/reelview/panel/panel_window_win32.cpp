@@ -6,7 +6,7 @@
 #include <algorithm>
 
 #include "programs/reelview/panel/panel_layout.h"
-#include "programs/reelview/base/texts_win32.h"
+#include "programs/reelview/base/texts.h"
 #include "programs/reelview/base/window_class_win32.h"
 
 namespace velmora::reelview {

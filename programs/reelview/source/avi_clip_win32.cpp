@@ -6,7 +6,7 @@
 #include <cstring>
 
 #include "programs/reelview/source/open_clip_win32.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 #include "platform/win32.h"
 
 namespace velmora::reelview {

@@ -16,7 +16,7 @@
 
 namespace velmora::reelview {
 
-// Its text is a key of the user-visible texts (base/text_keys.h).
+// Its text is a key of the user-visible texts (base/texts.h).
 class SourceError : public std::runtime_error {
   public:
     using std::runtime_error::runtime_error;

@@ -5,7 +5,7 @@
 #include <string_view>
 
 #include "programs/reelview/source/clip_source.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 
 namespace velmora::reelview {
 namespace {

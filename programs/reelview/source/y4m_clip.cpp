@@ -5,7 +5,7 @@
 #include <vector>
 
 #include "text/number_text.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 
 namespace velmora::reelview {
 namespace {

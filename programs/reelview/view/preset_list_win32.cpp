@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
-#include "programs/reelview/base/texts_win32.h"
+#include "programs/reelview/base/texts.h"
 #include "programs/reelview/base/window_class_win32.h"
 
 namespace velmora::reelview {

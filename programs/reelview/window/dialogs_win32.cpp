@@ -6,7 +6,7 @@
 #include <array>
 
 #include "programs/reelview/base/window_class_win32.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 
 namespace velmora::reelview {
 namespace {

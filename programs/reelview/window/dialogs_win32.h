@@ -10,7 +10,7 @@
 
 #include "programs/reelview/base/theme_win32.h"
 #include "programs/reelview/keeper/export_job_win32.h"
-#include "programs/reelview/base/texts_win32.h"
+#include "programs/reelview/base/texts.h"
 
 namespace velmora::reelview {
 

@@ -6,7 +6,7 @@
 #include "programs/reelview/keeper/export_job_win32.h"
 #include "programs/reelview/window/commands.h"
 #include "programs/reelview/window/main_window_win32.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 
 namespace velmora::reelview {
 namespace {

@@ -10,7 +10,7 @@
 #include "programs/reelview/library/guarded_call_win32.h"
 #include "programs/reelview/base/com_win32.h"
 #include "programs/reelview/window/commands.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 #include "programs/reelview/base/window_class_win32.h"
 
 namespace velmora::reelview {

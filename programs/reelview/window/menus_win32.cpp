@@ -5,7 +5,7 @@
 #include <algorithm>
 
 #include "programs/reelview/window/commands.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 
 namespace velmora::reelview {
 

@@ -7,7 +7,7 @@
 #include <string>
 #include <vector>
 
-#include "programs/reelview/base/texts_win32.h"
+#include "programs/reelview/base/texts.h"
 #include "programs/reelview/base/theme_win32.h"
 
 namespace velmora::reelview {

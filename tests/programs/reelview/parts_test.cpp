@@ -10,7 +10,7 @@
 #include <vector>
 
 #include "language/language_table.h"
-#include "programs/reelview/base/text_keys.h"
+#include "programs/reelview/base/texts.h"
 #include "programs/reelview/document/command_line.h"
 #include "programs/reelview/document/settings_history.h"
 #include "programs/reelview/library/worker.h"
@@ -266,7 +266,7 @@ TEST(Texts, AreInTheLanguageFile) {
     };
     const auto table = language::LanguageTable::Read(read("/language/VMReelEffectsLang.xml.in"));
     ASSERT_TRUE(table);
-    const std::string header = read("/programs/reelview/base/text_keys.h");
+    const std::string header = read("/programs/reelview/base/texts.h");
     const std::regex constant("inline constexpr char k\\w+\\[\\] = \"(.*)\";");
     std::vector<std::string> keys;
     for (std::sregex_iterator match(header.begin(), header.end(), constant), none; match != none; ++match) {
