@@ -29,7 +29,25 @@ namespace {
 #include "render/simd/channels.inc"
 #include "render/simd/mix.inc"
 #include "render/simd/mix_channels.inc"
-#include "render/simd/table_permutes.inc"
+
+// Table lookups by byte permutations of 128 entries each, which are faster than computing any line.
+
+constexpr int kTogether = 1;
+constexpr bool kComputesLines = false;
+
+inline Vec LookUp(Vec bytes, const ByteTable& table) noexcept {
+    const std::uint8_t* entries = table.data();
+    const Vec low = _mm512_permutex2var_epi8(Load(entries), bytes, Load(entries + 64));
+    const Vec high = _mm512_permutex2var_epi8(Load(entries + 128), bytes, Load(entries + 192));
+    return _mm512_mask_blend_epi8(_mm512_movepi8_mask(bytes), low, high);
+}
+
+inline void LookUpAll(Block (&b)[kTogether], const ChannelTables& tables) noexcept {
+    b[0].v[0] = LookUp(b[0].v[0], tables.blue);
+    b[0].v[1] = LookUp(b[0].v[1], tables.green);
+    b[0].v[2] = LookUp(b[0].v[2], tables.red);
+}
+
 #include "render/simd/glow_channels.inc"
 #include "render/simd/tone_channels.inc"
 #include "render/simd/ycbcr.inc"

@@ -26,14 +26,57 @@ namespace {
 #include "render/simd/rows.inc"
 #include "render/simd/wear.inc"
 #include "render/simd/tone_lines.inc"
-#include "render/simd/table_words.inc"
 #include "render/simd/mix.inc"
-#include "render/simd/mix_words.inc"
+
+// Lines and the saturation mix on interleaved pixels: blue and red in one vector of 16-bit numbers, green and alpha in
+// another.
+
+template <typename Lines, typename Mixer>
+inline Vec MixVector(Vec pixels, const Lines& lines, const Mixer& mixer) noexcept {
+    constexpr std::int32_t kBlueRed = 30 | 76 << 16, kGreen = 149;
+    const Vec blueRed = lines.At(ShiftLeft16<8>(pixels)), greenAlpha = lines.At(Upper(pixels));
+    const Vec sum = Add32(MulAdd16(ShiftRightU16<8>(blueRed), All32(kBlueRed)),
+                          MulAdd16(ShiftRightU16<8>(greenAlpha), All32(kGreen)));
+    const Vec luma = Upper(sum);
+    const Vec shared = MulHighU16(Or(luma, ShiftLeft32<16>(luma)), mixer.share);
+    const Vec white = All16(255);
+    const Vec even = Min16(mixer.Mixed(blueRed, shared), white);
+    const Vec odd = Min16(mixer.Mixed(greenAlpha, shared), white);
+    const Vec alpha = All32(static_cast<std::int32_t>(0xFF000000u));
+    return Select(alpha, pixels, Or(even, ShiftLeft16<8>(odd)));
+}
+
+template <typename Lines, typename Mixer>
+inline void MixPixels(const Bgra* in, Bgra* out, std::int32_t count, const Lines& lines,
+                      const Mixer& mixer) noexcept {
+    ForEachVector(in, out, count, [&](Vec pixels) { return MixVector(pixels, lines, mixer); });
+}
+
 #include "render/simd/tone_words.inc"
 #include "render/simd/glow.inc"
 #include "render/simd/ycbcr.inc"
 #include "render/scratch_rows.inc"
-#include "render/simd/scratch_span.inc"
+
+// The pixels of a scratch that is entirely inside the picture (scratch_rows.inc), four at a time. The saturating
+// differences keep the direction, and the alpha of their limits keeps alpha unchanged.
+void DrawSpan(Bgra* span, const std::uint16_t* weights, std::int32_t pixels, std::uint32_t strength,
+              bool isWhite) noexcept {
+    const Vec darkest = All32(static_cast<std::int32_t>(0xFF000000u | kDarkest * 0x010101u));
+    const Vec brightest = All32(kBrightest * 0x010101);
+    const Vec strengths = All16(static_cast<std::int32_t>(strength));
+    for (std::int32_t i = 0; i < pixels; i += kPixels) {
+        const Vec pixel = Load(span + i);
+        const Vec weight = LoadLow64(weights + i);
+        const Vec share = MulHighU16(weight, strengths);
+        const Vec pairs = InterleaveLow16(share, share);
+        const Vec towards = isWhite ? SubSatU8(brightest, pixel) : SubSatU8(pixel, darkest);
+        // The difference in the upper byte: the product's upper half is then 256 times the change.
+        const Vec low = MulHighU16(InterleaveLow8(Zero(), towards), InterleaveLow32(pairs, pairs));
+        const Vec high = MulHighU16(InterleaveHigh8(Zero(), towards), InterleaveHigh32(pairs, pairs));
+        const Vec change = PackU8(ShiftRightU16<8>(low), ShiftRightU16<8>(high));
+        Store(span + i, isWhite ? Add8(pixel, change) : Sub8(pixel, change));
+    }
+}
 
 }  // namespace
 

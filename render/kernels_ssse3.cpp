@@ -22,7 +22,17 @@ namespace velmora::render {
 namespace {
 
 #include "render/simd/sse2.h"
-#include "render/simd/ssse3.h"
+
+// What SSSE3 adds to the vocabulary of SSE2: byte shuffles.
+
+// Looks up each block of `indices` (0..15) in the same block of `table`; 0 where an index is negative.
+inline Vec ShuffleBytes(Vec table, Vec indices) noexcept {
+    return _mm_shuffle_epi8(table, indices);
+}
+// Sums of two neighbouring products of unsigned by signed bytes.
+inline Vec MulAddU8(Vec bytes, Vec signedBytes) noexcept {
+    return _mm_maddubs_epi16(bytes, signedBytes);
+}
 
 #include "render/simd/rows.inc"
 #include "render/simd/wear.inc"
@@ -30,7 +40,6 @@ namespace {
 #include "render/simd/channels.inc"
 #include "render/simd/mix.inc"
 #include "render/simd/mix_channels.inc"
-#include "render/simd/table_words.inc"
 #include "render/simd/tone_words.inc"
 #include "render/simd/glow.inc"
 #include "render/simd/ycbcr.inc"
