@@ -272,7 +272,7 @@ GlowStage::Neighbours GlowStage::NeighboursOf(std::int32_t y) const noexcept {
 GlowRow GlowStage::Over(std::int32_t width, std::int32_t y) const noexcept {
     CellRow row = m_rows.Row(0), other = m_rows.Row(1);
     const Neighbours from = NeighboursOf(y);
-    m_kernels->approach(from.near, from.far, row, m_layer.width, from.share);
+    m_kernels->approach(from.nearer, from.farther, row, m_layer.width, from.share);
     std::int32_t cells = m_layer.width;
     const int wanted = m_reduction < 2 ? 0 : 2;  // one cell per pixel, or per four pixels
     for (int reduction = m_reduction; reduction > wanted; --reduction) {
@@ -289,12 +289,12 @@ GlowPlanes GlowStage::PlanesOver(std::int32_t width, std::int32_t y, SplitGlow s
     const std::int32_t cells = ReducedSize(width, 2);
     Neighbours from = NeighboursOf(y);
     // A row of finer cells is split as it is.
-    if (m_reduction > 2) from.near = from.far = Over(width, y).cells;
+    if (m_reduction > 2) from.nearer = from.farther = Over(width, y).cells;
     const CellRow taken = m_rows.Row(0);
-    std::uint16_t* const first = m_rows.Row(from.near == taken ? 1 : 0);
+    std::uint16_t* const first = m_rows.Row(from.nearer == taken ? 1 : 0);
     const std::ptrdiff_t step = std::ptrdiff_t{cells} + 2 * kCellPad;
     std::uint16_t* const planes[3] = {first, first + step, first + 2 * step};
-    split(from.near, from.far, planes, cells, from.share);
+    split(from.nearer, from.farther, planes, cells, from.share);
     for (std::uint16_t* plane : planes) {
         plane[-1] = plane[0];
         plane[cells] = plane[cells - 1];

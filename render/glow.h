@@ -79,7 +79,7 @@ class GlowStage {
   private:
     // Rows of cells above and below a row of pixels, and the share of the farther one.
     struct Neighbours {
-        ConstCellRow near, far;
+        ConstCellRow nearer, farther;  // near and far are words of Windows' headers
         std::int16_t share;
     };
     [[nodiscard]] Neighbours NeighboursOf(std::int32_t y) const noexcept;
