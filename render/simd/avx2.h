@@ -23,10 +23,15 @@ inline Vec BlockIndex16() noexcept {
     return _mm256_setr_epi64x(0, 0, kOnes, kOnes);
 }
 
+inline Vec ShuffleBytes(Vec table, Vec indices) noexcept {
+    return _mm256_shuffle_epi8(table, indices);
+}
+// As a byte shuffle, which takes one instruction instead of two.
 template <int a, int b, int c, int d>
 inline Vec Shuffle16(Vec v) noexcept {
-    return _mm256_shufflehi_epi16(_mm256_shufflelo_epi16(v, _MM_SHUFFLE(d, c, b, a)),
-                                  _MM_SHUFFLE(d, c, b, a));
+    constexpr auto kBytesOf = [](std::int64_t word) { return word * 0x202 + 0x100; };
+    constexpr std::int64_t kLow = kBytesOf(a) | kBytesOf(b) << 16 | kBytesOf(c) << 32 | kBytesOf(d) << 48;
+    return ShuffleBytes(v, EachBlock(kLow, kLow + 0x0808080808080808));
 }
 inline Vec SwapPairs32(Vec v) noexcept {
     return _mm256_shuffle_epi32(v, _MM_SHUFFLE(2, 3, 0, 1));
@@ -93,9 +98,6 @@ inline Vec LoadBytes16(const void* from) noexcept {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(static_cast<const __m128i*>(from)));
 }
 
-inline Vec ShuffleBytes(Vec table, Vec indices) noexcept {
-    return _mm256_shuffle_epi8(table, indices);
-}
 inline Vec MulAddU8(Vec bytes, Vec signedBytes) noexcept {
     return _mm256_maddubs_epi16(bytes, signedBytes);
 }
