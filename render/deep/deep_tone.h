@@ -8,7 +8,7 @@
 //                         less t, but at least 0
 //   tint                  o > 0: o / 255 + x (256 - o) / 255, at most 1
 //                         o <= 0: (255 x + o) / (256 + o), at least 0
-// in the order brightness, contrast, saturation, gamma, tint, gamma.
+// in the order brightness, contrast, saturation, gamma, tint, gamma; the last at most 1.
 //
 // t is half a level of 255: where the 8-bit stage truncates it takes away that much on average, and several stages of
 // a preset together take away several levels. Without t the deep picture would be visibly brighter than the 8-bit one.

@@ -225,7 +225,7 @@ double LookOf(double level, const ColourStage& colour, std::int32_t offset, doub
     level = bend(level);
     level = offset > 0 ? std::min(offset + level * (256 - offset) / 255, 255.0)
                        : std::max((level + offset) * 255 / (256 + offset), 0.0);
-    return bend(level);
+    return std::min(bend(level), 255.0);
 }
 
 StageSettings RandomLook(std::mt19937& numbers) {
@@ -277,6 +277,31 @@ TEST(DeepLook, IsTheFormulaWithoutSteps) {
     }
 }
 
+// Diffusion starts from the picture, so there is no formula of a single pixel. But if a picture's greys rise by a 65535th,
+// no pixel rises by much more than a sixteenth of what it, or one near it, rises by in sixteen such steps.
+TEST(DeepLook, DiffusesWithoutSteps) {
+    constexpr std::int32_t kSide = 256, kNear = 128;
+    StageSettings settings;
+    for (const float amount : {0.2f, 1.0f}) {
+        settings.glow = amount;
+        const auto risen = [&settings](std::int32_t by) {
+            Deep ramp(kSide, kSide, {DeepSamples::kFloat, 3, false});
+            for (std::int32_t i = 0; i < kSide * kSide * 3; ++i)
+                ramp.samples[static_cast<std::size_t>(i)] =
+                    static_cast<float>(std::min(i / 3 + by, 65535) / 65535.0);
+            return Rendered(ramp, settings).samples;
+        };
+        const std::vector<float> low = risen(0), next = risen(1), high = risen(16);
+        for (std::size_t i = 0; i < low.size(); i += 3) {
+            const std::size_t from = i < 3 * kNear ? 0 : i - 3 * kNear,
+                              to = std::min(low.size(), i + 3 * kNear);
+            float most = 0.0f;
+            for (std::size_t j = from; j < to; j += 3) most = std::max(most, high[j] - low[j]);
+            ASSERT_LE(next[i] - low[i], 1.2f * most / 16.0f + 5e-7f) << i / 3;
+        }
+    }
+}
+
 struct StageCase {
     const char* name;
     double most;  // difference of levels of 255: what the 8-bit stage rounds
@@ -285,7 +310,7 @@ struct StageCase {
 constexpr StageCase kStages[] = {
     {"jitter", 0.001,
      [](StageSettings& s, float a) { s.xJitter = s.yJitter = static_cast<std::int32_t>(10 * a); }},
-    {"glow", 1.25, [](StageSettings& s, float a) { s.glow = a; }},
+    {"glow", 1.15, [](StageSettings& s, float a) { s.glow = a; }},
     {"brightness", 0.501, [](StageSettings& s, float a) { s.brightness = 2 * a - 1; }},
     {"flicker", 0.501, [](StageSettings& s, float a) { s.flicker = a; }},
     {"contrast", 0.501, [](StageSettings& s, float a) { s.contrast = 2 * a - 1; }},
