@@ -1,9 +1,10 @@
 #include "faces/openfx/pixel_rows.h"
 
 #include <algorithm>
-#include <cmath>
 #include <cstring>
 #include <limits>
+
+#include "render/deep/light.h"
 
 namespace velmora::hosts::openfx {
 namespace {
@@ -40,18 +41,32 @@ float FromUnit<float>(float value) noexcept {
     return value;
 }
 
-// Light to display values and back. Both continue beyond 1, and below 0 where the picture has such values.
-float ToDisplay(WorkingSpace space, float light) noexcept {
-    if (!(light == light)) return 0.0f;
-    if (space == WorkingSpace::kLinear24) return std::copysign(std::pow(std::abs(light), 1.0f / 2.4f), light);
-    return light <= 0.0031308f ? light * 12.92f : 1.055f * std::pow(light, 1.0f / 2.4f) - 0.055f;
-}
-float ToLight(WorkingSpace space, float display) noexcept {
-    if (space == WorkingSpace::kLinear24) return std::copysign(std::pow(std::abs(display), 2.4f), display);
-    return display <= 0.04045f ? display / 12.92f : std::pow((display + 0.055f) / 1.055f, 2.4f);
-}
 bool IsLinear(WorkingSpace space) noexcept {
     return space == WorkingSpace::kLinearSrgb || space == WorkingSpace::kLinear24;
+}
+
+using Curve = void (*)(render::LightCurve curve, float* numbers, std::int32_t count,
+                       render::SimdLevel level) noexcept;
+
+// The colours of `count` pixels of floats from light to display values, or back, in parts that stay in the first-level
+// cache.
+void Convert(Curve convert, const PixelFormat& format, std::byte* pixels, int count) noexcept {
+    constexpr int kPart = 512;
+    float colours[3 * kPart];
+    const auto curve =
+        format.space == WorkingSpace::kLinear24 ? render::LightCurve::kGamma : render::LightCurve::kSrgb;
+    const render::SimdLevel level = render::BestSimdLevel();
+    const std::size_t step = static_cast<std::size_t>(format.channels) * sizeof(float);
+    constexpr std::size_t kColours = 3 * sizeof(float);
+    for (int done = 0; done < count; done += kPart) {
+        const int part = std::min(kPart, count - done);
+        for (int i = 0; i < part; ++i)
+            std::memcpy(colours + 3 * i, pixels + step * static_cast<std::size_t>(i), kColours);
+        convert(curve, colours, 3 * part, level);
+        for (int i = 0; i < part; ++i)
+            std::memcpy(pixels + step * static_cast<std::size_t>(i), colours + 3 * i, kColours);
+        pixels += step * static_cast<std::size_t>(part);
+    }
 }
 
 int DividedByte(int colour, int alpha) noexcept {
@@ -84,7 +99,6 @@ void LoadFloats(const PixelFormat& format, const std::byte* host, std::byte* wor
         for (int c = 0; c < 3; ++c) {
             float value = ToUnit(Get<Sample>(host + static_cast<std::size_t>(c) * sizeof(Sample)));
             if (format.isDividedHere) value = alpha > 0.0f ? value / alpha : 0.0f;
-            if (IsLinear(format.space)) value = ToDisplay(format.space, value);
             Put(work + static_cast<std::size_t>(c) * sizeof(float), value);
         }
         if (format.channels == 4) Put(work + 3 * sizeof(float), alpha);
@@ -105,8 +119,7 @@ template <typename Sample>
 void FinishFloats(const PixelFormat& format, const std::byte* work, Sample (&out)[4]) noexcept {
     const float alpha = format.channels == 4 ? Get<float>(work + 3 * sizeof(float)) : 1.0f;
     for (int c = 0; c < 3; ++c) {
-        float value = Get<float>(work + static_cast<std::size_t>(c) * sizeof(float));
-        if (IsLinear(format.space)) value = ToLight(format.space, value);
+        const float value = Get<float>(work + static_cast<std::size_t>(c) * sizeof(float));
         out[c] = FromUnit<Sample>(format.isDividedHere ? value * alpha : value);
     }
     out[3] = FromUnit<Sample>(alpha);
@@ -168,10 +181,12 @@ void LoadRow(const PixelFormat& format, const std::byte* host, std::byte* work, 
     } else {
         LoadFloats<float>(format, host, work, count);
     }
+    if (IsLinear(format.space)) Convert(render::LightToDisplay, format, work, count);
 }
 
-void StoreRow(const PixelFormat& format, const std::byte* work, const std::byte* original, const float* share,
+void StoreRow(const PixelFormat& format, std::byte* work, const std::byte* original, const float* share,
               std::byte* host, int count) noexcept {
+    if (IsLinear(format.space)) Convert(render::DisplayToLight, format, work, count);
     const auto floats = [&format](const std::byte* pixel, auto& out) { FinishFloats(format, pixel, out); };
     if (format.work == WorkKind::kBytes) {
         Store<std::uint8_t>(

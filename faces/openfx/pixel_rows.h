@@ -41,9 +41,9 @@ struct PixelFormat {
 // `count` pixels of the host's into a working row. The rows do not overlap.
 void LoadRow(const PixelFormat& format, const std::byte* host, std::byte* work, int count) noexcept;
 
-// A working row into the host's pixels, mixed into `original`, which are the source's pixels: `share` has the share of
-// the result, 0..1, for each pixel; null: 1 everywhere. `original` and `host` may be the same.
-void StoreRow(const PixelFormat& format, const std::byte* work, const std::byte* original, const float* share,
+// A working row, which is used up, into the host's pixels, mixed into `original`, which are the source's pixels: `share`
+// has the share of the result, 0..1, for each pixel; null: 1 everywhere. `original` and `host` may be the same.
+void StoreRow(const PixelFormat& format, std::byte* work, const std::byte* original, const float* share,
               std::byte* host, int count) noexcept;
 
 // The alpha of `count` pixels, 0..1, times `times`.

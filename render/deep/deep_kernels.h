@@ -76,6 +76,9 @@ struct DeepKernels {
     // the truncation in 8 bits.
     void (*scratch)(float* channel, const float* shares, std::int32_t count, float towards,
                     bool isWhite) noexcept;
+    // By LightCurve (render/deep/light.h), in place.
+    void (*toDisplay[2])(float* numbers, std::int32_t count) noexcept;
+    void (*toLight[2])(float* numbers, std::int32_t count) noexcept;
     DeepGlowKernels glow;
 };
 

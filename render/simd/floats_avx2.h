@@ -14,6 +14,12 @@ inline Floats WherePositive(Floats sign, Floats x) noexcept {
     return _mm256_and_ps(_mm256_cmp_ps(sign, _mm256_setzero_ps(), _CMP_GT_OQ), x);
 }
 
+inline Floats SquareRoot(Floats x) noexcept { return _mm256_sqrt_ps(x); }
+inline Floats PowerGuess(Floats x, float times, float plus) noexcept {
+    const Floats bits = _mm256_cvtepi32_ps(_mm256_castps_si256(x));
+    return _mm256_castsi256_ps(_mm256_cvttps_epi32(bits * All(times) + All(plus)));
+}
+
 inline constexpr std::int32_t kBitsOf1 = 0x3F800000;
 using Marks = __m256i;
 inline Marks NoMarks() noexcept { return _mm256_setzero_si256(); }

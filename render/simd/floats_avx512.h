@@ -16,6 +16,12 @@ inline Floats WherePositive(Floats sign, Floats x) noexcept {
     return _mm512_maskz_mov_ps(_mm512_cmp_ps_mask(sign, _mm512_setzero_ps(), _CMP_GT_OQ), x);
 }
 
+inline Floats SquareRoot(Floats x) noexcept { return _mm512_sqrt_ps(x); }
+inline Floats PowerGuess(Floats x, float times, float plus) noexcept {
+    const Floats bits = _mm512_cvtepi32_ps(_mm512_castps_si512(x));
+    return _mm512_castsi512_ps(_mm512_cvttps_epi32(bits * All(times) + All(plus)));
+}
+
 inline constexpr std::int32_t kBitsOf1 = 0x3F800000;
 using Marks = __m512i;
 inline Marks NoMarks() noexcept { return _mm512_setzero_si512(); }

@@ -16,6 +16,17 @@ inline Floats NumberOr0(Floats x) noexcept { return x == x ? x : 0.0f; }
 // x where `sign` is above 0, else 0.
 inline Floats WherePositive(Floats sign, Floats x) noexcept { return sign > 0.0f ? x : 0.0f; }
 
+inline Floats SquareRoot(Floats x) noexcept { return __builtin_sqrtf(x); }
+// The bits of a float, taken as a whole number, nearly are its logarithm. The float whose bits are `times` those of x,
+// and `plus`.
+inline Floats PowerGuess(Floats x, float times, float plus) noexcept {
+    std::int32_t bits;
+    __builtin_memcpy(&bits, &x, sizeof bits);
+    bits = static_cast<std::int32_t>(static_cast<float>(bits) * times + plus);
+    __builtin_memcpy(&x, &bits, sizeof bits);
+    return x;
+}
+
 // Numbers from 0 to 1 have the bits of whole numbers from 0 to kBitsOf1; those of all others are larger, or negative as
 // whole numbers. A mark is negative from the first such number on.
 inline constexpr std::uint32_t kBitsOf1 = 0x3F800000;

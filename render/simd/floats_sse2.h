@@ -14,6 +14,12 @@ inline Floats WherePositive(Floats sign, Floats x) noexcept {
     return _mm_and_ps(_mm_cmpgt_ps(sign, _mm_setzero_ps()), x);
 }
 
+inline Floats SquareRoot(Floats x) noexcept { return _mm_sqrt_ps(x); }
+inline Floats PowerGuess(Floats x, float times, float plus) noexcept {
+    const Floats bits = _mm_cvtepi32_ps(_mm_castps_si128(x));
+    return _mm_castsi128_ps(_mm_cvttps_epi32(bits * All(times) + All(plus)));
+}
+
 inline constexpr std::int32_t kBitsOf1 = 0x3F800000;
 using Marks = __m128i;
 inline Marks NoMarks() noexcept { return _mm_setzero_si128(); }
