@@ -145,6 +145,8 @@ extern const Kernels kAvx512Kernels;
 // and the glow layer is a quarter of the picture.
 void DrawScratchesSse2(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
                        const ScratchRowPlace& place) noexcept;
+// With eight registers, most of a block of channels would be in memory, so that SSSE3 is no gain in 32 bits.
+void ToneRowSse2(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
 extern const GlowKernels kAvx2Glow;
 void SplitGlowAvx2(const std::uint16_t* near, const std::uint16_t* far, std::uint16_t* const planes[3],
                    std::int32_t count, std::int16_t share) noexcept;

@@ -85,6 +85,10 @@ void DrawScratchesSse2(const ScratchLine* lines, std::uint32_t count, Bgra* row,
     DrawLines(lines, count, row, width, place);
 }
 
+void ToneRowSse2(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
+    ToneRow(in, out, width, tone);
+}
+
 const Kernels kSse2Kernels = {ToneRow,   WearRow, DrawScratchesSse2, CopyRow, StreamRow,
                               EndStream, &kGlow,  &kYcbcr,           nullptr};
 

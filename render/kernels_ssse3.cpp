@@ -36,11 +36,15 @@ inline Vec MulAddU8(Vec bytes, Vec signedBytes) noexcept {
 
 #include "render/simd/rows.inc"
 #include "render/simd/wear.inc"
+#if defined(__i386__)
+constexpr auto* ToneRow = ToneRowSse2;
+#else
 #include "render/simd/tone_lines.inc"
-#include "render/simd/channels.inc"
 #include "render/simd/mix.inc"
+#include "render/simd/channels.inc"
 #include "render/simd/mix_channels.inc"
 #include "render/simd/tone_words.inc"
+#endif
 #include "render/simd/glow.inc"
 #include "render/simd/ycbcr.inc"
 
