@@ -30,7 +30,7 @@ void RunCase(benchmark::State& state, LevelTimes& times, const BenchCase& test, 
              double startSeconds) {
     FramePool pool(size);
     const auto sessions = MakeAtEachLevel([&] { return SessionOf(test); });
-    for (auto _ : state) {
+    while (state.KeepRunning()) {
         const double seconds = startSeconds + static_cast<double>(times.Rounds()) / 30.0;
         times.AddRound(pool, [&](std::size_t level) {
             if (!sessions[level]->Render(pool.Record(pool.Source()), pool.Record(pool.Destination()),
@@ -56,7 +56,7 @@ void RunDeep(benchmark::State& state, LevelTimes& times, const BenchCase& test, 
     const auto frame = render::DeepFrame::Whole(kFullHd.width, kFullHd.height, format, {source.data(), step},
                                                 {destination.data(), step});
     const auto sessions = MakeAtEachLevel([&] { return SessionOf(test); });
-    for (auto _ : state) {
+    while (state.KeepRunning()) {
         const double seconds = 1.0 + static_cast<double>(times.Rounds()) / 30.0;
         times.AddRound(pool, [&](std::size_t level) {
             if (!sessions[level]->RenderDeep(frame, seconds)) state.SkipWithError("frame refused");
@@ -68,7 +68,7 @@ void RunDeep(benchmark::State& state, LevelTimes& times, const BenchCase& test, 
 void RunJumps(benchmark::State& state, LevelTimes& times, const BenchCase& test) {
     FramePool pool(kFullHd);
     const auto sessions = MakeAtEachLevel([&] { return SessionOf(test); });
-    for (auto _ : state) {
+    while (state.KeepRunning()) {
         times.AddJump(pool, [&](std::size_t level, double seconds) {
             if (!sessions[level]->Render(pool.Record(pool.Source()), pool.Record(pool.Destination()),
                                          seconds)) {
@@ -82,7 +82,7 @@ void RunJumps(benchmark::State& state, LevelTimes& times, const BenchCase& test)
 void RunConversion(benchmark::State& state, LevelTimes& times, bool toBgra) {
     FramePool pool(kFullHd);
     const auto processors = MakeAtEachLevel([] { return std::make_unique<FrameProcessor>(); });
-    for (auto _ : state) {
+    while (state.KeepRunning()) {
         times.AddRound(pool, [&](std::size_t level) {
             FrameProcessor& processor = *processors[level];
             FrameRecord source = pool.Record(pool.Source()), destination = pool.Record(pool.Destination());

@@ -182,6 +182,7 @@ std::string PresetData(const PluginDescription& plugin, const std::vector<std::s
     std::vector<std::string> presets;
     for (std::uint32_t preset = 0; preset < plugin.effect.presetNames.size(); ++preset) {
         std::vector<std::string> values;
+        values.reserve(own.size());
         for (const std::size_t i : own) {
             values.push_back(Quoted(PresetValueOf(plugin, preset, plugin.params[i])));
         }

@@ -37,7 +37,7 @@ class DialogCanceller {
     [[nodiscard]] int Cancelled() const noexcept;
 
   private:
-    [[maybe_unused]] void* m_hook;  // null where dialogs are linked in
+    [[maybe_unused]] void* m_hook = nullptr;  // null where dialogs are linked in
 };
 
 }  // namespace velmora::reelcheck

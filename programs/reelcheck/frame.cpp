@@ -16,7 +16,7 @@ std::int32_t StepOf(const Layout& layout, Packing packing) noexcept {
 }
 
 std::size_t SizeOf(const Layout& layout, Packing packing) noexcept {
-    const auto rows = static_cast<std::size_t>(layout.yOrigin + layout.height);
+    const auto rows = static_cast<std::size_t>(layout.yOrigin) + static_cast<std::size_t>(layout.height);
     return static_cast<std::size_t>(StepOf(layout, packing)) * (rows - 1) +
            BytesOf(packing, layout.xOrigin + layout.width);
 }
@@ -56,14 +56,14 @@ Frame::Frame(const Layout& layout, Packing packing)
       m_step(StepOf(layout, packing)),
       m_memory(SizeOf(layout, packing), layout.edge) {}
 
-void Frame::Paint(Dice& dice) {
+void Frame::Paint(Dice& dice) const {
     const auto step = static_cast<std::size_t>(m_step);
     for (std::size_t at = 0; at < Size(); at += step) {
         PaintRow(Bytes() + at, std::min(step, Size() - at), at / step, dice);
     }
 }
 
-void Frame::Fill(std::uint8_t value) {
+void Frame::Fill(std::uint8_t value) const {
     std::memset(Bytes(), value, Size());
 }
 

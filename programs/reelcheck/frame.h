@@ -27,8 +27,8 @@ class Frame {
     explicit Frame(const Layout& layout, Packing packing = Packing::kBgra);
 
     // Fills the whole buffer: a picture with edges, gradients, noise, and black, white and fully opaque pixels.
-    void Paint(Dice& dice);
-    void Fill(std::uint8_t value);
+    void Paint(Dice& dice) const;
+    void Fill(std::uint8_t value) const;
     // For a source: a write then ends the process.
     void ForbidWriting() noexcept { m_memory.ForbidWriting(); }
 

@@ -22,7 +22,7 @@ class Library {
   public:
     // An empty path means the library next to this program. Throws CheckFailed when it cannot be loaded.
     explicit Library(const std::string& path);
-    ~Library();
+    ~Library();  // NOLINT(performance-trivially-destructible): not trivial on Windows
     Library(const Library&) = delete;
     Library& operator=(const Library&) = delete;
 

@@ -38,11 +38,11 @@ std::string ProgressText(std::int64_t done, std::int64_t total, double seconds) 
 
 std::string ProgressJson(std::int64_t done, std::int64_t total, double seconds, bool isEnd) {
     const std::string frames =
-        total > 0 ? ",\"frames\":" + std::to_string(isEnd ? done : std::max(total, done)) : "";
+        total > 0 ? R"(,"frames":)" + std::to_string(isEnd ? done : std::max(total, done)) : "";
     char rest[96];
-    std::snprintf(rest, sizeof rest, ",\"seconds\":%.3f,\"fps\":%.1f,\"progress\":\"%s\"}", seconds,
+    std::snprintf(rest, sizeof rest, R"(,"seconds":%.3f,"fps":%.1f,"progress":"%s"})", seconds,
                   seconds > 0.0 ? static_cast<double>(done) / seconds : 0.0, isEnd ? "end" : "continue");
-    return "{\"frame\":" + std::to_string(done) + frames + rest;
+    return R"({"frame":)" + std::to_string(done) + frames + rest;
 }
 
 ProgressKind Resolved(ProgressKind kind) {

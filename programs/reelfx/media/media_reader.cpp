@@ -4,7 +4,6 @@
 #include <array>
 #include <cstring>
 #include <numeric>
-#include <span>
 #include <string>
 #include <string_view>
 
@@ -74,12 +73,13 @@ const AVCodec* DecoderOf(const AVStream& stream) {
 bool LacksEnd(const AVFormatContext& container, const AVPacket& packet) {
     const std::string_view format = container.iformat->name;
     const bool isStill = format == "image2" || format == "jpeg_pipe";
-    const std::span data(packet.data, static_cast<std::size_t>(packet.size));
     if (!isStill || container.streams[packet.stream_index]->codecpar->codec_id != AV_CODEC_ID_MJPEG)
         return false;
     constexpr std::array<std::uint8_t, 2> kScan = {0xFF, 0xDA}, kEnd = {0xFF, 0xD9};
-    const auto scan = std::ranges::find_end(data, kScan);
-    return scan.empty() || std::ranges::search(std::span(scan.begin(), data.end()), kEnd).empty();
+    const std::uint8_t* const end = packet.data + packet.size;
+    const std::uint8_t* const scan =
+        std::find_end(packet.data, packet.data + packet.size, kScan.begin(), kScan.end());
+    return scan == end || std::search(scan, end, kEnd.begin(), kEnd.end()) == end;
 }
 
 }  // namespace
