@@ -126,14 +126,14 @@ void GlowLayerMaker::ReadBlocks(std::int32_t y, CellRow out) noexcept {
     }
     const std::int32_t cells = m_width / 4 + (m_width % 4 != 0 ? 1 : 0);
     const std::int32_t first = areAligned ? (rows[0].start + 3) / 4 : cells;
-    const std::int32_t end = std::max(first, areAligned ? (rows[0].start + rows[0].count) / 4 : cells);
-    if (first != end) {
+    const std::int32_t after = std::max(first, areAligned ? (rows[0].start + rows[0].count) / 4 : cells);
+    if (first != after) {
         const Bgra* pixels[4];
         for (int i = 0; i < 4; ++i) pixels[i] = rows[i].pixels + (4 * first - rows[i].start);
-        m_kernels.averageBlocks(pixels, out + first * std::ptrdiff_t{kCellLanes}, end - first);
+        m_kernels.averageBlocks(pixels, out + first * std::ptrdiff_t{kCellLanes}, after - first);
     }
     AverageCopies(rows, 0, std::min(first, cells), out);
-    AverageCopies(rows, end, cells, out);
+    AverageCopies(rows, after, cells, out);
 }
 
 void GlowLayerMaker::AverageCopies(const ShiftedRow (&rows)[4], std::int32_t first, std::int32_t end,
@@ -290,8 +290,8 @@ GlowPlanes GlowStage::PlanesOver(std::int32_t width, std::int32_t y, SplitGlow s
     Neighbours from = NeighboursOf(y);
     // A row of finer cells is split as it is.
     if (m_reduction > 2) from.nearer = from.farther = Over(width, y).cells;
-    const CellRow taken = m_rows.Row(0);
-    std::uint16_t* const first = m_rows.Row(from.nearer == taken ? 1 : 0);
+    const std::int32_t unused = from.nearer == m_rows.Row(0) ? 1 : 0;
+    std::uint16_t* const first = m_rows.Row(unused);
     const std::ptrdiff_t step = std::ptrdiff_t{cells} + 2 * kCellPad;
     std::uint16_t* const planes[3] = {first, first + step, first + 2 * step};
     split(from.nearer, from.farther, planes, cells, from.share);

@@ -2,8 +2,8 @@
 // ssse3.h say what the operations do.
 
 using Vec = __m256i;
-constexpr std::int32_t kBlocks = 2;
-constexpr std::int32_t kPixels = 4 * kBlocks;
+inline constexpr std::int32_t kBlocks = 2;
+inline constexpr std::int32_t kPixels = 4 * kBlocks;
 
 #define VM_MM(name) _mm256_##name
 #define VM_WHOLE(name) _mm256_##name##_si256

@@ -2,8 +2,8 @@
 // ssse3.h say what the operations do.
 
 using Vec = __m512i;
-constexpr std::int32_t kBlocks = 4;
-constexpr std::int32_t kPixels = 4 * kBlocks;
+inline constexpr std::int32_t kBlocks = 4;
+inline constexpr std::int32_t kPixels = 4 * kBlocks;
 
 #define VM_MM(name) _mm512_##name
 #define VM_WHOLE(name) _mm512_##name##_si512

@@ -2,8 +2,8 @@
 // See x86_operations.inc for how operations are named.
 
 using Vec = __m128i;
-constexpr std::int32_t kBlocks = 1;            // of 16 bytes
-constexpr std::int32_t kPixels = 4 * kBlocks;  // in a vector
+inline constexpr std::int32_t kBlocks = 1;            // of 16 bytes
+inline constexpr std::int32_t kPixels = 4 * kBlocks;  // in a vector
 
 #define VM_MM(name) _mm_##name
 #define VM_WHOLE(name) _mm_##name##_si128
