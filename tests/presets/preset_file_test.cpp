@@ -13,6 +13,7 @@
 #include <cstring>
 #include <limits>
 #include <string>
+#include <string_view>
 
 #include "tests/presets/fake_library.h"
 #include "tests/presets/temporary_folder.h"
@@ -299,7 +300,10 @@ TEST(ReadPreset, ReadsOddFiles) {
             EXPECT_EQ(record.count, file.values) << file.name;
         } else {
             const PresetRecord untouched = Filled();
-            EXPECT_EQ(std::memcmp(&record, &untouched, sizeof record), 0) << file.name;
+            const auto bytes = [](const PresetRecord& r) {
+                return std::string_view(reinterpret_cast<const char*>(&r), sizeof r);
+            };
+            EXPECT_EQ(bytes(record), bytes(untouched)) << file.name;
         }
     }
 }

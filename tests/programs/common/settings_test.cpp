@@ -69,8 +69,8 @@ TEST(Settings, RefusalsSayWhatWouldBeRight) {
         const char* words;
     };
     for (const Row& row : {Row{"Shake=11", "0 to 10"}, Row{"Tint=red", "#RRGGBB or a number"},
-                           Row{"Grain=2", "\"Fine\", \"Coarse\""}, Row{"Thick=maybe", "on or off"},
-                           Row{"Shape=1", "\"Shake\", \"Tint\""}, Row{"Shake", "NAME=VALUE"}}) {
+                           Row{"Grain=2", R"("Fine", "Coarse")"}, Row{"Thick=maybe", "on or off"},
+                           Row{"Shape=1", R"("Shake", "Tint")"}, Row{"Shake", "NAME=VALUE"}}) {
         try {
             ParseSetting(TestEffect(), row.text);
             ADD_FAILURE() << row.text;
