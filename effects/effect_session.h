@@ -44,8 +44,8 @@ class EffectSession {
     // the state that a later frame of a sequence starts from.
     [[nodiscard]] std::uint32_t DrawsPerFrame(std::int32_t width) noexcept;
 
-    // From now on scratches keep the places and flicker the rhythm that the present values give them, while values
-    // change from frame to frame. There are at most as many scratches as now, unless a frame has more, which moves all.
+    // From now on scratches and flicker keep the places and the rhythm that the current values give them, even while
+    // values change from frame to frame. A frame with more scratches than now moves all of them.
     void KeepArrangement() noexcept;
     // From now on they follow the values again.
     void ReleaseArrangement() noexcept { m_arrangement.reset(); }

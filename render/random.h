@@ -56,7 +56,8 @@ class Random {
     std::uint32_t m_state = 0;
 };
 
-// A hash of one word, for looks that must not depend on the build or on the order of work. Every bit of the argument affects about half of the result's bits.
+// A hash of one word, for looks that must not depend on the build or on the order of work. Every bit of the argument
+// affects about half of the result's bits.
 constexpr std::uint32_t MixBits(std::uint32_t word) noexcept {
     word = (word ^ (word >> 15)) * 0x9E3779B1u;
     word = (word ^ (word >> 13)) * 0x85A308D3u;

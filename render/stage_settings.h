@@ -12,8 +12,8 @@ enum WearChannels : std::int32_t { kWearBlueOnly = 4, kWearAllChannels = 7 };
 
 inline constexpr std::uint32_t kFramesPerSecond = 30;  // whatever the host's rate is
 
-// Where scratches are and how flicker runs follows from their settings. A host that changes these from frame to frame
-// gives the same arrangement with all frames; otherwise each would have scratches and flicker of its own.
+// The places of scratches and the rhythm of flicker follow from their settings. A host that changes these from frame to
+// frame passes the same arrangement with all frames; otherwise each frame would have scratches and flicker of its own.
 struct Arrangement {
     float scratchSeed = 0.0f;
     std::uint32_t scratchLives = 0;  // the most scratches that any frame shows

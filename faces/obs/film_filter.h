@@ -3,7 +3,7 @@
 // The time of a frame, from which its damage follows, comes from one of two clocks:
 //   the source's   the position of a source that plays a film. It stops in a pause and starts again with the film
 //   OBS' own       the frames that OBS has made since the filter was first shown, at OBS' frame rate; for all other
-//                  sources, and for all when the filter is not told to follow its source
+//                  sources, and for all unless the filter follows its source
 //
 // Rendering runs on OBS' graphics thread, once per frame however often the source is drawn (preview, program,
 // projectors). OBS delivers new settings on that thread too.

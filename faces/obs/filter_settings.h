@@ -9,7 +9,7 @@
 //   seed               0..4294967295
 //   source_time        whether frames follow the source's position, see film_filter.h
 //   the effect's own   slider: number as shown; colour: 0xAABBGGRR; menu: the item's text; check box: boolean.
-//                      Keys are the names in small letters with "_" for blanks, such as "film_gamma"
+//                      Keys are the names in lower case with "_" for spaces, such as "film_gamma"
 //
 // Not for several threads at once: OBS does not lock settings either.
 #pragma once
@@ -69,13 +69,13 @@ void DropPresetIfChanged(const FilterDescription& filter, obs_data_t* settings);
 
 // Preset files of the library (presets/preset_file.h) as settings (preset_files.cpp).
 
-// The extension of an effect's preset files, without a point.
+// The extension of an effect's preset files, without the dot.
 [[nodiscard]] std::string PresetFileExtension(const FilterDescription& filter);
 
 // File names are UTF-8, as OBS has them.
 
 // Writes a preset's values into the settings, which are then the user's own. False, with the settings unchanged, when
-// the file cannot be read or is none of this effect.
+// the file cannot be read or belongs to another effect.
 [[nodiscard]] bool LoadPresetFile(const FilterDescription& filter, const std::string& path,
                                   obs_data_t* settings);
 

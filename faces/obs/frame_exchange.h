@@ -1,6 +1,6 @@
 // Takes the picture under a filter from the graphics card, has it rendered, and draws the result.
 //
-// Reading back a picture right after it was drawn would stop the graphics card. So each frame starts the transfer of its
+// Reading back a picture right after it was drawn would stall the graphics card. So each frame starts the transfer of its
 // own picture and renders that of the frame before, which has arrived meanwhile: one frame of delay. Only the first
 // frame after a pause or a change of size waits for its own.
 //

@@ -106,7 +106,7 @@ ValueWord Instance::OwnAt(std::size_t index, OfxTime time) const {
     }
 }
 
-// Nothing for a parameter that is not animated, or when the host does not tell its keys.
+// Nothing for a parameter that is not animated, or when the host does not give its keys.
 std::optional<ValueWord> Instance::LargestKey(std::size_t index) const {
     const OfxParameterSuiteV1& suite = *m_suites.parameter;
     unsigned int count = 0;

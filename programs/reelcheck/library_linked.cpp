@@ -74,7 +74,7 @@ int DialogAnswers::Programs() const noexcept {
     return 0;
 }
 
-DialogCanceller::DialogCanceller() noexcept : m_hook(nullptr) {}
+DialogCanceller::DialogCanceller() noexcept = default;
 DialogCanceller::~DialogCanceller() = default;
 int DialogCanceller::Cancelled() const noexcept {
     return 0;

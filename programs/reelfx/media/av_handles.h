@@ -24,7 +24,9 @@ struct AvDelete {
     void operator()(AVCodecContext* codec) const { avcodec_free_context(&codec); }
     void operator()(SwsContext* scaler) const { sws_freeContext(scaler); }
     void operator()(SwrContext* resampler) const { swr_free(&resampler); }
-    void operator()(AVBufferPool* pool) const { av_buffer_pool_uninit(&pool); }  // after the last buffer's return
+    void operator()(AVBufferPool* pool) const {
+        av_buffer_pool_uninit(&pool);
+    }  // after the last buffer's return
 };
 using FramePtr = std::unique_ptr<AVFrame, AvDelete>;
 using PacketPtr = std::unique_ptr<AVPacket, AvDelete>;
@@ -87,7 +89,7 @@ class AvOptions {
 // From now on the libraries' messages are kept instead of written.
 void KeepLibraryLog();
 
-// What was said so far is not about what follows.
+// Drops the kept messages, so that they are not given as the reason of a later error.
 void ForgetLibraryErrors();
 
 // ": " and the library's own last words on an error if there are any, otherwise the error's name.

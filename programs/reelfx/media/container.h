@@ -8,8 +8,8 @@
 
 namespace velmora::hosts {
 
-// What a container can hold (container_contents.cpp): by what the libraries say, and where they do not say it by trying to
-// write a header.
+// What a container can hold (container_contents.cpp): as the libraries say, and where they do not, as an attempt to write a
+// header shows.
 
 // True if streams of the codec can be stored, as far as that depends on the codec alone.
 bool CanHold(const AVOutputFormat& format, AVCodecID codec);
@@ -25,7 +25,7 @@ bool HoldsRange(const AVOutputFormat& format, AVCodecID codec);
 
 bool IsMovFamily(const AVOutputFormat& format);
 
-// False for formats of nothing but pictures.
+// False for formats that hold only pictures.
 bool HoldsOtherStreams(const AVOutputFormat& format);
 
 // Names, dates and other text that containers hold, and chapters, as they go from a source to an output (tags.cpp).

@@ -159,10 +159,10 @@ bool EndsEarly(const std::string& path, const std::string& format) {
     std::array<std::uint8_t, 512> head = {};
     std::ifstream(path, std::ios::binary).read(reinterpret_cast<char*>(head.data()), head.size());
     const bool isMatroska = format.find("matroska") != std::string::npos;
-    const std::uint64_t told = isMatroska        ? MatroskaLength(head.data(), head.size())
-                               : format == "avi" ? AviLength(head.data())
-                                                 : 0;
-    return told > size;
+    const std::uint64_t stated = isMatroska        ? MatroskaLength(head.data(), head.size())
+                                 : format == "avi" ? AviLength(head.data())
+                                                   : 0;
+    return stated > size;
 }
 
 }  // namespace velmora::hosts

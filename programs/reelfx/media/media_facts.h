@@ -27,13 +27,13 @@ struct MediaFacts {
     FrameSize shownSize;      // turned upright; pixels are counted, not their shape
     int turn = 0;             // degrees clockwise that make the picture upright
     bool isMirrored = false;  // left and right, before it is turned
-    std::string pixelShape;   // "4:3"; "1:1" where the container does not tell
+    std::string pixelShape;   // "4:3"; "1:1" where the container does not say
     FrameRate rate;
     bool isUnevenRate = false;  // frames do not follow at a constant rate
     std::int64_t frames = 0;    // 0: not known
     double seconds = 0.0;       // 0: not known
     bool isInterlaced = false;
-    std::string matrix, range, primaries, transfer;  // "unknown" where the clip does not tell
+    std::string matrix, range, primaries, transfer;  // "unknown" where the clip does not say
     std::string assumedMatrix;                       // what is taken for the matrix
     std::vector<OtherStreamFacts> others;
 };

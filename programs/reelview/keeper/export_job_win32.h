@@ -31,7 +31,8 @@ struct AviCodec {
 [[nodiscard]] std::unique_ptr<FrameSink> MakeAviSink(const std::wstring& file, const ClipFacts& facts,
                                                      const AviCodec& codec);
 
-// COM must be initialised on the thread for both. film.png becomes film0000.png, film0001.png and so on. Throws SourceError, also when one of them exists.
+// COM must be initialised on the thread for both. film.png becomes film0000.png, film0001.png and so on. Throws
+// SourceError, also when one of them exists.
 [[nodiscard]] std::unique_ptr<FrameSink> MakePngSink(const std::wstring& file, const ClipFacts& facts);
 // Writes one picture and replaces an existing file. Throws SourceError.
 void SavePng(const std::wstring& file, const Picture& picture);

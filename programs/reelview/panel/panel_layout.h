@@ -38,7 +38,8 @@ struct PanelLayout {
 // In pixels. Positions and sizes from a careless library are clamped to a range that a window can show.
 [[nodiscard]] PanelLayout LayOutPanel(const std::vector<hosts::ParamInfo>& params, UnitScale scale);
 
-// Values as the panel shows them and as a user types them: as many decimals as a thousandth of the range needs, without trailing zeros: "24.5", "-100", "0.25".
+// Values as the panel shows them and as a user types them: as many decimals as a thousandth of the range needs, without
+// trailing zeros: "24.5", "-100", "0.25".
 [[nodiscard]] std::string SliderText(const hosts::ParamInfo& param, double value, char decimalPoint);
 
 // Accepts a decimal point or comma, whatever the locale, and clamps to the range. Empty when the text is not a

@@ -65,8 +65,8 @@ void CheckSize(hosts::FrameSize size);
 // A YUV4MPEG2 file. Throws SourceError. A truncated file gives its complete frames.
 [[nodiscard]] std::unique_ptr<ClipSource> OpenY4mClip(const std::filesystem::path& file);
 
-// Numbered pictures: `name` is a file's name, `names` lists its folder. Returns the names that differ from it only in the last run of
-// digits, in numerical order, up to the first missing number; at least `name` itself.
+// Numbered pictures: `name` is a file's name, `names` lists its folder. Returns the names that differ from it only in the
+// last run of digits, in numerical order, up to the first missing number; at least `name` itself.
 [[nodiscard]] std::vector<std::u16string> SequenceOf(const std::u16string& name,
                                                      const std::vector<std::u16string>& names);
 
