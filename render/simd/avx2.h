@@ -98,9 +98,6 @@ inline Vec LoadBytes16(const void* from) noexcept {
     return _mm256_cvtepu8_epi16(_mm_loadu_si128(static_cast<const __m128i*>(from)));
 }
 
-inline Vec MulAddU8(Vec bytes, Vec signedBytes) noexcept {
-    return _mm256_maddubs_epi16(bytes, signedBytes);
-}
 // The bytes of `a` where those of `sign` are negative, else those of `b`.
 inline Vec SelectBySign8(Vec sign, Vec a, Vec b) noexcept {
     return _mm256_blendv_epi8(b, a, sign);

@@ -21,9 +21,6 @@ inline Vec EachBlock(std::int64_t low, std::int64_t high) noexcept {
 inline Vec ShuffleBytes(Vec table, Vec indices) noexcept {
     return _mm512_shuffle_epi8(table, indices);
 }
-inline Vec MulAddU8(Vec bytes, Vec signedBytes) noexcept {
-    return _mm512_maddubs_epi16(bytes, signedBytes);
-}
 
 // As a byte shuffle, which takes one instruction instead of two.
 template <int a, int b, int c, int d>
