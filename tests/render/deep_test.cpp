@@ -138,6 +138,7 @@ TEST(DeepFrame, CanBeRenderedByManyThreads) {
     const Deep alone = Rendered(source, Everything());
     std::vector<Deep> results(6, source);
     std::vector<std::thread> workers;
+    workers.reserve(results.size());
     for (Deep& result : results)
         workers.emplace_back([&source, &result] { result = Rendered(source, Everything()); });
     for (std::thread& worker : workers) worker.join();
@@ -421,8 +422,8 @@ TEST(DeepLook, DoesNotDependOnTheNeighbours) {
     for (int round = 0; round < 40; ++round) {
         StageSettings settings = RandomLook(numbers);
         settings.tintBlue = 0.7f;
-        std::vector<float> greys;
-        for (int i = 0; i < 300; ++i) greys.push_back(static_cast<float>(numbers() % 1001) / 1000.0f);
+        std::vector<float> greys(300);
+        for (float& grey : greys) grey = static_cast<float>(numbers() % 1001) / 1000.0f;
         std::vector<float> outside = greys;
         outside[7] = 1.5f;
         outside[8] = kNotANumber;
