@@ -5,10 +5,6 @@
 namespace velmora::hosts {
 namespace {
 
-int Reduced(int size, int shift) {
-    return (size + (1 << shift) - 1) >> shift;
-}
-
 bool IsCopy(const FilterTaps& taps) {
     return taps.size() == 1 && taps.front().place == 0;
 }
@@ -23,8 +19,8 @@ FrameToPicture::FrameToPicture(const FrameCoding& coding, const SampleLayout& la
                  : samples == SampleType::kWords ? kernels.toWords
                                                  : kernels.toFloats),
       m_width(coding.width),
-      m_chromaWidth(Reduced(coding.width, layout.chromaWidthShift)),
-      m_chromaHeight(Reduced(coding.height, layout.chromaHeightShift)),
+      m_chromaWidth(ChromaSize(coding.width, layout.chromaWidthShift)),
+      m_chromaHeight(ChromaSize(coding.height, layout.chromaHeightShift)),
       m_luma(coding.width),
       m_alpha(coding.width) {
     SetMatrix(coding, samples);
@@ -43,9 +39,7 @@ FrameToPicture::FrameToPicture(const FrameCoding& coding, const SampleLayout& la
 
 void FrameToPicture::SetMatrix(const FrameCoding& coding, SampleType samples) {
     const CodeMatrix codes = MatrixOf(coding, m_layout);
-    const double white = samples == SampleType::kBytes   ? 255.0
-                         : samples == SampleType::kWords ? 65535.0
-                                                         : 1.0;
+    const double white = WhiteOf(samples);
     const double half = samples == SampleType::kFloats ? 0.0 : 0.5;
     for (std::size_t i = 0; i < 3; ++i) {
         double plus = half;

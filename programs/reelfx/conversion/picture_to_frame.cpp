@@ -23,7 +23,7 @@ PictureToFrame::PictureToFrame(SampleType samples, const FrameCoding& coding, co
                    : samples == SampleType::kWords ? kernels.fromWords
                                                    : kernels.fromFloats),
       m_width(coding.width),
-      m_chromaWidth((coding.width + (1 << layout.chromaWidthShift) - 1) >> layout.chromaWidthShift),
+      m_chromaWidth(ChromaSize(coding.width, layout.chromaWidthShift)),
       m_luma(coding.width),
       m_alpha(coding.width) {
     SetMatrix(samples, MatrixOf(coding, layout));
@@ -40,9 +40,7 @@ PictureToFrame::PictureToFrame(SampleType samples, const FrameCoding& coding, co
 }
 
 void PictureToFrame::SetMatrix(SampleType samples, const CodeMatrix& codes) {
-    const double white = samples == SampleType::kBytes   ? 255.0
-                         : samples == SampleType::kWords ? 65535.0
-                                                         : 1.0;
+    const double white = WhiteOf(samples);
     for (std::size_t k = 0; k < 3; ++k) {
         for (std::size_t i = 0; i < 3; ++i) {
             m_matrix.weight[k][i] = static_cast<float>(codes.fromRgb[k][i] / white);
@@ -104,7 +102,7 @@ void PictureToFrame::ReduceAcross(ChromaRows& chroma, float* out) {
 // The rows of chroma for which row y is the last one needed.
 void PictureToFrame::WriteChroma(int y, int height, AVFrame& frame) {
     const int shift = m_layout.chromaHeightShift;
-    const int chromaHeight = (height + (1 << shift) - 1) >> shift;
+    const int chromaHeight = ChromaSize(height, shift);
     for (; m_chromaY < chromaHeight; ++m_chromaY) {
         const int start = m_chromaY << shift;
         if (std::min(start + m_downTaps.back().place, height - 1) > y) return;

@@ -16,6 +16,10 @@ constexpr std::ptrdiff_t BytesPerPixel(SampleType type) {
     return type == SampleType::kBytes ? 4 : type == SampleType::kWords ? 8 : 16;
 }
 
+constexpr double WhiteOf(SampleType type) {
+    return type == SampleType::kBytes ? 255.0 : type == SampleType::kWords ? 65535.0 : 1.0;
+}
+
 template <class Byte>
 struct BasicPictureView {
     Byte* rows;             // not owned

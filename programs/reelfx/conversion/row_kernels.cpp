@@ -7,14 +7,10 @@
 
 #include "render/simd/target.h"
 
-namespace velmora::hosts {
-namespace {
-
+#define VM_ROW_KERNELS kPlainRowKernels
 #include "programs/reelfx/conversion/row_kernels.inc"
 
-}  // namespace
-
-const RowKernels kPlainRowKernels = kKernels;
+namespace velmora::hosts {
 
 const RowKernels& RowKernelsOf([[maybe_unused]] render::SimdLevel level) noexcept {
 #if VM_HAS_AVX512

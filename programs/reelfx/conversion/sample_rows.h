@@ -33,6 +33,11 @@ void ReadRow(const RowKernels& kernels, const AVFrame& frame, const ComponentLay
 void WriteRow(const RowKernels& kernels, const float* in, const ComponentLayout& layout, float zero, int y,
               int count, AVFrame& frame);
 
+// The rows or columns of chroma for so many of luma, of which one in 2^shift has chroma.
+constexpr int ChromaSize(int lumaSize, int shift) {
+    return (lumaSize + (1 << shift) - 1) >> shift;
+}
+
 // The sum of rows by their taps; row(place) gives the row for a tap, in which sample i is the one for output i.
 template <class RowAt>
 void SumRows(const RowKernels& kernels, const FilterTaps& taps, int count, float* out, const RowAt& row) {
