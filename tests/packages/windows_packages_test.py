@@ -34,10 +34,10 @@ EXIT_IN_USE = 2
 class Prefix:
     """A separate Windows with its own Wine server, isolated from those that other tests use."""
 
-    def __init__(self, folder):
+    def __init__(self, folder, **variables):
         self.folder = folder
         self.drive = folder / "drive_c"
-        self._environment = {**os.environ, "WINEPREFIX": str(folder)}
+        self._environment = {**os.environ, "WINEPREFIX": str(folder), **variables}
         run(WINE, "--prepare", env=self._environment)
 
     def start(self, program, *arguments, **options):
@@ -208,6 +208,35 @@ def check_life(prefix, setup, packed, expected):
     assert registry <= prefix.registry(), registry - prefix.registry()
 
 
+def check_openfx(work, setup):
+    """The OpenFX plug-ins, in a 64-bit Windows that runs the 32-bit installer: chosen, checked, kept by an update, removed.
+
+    The tree's Wine can do so with the package wine64:amd64 in it, which scripts/setup does not install.
+    """
+    tree = Path(os.environ.get("VELMORA_CACHE", Path.home() / ".cache/velmora-reel-effects"), "wine32-tree")
+    if not (tree / "usr/lib/wine/wine64").exists():
+        return print("The OpenFX section is not tried: the tree has no wine64:amd64.")
+    prefix = Prefix(work / "wow64", WINEARCH="win64")
+    try:
+        everyone = Installation(prefix, setup, "Program Files (x86)\\Velmora\\Reel Effects", "HKLM", "/AllUsers")
+        folder = prefix.drive / "Program Files/Common Files/OFX"
+        bundle = folder / "Plugins/VelmoraReelEffects.ofx.bundle"
+        assert everyone.install() == 0 and not folder.exists()
+        assert everyone.install("/OpenFX") == 0 and files_below(bundle) == files_below(
+            everyone.folder / "64-bit/VelmoraReelEffects.ofx.bundle")
+        assert prefix.run(everyone.folder / "64-bit/reelcheck.exe", "--level", "1", "--seed", "1", "--bundle", bundle) == 0
+        assert everyone.install() == 0 and files_below(bundle)
+        # Its entry is in the 32-bit part of the registry, which the 64-bit tools do not show.
+        assert prefix.run(everyone.folder / "uninstall.exe", "/S") == 0
+        for _ in range(600):
+            if not folder.exists() and not everyone.folder.exists():
+                return
+            time.sleep(0.1)
+        raise AssertionError("the uninstaller leaves something")
+    finally:
+        prefix.end()
+
+
 def main():
     with tempfile.TemporaryDirectory(prefix="windows-", dir=os.environ["WORK"]) as folder:
         work = Path(folder)
@@ -220,6 +249,7 @@ def main():
             check_life(prefix, packages[f"{PRODUCT}-setup.exe"], packed, expected)
         finally:
             prefix.end()
+        check_openfx(work, packages[f"{PRODUCT}-setup.exe"])
         for name, path in sorted(packages.items()):
             print(f"{name}: {path.stat().st_size} bytes, sha256 {hashlib.sha256(path.read_bytes()).hexdigest()}")
 
