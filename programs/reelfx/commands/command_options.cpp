@@ -22,6 +22,9 @@ void AddInput(CLI::App& command, TypedOptions& typed) {
         .add_option("--start-number", typed.startNumber,
                     "First number of an image sequence; default: the first that exists")
         ->type_name("N");
+    command.add_flag(
+        "--linear-as-is", typed.input.keepsLight,
+        "Take and write the values of OpenEXR as they are, without converting them from and to light");
 }
 
 // An option of one value that each effect of a list can have.

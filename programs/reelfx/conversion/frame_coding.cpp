@@ -93,6 +93,12 @@ FrameCoding CodingOf(const AVFrame& frame) {
             frame.colorspace, frame.color_range, frame.chroma_location};
 }
 
+bool IsLinearLight(const AVFrame& frame) {
+    const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(static_cast<AVPixelFormat>(frame.format));
+    return frame.color_trc == AVCOL_TRC_LINEAR && descriptor &&
+           (descriptor->flags & AV_PIX_FMT_FLAG_FLOAT) != 0;
+}
+
 bool IsFullRange(const FrameCoding& coding) {
     const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(coding.format);
     return coding.range == AVCOL_RANGE_JPEG || IsRgb(coding.format) ||

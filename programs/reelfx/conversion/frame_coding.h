@@ -27,6 +27,9 @@ struct FrameCoding {
 };
 FrameCoding CodingOf(const AVFrame& frame);
 
+// Floating-point samples proportional to light. The tags of other formats are not to be trusted in this.
+bool IsLinearLight(const AVFrame& frame);
+
 // RGB, grey and the old formats named "yuvj" have full range whatever their tag says.
 bool IsFullRange(const FrameCoding& coding);
 

@@ -49,9 +49,11 @@ bool Fits(const AVCodec& codec, AVPixelFormat format, const PictureSource& sourc
 
 std::vector<AVPixelFormat> FormatsOf(const AVCodec& codec) {
     std::vector<AVPixelFormat> formats;
-    if (codec.id == AV_CODEC_ID_WRAPPED_AVFRAME) {  // YUV4MPEG2: the 8-bit formats that its header can name
-        return {AV_PIX_FMT_YUV420P, AV_PIX_FMT_YUV422P, AV_PIX_FMT_YUV444P, AV_PIX_FMT_YUV411P,
-                AV_PIX_FMT_GRAY8};
+    if (codec.id == AV_CODEC_ID_WRAPPED_AVFRAME) {  // YUV4MPEG2: the formats that its header can name
+        return {AV_PIX_FMT_YUV420P,   AV_PIX_FMT_YUV422P,   AV_PIX_FMT_YUV444P,   AV_PIX_FMT_YUV411P,
+                AV_PIX_FMT_YUV420P10, AV_PIX_FMT_YUV422P10, AV_PIX_FMT_YUV444P10, AV_PIX_FMT_YUV420P12,
+                AV_PIX_FMT_YUV422P12, AV_PIX_FMT_YUV444P12, AV_PIX_FMT_YUV420P16, AV_PIX_FMT_YUV422P16,
+                AV_PIX_FMT_YUV444P16, AV_PIX_FMT_GRAY8};
     }
     for (const AVPixelFormat* f = codec.pix_fmts; f && *f != AV_PIX_FMT_NONE; ++f) formats.push_back(*f);
     return formats;
@@ -98,9 +100,9 @@ std::vector<AVPixelFormat> WithAlpha(const std::vector<AVPixelFormat>& formats) 
 // The source's codec is kept if it is one of these: deeper, lossless or newer than a container's usual one, or the
 // usual one elsewhere. Cameras' and discs' older codecs are not.
 constexpr AVCodecID kKeptCodecs[] = {
-    AV_CODEC_ID_H264,       AV_CODEC_ID_HEVC,    AV_CODEC_ID_AV1,     AV_CODEC_ID_VP9,
-    AV_CODEC_ID_VP8,        AV_CODEC_ID_PRORES,  AV_CODEC_ID_FFV1,    AV_CODEC_ID_QTRLE,
-    AV_CODEC_ID_MPEG2VIDEO, AV_CODEC_ID_HUFFYUV, AV_CODEC_ID_FFVHUFF, AV_CODEC_ID_UTVIDEO,
+    AV_CODEC_ID_H264,    AV_CODEC_ID_HEVC,    AV_CODEC_ID_AV1,   AV_CODEC_ID_VP9,        AV_CODEC_ID_VP8,
+    AV_CODEC_ID_PRORES,  AV_CODEC_ID_FFV1,    AV_CODEC_ID_QTRLE, AV_CODEC_ID_MPEG2VIDEO, AV_CODEC_ID_HUFFYUV,
+    AV_CODEC_ID_FFVHUFF, AV_CODEC_ID_UTVIDEO, AV_CODEC_ID_V210,
 };
 
 // The encoder of a codec, where there are several and the libraries' first choice is slow or poor.
@@ -158,6 +160,7 @@ AVPixelFormat InColour(AVPixelFormat format, bool isFilm) {
         return format;
     const int depth = descriptor->comp[0].depth;
     const bool isDeep = depth > 8;
+    if (depth > 16) return AV_PIX_FMT_GBRPF32;
     if (isFilm)
         return depth > 12   ? AV_PIX_FMT_YUV420P16
                : depth > 10 ? AV_PIX_FMT_YUV420P12

@@ -1,4 +1,4 @@
-#include "programs/reelfx/media/exif.h"
+#include "programs/reelfx/media/picture_metadata.h"
 
 #include <cstring>
 

@@ -1,4 +1,4 @@
-#include "programs/reelfx/media/hdr_metadata.h"
+#include "programs/reelfx/media/picture_metadata.h"
 
 #include <cmath>
 #include <cstring>

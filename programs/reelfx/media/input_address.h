@@ -17,6 +17,7 @@ struct InputOptions {
     std::optional<FrameSize> rawSize;              // the input is raw BGRA of this size
     std::optional<FrameRate> rate;                 // of raw input and image sequences
     std::optional<std::int64_t> startNumber = {};  // of the first image of a numbered sequence
+    bool keepsLight = false;                       // linear light is not converted to display values
 };
 
 struct InputAddress {

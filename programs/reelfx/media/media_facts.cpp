@@ -123,6 +123,9 @@ std::vector<std::string> NotesOn(const MediaFacts& facts) {
     note(facts.transfer == "smpte2084" || facts.transfer == "arib-std-b67",
          "high dynamic range (" + facts.transfer +
              "): effects are applied to the code values without conversion");
+    note(facts.transfer == "linear" && facts.bits == 32,
+         "linear light: the effects work on display values (sRGB's curve); --linear-as-is on the values "
+         "themselves");
     note(facts.frames == 0, "the number of frames is unknown until the end");
     return notes;
 }

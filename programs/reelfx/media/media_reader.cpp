@@ -291,6 +291,10 @@ void MediaReader::TakeFrames() {
             return;
         }
         frame = Plain(std::move(frame));
+        // OpenEXR has no tag for it: its values are proportional to light.
+        const bool isUntagged = frame->color_trc == AVCOL_TRC_UNSPECIFIED;
+        if (m_decoder->codec_id == AV_CODEC_ID_EXR && isUntagged && ConvertsLight())
+            frame->color_trc = AVCOL_TRC_LINEAR;
         if (m_lastPts == AV_NOPTS_VALUE && frame->best_effort_timestamp == AV_NOPTS_VALUE &&
             m_untimed.size() < kMostUntimed) {
             m_untimed.push_back(std::move(frame));

@@ -70,6 +70,8 @@ class MediaReader {
     [[nodiscard]] AVRational FrameRateGuess() const;
     // The number of frames according to the container; 0 if unknown.
     [[nodiscard]] std::int64_t FrameCountGuess() const;
+    // Linear light is converted to display values for the effects, and back for formats that have it.
+    [[nodiscard]] bool ConvertsLight() const { return !m_options.keepsLight; }
     [[nodiscard]] const std::string& Name() const { return m_name; }
     // The number of packets that could not be decoded and were skipped.
     [[nodiscard]] std::int64_t DamagedPackets() const { return m_damaged; }

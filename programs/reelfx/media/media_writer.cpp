@@ -6,7 +6,7 @@
 
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/container.h"
-#include "programs/reelfx/media/exif.h"
+#include "programs/reelfx/media/picture_metadata.h"
 #include "programs/reelfx/media/av_handles.h"
 
 extern "C" {
@@ -40,6 +40,7 @@ MediaWriter::MediaWriter(const OutputOptions& options, const std::string& addres
     }
     m_container.reset(container);
     m_container->opaque = &m_closeError;
+    m_container->strict_std_compliance = FF_COMPLIANCE_UNOFFICIAL;  // YUV4MPEG2 of more than 8 bits
     m_container->flags |= AVFMT_FLAG_BITEXACT;  // no random identifiers: the same frames give the same file
     m_container->io_close2 = CloseAndRemember;
     CopyContainerTags(source.Container(), *m_container);

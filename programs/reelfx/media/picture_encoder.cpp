@@ -4,11 +4,12 @@
 #include <cmath>
 #include <cstring>
 #include <iterator>
+#include <string_view>
 #include <utility>
 
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/container.h"
-#include "programs/reelfx/media/hdr_metadata.h"
+#include "programs/reelfx/media/picture_metadata.h"
 #include "programs/reelfx/media/av_handles.h"
 #include "programs/reelfx/media/pixel_converter.h"
 
@@ -102,6 +103,27 @@ PictureEncoder::PictureEncoder(const OutputOptions& options, const AVOutputForma
     if (!options.needsAlpha) NoteLosses(container);
 }
 
+// The threads of this encoder end only when they have been given a frame and then the end of the stream.
+PictureEncoder::~PictureEncoder() {
+    AVCodecContext* const encoder = m_encoder.get();
+    const bool isOpen = encoder && avcodec_is_open(encoder) != 0;
+    if (!isOpen || std::string_view(encoder->codec->name) != "libsvtav1") return;
+    const FramePtr frame(av_frame_alloc());
+    const PacketPtr packet(av_packet_alloc());
+    if (!frame || !packet) return;
+    frame->width = encoder->width;
+    frame->height = encoder->height;
+    frame->format = encoder->pix_fmt;
+    if (av_frame_get_buffer(frame.get(), 0) < 0) return;
+    for (const AVBufferRef* buffer : frame->buf) {
+        if (buffer) std::memset(buffer->data, 0, buffer->size);
+    }
+    // Refused when the stream has ended.
+    if (avcodec_send_frame(encoder, frame.get()) < 0) return;
+    avcodec_send_frame(encoder, nullptr);
+    while (avcodec_receive_packet(encoder, packet.get()) >= 0) av_packet_unref(packet.get());
+}
+
 PictureSource PictureEncoder::SourceOf(const AVOutputFormat&) const {
     const AVFrame& first = m_source.FirstFrame();
     PictureSource picture = {.codec = m_source.Picture().codecpar->codec_id,
@@ -179,6 +201,11 @@ void PictureEncoder::DescribeColours(const AVOutputFormat& container) {
     const auto format = static_cast<AVPixelFormat>(first.format);
     encoder.color_primaries = first.color_primaries;
     encoder.color_trc = first.color_trc;
+    if (encoder.codec_id == AV_CODEC_ID_EXR && m_source.ConvertsLight()) {
+        encoder.color_trc = AVCOL_TRC_LINEAR;
+    } else if (IsLinearLight(first)) {
+        encoder.color_trc = AVCOL_TRC_IEC61966_2_1;
+    }
     encoder.chroma_sample_location = first.chroma_location;
     if (IsRgb(encoder.pix_fmt)) {
         encoder.colorspace = AVCOL_SPC_RGB;
@@ -252,6 +279,7 @@ FramePtr PictureEncoder::NewResult(const AVFrame& source) const {
     frame->color_range = m_encoder->color_range;
     frame->colorspace = m_encoder->colorspace;
     frame->chroma_location = m_encoder->chroma_sample_location;
+    frame->color_trc = m_encoder->color_trc;
     if (m_isUpright) {
         av_frame_remove_side_data(frame.get(), AV_FRAME_DATA_DISPLAYMATRIX);
         frame->sample_aspect_ratio = m_encoder->sample_aspect_ratio;
@@ -261,9 +289,12 @@ FramePtr PictureEncoder::NewResult(const AVFrame& source) const {
 }
 
 bool PictureEncoder::TakesAsItIs(const AVFrame& source) const {
-    return !m_isUpright && source.format == m_encoder->pix_fmt && source.width == m_encoder->width &&
-           source.height == m_encoder->height && source.color_range == m_encoder->color_range &&
-           source.colorspace == m_encoder->colorspace;
+    const bool isSameSize = source.width == m_encoder->width && source.height == m_encoder->height;
+    // RGB has one range and no matrix, whatever its tags say or leave out.
+    const bool isSameCoding = IsRgb(m_encoder->pix_fmt) || (source.color_range == m_encoder->color_range &&
+                                                            source.colorspace == m_encoder->colorspace);
+    return !m_isUpright && source.format == m_encoder->pix_fmt && isSameSize && isSameCoding &&
+           source.color_trc == m_encoder->color_trc;
 }
 
 }  // namespace velmora::hosts

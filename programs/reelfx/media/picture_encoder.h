@@ -18,6 +18,10 @@ class PictureEncoder {
     PictureEncoder(const OutputOptions& options, const AVOutputFormat& container, const MediaReader& source,
                    const std::string& name);
 
+    ~PictureEncoder();
+    PictureEncoder(const PictureEncoder&) = delete;
+    PictureEncoder& operator=(const PictureEncoder&) = delete;
+
     [[nodiscard]] AVCodecContext& Context() const { return *m_encoder; }
     // Describes the encoded picture in a stream of the output.
     void Describe(AVStream& stream) const;

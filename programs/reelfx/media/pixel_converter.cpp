@@ -1,9 +1,11 @@
 #include "programs/reelfx/media/pixel_converter.h"
 
 #include <algorithm>
+#include <utility>
 
 #include "effects/render_options.h"
 #include "programs/reelfx/common/failure.h"
+#include "programs/reelfx/conversion/light_curve.h"
 
 extern "C" {
 #include <libavutil/opt.h>
@@ -86,6 +88,20 @@ void PixelConverter::Prepare(Scaler& scaler, const FrameCoding& from, const Fram
 }
 
 void PixelConverter::ToPicture(const AVFrame& frame, const PictureView& picture) {
+    if (!IsLinearLight(frame)) return CodesToPicture(frame, picture);
+    m_light = BgraPicture(picture.width, picture.height, SampleType::kFloats);
+    CodesToPicture(frame, m_light.View());
+    DisplayOfLight(std::as_const(m_light).View(), picture);
+}
+
+void PixelConverter::FromPicture(const ConstPictureView& picture, AVFrame& frame) {
+    if (!IsLinearLight(frame)) return CodesFromPicture(picture, frame);
+    m_light = BgraPicture(picture.width, picture.height, SampleType::kFloats);
+    LightOfDisplay(picture, m_light.View());
+    CodesFromPicture(std::as_const(m_light).View(), frame);
+}
+
+void PixelConverter::CodesToPicture(const AVFrame& frame, const PictureView& picture) {
     const FrameCoding coding = CodingOf(frame);
     if (!IsOfSize(coding, picture)) return ScaleToPicture(frame, picture);
     auto& [preparedCoding, preparedSamples, conversion] = m_toPicture;
@@ -99,7 +115,7 @@ void PixelConverter::ToPicture(const AVFrame& frame, const PictureView& picture)
     conversion->Convert(frame, picture);
 }
 
-void PixelConverter::FromPicture(const ConstPictureView& picture, AVFrame& frame) {
+void PixelConverter::CodesFromPicture(const ConstPictureView& picture, AVFrame& frame) {
     const FrameCoding coding = CodingOf(frame);
     if (!IsOfSize(coding, picture)) return ScaleFromPicture(picture, frame);
     auto& [preparedCoding, preparedSamples, conversion] = m_fromPicture;

@@ -1,5 +1,6 @@
 // Converts decoded frames to pictures and back. Both ways use the frame's own matrix, range and chroma position, so
-// that an unchanged picture comes back as it was. One converter per thread.
+// that an unchanged picture comes back as it was. Frames in linear light become display values, and back
+// (conversion/light_curve.h). One converter per thread.
 //
 // Frames of YCbCr, grey and deep RGB go through conversion/, which rounds once. The library's scaler does the rest:
 // 8-bit RGB, where both are exact and it is faster, frames of another size than the picture, palettes and other rare
@@ -36,6 +37,9 @@ class PixelConverter {
     }
 
   private:
+    void CodesToPicture(const AVFrame& frame, const PictureView& picture);
+    void CodesFromPicture(const ConstPictureView& picture, AVFrame& frame);
+
     template <class Conversion>
     struct Prepared {
         FrameCoding coding{};
@@ -53,6 +57,7 @@ class PixelConverter {
     Prepared<FrameToPicture> m_toPicture;
     Prepared<PictureToFrame> m_fromPicture;
     Scaler m_toScaler, m_fromScaler;
+    BgraPicture m_light;
     std::vector<std::uint16_t> m_words;  // a picture between floats and the scaler
 };
 

@@ -19,6 +19,12 @@ CHAPTERS = (";FFMETADATA1\ntitle=A film\nartist=Somebody\n[CHAPTER]\nTIMEBASE=1/
 HDR = ("-x265-params log-level=none:hdr10=1:master-display=G(13250,34500)B(7500,3000)R(34000,16000)WP(15635,16450)"
        "L(10000000,1):max-cll=1000,400 -tag:v hvc1 -color_primaries bt2020 -color_trc smpte2084 -colorspace bt2020nc")
 
+# Steps finer than those of 8 bits. The values of the second are light, from below black to above white.
+DEEP = ("-f lavfi -i \"nullsrc=size=64x48:rate=25:duration=0.2,format=gbrp16le,geq=r='X*1000+Y':g='Y*1300':b='X*Y*20+7'\" "
+        "-pix_fmt")
+LIGHT = ("-f lavfi -i \"nullsrc=size=64x48,format=gbrpf32le,geq=r='X/20-0.5':g='0.2140':b='Y/48'\" -frames:v 1 "
+         "-pix_fmt gbrpf32le")
+
 # Inputs: the file's name, and how ffmpeg makes it. Later ones may use earlier ones; {f} is their folder.
 INPUTS = {
     "plain.mp4": f"{PICTURE} {TONE} -pix_fmt yuv420p -c:v libx264 -c:a aac",
@@ -65,6 +71,21 @@ INPUTS = {
     "code.mov": f"{PICTURE} -c:v libx264 -pix_fmt yuv420p -timecode 01:00:00:00",
     "rgb.mkv": f"{PICTURE} -c:v ffv1 -pix_fmt bgr0",
     "rgb48.png": "-f lavfi -i testsrc=size=64x48 -frames:v 1 -pix_fmt rgb48be",
+    "deep.mp4": f"{DEEP} yuv420p10le -c:v libx265 -x265-params log-level=none -tag:v hvc1",
+    "hlg.mp4": f"{DEEP} yuv420p10le -c:v libx265 -x265-params log-level=none -tag:v hvc1 -color_primaries bt2020 "
+               "-color_trc arib-std-b67 -colorspace bt2020nc",
+    "deep-hq.mov": f"{DEEP} yuv422p10le -c:v prores_ks -profile:v hq",
+    "deep-4444.mov": f"{DEEP} yuva444p10le -c:v prores_ks -profile:v 4444",
+    "deep-v210.mov": f"{DEEP} yuv422p10le -c:v v210",
+    "deep-av1.mp4": f"{DEEP} yuv420p10le -c:v libaom-av1 -cpu-used 8",
+    "deep-vp9.webm": f"{DEEP} yuv420p10le -c:v libvpx-vp9 -profile:v 2",
+    **{f"deep-{pixels}.mkv": f"{DEEP} {pixels} -c:v ffv1"
+       for pixels in ("yuv444p16le", "gbrp16le", "gbrap16le", "gbrp12le", "gray16le", "gray10le")},
+    **{f"deep-{pixels}.y4m": f"{DEEP} {pixels} -strict -1" for pixels in ("yuv420p10", "yuv444p12")},
+    **{f"deep-{pixels}.png": f"{DEEP} {pixels} -frames:v 1" for pixels in ("rgb48be", "rgba64be", "gray16be", "ya16be")},
+    **{f"deep-{pixels}.tif": f"{DEEP} {pixels} -frames:v 1" for pixels in ("rgb48le", "rgba64le", "gray16le")},
+    **{f"deep-{pixels}.dpx": f"{DEEP} {pixels} -frames:v 1" for pixels in ("gbrp10le", "gbrp12le", "rgb48be")},
+    "light.exr": LIGHT, "half.exr": f"{LIGHT} -format half",
     "grow-a.ts": f"{PICTURE} -c:v mpeg2video -pix_fmt yuv420p",
     "grow-b.ts": "-f lavfi -i testsrc=size=128x96:rate=25:duration=1 -c:v mpeg2video -pix_fmt yuv420p "
                  "-output_ts_offset 1",
@@ -171,6 +192,31 @@ CASES = [
     *((f"{name} from standard input", name, ("render", "-", "{o}/o.mkv", *SEPIA),
        {"stdin": True, "frames": 25, "a:0 codec_name": codec})
       for name, codec in (("flac.mkv", "flac"), ("aac.ts", "aac"))),
+    # Deep sources. Where nothing is lost, a neutral effect keeps every sample.
+    *((f"deep {name}", name, render(f"o.{name.split('.')[-1]}", effect=PLAIN),
+       {"like input": "v:0.codec_name v:0.pix_fmt digests"})
+      for name in ("deep-v210.mov", "deep-yuv444p16le.mkv", "deep-gbrp16le.mkv", "deep-gbrap16le.mkv", "deep-gbrp12le.mkv",
+                   "deep-yuv420p10.y4m", "deep-yuv444p12.y4m", "deep-rgb48be.png", "deep-rgba64be.png",
+                   "deep-rgb48le.tif", "deep-rgba64le.tif", "deep-gbrp10le.dpx", "deep-gbrp12le.dpx", "deep-rgb48be.dpx",
+                   "light.exr", "half.exr")),
+    *((f"deep {name}", name, render(f"o.{name.split('.')[-1]}", effect=PLAIN), {"v:0 pix_fmt": pixels})
+      for name, pixels in (("deep-gray16be.png", "rgb48be"), ("deep-ya16be.png", "rgba64be"),
+                           ("deep-gray16le.tif", "rgb48le"), ("deep-gray16le.mkv", "yuv420p16le"),
+                           ("deep-gray10le.mkv", "yuv420p10le"), ("deep.mp4", "yuv420p10le"),
+                           ("deep-hq.mov", "yuv422p10le"), ("deep-4444.mov", "yuva444p12le"),
+                           ("deep-av1.mp4", "yuv420p10le"), ("deep-vp9.webm", "yuv420p10le"))),
+    *((f"deep info of {name}", name, ("info", "{i}"), {"prints": f"{bits} bits, effects work in float"})
+      for name, bits in (("deep.mp4", 10), ("deep-4444.mov", 12), ("deep-rgba64be.png", 16), ("light.exr", 32),
+                         ("deep-yuv420p10.y4m", 10))),
+    ("deep --depth", "deep-hq.mov", render("o.mov", "--depth", "8", "--dry-run"), {"prints": "depth     8 bits"}),
+    ("deep to H.264", "deep-rgb48be.png", render("o.mp4"), {"says": "rgb48be becomes yuv444p10le"}),
+    ("deep to JPEG", "deep-gray16be.png", render("o.jpg"), {"says": "gray16be becomes"}),
+    ("deep HLG", "hlg.mp4", render("o.mp4"), {"v:0 color_transfer": "arib-std-b67", "v:0 pix_fmt": "yuv420p10le"}),
+    ("deep HLG info", "hlg.mp4", ("info", "{i}"), {"prints": "high dynamic range (arib-std-b67)"}),
+    # Light of 0.214 is half of white on a screen.
+    ("deep light to PNG", "light.exr", render("o.png", effect=PLAIN), {"v:0 pix_fmt": "rgb48be", "middle": (127, 128)}),
+    ("deep light as it is", "light.exr", render("o.png", "--linear-as-is", effect=PLAIN), {"middle": 54}),
+    ("deep PNG to light", "deep-rgb48be.png", render("o.exr", effect=PLAIN), {"v:0 pix_fmt": "gbrpf32le", "middle": 49}),
     # What has always held.
     ("edit list", "edit.mp4", render("o.mp4"), {"like input": "frames"}),
     *((f"rate {name}", f"rate{name}.mp4", render("o.mp4"), {"like input": "frames v:0.r_frame_rate times"})

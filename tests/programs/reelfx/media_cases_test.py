@@ -13,7 +13,7 @@ from pathlib import Path
 
 sys.path.insert(0, str(Path(__file__).resolve().parents[2] / "common"))
 sys.path.insert(0, str(Path(__file__).resolve().parent))
-from clip import ffmpeg, frame_times, reelfx, run  # noqa: E402
+from clip import ffmpeg, frame_digests, frame_times, reelfx, run  # noqa: E402
 from media_cases import CASES, CHAPTERS, INPUTS, SRT  # noqa: E402
 
 COLOURS = {(1, 0, 0): "red", (0, 1, 0): "lime", (0, 0, 1): "blue", (1, 1, 1): "white", (0, 0, 0): "black"}
@@ -147,6 +147,14 @@ class Probe:
     def look_ramp(self):
         row = samples(self.path, "null", "rgb24")[:256 * 3]
         return row == bytes(value for value in range(256) for _ in range(3))
+
+    def look_digests(self):
+        return frame_digests(self.path)
+
+    def look_middle(self):
+        """The green sample in the middle, in 8 bits."""
+        raw = samples(self.path, "null", "gbrp16le")
+        return raw[(24 * 64 + 32) * 2 + 1]
 
     def look_text(self):
         text = ffmpeg("-i", self.path, "-map", "0:s", "-f", "srt", "-").decode()
