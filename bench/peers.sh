@@ -2,7 +2,7 @@
 # Times other programs doing comparable work on frames of the same size, in one run with ours; prints two Markdown
 # tables, for the effects alone and for whole runs from file to file.
 #
-#   bench/peers.sh [FRAMES]          default 120 frames each
+#   bench/peers.sh [--effects | --files] [FRAMES]    one of the tables only; default 120 frames each
 #   VELMORA_BENCH=path/frames_bench  default: build/native/bench/frames_bench
 #   VELMORA_REELFX=path/reelfx       default: build/native/dist/reelfx
 #
@@ -12,6 +12,8 @@
 set -euo pipefail
 source "$(dirname "$0")/../scripts/common.sh"
 
+part=all
+case ${1:-} in --effects | --files) part=${1#--} && shift ;; esac
 frames=${1:-120}
 bench=${VELMORA_BENCH:-$velmoraRoot/build/native/bench/frames_bench}
 reelfx=${VELMORA_REELFX:-$velmoraRoot/build/native/dist/reelfx}
@@ -84,6 +86,9 @@ melt_peer() {  # case, filters
     peer "$case" "MLT $*" "$(run_melt "$@")" "$emptyMelt"
 }
 
+# The effects alone.
+if [ $part != files ]; then
+
 emptyMelt=$(run_melt)
 emptyGstreamer=$(run_gstreamer identity)
 emptyVlc=$(run_vlc "")
@@ -123,6 +128,9 @@ awk -F'|' '
         }
         print "\nBold: the best peer of each work."
     }' "$work/ours" "$work/peers"
+
+fi
+[ $part != effects ] || exit 0
 
 # From file to file: an H.264 clip in, raw 4:2:0 out, so that no encoder hides the rest. With as many threads as the
 # programs take by themselves.
