@@ -209,6 +209,8 @@ CASES = [
       for name, bits in (("deep.mp4", 10), ("deep-4444.mov", 12), ("deep-rgba64be.png", 16), ("light.exr", 32),
                          ("deep-yuv420p10.y4m", 10))),
     ("deep --depth", "deep-hq.mov", render("o.mov", "--depth", "8", "--dry-run"), {"prints": "depth     8 bits"}),
+    ("deep SVT-AV1 --dry-run", "hdr.mp4", render("o.mp4", "--codec", "libsvtav1", "--dry-run"),
+     {"prints": "libsvtav1 yuv420p10le"}),
     ("deep to H.264", "deep-rgb48be.png", render("o.mp4"), {"says": "rgb48be becomes yuv444p10le"}),
     ("deep to JPEG", "deep-gray16be.png", render("o.jpg"), {"says": "gray16be becomes"}),
     ("deep HLG", "hlg.mp4", render("o.mp4"), {"v:0 color_transfer": "arib-std-b67", "v:0 pix_fmt": "yuv420p10le"}),
