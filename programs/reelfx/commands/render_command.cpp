@@ -256,6 +256,10 @@ class RenderRun {
             what = "damaged in " + std::to_string(m_reader.DamagedPackets()) + " places";
         }
         if (missing > 0.0) what += (what.empty() ? "ends " : ", ends ") + NumberText(missing) + " s early";
+        const std::string image = m_reader.MissingImage();
+        if (!image.empty()) {
+            what += (what.empty() ? "" : ", ") + image + " is missing and the images after it are left out";
+        }
         if (what.empty()) return;
         std::fprintf(stderr, "reelfx: %s: %s; the part that could be decoded was rendered\n",
                      m_reader.Name().c_str(), what.c_str());

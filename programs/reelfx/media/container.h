@@ -14,8 +14,15 @@ namespace velmora::hosts {
 // True if streams of the codec can be stored, as far as that depends on the codec alone.
 bool CanHold(const AVOutputFormat& format, AVCodecID codec);
 
-// True if a file of the format can begin with this picture and this other stream.
-bool CanBegin(const AVOutputFormat& format, const AVCodecParameters& picture, const AVStream& other);
+// A stream that is not in the container yet.
+struct NewStream {
+    const AVCodecParameters& parameters;
+    AVRational timeBase;
+    int disposition;
+};
+
+// True if a file can begin with the streams of `container` and another one. Formats limit their number too.
+bool CanBegin(const AVFormatContext& container, const NewStream& other);
 
 // True for containers that can say how players must turn the picture.
 bool HoldsTurn(const AVOutputFormat& format);

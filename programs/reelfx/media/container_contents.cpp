@@ -37,12 +37,12 @@ bool IsOneOf(const AVOutputFormat& format, std::initializer_list<const char*> na
     return std::ranges::find(names, std::string(format.name)) != names.end();
 }
 
-AVStream* AddStream(AVFormatContext& container, const AVCodecParameters& parameters, AVRational timeBase) {
+void AddStream(AVFormatContext& container, const NewStream& added) {
     AVStream* stream = avformat_new_stream(&container, nullptr);
-    if (!stream || avcodec_parameters_copy(stream->codecpar, &parameters) < 0) throw std::bad_alloc();
+    if (!stream || avcodec_parameters_copy(stream->codecpar, &added.parameters) < 0) throw std::bad_alloc();
     stream->codecpar->codec_tag = 0;
-    stream->time_base = timeBase;
-    return stream;
+    stream->time_base = added.timeBase;
+    stream->disposition = added.disposition;
 }
 
 }  // namespace
@@ -56,20 +56,23 @@ bool CanHold(const AVOutputFormat& format, AVCodecID codec) {
     return known == 1;
 }
 
-bool CanBegin(const AVOutputFormat& format, const AVCodecParameters& picture, const AVStream& other) {
-    AVFormatContext* container = nullptr;
-    if (avformat_alloc_output_context2(&container, &format, nullptr, nullptr) < 0) throw std::bad_alloc();
-    const std::unique_ptr<AVFormatContext, void (*)(AVFormatContext*)> owner(container,
-                                                                             avformat_free_context);
-    AVStream* shown = AddStream(*container, picture, {1, 25});
-    shown->avg_frame_rate = {25, 1};
-    AddStream(*container, *other.codecpar, other.time_base)->disposition = other.disposition;
-    int error = avio_open_dyn_buf(&container->pb);
-    if (error >= 0) error = avformat_write_header(container, nullptr);
+bool CanBegin(const AVFormatContext& container, const NewStream& other) {
+    AVFormatContext* trial = nullptr;
+    if (avformat_alloc_output_context2(&trial, container.oformat, nullptr, nullptr) < 0)
+        throw std::bad_alloc();
+    const std::unique_ptr<AVFormatContext, void (*)(AVFormatContext*)> owner(trial, avformat_free_context);
+    for (unsigned i = 0; i < container.nb_streams; ++i) {
+        const AVStream& there = *container.streams[i];
+        AddStream(*trial, {*there.codecpar, there.time_base, there.disposition});
+        if (i == 0) trial->streams[i]->avg_frame_rate = there.avg_frame_rate;
+    }
+    AddStream(*trial, other);
+    int error = avio_open_dyn_buf(&trial->pb);
+    if (error >= 0) error = avformat_write_header(trial, nullptr);
     std::uint8_t* bytes = nullptr;
-    if (container->pb) avio_close_dyn_buf(container->pb, &bytes);
+    if (trial->pb) avio_close_dyn_buf(trial->pb, &bytes);
     av_free(bytes);
-    container->pb = nullptr;
+    trial->pb = nullptr;
     ThrowIfNoMemory(error);
     ForgetLibraryErrors();
     return error >= 0;

@@ -3,9 +3,12 @@
 #include <algorithm>
 #include <array>
 #include <cctype>
+#include <cstdlib>
 #include <filesystem>
 #include <fstream>
+#include <limits>
 #include <map>
+#include <set>
 
 #include "programs/reelfx/common/failure.h"
 
@@ -143,6 +146,32 @@ void CheckTaken(InputAddress& address) {
     }
     if (av_dict_get(left, "start_number", nullptr, 0))
         throw Failure(kExitUsage, "--start-number is for numbered image sequences");
+}
+
+std::string FirstMissingImage(const InputOptions& options) {
+    const fs::path pattern(options.path);
+    std::error_code ignored;
+    char name[4096];
+    const auto file = [&](std::int64_t number) {
+        const bool isNumbered = number <= std::numeric_limits<int>::max() &&
+                                av_get_frame_filename(name, sizeof name, pattern.filename().c_str(),
+                                                      static_cast<int>(number)) >= 0;
+        return isNumbered ? std::string(name) : std::string();
+    };
+    if (!IsImageName(options.path) || file(0).empty() || fs::exists(pattern, ignored)) return {};
+    const std::size_t prefix = pattern.filename().string().find('%');
+    std::set<std::int64_t> numbers;
+    for (fs::directory_iterator entry(fs::absolute(pattern).parent_path(), ignored), end;
+         !ignored && entry != end; entry.increment(ignored)) {
+        const std::string found = entry->path().filename().string();
+        const std::int64_t number =
+            prefix < found.size() ? std::strtoll(found.c_str() + prefix, nullptr, 10) : -1;
+        if (number >= options.startNumber.value_or(0) && found == file(number)) numbers.insert(number);
+    }
+    if (numbers.empty() || *numbers.rbegin() - *numbers.begin() + 1 == std::ssize(numbers)) return {};
+    std::int64_t missing = *numbers.begin();
+    while (numbers.contains(missing)) ++missing;
+    return file(missing);
 }
 
 bool EndsEarly(const std::string& path, const std::string& format) {

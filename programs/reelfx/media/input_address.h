@@ -35,6 +35,10 @@ void CheckTaken(InputAddress& address);
 // False for standard input, pipes and devices.
 bool CanBeReadTwice(const std::string& path);
 
+// Of a numbered sequence with a gap, where reading ends: the first file that is missing while later ones are there.
+// Empty for any other input.
+std::string FirstMissingImage(const InputOptions& options);
+
 // True if a file ends before the length that its own header gives, or inside a packet of a format whose packets have
 // one size. Only for formats whose readers do not report it: Matroska, AVI and MPEG-TS.
 bool EndsEarly(const std::string& path, const std::string& format);

@@ -43,10 +43,10 @@ void ForgetLibraryErrors() {
 
 std::string ErrorWords(int error) {
     const std::lock_guard lock(guard);
-    // These names say nothing.
+    // These names say nothing; a YUV4MPEG2 file of an impossible size is "busy".
     const bool isVague = error == AVERROR(EINVAL) || error == AVERROR_EXTERNAL || error == AVERROR_UNKNOWN ||
                          error == AVERROR_EXPERIMENTAL || error == AVERROR_INVALIDDATA ||
-                         error == AVERROR_BUG;
+                         error == AVERROR_BUG || error == AVERROR(EBUSY);
     if (error == AVERROR(EPERM) && !lastError.empty()) return ": " + lastError;
     if (!isVague) return ": " + AvText(error);
     if (lastError.empty() && error == AVERROR_INVALIDDATA)

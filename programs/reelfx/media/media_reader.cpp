@@ -260,6 +260,11 @@ double MediaReader::MissingSeconds() const {
     return missing > kTolerance ? missing : 0.0;
 }
 
+std::string MediaReader::MissingImage() const {
+    const bool isSequence = m_ended && std::strcmp(m_container->iformat->name, "image2") == 0;
+    return isSequence ? FirstMissingImage(m_options) : std::string();
+}
+
 // Some containers count their length from 0 and some from their first time: what both ways agree on.
 double MediaReader::ContainerEnd() const {
     const AVFormatContext& container = *m_container;

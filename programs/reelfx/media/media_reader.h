@@ -78,6 +78,8 @@ class MediaReader {
     // Seconds that are missing compared with the length in the container's header; 0 if nothing is known to
     // be missing.
     [[nodiscard]] double MissingSeconds() const;
+    // Of numbered images that were read to the end: the first one that is missing while later ones are there.
+    [[nodiscard]] std::string MissingImage() const;
     // "128x96" if a later frame has another size than the first; it was scaled. Otherwise empty.
     [[nodiscard]] const std::string& OtherSize() const { return m_otherSize; }
     // The EXIF block of a photograph, without its marker; empty if there is none.

@@ -52,7 +52,7 @@ MediaWriter::MediaWriter(const OutputOptions& options, const std::string& addres
     const AVCodecContext& encoder = m_picture->Context();
     const bool isVp = encoder.codec_id == AV_CODEC_ID_VP8 || encoder.codec_id == AV_CODEC_ID_VP9;
     if (isVp && CarriesAlpha(encoder.pix_fmt)) av_dict_set(&m_stream->metadata, "alpha_mode", "1", 0);
-    if (withOthers) m_others.emplace(*m_container, *m_stream->codecpar, source, options.audio);
+    if (withOthers) m_others.emplace(*m_container, source, options.audio);
     // The name of a still picture is not a pattern: it holds one frame.
     char name[4096];
     const bool isImage = std::strcmp(format.name, "image2") == 0;

@@ -47,9 +47,8 @@ const AVCodec& AskedSoundCodec(const std::string& name, const AVOutputFormat& fo
 
 }  // namespace
 
-OtherStreams::OtherStreams(AVFormatContext& container, const AVCodecParameters& picture,
-                           const MediaReader& source, std::string audio)
-    : m_container(container), m_picture(picture), m_source(source), m_audio(std::move(audio)) {
+OtherStreams::OtherStreams(AVFormatContext& container, const MediaReader& source, std::string audio)
+    : m_container(container), m_source(source), m_audio(std::move(audio)) {
     const AVFormatContext& from = source.Container();
     for (unsigned i = 0; i < from.nb_streams; ++i) {
         const AVStream& stream = *from.streams[i];
@@ -85,8 +84,20 @@ bool OtherStreams::CanCopy(const AVStream& source) const {
     const bool isUnknown = parameters.codec_id == AV_CODEC_ID_NONE ||
                            parameters.codec_id == AV_CODEC_ID_BIN_DATA ||
                            (parameters.codec_type == AVMEDIA_TYPE_AUDIO && parameters.sample_rate == 0);
-    return !isUnknown && CanHold(*m_container.oformat, parameters.codec_id) &&
-           CanBegin(*m_container.oformat, m_picture, source);
+    // In AVI, H.264 needs start codes, and has no times for its reordered frames.
+    const bool isReordered =
+        parameters.codec_id == AV_CODEC_ID_H264 || parameters.codec_id == AV_CODEC_ID_HEVC;
+    if (isUnknown || (isReordered && std::string(m_container.oformat->name) == "avi")) return false;
+    return CanHold(*m_container.oformat, parameters.codec_id) &&
+           hosts::CanBegin(m_container, {parameters, source.time_base, source.disposition});
+}
+
+bool OtherStreams::CanBegin(const AVStream& source, const AVCodecContext& encoder) const {
+    std::unique_ptr<AVCodecParameters, void (*)(AVCodecParameters*)> parameters(
+        avcodec_parameters_alloc(), [](AVCodecParameters* p) { avcodec_parameters_free(&p); });
+    if (!parameters || avcodec_parameters_from_context(parameters.get(), &encoder) < 0)
+        throw std::bad_alloc();
+    return hosts::CanBegin(m_container, {*parameters, encoder.time_base, source.disposition});
 }
 
 void OtherStreams::AddSound(const AVStream& source) {
@@ -99,6 +110,7 @@ void OtherStreams::AddSound(const AVStream& source) {
     Stream stream;
     if (m_audio == "auto" ? !canCopy : m_audio != "copy") {
         stream.transcoder = TranscoderFor(source);
+        if (!CanBegin(source, stream.transcoder->Encoder())) return LeaveOut(source);
         const std::string to = avcodec_get_name(stream.transcoder->Encoder().codec_id);
         if (m_audio == "auto") m_conversions.push_back("sound is encoded as " + to + " instead of " + from);
     }
@@ -108,9 +120,8 @@ void OtherStreams::AddSound(const AVStream& source) {
 // The container's usual codec, or another of the common ones that takes as many channels.
 std::unique_ptr<SoundTranscoder> OtherStreams::TranscoderFor(const AVStream& source) const {
     const AVOutputFormat& format = *m_container.oformat;
-    const bool globalHeader = (format.flags & AVFMT_GLOBALHEADER) != 0;
     if (m_audio != "auto")
-        return std::make_unique<SoundTranscoder>(source, AskedSoundCodec(m_audio, format), globalHeader);
+        return std::make_unique<SoundTranscoder>(source, AskedSoundCodec(m_audio, format), format);
     const AVCodecID candidates[] = {format.audio_codec, AV_CODEC_ID_AAC,  AV_CODEC_ID_AC3,
                                     AV_CODEC_ID_MP3,    AV_CODEC_ID_OPUS, AV_CODEC_ID_PCM_S16LE};
     for (const bool isAnyNumber : {false, true}) {
@@ -118,7 +129,7 @@ std::unique_ptr<SoundTranscoder> OtherStreams::TranscoderFor(const AVStream& sou
             const AVCodec* codec = avcodec_find_encoder(id);
             if (!codec || !CanHold(format, id)) continue;
             if (!isAnyNumber && !Supports(*codec, source.codecpar->ch_layout.nb_channels)) continue;
-            return std::make_unique<SoundTranscoder>(source, *codec, globalHeader);
+            return std::make_unique<SoundTranscoder>(source, *codec, format);
         }
     }
     throw Failure(kExitOutput, "the sound cannot be encoded; use --no-sound to leave it out");
@@ -130,6 +141,7 @@ void OtherStreams::AddSubtitle(const AVStream& source) {
     if (target == AV_CODEC_ID_NONE) return LeaveOut(source);
     Stream stream;
     stream.converter = std::make_unique<SubtitleConverter>(source, target);
+    if (!CanBegin(source, stream.converter->Encoder())) return LeaveOut(source);
     m_conversions.push_back(std::string("subtitles are converted to ") + avcodec_get_name(target));
     AddStream(source, std::move(stream));
 }

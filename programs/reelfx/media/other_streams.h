@@ -19,10 +19,9 @@ class OtherStreams {
     // Takes a packet for a stream of the output, with times in a time base.
     using Sink = std::function<void(AVPacket&, const AVStream&, AVRational)>;
 
-    // Adds the streams to `container`. `picture` is the encoded picture; `audio` is the user's wish, "auto", "copy",
+    // Adds the streams to `container`, which has the encoded picture; `audio` is the user's wish, "auto", "copy",
     // "none" or a codec. Throws Failure. `source` must outlive the object.
-    OtherStreams(AVFormatContext& container, const AVCodecParameters& picture, const MediaReader& source,
-                 std::string audio);
+    OtherStreams(AVFormatContext& container, const MediaReader& source, std::string audio);
 
     // The pictures of covers, which come before all else.
     void WriteCovers(const Sink& sink) const;
@@ -47,12 +46,13 @@ class OtherStreams {
     void AddSound(const AVStream& source);
     void AddSubtitle(const AVStream& source);
     [[nodiscard]] bool CanCopy(const AVStream& source) const;
+    // The same for a stream that is encoded anew.
+    [[nodiscard]] bool CanBegin(const AVStream& source, const AVCodecContext& encoder) const;
     [[nodiscard]] std::unique_ptr<SoundTranscoder> TranscoderFor(const AVStream& source) const;
     void AddStream(const AVStream& source, Stream stream);
     void LeaveOut(const AVStream& source);
 
     AVFormatContext& m_container;
-    const AVCodecParameters& m_picture;
     const MediaReader& m_source;
     std::string m_audio;
     std::map<int, Stream> m_streams;       // by the source's stream index

@@ -13,6 +13,7 @@ namespace velmora::hosts {
 namespace {
 
 constexpr std::int64_t kBitRatePerChannel = 96000;
+constexpr int kMxfRate = 48000;  // the only one that the library writes
 
 int NearestRate(const AVCodec& codec, int wanted) {
     if (!codec.supported_samplerates) return wanted;
@@ -67,17 +68,19 @@ AVSampleFormat ClosestFormat(const AVCodec& codec, AVSampleFormat wanted) {
 
 }  // namespace
 
-SoundTranscoder::SoundTranscoder(const AVStream& source, const AVCodec& target, bool globalHeader)
+SoundTranscoder::SoundTranscoder(const AVStream& source, const AVCodec& target,
+                                 const AVOutputFormat& container)
     : m_sourceBase(source.time_base), m_decoder(OpenDecoder(source)) {
     m_encoder = Allocated<CodecPtr>(avcodec_alloc_context3(&target));
     ChooseLayout(target, *m_decoder, *m_encoder);
     const int channels = m_encoder->ch_layout.nb_channels;
-    m_encoder->sample_rate = NearestRate(target, m_decoder->sample_rate);
+    const bool isMxf = std::string(container.name).starts_with("mxf");
+    m_encoder->sample_rate = NearestRate(target, isMxf ? kMxfRate : m_decoder->sample_rate);
     m_encoder->sample_fmt = ClosestFormat(target, m_decoder->sample_fmt);
     m_encoder->bit_rate = kBitRatePerChannel * channels;
     m_encoder->time_base = {1, m_encoder->sample_rate};
     m_encoder->thread_count = 1;
-    if (globalHeader) m_encoder->flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
+    if ((container.flags & AVFMT_GLOBALHEADER) != 0) m_encoder->flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
     const int error = avcodec_open2(m_encoder.get(), &target, nullptr);
     ThrowIfNoMemory(error);
     if (error < 0) {

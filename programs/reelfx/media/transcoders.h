@@ -17,7 +17,7 @@ class SoundTranscoder {
     using Sink = std::function<void(AVPacket&)>;  // times in the encoder's time base
 
     // Throws Failure when either codec cannot be opened.
-    SoundTranscoder(const AVStream& source, const AVCodec& target, bool globalHeader);
+    SoundTranscoder(const AVStream& source, const AVCodec& target, const AVOutputFormat& container);
     ~SoundTranscoder();
     SoundTranscoder(const SoundTranscoder&) = delete;
     SoundTranscoder& operator=(const SoundTranscoder&) = delete;
