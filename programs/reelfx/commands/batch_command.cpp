@@ -9,6 +9,7 @@
 #include "text/number_text.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/output_place.h"
+#include "programs/reelfx/media/container.h"
 #include "programs/reelfx/pipeline/effect_list.h"
 
 extern "C" {
@@ -22,8 +23,7 @@ namespace fs = std::filesystem;
 
 std::string ExtensionOf(const OutputOptions& output, const fs::path& input) {
     if (output.isRawBgra) return ".bgra";
-    const AVOutputFormat* format =
-        output.format ? av_guess_format(output.format->c_str(), nullptr, nullptr) : nullptr;
+    const AVOutputFormat* format = output.format ? FormatNamed(*output.format) : nullptr;
     if (format == nullptr || format->extensions == nullptr) return input.extension().string();
     const std::string usual = format->extensions;
     return '.' + usual.substr(0, usual.find(','));

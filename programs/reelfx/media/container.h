@@ -3,6 +3,7 @@
 
 #include <cstdint>
 #include <optional>
+#include <string>
 
 #include "programs/reelfx/media/av_handles.h"
 
@@ -10,6 +11,9 @@ namespace velmora::hosts {
 
 // What a container can hold (container_contents.cpp): as the libraries say, and where they do not, as an attempt to write a
 // header shows.
+
+// The format of a name such as "matroska", or of a file name extension such as "mkv"; null if there is none.
+const AVOutputFormat* FormatNamed(const std::string& name);
 
 // True if streams of the codec can be stored, as far as that depends on the codec alone.
 bool CanHold(const AVOutputFormat& format, AVCodecID codec);

@@ -47,6 +47,11 @@ void AddStream(AVFormatContext& container, const NewStream& added) {
 
 }  // namespace
 
+const AVOutputFormat* FormatNamed(const std::string& name) {
+    const AVOutputFormat* const format = av_guess_format(name.c_str(), nullptr, nullptr);
+    return format ? format : av_guess_format(nullptr, ("." + name).c_str(), nullptr);
+}
+
 bool CanHold(const AVOutputFormat& format, AVCodecID codec) {
     const int known = avformat_query_codec(&format, codec, FF_COMPLIANCE_NORMAL);
     const std::string name = IsOneOf(format, {"vob", "dvd", "svcd", "vcd"}) ? "mpeg" : format.name;

@@ -219,10 +219,8 @@ const AVOutputFormat& ChooseContainer(const OutputOptions& options) {
     const char* name = options.format ? options.format->c_str() : nullptr;
     if (options.isRawBgra) name = "rawvideo";
     if (!name && options.path == "-") name = "yuv4mpegpipe";
-    const AVOutputFormat* format = name ? av_guess_format(name, nullptr, nullptr)
-                                        : av_guess_format(nullptr, options.path.c_str(), nullptr);
-    // "mkv" for matroska: what the extension of a file would choose.
-    if (!format && name) format = av_guess_format(nullptr, ("." + std::string(name)).c_str(), nullptr);
+    const AVOutputFormat* format =
+        name ? FormatNamed(name) : av_guess_format(nullptr, options.path.c_str(), nullptr);
     if (!format && name) throw Failure(kExitUsage, std::string("unknown format \"") + name + '"');
     if (!format) {
         throw Failure(kExitUsage,

@@ -231,6 +231,12 @@ void MediaReader::NoteExif(const AVPacket& packet) {
 
 std::string MediaReader::BreakOffAt(int error) const {
     if (error == AVERROR_EXIT) return {};  // interrupted
+    const bool isPiped = m_container->pb && (m_container->pb->seekable & AVIO_SEEKABLE_NORMAL) == 0;
+    if (error == AVERROR_INVALIDDATA && isPiped && !m_firstFrame) {
+        return "cannot be read from a pipe; its index may be at the end, as in many MOV and MP4 files. Give "
+               "the "
+               "file's name";
+    }
     if (error != AVERROR_EOF) return "breaks off: " + AvText(error);
     AVIOContext* const file = m_container->pb;
     if (!file) return {};

@@ -2,7 +2,9 @@
 
 #include <cerrno>
 #include <new>
+#include <optional>
 #include <poll.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include "programs/reelfx/common/failure.h"
@@ -31,6 +33,25 @@ int Read(void*, std::uint8_t* buffer, int size) {
     }
 }
 
+// Where a file that is redirected to standard input begins; nothing if it is a pipe or a terminal.
+std::optional<off_t> StartOfFile() {
+    struct stat status {};
+    if (fstat(STDIN_FILENO, &status) != 0 || !S_ISREG(status.st_mode)) return std::nullopt;
+    const off_t start = lseek(STDIN_FILENO, 0, SEEK_CUR);
+    return start < 0 ? std::nullopt : std::optional(start);
+}
+
+// Files with their index at the end can only be read by going there first.
+std::int64_t Seek(void* opaque, std::int64_t offset, int whence) {
+    const off_t start = *static_cast<const off_t*>(opaque);
+    struct stat status {};
+    if (fstat(STDIN_FILENO, &status) != 0) return AVERROR(errno);
+    if ((whence & AVSEEK_SIZE) != 0) return status.st_size - start;
+    whence &= ~AVSEEK_FORCE;
+    const off_t at = lseek(STDIN_FILENO, whence == SEEK_SET ? offset + start : offset, whence);
+    return at < 0 ? AVERROR(errno) : at - start;
+}
+
 }  // namespace
 
 void CloseInputStream::operator()(AVIOContext* stream) const {
@@ -39,9 +60,13 @@ void CloseInputStream::operator()(AVIOContext* stream) const {
 }
 
 InputStreamPtr OpenStandardInput() {
+    static std::optional<off_t> start;  // there is only one standard input
+    if (!start) start = StartOfFile();
     auto* const buffer = static_cast<unsigned char*>(av_malloc(kBufferBytes));
-    AVIOContext* const stream =
-        buffer ? avio_alloc_context(buffer, kBufferBytes, 0, nullptr, Read, nullptr, nullptr) : nullptr;
+    AVIOContext* const stream = buffer
+                                    ? avio_alloc_context(buffer, kBufferBytes, 0, start ? &*start : nullptr,
+                                                         Read, nullptr, start ? Seek : nullptr)
+                                    : nullptr;
     if (!stream) {
         av_free(buffer);
         throw std::bad_alloc();

@@ -123,6 +123,9 @@ class Joining(FarmTest):
         done = run(SCRIPTS / "reelfx-farm-join", clips.small, self.root / "joined.mkv", *parts)
         self.assertEqual((done.returncode, done.stderr), (0, b""))
         self.assert_whole(self.root / "joined.mkv")
+        for number, (some, word) in enumerate(((parts[:3], b"missing"), (parts[1::-1] + parts[2:], b"order"))):
+            done = run(SCRIPTS / "reelfx-farm-join", clips.small, self.root / f"{number}.mkv", *some)
+            self.assertEqual((done.returncode, word in done.stderr), (0, True), done.stderr)
 
     def test_times_and_sound_in_other_containers(self):
         for ending, codec in ((".mp4", "libx264"), (".mov", "prores_ks")):

@@ -210,6 +210,15 @@ class Input(Commands):
         (self.out / "cut.mkv").write_bytes(film.read_bytes()[:film.stat().st_size * 4 // 10])
         self.check_failed(reelfx("render", self.out / "cut.mkv", self.out / "x.mp4", *DAMAGE), [3], "cut off", "first")
 
+    def test_index_at_the_end(self):
+        """A redirected file is read as a named one; a pipe cannot be."""
+        film = self.out / "film.mp4"
+        ffmpeg("-i", clips.small, "-c", "copy", film)
+        with film.open("rb") as stream:
+            done = reelfx("render", "-", "--hash", *DAMAGE, stdin=stream)
+        self.assertEqual((done.returncode, done.stdout), (0, reelfx("render", film, "--hash", *DAMAGE).stdout))
+        self.check_failed(reelfx("render", "-", "--hash", *DAMAGE, input=film.read_bytes()), [3], "index", "pipe")
+
     def while_it_runs(self, args, action):
         """Runs a render and lets `action` happen once it has begun to write, while it is paused."""
         program = subprocess.Popen([REELFX, "render", *map(str, args), "-j", "1"], stderr=subprocess.PIPE)
