@@ -27,6 +27,13 @@ constexpr QualityRow kQualities[] = {
     {"libx264", "18"},    {"libx265", "20"},    {"libvpx", "10"},
     {"libvpx-vp9", "22"}, {"libaom-av1", "22"}, {"libsvtav1", "24"},
 };
+// Codecs whose scale runs the other way: the highest value is best, 10 for Theora and 100 for the others.
+struct HighestIsBest {
+    const char* codec;
+    int quality;
+};
+constexpr HighestIsBest kOtherScales[] = {
+    {"libtheora", 9}, {"libwebp", 92}, {"libwebp_anim", 92}, {"libjxl", 95}};
 // For codecs with a quantiser instead: 1 is best, 31 worst.
 constexpr int kQuantiser = 2;
 
@@ -320,6 +327,9 @@ void SetQuality(const OutputOptions& options, const AVCodec& codec, AVCodecConte
     }
     encoder.flags |= AV_CODEC_FLAG_QSCALE;
     encoder.global_quality = FF_QP2LAMBDA * kQuantiser;
+    for (const HighestIsBest& row : kOtherScales) {
+        if (std::string(codec.name) == row.codec) encoder.global_quality = FF_QP2LAMBDA * row.quality;
+    }
 }
 
 bool NeedsConstantRate(const AVCodec& codec) {

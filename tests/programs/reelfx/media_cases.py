@@ -134,6 +134,8 @@ CASES = [
     ("5 alpha to MP4", "alpha.webm", render("o.mp4"), {"v:0 tags alpha_mode": None, "says": "transparency"}),
     *((f"6 full range to {end}", "full.mp4", render(f"o.{end}", *more, effect=PLAIN), {"grey": 21})
       for end, *more in (("mov", "--codec", "prores_ks"), ("avi",), ("ts",), ("mpg",), ("ogv",), ("mkv",))),
+    *((f"6 quality of {end}", "gap-2.png", render(f"o.{end}", effect=PLAIN), {"psnr": 32})
+      for end in ("ogv", "webp", "jxl", "jpg", "mpg")),
     ("7 uneven to Y4M", "uneven.mkv", render("o.y4m"), {"frames": 57, "says": "repeated"}),
     ("7 uneven to images", "uneven.mkv", render("o-%03d.png"), {"files": 57}),
     ("7 --frames", "uneven.mkv", render("o.mkv", "--frames", "11:"), {"frames": 15}),

@@ -198,6 +198,10 @@ class MediaCases(unittest.TestCase):
         for key in wanted.pop("like input", "").split():
             key = key.replace(".", " ", 1)
             self.assertEqual(probe.value(key), Probe(source).value(key), key)
+        if "psnr" in wanted:
+            graph = "[0:v]format=yuv444p[a];[1:v]format=yuv444p[b];[a][b]psnr"
+            done = run("ffmpeg", "-nostdin", "-i", source, "-i", path, "-lavfi", graph, "-f", "null", "-")
+            self.assertGreater(float(re.search(rb"PSNR y:(\S+)", done.stderr).group(1)), wanted.pop("psnr"))
         if "step" in wanted:
             self.assertAlmostEqual(probe.value("step"), 0.0, delta=wanted.pop("step"))
         for key, value in wanted.items():
