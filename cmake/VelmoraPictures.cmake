@@ -7,17 +7,12 @@ function(velmora_embed_pictures target)
   set(folder ${PROJECT_SOURCE_DIR}/render/pictures)
   set(script ${PROJECT_SOURCE_DIR}/cmake/embed_pictures.py)
   set(source ${CMAKE_CURRENT_BINARY_DIR}/embedded_pictures.cpp)
-  set(pictures)
-  foreach(value RANGE 2000 2006)
-    list(APPEND pictures ${folder}/wear-${value}.pgm)
-  endforeach()
-  foreach(index RANGE 10)
-    list(APPEND pictures ${folder}/spot-${index}.pgm)
-  endforeach()
+  file(GLOB wear CONFIGURE_DEPENDS ${folder}/wear-*.pgm)
+  file(GLOB spots CONFIGURE_DEPENDS ${folder}/spot-*.pgm)
   add_custom_command(
     OUTPUT ${source}
-    COMMAND ${Python3_EXECUTABLE} ${script} ${folder} ${source}
-    DEPENDS ${script} ${pictures}
+    COMMAND ${Python3_EXECUTABLE} ${script} ${folder} ${source} ${wear}
+    DEPENDS ${script} ${wear} ${spots}
     COMMENT "Embedding the wear pictures and spots"
     VERBATIM)
   target_sources(${target} PRIVATE ${source})

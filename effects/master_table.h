@@ -9,6 +9,7 @@
 #include <iterator>
 
 #include "api/host_api.h"
+#include "render/pictures.h"
 
 namespace velmora {
 
@@ -137,8 +138,9 @@ inline constexpr std::uint32_t kMasterCount = static_cast<std::uint32_t>(std::co
 static_assert(kMasterCount == 21 && std::size(kMasterRows) == 33);
 
 // The texts of the "Pattern" menu, in item order. Item i has the value 2000 + i.
-inline constexpr std::array<const char*, 7> kPatternItems = {"Wavy",     "Blotchy", "Grainy", "Fine",
-                                                             "Splotchy", "Lite",    "Crackly"};
+inline constexpr auto kPatternItems =
+    std::to_array<const char*>({"Wavy", "Blotchy", "Grainy", "Fine", "Splotchy", "Lite", "Crackly"});
+static_assert(kPatternItems.size() == render::kWearPictureCount, "one text for each wear picture");
 inline constexpr std::int32_t kFirstPatternValue = 2000;
 
 }  // namespace velmora

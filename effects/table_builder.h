@@ -16,7 +16,8 @@ namespace velmora::effects::tables {
 
 // Values of check boxes and of the "Pattern" menu, in defaults and presets.
 enum Flag : std::uint32_t { kOff = 0, kOn = 1 };
-enum Pattern : std::uint32_t { kWavy, kBlotchy, kGrainy, kFine, kSplotchy, kLite, kCrackly };
+enum Pattern : std::uint32_t { kWavy, kBlotchy, kGrainy, kFine, kSplotchy, kLite, kCrackly, kPatternCount };
+static_assert(kPatternCount == kPatternItems.size(), "one name for each item of the \"Pattern\" menu");
 
 // ---------------------------------------------------------------------------------------------------------
 // Parameters

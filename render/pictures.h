@@ -15,6 +15,8 @@ struct GreyPicture {
     const std::uint8_t* pixels;
 };
 
+// The wear pictures have the menu values from 2000 without a gap.
+inline constexpr int kWearPictureCount = 7;
 inline constexpr int kSpotCount = 11;
 
 // The tables that the build generates from the files in render/pictures.
@@ -31,7 +33,7 @@ extern const GreyPicture kSpotTable[kSpotCount];
 // The largest width of a wear picture.
 inline constexpr std::int32_t kWidestWear = 64;
 
-// The wear picture of an item value of the "Pattern" menu, 2000..2006; any other value gives 2000's.
+// The wear picture of an item value of the "Pattern" menu; any other value gives 2000's.
 // 0 is intact film, 255 is film worn down to the base. The picture wraps from the last row to the first.
 inline const GreyPicture& WearPicture(std::int32_t menuValue) noexcept {
     for (const WearEntry* entry = kWearTable; entry->menuValue != 0; ++entry) {

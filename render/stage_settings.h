@@ -39,7 +39,7 @@ struct StageSettings {
     float tintBlue = 0.5f;
 
     float wear = 0.0f;                // 0..1
-    std::int32_t wearPattern = 2000;  // menu value of the picture, 2000..2006
+    std::int32_t wearPattern = 2000;  // menu value of the picture (render/pictures.h)
     std::int32_t wearChannels = kWearAllChannels;
 
     std::uint32_t scratchKinds = 0;    // ScratchKinds combined; 0: no scratches

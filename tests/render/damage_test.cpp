@@ -74,7 +74,7 @@ TEST(Wear, TilesInStripsWithARandomStartEach) {
 
 TEST(WearFactors, TakeThePicturesThatThereAreAndRefuseTooLargeOnes) {
     WearFactors factors;
-    for (std::int32_t value = 2000; value <= 2006; ++value) {
+    for (std::int32_t value = 2000; value < 2000 + kWearPictureCount; ++value) {
         EXPECT_LE(WearPicture(value).width, kWidestWear);
         EXPECT_TRUE(factors.Set(WearPicture(value), 0.5f)) << value;
     }

@@ -22,7 +22,7 @@ class EmbedPictures(unittest.TestCase):
         shutil.copytree(PICTURES, self.folder)
 
     def embed(self):
-        command = [sys.executable, SCRIPT, self.folder, self.output]
+        command = [sys.executable, SCRIPT, self.folder, self.output, *self.folder.glob("wear-*.pgm")]
         return subprocess.run(command, capture_output=True, text=True)
 
     def change(self, name, old, new):
@@ -43,9 +43,21 @@ class EmbedPictures(unittest.TestCase):
         self.change("spot-4.pgm", b"P5\n", b"P5\n# drawn 12 by 12\n")
         self.assertEqual(self.embed().returncode, 0)
 
-    def test_size(self):
+    def test_sizes(self):
+        self.change("spot-4.pgm", b"8 7", b"7 8")
+        self.assert_refused("spot-4.pgm", "size", "found 7x8", "expected 8x7")
         self.change("wear-2004.pgm", b"25 150", b"150 25")
-        self.assert_refused("wear-2004.pgm", "size", "found 150x25", "expected 25x150")
+        self.assert_refused("wear-2004.pgm", "size", "found 150x25", "16 to 64 columns")
+
+    def test_every_wear_picture_is_taken(self):
+        shutil.copy(self.folder / "wear-2005.pgm", self.folder / "wear-2007.pgm")
+        self.assertEqual(self.embed().returncode, 0)
+        self.assertIn("{2007, {64, 64, 64, kWear2007}}", self.output.read_text())
+        self.assertIn("kWearPictureCount == 8", self.output.read_text())
+
+    def test_gap_in_the_menu_values(self):
+        (self.folder / "wear-2003.pgm").unlink()
+        self.assert_refused("wear-2004.pgm", "menu value", "expected 2003")
 
     def test_key(self):
         self.change("spot-7.pgm", b"255\n\x5a", b"255\n\x5b")

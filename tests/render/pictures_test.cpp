@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <iterator>
 #include <numeric>
 #include <sstream>
 #include <string>
@@ -142,6 +143,7 @@ constexpr WearCase kWearCases[] = {
     {"Lite", 2005, 64, 64, .05, .09, .03, .055, .20, .34},      // the weakest
     {"Crackly", 2006, 64, 64, .14, .19, .085, .115, .13, .27},
 };
+static_assert(std::size(kWearCases) == kWearPictureCount);
 
 // Lists the features that make a texture's repetition visible when a frame shows it a hundred times; empty if none.
 //
@@ -207,7 +209,7 @@ TEST(WearPictures, AreRefusedWithAFigureAnEdgeOrALattice) {
 }
 
 TEST(WearPictures, UnknownValueGivesTheFirst) {
-    for (int value : {0, -1, 1999, 2007, 2099}) {
+    for (int value : {0, -1, 1999, 2000 + kWearPictureCount, 2099}) {
         EXPECT_EQ(&WearPicture(value), &WearPicture(2000)) << value;
     }
 }
