@@ -7,8 +7,8 @@
 #include <new>
 
 #include "effects/effect_queries.h"
-#include "presets/file_access.h"
-#include "presets/preset_file.h"
+#include "preset_files/file_access.h"
+#include "preset_files/preset_file.h"
 #include "text/names.h"
 #include "text/number_text.h"
 

@@ -7,8 +7,8 @@
 #include <cstring>
 #include <string>
 
-#include "presets/preset_file.h"
-#include "presets/file_access.h"
+#include "preset_files/preset_file.h"
+#include "preset_files/file_access.h"
 
 namespace {
 

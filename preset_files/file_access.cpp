@@ -1,4 +1,4 @@
-#include "presets/file_access.h"
+#include "preset_files/file_access.h"
 
 #include <memory>
 

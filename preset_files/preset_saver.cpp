@@ -1,4 +1,4 @@
-#include "presets/preset_saver.h"
+#include "preset_files/preset_saver.h"
 
 #include <algorithm>
 #include <cstring>
@@ -7,8 +7,8 @@
 
 #include "api/reference.h"
 #include "platform/float_guard.h"
-#include "presets/preset_file.h"
-#include "presets/dialogs.h"
+#include "preset_files/preset_file.h"
+#include "preset_files/dialogs.h"
 #include "text/encodings.h"
 #include "text/strings.h"
 

@@ -3,8 +3,8 @@
 
 #include <filesystem>
 
-#include "presets/file_access.h"
-#include "tests/presets/temporary_folder.h"
+#include "preset_files/file_access.h"
+#include "tests/preset_files/temporary_folder.h"
 #ifdef _WIN32
 #include <windows.h>
 #else

@@ -5,9 +5,9 @@
 #include <memory>
 #include <string>
 
-#include "presets/file_access.h"
+#include "preset_files/file_access.h"
 #include "text/number_text.h"
-#include "presets/preset_file.h"
+#include "preset_files/preset_file.h"
 
 namespace velmora {
 

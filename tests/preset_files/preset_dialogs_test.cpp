@@ -5,12 +5,12 @@
 #include <string>
 #include <thread>
 
-#include "presets/dialogs.h"
-#include "presets/preset_file.h"
-#include "presets/preset_saver.h"
-#include "tests/presets/dialog_driver.h"
-#include "tests/presets/fake_library.h"
-#include "tests/presets/temporary_folder.h"
+#include "preset_files/dialogs.h"
+#include "preset_files/preset_file.h"
+#include "preset_files/preset_saver.h"
+#include "tests/preset_files/dialog_driver.h"
+#include "tests/preset_files/fake_library.h"
+#include "tests/preset_files/temporary_folder.h"
 
 namespace velmora {
 namespace {

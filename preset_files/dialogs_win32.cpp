@@ -1,4 +1,4 @@
-#include "presets/dialogs.h"
+#include "preset_files/dialogs.h"
 
 #include <windows.h>
 #include <commdlg.h>

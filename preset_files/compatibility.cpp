@@ -1,4 +1,4 @@
-#include "presets/preset_file.h"
+#include "preset_files/preset_file.h"
 
 #include <cstring>
 
