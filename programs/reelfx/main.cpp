@@ -13,10 +13,11 @@
 int main(int count, char** arguments) {
     using namespace velmora::hosts;
     OccupyStandardStreams();
-    KeepLibraryLog();  // one clear line of ours instead
     WatchInterrupts();
     try {
-        const ExitCode code = RunCommand(ReadCommandLine(count, arguments));
+        const Command command = ReadCommandLine(count, arguments);
+        if (NeedsMedia(command)) KeepLibraryLog();  // one clear line of ours instead
+        const ExitCode code = RunCommand(command);
         // Texts and digests may still be buffered.
         if (std::fflush(stdout) != 0 || std::ferror(stdout) != 0) {
             throw Failure(kExitOutput, "standard output cannot be written");

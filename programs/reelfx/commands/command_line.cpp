@@ -367,6 +367,14 @@ ExitCode Run(const TextCommand& command) {
 
 }  // namespace
 
+bool NeedsMedia(const Command& command) {
+    return !std::holds_alternative<TextCommand>(command) && !std::holds_alternative<ListOptions>(command) &&
+           !std::holds_alternative<PresetsOptions>(command) &&
+           !std::holds_alternative<PresetShowOptions>(command) &&
+           !std::holds_alternative<PresetSaveOptions>(command) &&
+           !std::holds_alternative<StudioOptions>(command);
+}
+
 ExitCode RunCommand(const Command& command) {
     return std::visit([](const auto& options) { return Run(options); }, command);
 }

@@ -128,9 +128,8 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         ->envname("REELFX_THREADS");
     render.add_option("--format", typed.format, "Container, if the file name extension of OUT does not say")
         ->type_name("FORMAT");
-    render.add_option("--codec", typed.codec, "Video codec; default: " + UsualCodecs())
-        ->type_name("CODEC")
-        ->envname("REELFX_CODEC");
+    render.add_option("--codec", typed.codec, "Video codec")->type_name("CODEC")->envname("REELFX_CODEC");
+    render.preparse_callback([&render](std::size_t) { NameUsualCodecs(render); });
     render.add_option("--crf", typed.crf, "Quality, on the codec's own scale; default: " + UsualQualities())
         ->type_name("N")
         ->envname("REELFX_CRF");
@@ -292,6 +291,10 @@ std::string ExitCodesText() {
 }
 
 }  // namespace
+
+void NameUsualCodecs(CLI::App& render) {
+    render.get_option("--codec")->description("Video codec; default: " + UsualCodecs());
+}
 
 void AddCommands(CLI::App& app, TypedOptions& typed) {
     app.name("reelfx");

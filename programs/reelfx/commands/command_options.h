@@ -64,4 +64,8 @@ struct TypedOptions {
 // it: EFFECT, PRESET, NAME=VALUE, FILE, CODEC, FORMAT, PIXELS, or the choices themselves, "one|other".
 void AddCommands(CLI::App& app, TypedOptions& typed);
 
+// Adds the usual codecs to the help of render's --codec. The parser does this for `reelfx render` only, because asking for
+// codecs loads FFmpeg's libraries.
+void NameUsualCodecs(CLI::App& render);
+
 }  // namespace velmora::hosts

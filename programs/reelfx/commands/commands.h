@@ -151,6 +151,9 @@ using Command = std::variant<TextCommand, ListOptions, RenderOptions, BatchOptio
 // Parses the arguments (command_line.cpp); opens and writes nothing. Throws UsageError.
 Command ReadCommandLine(int count, const char* const* arguments);
 
+// Whether the command reads or writes pictures, and so needs FFmpeg's libraries.
+bool NeedsMedia(const Command& command);
+
 // Runs the command. Throws Failure or UsageError; the caller prints their text.
 ExitCode RunCommand(const Command& command);
 

@@ -50,6 +50,7 @@ int main() {
     TypedOptions typed;
     CLI::App app;
     AddCommands(app, typed);
+    NameUsualCodecs(*app.get_subcommand("render"));
     Json program = JsonOf(app);
     program["version"] = velmora::kReelEffectsVersion;
     program["interrupt"] = kOnInterrupt;

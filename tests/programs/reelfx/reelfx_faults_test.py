@@ -159,7 +159,8 @@ class Places(Commands):
 
         if limited(4096, "--version").returncode:
             self.skipTest("the program reserves more than it uses")
-        least = next(size for size in range(100, 4096, 10) if limited(size, "--version").returncode == 0)
+        # The help of render names codecs, so the media libraries are loaded for it.
+        least = next(size for size in range(100, 4096, 10) if limited(size, "render", "--help").returncode == 0)
         rows = list(self.rows())
         for number in range(10 if OPTIONS.rounds < 50 else 40):
             target, args = rows[number % len(rows)]
