@@ -14,6 +14,9 @@ namespace {
 
 constexpr std::int64_t kBitRatePerChannel = 96000;
 constexpr int kMxfRate = 48000;  // the only one that the library writes
+constexpr int kQueuePiece = 1024;
+// Containers round times, some to milliseconds. What is missing for longer than this is filled with silence, in seconds.
+constexpr double kLeastGap = 0.05;
 
 int NearestRate(const AVCodec& codec, int wanted) {
     if (!codec.supported_samplerates) return wanted;
@@ -100,6 +103,7 @@ void SoundTranscoder::Send(const AVPacket* packet, const Sink& sink) {
     avcodec_send_packet(m_decoder.get(), packet);
     TakeDecoded(sink);
     if (packet) return;
+    FlushResampler();
     Encode(av_audio_fifo_size(m_fifo), sink);
     avcodec_send_frame(m_encoder.get(), nullptr);
     TakeEncoded(sink);
@@ -108,24 +112,56 @@ void SoundTranscoder::Send(const AVPacket* packet, const Sink& sink) {
 void SoundTranscoder::TakeDecoded(const Sink& sink) {
     const FramePtr frame = NewFrame();
     while (avcodec_receive_frame(m_decoder.get(), frame.get()) >= 0) {
+        const std::int64_t time = frame->best_effort_timestamp;
+        const bool hasTime = time != AV_NOPTS_VALUE;
+        const std::int64_t pts = hasTime ? av_rescale_q(time, m_sourceBase, m_encoder->time_base) : 0;
         if (m_nextPts == AV_NOPTS_VALUE) {
-            const std::int64_t pts = frame->best_effort_timestamp;
-            m_nextPts = pts == AV_NOPTS_VALUE ? 0 : av_rescale_q(pts, m_sourceBase, m_encoder->time_base);
+            m_nextPts = pts;
+        } else if (hasTime) {
+            FillGap(pts, sink);
         }
         Resample(*frame);
-        const int block = m_encoder->frame_size > 0 ? m_encoder->frame_size : 1024;
-        while (av_audio_fifo_size(m_fifo) >= block) Encode(block, sink);
+        EncodeBlocks(sink);
     }
+}
+
+// What follows a gap must not come early: silence takes its place.
+void SoundTranscoder::FillGap(std::int64_t pts, const Sink& sink) {
+    const std::int64_t delay = swr_is_initialized(m_resampler.get()) != 0
+                                   ? swr_get_delay(m_resampler.get(), m_encoder->sample_rate)
+                                   : 0;
+    std::int64_t missing = pts - (m_nextPts + av_audio_fifo_size(m_fifo) + delay);
+    if (static_cast<double>(missing) < kLeastGap * m_encoder->sample_rate) return;
+    FlushResampler();
+    const FramePtr silence = NewSamples(kQueuePiece);
+    av_samples_set_silence(silence->extended_data, 0, kQueuePiece, m_encoder->ch_layout.nb_channels,
+                           m_encoder->sample_fmt);
+    for (; missing > 0; missing -= kQueuePiece) {
+        Queue(*silence, static_cast<int>(std::min<std::int64_t>(missing, kQueuePiece)));
+        EncodeBlocks(sink);
+    }
+}
+
+FramePtr SoundTranscoder::NewSamples(int samples) const {
+    FramePtr frame = NewFrame();
+    frame->nb_samples = samples;
+    frame->format = m_encoder->sample_fmt;
+    frame->sample_rate = m_encoder->sample_rate;
+    av_channel_layout_copy(&frame->ch_layout, &m_encoder->ch_layout);
+    if (samples > 0 && av_frame_get_buffer(frame.get(), 0) < 0) throw std::bad_alloc();
+    return frame;
+}
+
+void SoundTranscoder::Queue(const AVFrame& frame, int samples) {
+    void** const data = reinterpret_cast<void**>(frame.extended_data);
+    if (av_audio_fifo_write(m_fifo, data, samples) < 0) throw std::bad_alloc();
 }
 
 void SoundTranscoder::Resample(AVFrame& frame) {
     if (frame.ch_layout.order == AV_CHANNEL_ORDER_UNSPEC) {
         av_channel_layout_default(&frame.ch_layout, frame.ch_layout.nb_channels);
     }
-    const FramePtr converted = NewFrame();
-    converted->format = m_encoder->sample_fmt;
-    converted->sample_rate = m_encoder->sample_rate;
-    av_channel_layout_copy(&converted->ch_layout, &m_encoder->ch_layout);
+    const FramePtr converted = NewSamples(0);
     // Converters are set up for the first frame and for any frame whose format differs from the one before.
     int error = swr_convert_frame(m_resampler.get(), converted.get(), &frame);
     if (error == AVERROR_INPUT_CHANGED) {
@@ -134,18 +170,30 @@ void SoundTranscoder::Resample(AVFrame& frame) {
     }
     ThrowIfNoMemory(error);
     if (error < 0) throw Failure(kExitInput, "the sound cannot be converted; use --no-sound to leave it out");
-    void** const samples = reinterpret_cast<void**>(converted->extended_data);
-    if (av_audio_fifo_write(m_fifo, samples, converted->nb_samples) < 0) throw std::bad_alloc();
+    Queue(*converted, converted->nb_samples);
+}
+
+// Moves what a change of rate still holds back into the queue; the next frame sets the converter up again.
+void SoundTranscoder::FlushResampler() {
+    if (swr_is_initialized(m_resampler.get()) == 0) return;
+    const std::int64_t held = swr_get_delay(m_resampler.get(), m_encoder->sample_rate);
+    if (held > 0) {
+        const FramePtr rest = NewSamples(static_cast<int>(held) + 1);
+        const int count = swr_convert(m_resampler.get(), rest->extended_data, rest->nb_samples, nullptr, 0);
+        ThrowIfNoMemory(count);
+        if (count > 0) Queue(*rest, count);
+    }
+    swr_close(m_resampler.get());
+}
+
+void SoundTranscoder::EncodeBlocks(const Sink& sink) {
+    const int block = m_encoder->frame_size > 0 ? m_encoder->frame_size : kQueuePiece;
+    while (av_audio_fifo_size(m_fifo) >= block) Encode(block, sink);
 }
 
 void SoundTranscoder::Encode(int samples, const Sink& sink) {
     if (samples <= 0) return;
-    const FramePtr frame = NewFrame();
-    frame->nb_samples = samples;
-    frame->format = m_encoder->sample_fmt;
-    frame->sample_rate = m_encoder->sample_rate;
-    av_channel_layout_copy(&frame->ch_layout, &m_encoder->ch_layout);
-    if (av_frame_get_buffer(frame.get(), 0) < 0) throw std::bad_alloc();
+    const FramePtr frame = NewSamples(samples);
     av_audio_fifo_read(m_fifo, reinterpret_cast<void**>(frame->extended_data), samples);
     frame->pts = m_nextPts;
     m_nextPts += samples;

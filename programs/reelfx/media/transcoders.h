@@ -29,7 +29,12 @@ class SoundTranscoder {
 
   private:
     void TakeDecoded(const Sink& sink);
+    void FillGap(std::int64_t pts, const Sink& sink);
     void Resample(AVFrame& frame);
+    void FlushResampler();
+    [[nodiscard]] FramePtr NewSamples(int samples) const;  // in the encoder's format; not set
+    void Queue(const AVFrame& frame, int samples);
+    void EncodeBlocks(const Sink& sink);
     void Encode(int samples, const Sink& sink);
     void TakeEncoded(const Sink& sink);
 
