@@ -359,7 +359,8 @@ void ToneUnderGlow(const Kernels& kernels, const Bgra* in, Bgra* out, std::int32
     const std::int32_t cells = (width + 3) / 4;
     CellsOf near(cells, fill, 1), far(cells, fill, 2), over(cells, fill, 3);
     if (width == 0) return;
-    const CellRow row = over.Row(), last = row + (cells - 1) * kCellLanes;
+    std::uint16_t* const row = over.Row();
+    std::uint16_t* const last = row + (cells - 1) * kCellLanes;
     if (kernels.glowedTone == nullptr) {
         kernels.glow->approach(near.Row(), far.Row(), row, cells, kShare);
         std::copy_n(row, kCellLanes, row - kCellLanes);
@@ -368,7 +369,8 @@ void ToneUnderGlow(const Kernels& kernels, const Bgra* in, Bgra* out, std::int32
         return kernels.tone(out, out, width, tone);
     }
     std::vector<std::uint16_t> planes[3];
-    for (auto& plane : planes) plane.resize(static_cast<std::size_t>(cells + 1 + kPlanesRead), 0xFFFF);
+    for (auto& plane : planes)
+        plane.resize(static_cast<std::size_t>(cells) + 1 + std::size_t{kPlanesRead}, 0xFFFF);
     std::uint16_t* const first[3] = {planes[0].data() + 1, planes[1].data() + 1, planes[2].data() + 1};
     kernels.glowedTone->split(near.Row(), far.Row(), first, cells, kShare);
     for (std::uint16_t* plane : first) {

@@ -39,12 +39,8 @@ class Texture {
     double ShareAbove(double level) const {
         return MeanOf([&](double v) { return v + m_mean > level ? 1.0 : 0.0; });
     }
-    double ValueAt(int x, int y) const {
-        return m_values[static_cast<std::size_t>((y + m_height) % m_height * m_width + x)];
-    }
-    void Add(int x, int y, double amount) {
-        m_values[static_cast<std::size_t>(y % m_height * m_width + x)] += amount;
-    }
+    double ValueAt(int x, int y) const { return m_values[IndexOf(x, (y + m_height) % m_height)]; }
+    void Add(int x, int y, double amount) { m_values[IndexOf(x, y % m_height)] += amount; }
 
     // The correlation of pixels (dx, dy) apart; dx stays inside a strip.
     double Correlation(int dx, int dy) const {
@@ -112,6 +108,9 @@ class Texture {
     }
 
   private:
+    std::size_t IndexOf(int x, int y) const {
+        return static_cast<std::size_t>(y) * static_cast<std::size_t>(m_width) + static_cast<std::size_t>(x);
+    }
     double Count() const { return static_cast<double>(m_values.size()); }
     template <typename Function>
     double MeanOf(Function&& function) const {

@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <array>
 #include <bit>
 #include <map>
 #include <numeric>
@@ -149,8 +150,8 @@ PlainPicture Grey(std::int32_t width = 640, std::int32_t height = 90) {
 
 TEST(Scratches, AreTheSameInAnyOrderOfFrames) {
     const StageSettings settings[2] = {Scratched(7, 16, 0.8f, 60.0f), Scratched(1, 5, 0.4f, 60.0f)};
-    std::vector<std::int32_t> frames;
-    for (std::int32_t i = 0; i < 40; ++i) frames.push_back(i < 20 ? i : i * 911);
+    std::array<std::int32_t, 40> frames;
+    for (std::int32_t i = 0; i < 40; ++i) frames[static_cast<std::size_t>(i)] = i < 20 ? i : i * 911;
     ScratchMemory used;
     for (std::uint32_t round = 0; round < 3; ++round) {
         for (const std::int32_t frame : frames) {

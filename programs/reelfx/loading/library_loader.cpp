@@ -32,8 +32,8 @@ namespace {
 [[noreturn]] void Fail() {
     const char* const words = dlerror();
     const std::string_view reason = words == nullptr ? "no reason is given" : words;
-    const bool lacksMemory =
-        reason.find("failed to map") != reason.npos || reason.find("allocate") != reason.npos;
+    constexpr auto kNotFound = std::string_view::npos;
+    const bool lacksMemory = reason.find("failed to map") != kNotFound || reason.find("allocate") != kNotFound;
     std::fprintf(stderr, "reelfx: %s: %s\n",
                  lacksMemory ? "there is not enough memory for FFmpeg's libraries"
                              : "FFmpeg's libraries cannot be loaded",
