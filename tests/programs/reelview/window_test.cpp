@@ -369,7 +369,7 @@ TEST(ReelView, SavesWithACodec) {
     EXPECT_EQ(program.Status().find(L"codec.avi"), std::wstring::npos);
     // Of Wine's codecs none compresses 24-bit pictures.
     choose(L"Wine Video 1", true);
-    EXPECT_NE(program.CloseDialogs().find(L"codec does not take"), std::wstring::npos);
+    EXPECT_NE(program.CloseDialogs().find(L"codec does not accept"), std::wstring::npos);
     EXPECT_FALSE(std::filesystem::exists(Media(L"codec.avi")));
     choose(L"Full Frames", true);
     EXPECT_TRUE(WaitFor([&] { return program.Status().find(L"codec.avi") != std::wstring::npos; }))
@@ -471,7 +471,7 @@ TEST(ReelView, SurvivesLibrariesThatFail) {
         const wchar_t* fault;
         const wchar_t* message;  // in a box or, if there is no box, in the status line
     };
-    for (const Row& row : {Row{L"crashes", L"failed"}, Row{L"refuses", L"does not render"},
+    for (const Row& row : {Row{L"crashes", L"failed"}, Row{L"refuses", L"cannot render"},
                            Row{L"describes-for-ever", L"Frame"}, Row{L"hangs", L"does not answer"},
                            Row{L"aborts", L"failed"}, Row{L"ends-the-process", L"failed"},
                            Row{L"raises", L"failed"}, Row{L"crashes-at-once", L"failed"}}) {
