@@ -77,7 +77,13 @@ def check_tarball(path, work, expected):
     run("ffmpeg", "-nostdin", "-v", "error", "-i", CLIP, "-vf", "frei0r=velmora_film_pro:super8|7", "-frames:v", "2",
         "-f", "null", "-", env=environment)
     assert "Usage: " in run(home / ".local/bin/reelfx-farm-join", "--help")
-    run(unpacked / "install.sh", env=environment)  # again, as for a new version
+    # A new version over this one, which had a plug-in more.
+    outdated = home / ".frei0r-1/lib/velmora_film_gone.so"
+    outdated.write_text("of this version")
+    with open(listing, "a") as lines:
+        lines.write(f"{hashlib.sha256(outdated.read_bytes()).hexdigest()}  {outdated}\n")
+    run(unpacked / "install.sh", env=environment)
+    assert not outdated.exists()
     changed = home / ".local/share/man/man1/reelfx.1"
     changed.write_text("the user's own now")
     run(unpacked / "install.sh", "--remove", env=environment)
