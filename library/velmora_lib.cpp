@@ -7,7 +7,7 @@
 #include "platform/float_guard.h"
 #include "library/frame_processor.h"
 #include "effects/velmora_effect.h"
-#include "preset_files/preset_saver.h"
+#include "user_presets/preset_saver.h"
 #include "desktop/shell_services.h"
 
 namespace velmora {

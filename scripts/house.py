@@ -18,7 +18,7 @@ FLOORS = [
     [("effects", "tables, settings, sessions"),
      ("language", "texts in the user's language"),
      ("help", "topics, the compiled help")],
-    [("preset_files", "users' preset files"),
+    [("user_presets", "presets that users save"),
      ("desktop", "dialogs, options, registry")],
     [("library", "what makes the DLL"),
      ("resources", "bitmaps of the dialogs")],

@@ -7,8 +7,8 @@
 #include <new>
 
 #include "effects/effect_queries.h"
-#include "preset_files/file_access.h"
-#include "preset_files/preset_file.h"
+#include "user_presets/file_access.h"
+#include "user_presets/preset_file.h"
 #include "text/names.h"
 #include "text/number_text.h"
 

@@ -67,7 +67,7 @@ void DropPresetIfChanged(const FilterDescription& filter, obs_data_t* settings);
 // Whether the effect leaves every picture alone, as with its defaults.
 [[nodiscard]] bool IsNeutral(const FilterDescription& filter, const FilterValues& values);
 
-// Preset files of the library (preset_files/preset_file.h) as settings (preset_files.cpp).
+// Preset files of the library (user_presets/preset_file.h) as settings (preset_files.cpp).
 
 // The extension of an effect's preset files, without the dot.
 [[nodiscard]] std::string PresetFileExtension(const FilterDescription& filter);

@@ -5,9 +5,9 @@
 #include <vector>
 
 #include "effects/effect_queries.h"
-#include "preset_files/dialogs.h"
-#include "preset_files/file_access.h"
-#include "preset_files/preset_file.h"
+#include "user_presets/dialogs.h"
+#include "user_presets/file_access.h"
+#include "user_presets/preset_file.h"
 
 namespace velmora::hosts::obs {
 namespace {

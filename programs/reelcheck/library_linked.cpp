@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
-#include "preset_files/dialogs.h"
+#include "user_presets/dialogs.h"
 #include "programs/reelcheck/dialog_answers.h"
 #include "programs/reelcheck/library.h"
 

@@ -7,8 +7,8 @@
 #include <cstring>
 #include <string>
 
-#include "preset_files/preset_file.h"
-#include "preset_files/file_access.h"
+#include "user_presets/preset_file.h"
+#include "user_presets/file_access.h"
 
 namespace {
 

@@ -1,6 +1,6 @@
 // Native tests have no file dialogs: every dialog is cancelled and messages are not shown.
 
-#include "preset_files/dialogs.h"
+#include "user_presets/dialogs.h"
 
 namespace velmora {
 

@@ -9,7 +9,7 @@
 #include <cstdlib>
 #include <filesystem>
 
-#include "tests/preset_files/temporary_folder.h"
+#include "tests/user_presets/temporary_folder.h"
 
 namespace velmora::support {
 namespace {

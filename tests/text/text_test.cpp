@@ -7,7 +7,7 @@
 #include "text/encodings.h"
 #include "text/strings.h"
 #include "language/translation.h"
-#include "tests/preset_files/fake_library.h"
+#include "tests/user_presets/fake_library.h"
 #ifdef _WIN32
 #include <windows.h>
 #endif

@@ -1,4 +1,4 @@
-// Preset files as the library reads and writes them: preset_files/preset_file.h has the format.
+// Preset files as the library reads and writes them: user_presets/preset_file.h has the format.
 import {bitsOfNumber, numberOfBits} from './engine.js';
 
 const libraryName = 'Velmora Reel Effects';

@@ -6,7 +6,7 @@
 #include "text/number_text.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/common/output_place.h"
-#include "preset_files/preset_file.h"
+#include "user_presets/preset_file.h"
 
 namespace velmora::hosts {
 namespace {

@@ -17,8 +17,8 @@
 #include "faces/frei0r/instance.h"
 #include "faces/frei0r/plugin_params.h"
 #include "platform/platform.h"
-#include "preset_files/file_access.h"
-#include "preset_files/preset_file.h"
+#include "user_presets/file_access.h"
+#include "user_presets/preset_file.h"
 
 namespace velmora::hosts::frei0r {
 namespace {

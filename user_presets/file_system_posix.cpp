@@ -1,4 +1,4 @@
-#include "preset_files/file_access.h"
+#include "user_presets/file_access.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>

@@ -1,4 +1,4 @@
-#include "preset_files/preset_file.h"
+#include "user_presets/preset_file.h"
 
 #include <gtest/gtest.h>
 
@@ -15,8 +15,8 @@
 #include <string>
 #include <string_view>
 
-#include "tests/preset_files/fake_library.h"
-#include "tests/preset_files/temporary_folder.h"
+#include "tests/user_presets/fake_library.h"
+#include "tests/user_presets/temporary_folder.h"
 
 namespace velmora {
 namespace {

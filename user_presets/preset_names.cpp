@@ -1,4 +1,4 @@
-#include "preset_files/dialogs.h"
+#include "user_presets/dialogs.h"
 
 #include <algorithm>
 #include <cstring>

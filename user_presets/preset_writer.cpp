@@ -5,9 +5,9 @@
 #include <memory>
 #include <string>
 
-#include "preset_files/file_access.h"
+#include "user_presets/file_access.h"
 #include "text/number_text.h"
-#include "preset_files/preset_file.h"
+#include "user_presets/preset_file.h"
 
 namespace velmora {
 

@@ -3,8 +3,8 @@
 
 #include <filesystem>
 
-#include "preset_files/file_access.h"
-#include "tests/preset_files/temporary_folder.h"
+#include "user_presets/file_access.h"
+#include "tests/user_presets/temporary_folder.h"
 #ifdef _WIN32
 #include <windows.h>
 #else

@@ -5,12 +5,12 @@
 #include <string>
 #include <thread>
 
-#include "preset_files/dialogs.h"
-#include "preset_files/preset_file.h"
-#include "preset_files/preset_saver.h"
-#include "tests/preset_files/dialog_driver.h"
-#include "tests/preset_files/fake_library.h"
-#include "tests/preset_files/temporary_folder.h"
+#include "user_presets/dialogs.h"
+#include "user_presets/preset_file.h"
+#include "user_presets/preset_saver.h"
+#include "tests/user_presets/dialog_driver.h"
+#include "tests/user_presets/fake_library.h"
+#include "tests/user_presets/temporary_folder.h"
 
 namespace velmora {
 namespace {

@@ -41,7 +41,7 @@ inline constexpr std::size_t kPresetFileLimit = 16u << 20;  // bytes; a longer f
 // unreadable value is replaced by the previous element's, a missing type is 0, elements after the hundredth are
 // dropped, names are cut at 259 bytes, and infinities and NaN are read as such.
 // After a failure the record is untouched or, when the file has a "Preset" without values, holds its names and a count
-// of 0. A file over the limits of size, depth, attributes and nodes (preset_files/file_access.h) is a failure, as is a null
+// of 0. A file over the limits of size, depth, attributes and nodes (user_presets/file_access.h) is a failure, as is a null
 // record.
 [[nodiscard]] bool ReadPreset(const char* fileName, PresetRecord* record) noexcept;
 

@@ -1,4 +1,4 @@
-#include "preset_files/preset_saver.h"
+#include "user_presets/preset_saver.h"
 
 #include <algorithm>
 #include <cstring>
@@ -7,8 +7,8 @@
 
 #include "api/reference.h"
 #include "platform/float_guard.h"
-#include "preset_files/preset_file.h"
-#include "preset_files/dialogs.h"
+#include "user_presets/preset_file.h"
+#include "user_presets/dialogs.h"
 #include "text/encodings.h"
 #include "text/strings.h"
 

@@ -1,5 +1,5 @@
 // The saver's flows, with dialogs answered by the test.
-#include "preset_files/preset_saver.h"
+#include "user_presets/preset_saver.h"
 
 #include <gtest/gtest.h>
 
@@ -7,10 +7,10 @@
 #include <string>
 #include <vector>
 
-#include "preset_files/preset_file.h"
-#include "preset_files/dialogs.h"
-#include "tests/preset_files/fake_library.h"
-#include "tests/preset_files/temporary_folder.h"
+#include "user_presets/preset_file.h"
+#include "user_presets/dialogs.h"
+#include "tests/user_presets/fake_library.h"
+#include "tests/user_presets/temporary_folder.h"
 
 namespace velmora {
 namespace {

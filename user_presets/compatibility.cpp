@@ -1,4 +1,4 @@
-#include "preset_files/preset_file.h"
+#include "user_presets/preset_file.h"
 
 #include <cstring>
 
