@@ -137,10 +137,38 @@ inline constexpr std::uint32_t kMasterCount = static_cast<std::uint32_t>(std::co
     std::begin(kMasterRows), std::end(kMasterRows), [](const MasterRow& row) { return row.IsSetting(); }));
 static_assert(kMasterCount == 21 && std::size(kMasterRows) == 33);
 
-// The texts of the "Pattern" menu, in item order. Item i has the value 2000 + i.
-inline constexpr auto kPatternItems =
-    std::to_array<const char*>({"Wavy", "Blotchy", "Grainy", "Fine", "Splotchy", "Lite", "Crackly"});
-static_assert(kPatternItems.size() == render::kWearPictureCount, "one text for each wear picture");
+// The items of the "Pattern" menu: item i has the value 2000 + i and shows the wear picture of that value.
+enum class Pattern : std::uint32_t { kWavy, kBlotchy, kGrainy, kFine, kSplotchy, kLite, kCrackly };
 inline constexpr std::int32_t kFirstPatternValue = 2000;
+
+namespace master_table {
+
+struct PatternRow {
+    Pattern pattern;
+    const char* text;
+};
+
+using enum Pattern;
+
+inline constexpr PatternRow kPatterns[] = {
+    {kWavy, "Wavy"},         {kBlotchy, "Blotchy"}, {kGrainy, "Grainy"},   {kFine, "Fine"},
+    {kSplotchy, "Splotchy"}, {kLite, "Lite"},       {kCrackly, "Crackly"},
+};
+static_assert(std::size(kPatterns) == render::kWearPictureCount, "one row for each wear picture");
+
+template <std::size_t kCount>
+consteval std::array<const char*, kCount> TextsInOrder(const PatternRow (&rows)[kCount]) {
+    std::array<const char*, kCount> texts{};
+    for (std::size_t i = 0; i < kCount; ++i) {
+        if (rows[i].pattern != Pattern{static_cast<std::uint32_t>(i)}) throw "the patterns are out of order";
+        texts[i] = rows[i].text;
+    }
+    return texts;
+}
+
+}  // namespace master_table
+
+// The menu's texts, in item order.
+inline constexpr auto kPatternItems = master_table::TextsInOrder(master_table::kPatterns);
 
 }  // namespace velmora

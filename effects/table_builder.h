@@ -16,8 +16,7 @@ namespace velmora::effects::tables {
 
 // Values of check boxes and of the "Pattern" menu, in defaults and presets.
 enum Flag : std::uint32_t { kOff = 0, kOn = 1 };
-enum Pattern : std::uint32_t { kWavy, kBlotchy, kGrainy, kFine, kSplotchy, kLite, kCrackly, kPatternCount };
-static_assert(kPatternCount == kPatternItems.size(), "one name for each item of the \"Pattern\" menu");
+using enum Pattern;
 
 // ---------------------------------------------------------------------------------------------------------
 // Parameters
@@ -42,8 +41,8 @@ consteval ParamRow CheckBox(const char* name, Flag flag, Layout layout) {
     return {name, kKindCheckBox, 0.0f, 0.0f, {.bits = flag}, layout, false, {}, 0};
 }
 
-consteval ParamRow Menu(const char* name, std::span<const char* const> items, std::uint32_t item,
-                        Layout layout) {
+consteval ParamRow Menu(const char* name, std::span<const char* const> items, Pattern chosen, Layout layout) {
+    const auto item = static_cast<std::uint32_t>(chosen);
     if (items.size() > kMenuItemCapacity || item >= items.size()) throw "a menu's items or default are wrong";
     return {name, kKindMenu, 0.0f, 0.0f, {.bits = item}, layout, false, items, 0};
 }
