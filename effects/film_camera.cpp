@@ -1,5 +1,5 @@
-// "Film Camera": an unsteady camera or projector. Jitter with a border for the uncovered edge, and flicker.
-// The colour stages stay neutral and nothing is damaged.
+// The parameters and built-in presets of "Film Camera": an unsteady camera or projector. Jitter with a border for the
+// uncovered edge, and flicker. The colour stages stay neutral and nothing is damaged.
 #include "effects/table_builder.h"
 
 namespace velmora::effects {

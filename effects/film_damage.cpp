@@ -1,4 +1,5 @@
-// "Film Damage": wear, spots and scratches on a picture that otherwise stays as it is.
+// The parameters and built-in presets of "Film Damage": wear, spots and scratches on a picture that otherwise stays as
+// it is.
 #include "effects/table_builder.h"
 
 namespace velmora::effects {

@@ -1,5 +1,6 @@
-// "Film Express": camera, look and damage with few controls. One jitter for both directions, flicker at a
-// fixed speed, and a scratch depth that follows the amount of scratches; all kinds of scratch are on.
+// The parameters and built-in presets of "Film Express": camera, look and damage with few controls. One jitter for both
+// directions, flicker at a fixed speed, and a scratch depth that follows the amount of scratches; all kinds of scratch
+// are on.
 #include "effects/table_builder.h"
 
 namespace velmora::effects {

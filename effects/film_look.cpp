@@ -1,5 +1,5 @@
-// "Film Look": colour grading. Tint, saturation, brightness, contrast, film gamma and diffusion, without movement or
-// damage.
+// The parameters and built-in presets of "Film Look": colour grading. Tint, saturation, brightness, contrast, film gamma
+// and diffusion, without movement or damage.
 #include "effects/table_builder.h"
 
 namespace velmora::effects {

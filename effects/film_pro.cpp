@@ -1,5 +1,5 @@
-// "Film Pro": camera, look and damage with nearly every setting as a control. Only the border colour and wear in the
-// blue channel alone are fixed.
+// The parameters and built-in presets of "Film Pro": camera, look and damage with nearly every setting as a control. Only
+// the border colour and wear in the blue channel alone are fixed.
 #include "effects/table_builder.h"
 
 namespace velmora::effects {

@@ -1,4 +1,4 @@
-// Preset files: the settings of one effect as a small XML document.
+// Preset files: the settings of one effect as a small XML document. The built-in presets are in effects/film_*.cpp.
 //
 //     <?xml version="1.0" standalone="no" ?>
 //     <!-- Effect's Preset File -->
