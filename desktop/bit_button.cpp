@@ -15,8 +15,7 @@ constexpr SIZE kSizeWithoutBitmap = {74, 32};
 constexpr int kImages = 3;
 constexpr int kPlainMargin = 8;  // how much lower than the bitmap button the standard button is
 constexpr int kPlainLowest = 10;
-constexpr int kWindowExtraBytes = 4;  // a pointer to the window's record
-static_assert(sizeof(void*) <= kWindowExtraBytes, "the record's address lies in the window's extra bytes");
+constexpr int kWindowExtraBytes = sizeof(void*);  // a pointer to the window's record
 
 // The background colour of dialogs.
 HBRUSH DialogBrush() noexcept {
