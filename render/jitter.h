@@ -2,6 +2,7 @@
 // gate, and fills the uncovered strip with the border colour.
 #pragma once
 
+#include <algorithm>
 #include <cstdint>
 
 #include "render/image.h"
@@ -27,7 +28,15 @@ class JitterStage {
     [[nodiscard]] std::uint32_t Border() const noexcept { return m_border; }
 
     // Row `y` of the shaken picture of `source`'s region.
-    [[nodiscard]] ShiftedRow Shifted(const ImageView& source, std::int32_t y) const noexcept;
+    [[nodiscard]] ShiftedRow Shifted(const ImageView& source, std::int32_t y) const noexcept {
+        const std::int32_t width = source.Region().Width();
+        const std::int32_t row = y - m_dy;
+        if (row < 0 || row >= source.Region().Height()) return {nullptr, 0, 0, m_border};
+        const std::int32_t band = std::min(m_dx < 0 ? -m_dx : m_dx, width);
+        const Bgra* pixels = source.Row(row);
+        if (m_dx < 0) return {pixels + band, 0, width - band, m_border};
+        return {pixels, band, width - band, m_border};
+    }
 
   private:
     std::int32_t m_dy = 0;
@@ -36,7 +45,12 @@ class JitterStage {
 };
 
 // Draws the offsets: nothing if both amplitudes are 0, else the vertical offset and then the horizontal one.
-[[nodiscard]] JitterStage PrepareJitter(const StageSettings& settings, Random& random) noexcept;
+[[nodiscard]] inline JitterStage PrepareJitter(const StageSettings& settings, Random& random) noexcept {
+    if (settings.yJitter == 0 && settings.xJitter == 0) return {};
+    const std::int32_t dy = random.Draw(-settings.yJitter, settings.yJitter);
+    const std::int32_t dx = random.Draw(-settings.xJitter, settings.xJitter);
+    return {dy, dx, settings.borderColour};
+}
 
 // The shaken picture of a frame, for stages that need their neighbours.
 class ShakenRows final : public RowReader {
