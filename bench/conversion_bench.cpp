@@ -12,7 +12,7 @@
 #include <stdexcept>
 
 #include "bench/conversion.h"
-#include "effects/render_options.h"
+#include "effects/render_session.h"
 
 namespace velmora::bench {
 namespace {

@@ -10,7 +10,7 @@
 #include "effects/effect_table.h"
 #include "api/host_api.h"
 #include "effects/master_settings.h"
-#include "effects/render_options.h"
+#include "effects/render_session.h"
 #include "render/deep/deep_renderer.h"
 #include "render/render_state.h"
 #include "render/stage_settings.h"

@@ -1,9 +1,10 @@
-// What a render works on: the list of master settings, which every frame reads again, and the state that outlives a
-// frame. The library has one session for the whole process, as hosts expect; a host that links the core makes one for
-// each of its threads.
+// What a frame is rendered with: the SIMD level, the list of master settings, which every frame reads again, and the
+// state that outlives a frame. The library has one session for the whole process, as hosts expect; a host that links the
+// core makes one for each of its threads.
 #pragma once
 
 #include <optional>
+#include <string_view>
 
 #include "api/host_api.h"
 #include "effects/master_settings.h"
@@ -14,6 +15,17 @@
 #include "render/stage_settings.h"
 
 namespace velmora {
+
+// The environment variable that limits the SIMD level, for tests or to track down a fault: plain, sse2, ssse3, avx2 or
+// avx512. The output bytes are the same at every level.
+inline constexpr const char* kSimdVariable = "VELMORA_SIMD";
+
+// The level's name in the variable.
+[[nodiscard]] std::string_view NameOf(render::SimdLevel level) noexcept;
+
+// Reads the process's environment again. Values other than those above are ignored; a level that the processor lacks
+// gives the best one that it has.
+[[nodiscard]] render::RenderOptions ReadRenderOptions() noexcept;
 
 struct RenderSession {
     MasterSettingsList* settings = nullptr;  // not owned

@@ -3,7 +3,7 @@
 
 #include "api/com_object.h"
 #include "api/host_api.h"
-#include "effects/render_options.h"
+#include "effects/render_session.h"
 #include "render/kernels.h"
 #include "render/ycbcr.h"
 

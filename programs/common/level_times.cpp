@@ -4,7 +4,7 @@
 #include <cstdio>
 #include <cstdlib>
 
-#include "effects/render_options.h"
+#include "effects/render_session.h"
 
 namespace velmora::bench {
 namespace {

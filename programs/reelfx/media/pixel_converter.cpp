@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <utility>
 
-#include "effects/render_options.h"
+#include "effects/render_session.h"
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/conversion/light_curve.h"
 

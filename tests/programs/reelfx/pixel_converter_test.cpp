@@ -8,7 +8,7 @@
 #include <random>
 
 #include "bench/conversion.h"
-#include "effects/render_options.h"
+#include "effects/render_session.h"
 
 extern "C" {
 #include <libavutil/pixdesc.h>
