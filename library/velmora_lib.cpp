@@ -6,7 +6,6 @@
 #include "effects/film_effect.h"
 #include "platform/float_guard.h"
 #include "library/frame_processor.h"
-#include "effects/velmora_effect.h"
 #include "user_presets/preset_saver.h"
 #include "desktop/shell_services.h"
 
