@@ -1,4 +1,4 @@
-#include "programs/reelfx/conversion/light_curve.h"
+#include "programs/reelfx/conversion/picture_view.h"
 
 #include <algorithm>
 #include <cstddef>

@@ -1,4 +1,4 @@
-// A picture in memory that frames are converted to and from. Rows go from the top.
+// Pictures in memory that frames are converted to and from. Rows go from the top.
 #pragma once
 
 #include <cstddef>
@@ -31,5 +31,14 @@ struct BasicPictureView {
 };
 using PictureView = BasicPictureView<std::uint8_t>;
 using ConstPictureView = BasicPictureView<const std::uint8_t>;
+
+// Pictures whose values are proportional to light, as OpenEXR has them (light_curve.cpp). The effects are made for values
+// as a screen shows them, so such pictures are converted by sRGB's curve and back. Below 0 the curve continues in a
+// straight line, above 1 as it is.
+
+// `light` has floats, `display` samples of any type; alpha is kept. The pictures have one size.
+void DisplayOfLight(const ConstPictureView& light, const PictureView& display);
+// The other way: `light` has floats.
+void LightOfDisplay(const ConstPictureView& display, const PictureView& light);
 
 }  // namespace velmora::hosts

@@ -1,11 +1,11 @@
-// Rows of samples as floats, with padding on both sides, and their transfer from and to frames.
+// Rows of samples as floats, with padding on both sides, their transfer from and to frames, and the filter that gives
+// chroma the size of luma and back.
 #pragma once
 
 #include <cstddef>
 #include <cstdint>
 #include <vector>
 
-#include "programs/reelfx/conversion/chroma_filter.h"
 #include "programs/reelfx/conversion/frame_coding.h"
 #include "programs/reelfx/conversion/row_kernels.h"
 
@@ -37,6 +37,22 @@ void WriteRow(const RowKernels& kernels, const float* in, const ComponentLayout&
 constexpr int ChromaSize(int lumaSize, int shift) {
     return (lumaSize + (1 << shift) - 1) >> shift;
 }
+
+// The weights by which chroma is interpolated to the size of luma, and reduced again: cubic interpolation with a
+// slope of -0.6 one sample away, for reduction stretched over the samples that become one.
+
+struct FilterTap {
+    int place;  // of the sample; see below
+    float weight;
+};
+using FilterTaps = std::vector<FilterTap>;  // their weights add up to 1
+
+// One set of taps for each of `factor` luma samples: sample `factor` * i + p is the sum of the chroma samples
+// i + place by the taps of p. `position` is that of the first chroma sample, in luma samples.
+std::vector<FilterTaps> EnlargingTaps(int factor, double position);
+
+// Chroma sample i is the sum of the luma samples `factor` * i + place.
+FilterTaps ReducingTaps(int factor, double position);
 
 // The sum of rows by their taps; row(place) gives the row for a tap, in which sample i is the one for output i.
 template <class RowAt>

@@ -5,7 +5,7 @@
 
 #include "effects/render_session.h"
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/conversion/light_curve.h"
+#include "programs/reelfx/conversion/picture_view.h"
 
 extern "C" {
 #include <libavutil/opt.h>

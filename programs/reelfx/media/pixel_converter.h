@@ -1,6 +1,6 @@
 // Converts decoded frames to pictures and back. Both ways use the frame's own matrix, range and chroma position, so
 // that an unchanged picture comes back as it was. Frames in linear light become display values, and back
-// (conversion/light_curve.h). One converter per thread.
+// (conversion/picture_view.h). One converter per thread.
 //
 // Frames of YCbCr, grey and deep RGB go through conversion/, which rounds once. The library's scaler does the rest:
 // 8-bit RGB, where both are exact and it is faster, frames of another size than the picture, palettes and other rare
