@@ -1,7 +1,7 @@
 #include "programs/reelfx/commands/commands.h"
 
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/pictures/still.h"
+#include "programs/reelfx/pictures/pictures.h"
 #include "programs/reelfx/media/bgra_picture.h"
 #include "programs/reelfx/media/pixel_converter.h"
 #include <filesystem>

@@ -8,7 +8,7 @@
 #include "text/number_text.h"
 #include "programs/reelfx/pipeline/frame_worker.h"
 #include "programs/reelfx/common/failure.h"
-#include "programs/reelfx/pictures/matte.h"
+#include "programs/reelfx/pictures/pictures.h"
 #include "programs/reelfx/common/output_place.h"
 #include "programs/reelfx/media/bgra_picture.h"
 #include "programs/reelfx/media/media_facts.h"

@@ -7,7 +7,7 @@
 
 #include "text/number_text.h"
 #include "programs/reelfx/common/output_place.h"
-#include "programs/reelfx/pictures/still.h"
+#include "programs/reelfx/pictures/pictures.h"
 
 namespace velmora::hosts {
 namespace {

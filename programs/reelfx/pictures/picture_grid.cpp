@@ -1,4 +1,4 @@
-#include "programs/reelfx/pictures/still.h"
+#include "programs/reelfx/pictures/pictures.h"
 
 #include <algorithm>
 #include <cairo.h>

@@ -3,7 +3,7 @@
 #include <cstring>
 #include <utility>
 
-#include "programs/reelfx/pictures/matte.h"
+#include "programs/reelfx/pictures/pictures.h"
 #include "programs/reelfx/media/bgra_picture.h"
 
 namespace velmora::hosts {

@@ -21,7 +21,7 @@ class FrameWorker {
         PictureTurn turn = {};                    // which makes the picture upright
         FrameDigests* digests = nullptr;          // of the pipeline, if they are wanted
         SampleType samples = SampleType::kBytes;  // that the effects work on
-        bool isMatte = false;                     // the result is only the damage, see matte.h
+        bool isMatte = false;                     // the result is only the damage, see pictures.h
     };
     FrameWorker(EffectListSession session, const Job& job);
 
