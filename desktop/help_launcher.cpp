@@ -1,4 +1,4 @@
-#include "desktop/help_launcher.h"
+#include "desktop/options.h"
 
 #include <windows.h>
 #include <shellapi.h>

@@ -1,12 +1,13 @@
-// The user's preferences, and the dialog that shows them. Windows only; the user-interface thread.
+// The user's preferences, the dialog that shows them, and the help that it opens. Windows only; the user-interface
+// thread.
 #pragma once
 
 #include <windows.h>
 
+#include <cstdint>
 #include <optional>
 #include <string>
 
-#include "desktop/help_launcher.h"
 #include "language/translation.h"
 
 namespace velmora::support {
@@ -35,6 +36,23 @@ class Preferences {
 
 // Stores a text with its terminator, creating the key if it is missing; false when the registry refuses.
 bool WriteSetting(const char* section, const char* name, const char* text);
+
+// Opens the help file at a numbered topic, either in the system's help viewer (a separate program) or through the HTML
+// help control inside this process (help_launcher.cpp).
+class HelpLauncher {
+  public:
+    // `folder` is 16-bit text that ends in a separator, `fileName` 8-bit text in the system code page.
+    void SetFile(std::u16string folder, const std::string& fileName);
+
+    // Non-zero when the help was started. `owner` is a window handle or null.
+    [[nodiscard]] std::int32_t Show(void* owner, std::int32_t topic, bool externalViewer) const;
+
+  private:
+    [[nodiscard]] std::int32_t ShowInViewer(void* owner, std::int32_t topic) const;
+    [[nodiscard]] std::int32_t ShowInProcess(void* owner, std::int32_t topic) const;
+
+    std::u16string m_path;
+};
 
 // The options dialog: the library's name and version, its one preference, a logo that opens the maker's web page,
 // and help.

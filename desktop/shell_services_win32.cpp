@@ -5,7 +5,6 @@
 
 #include "platform/float_guard.h"
 #include "desktop/bit_button.h"
-#include "desktop/help_launcher.h"
 #include "desktop/options.h"
 #include "desktop/resource_ids.h"
 #include "desktop/shell_services.h"
