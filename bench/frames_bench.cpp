@@ -14,7 +14,6 @@
 #include "programs/common/bench_cases.h"
 #include "programs/common/frame_pool.h"
 #include "programs/common/level_times.h"
-#include "bench/session_of.h"
 #include "library/frame_processor.h"
 
 namespace velmora::bench {

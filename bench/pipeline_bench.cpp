@@ -12,7 +12,7 @@
 #include <vector>
 
 #include "programs/common/frame_pool.h"
-#include "bench/session_of.h"
+#include "programs/common/bench_cases.h"
 #include "programs/reelfx/pipeline/frame_pipeline.h"
 
 namespace velmora::bench {

@@ -1,9 +1,14 @@
-// What is measured: an effect with settings that make all of its stages work.
+// What is measured: an effect with settings that make all of its stages work, and a session with them.
 #pragma once
 
 #include <cstdint>
+#include <memory>
+#include <new>
 #include <span>
 #include <string>
+#include <string_view>
+
+#include "effects/effect_session.h"
 
 namespace velmora::bench {
 
@@ -28,5 +33,25 @@ struct BenchCase {
 [[nodiscard]] const BenchCase& EverythingCase() noexcept;
 // The case's name with its goals.
 [[nodiscard]] std::string TitleOf(const BenchCase& test, double goal);
+
+// The case's effect with its values. Throws std::bad_alloc. Inline: reelhost, which measures the DLL, has no sessions.
+[[nodiscard]] inline std::unique_ptr<effects::EffectSession> SessionOf(const BenchCase& test) {
+    const effects::EffectTable& effect = *effects::kAllEffects[test.effect];
+    auto session = effects::EffectSession::Create(effect);
+    if (!session) throw std::bad_alloc();
+    for (std::uint32_t i = 0; i < effect.presetNames.size(); ++i) {
+        if (std::string_view(effect.presetNames[i]) == "Reset To None") session->ApplyPreset(i);
+    }
+    for (const CaseValue& value : test.values) {
+        ValueWord word = {};
+        if (effect.params[value.parameter].kind == kKindSlider) {
+            word.number = static_cast<float>(value.value);
+        } else {
+            word.bits = static_cast<std::uint32_t>(value.value);
+        }
+        session->SetValue(value.parameter, word);
+    }
+    return session;
+}
 
 }  // namespace velmora::bench
