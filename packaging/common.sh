@@ -25,9 +25,11 @@ put_tree() {
 }
 
 # put_obs DIST PLACE: the filters for OBS, with the licence of the library that they are a part of when they run
+gpl=/usr/share/common-licenses/GPL-2
+obsLicence=velmora-reel-effects-obs/data/GPL-2.txt
 put_obs() {
     put_tree "$1/obs" "$2"
-    put /usr/share/common-licenses/GPL-2 "$2/velmora-reel-effects-obs/data/GPL-2.txt"
+    put "$gpl" "$2/$obsLicence"
 }
 
 # put_help PLACE READER...: the help pages for these readers

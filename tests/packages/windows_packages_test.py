@@ -19,16 +19,28 @@ PRODUCT = "velmora-reel-effects-1.0"
 WINE = ROOT / "scripts" / "wine32"
 MUST_HAVE = """VMReelEffects.dll VMLang.dll VMReelEffectsLang.xml resources.dll VMReelEffects.chm reelhost.exe reelview.exe reelcheck.exe
     frei0r/velmora_film_camera.dll frei0r/velmora_film_look.dll frei0r/velmora_film_damage.dll
-    frei0r/velmora_film_express.dll frei0r/velmora_film_pro.dll sdk/host_api.h sdk/example_host.cpp docs/hosts.txt
-    64-bit/reelcheck.exe 64-bit/frei0r/velmora_film_pro.dll docs/openfx.txt
+    frei0r/velmora_film_express.dll frei0r/velmora_film_pro.dll sdk/host_api.h sdk/example_host.cpp docs/hosts.html
+    64-bit/reelcheck.exe 64-bit/frei0r/velmora_film_pro.dll docs/openfx.html
     64-bit/VelmoraReelEffects.ofx.bundle/Contents/Info.plist
     64-bit/VelmoraReelEffects.ofx.bundle/Contents/Win64/VelmoraReelEffects.ofx
-    64-bit/obs/velmora-reel-effects-obs/bin/64bit/velmora-reel-effects-obs.dll docs/obs.txt
+    64-bit/obs/velmora-reel-effects-obs/bin/64bit/velmora-reel-effects-obs.dll docs/obs.html docs/changes.html
     64-bit/obs/velmora-reel-effects-obs/data/locale/ja-JP.ini 64-bit/obs/velmora-reel-effects-obs/data/GPL-2.txt
     docs/help/start.html README.txt reel.html LICENSE.txt third-party.txt SHA256SUMS""".split()
 UNINSTALL = r"Software\Microsoft\Windows\CurrentVersion\Uninstall"
 OWN_KEY = UNINSTALL + r"\VelmoraReelEffects"
 EXIT_IN_USE = 2
+
+
+def check_texts(folder):
+    """Texts have Windows line ends; the pages have no marks of their source, and their links lead to files."""
+    for path in Path(folder).rglob("*.txt"):
+        lines = path.read_bytes().split(b"\n")
+        assert all(line.endswith(b"\r") for line in lines[:-1]) and len(lines) > 3, path
+    for path in Path(folder, "docs").glob("*.html"):
+        page = path.read_text("utf-8")
+        assert "<!--" not in page and not re.search(r"\]\(|^\|", page, re.M), path
+        for target in re.findall(r'href="([^"]*)"', page):
+            assert "://" in target or (path.parent / target).is_file(), f"{path}: {target}"
 
 
 class Prefix:
@@ -112,6 +124,7 @@ def check_zip(path, work):
     missing = set(MUST_HAVE) - set(files)
     assert not missing, missing
     assert {name: files.get(name) for name in files_below(DIST)} == files_below(DIST), "not what was built"
+    check_texts(unpacked)
     check_digest_list(unpacked)
     check_no_build_paths(unpacked)
     # The OpenFX plug-ins as they lie in the package, by the program beside them.
