@@ -4,7 +4,6 @@
 #include <cmath>
 #include <cstddef>
 #include <iterator>
-#include <limits>
 #include <numbers>
 
 namespace velmora::render {
@@ -13,17 +12,13 @@ namespace {
 // What a truncation to whole levels of 255 takes away on average.
 constexpr double kHalfLevel = 0.5 / 255.0;
 
-constexpr float kNoBound = std::numeric_limits<float>::infinity();
-
 DeepTone::Line LineOf(const ColourStage& colour) noexcept {
     const double offset = colour.Offset();
     const double gain = colour.Gain().value_or(1.0);
     const double times = gain * (1.0 - std::abs(offset));
     const double truncated = colour.Gain() ? kHalfLevel : 0.0;
     const double plus = gain * (std::max(offset, 0.0) - 0.5) + 0.5 - truncated;
-    const bool isClamped = gain > 1.0;
-    DeepTone::Line line = {static_cast<float>(times), static_cast<float>(plus), isClamped ? 0.0f : -kNoBound,
-                           isClamped ? 1.0f : kNoBound, false};
+    DeepTone::Line line = {static_cast<float>(times), static_cast<float>(plus), gain > 1.0, false};
     // White stays white to the last bit, so that what follows finds it inside.
     if (!colour.Gain() && offset > 0.0) line.times = 1.0f - line.plus;
     line.staysInside = line.plus >= 0.0f && line.times + line.plus <= 1.0f;
@@ -70,7 +65,8 @@ DeepTone::Gamma GammaOf(double gamma, double in, double out) noexcept {
     return result;
 }
 
-DeepTone::Tint TintOf(std::int32_t offset, double gamma) noexcept {
+// After the gamma `first`, if there is one.
+DeepTone::Tint TintOf(std::int32_t offset, double gamma, const DeepTone::Gamma& first) noexcept {
     constexpr double kWhite = 255.0 / 256.0;
     const bool bends = gamma != 0.0, lifts = offset > 0;
     const Curve curve{gamma};
@@ -85,12 +81,14 @@ DeepTone::Tint TintOf(std::int32_t offset, double gamma) noexcept {
         return static_cast<float>(curve.SlopeAt(q) * times * curve.SlopeAt(thenAt));
     };
     DeepTone::Tint result;
-    result.lifts = lifts;
     // Without a gamma the tint takes x - middle to x + black itself.
     const double in = bends ? 1.0 : 1.0 / kToUnit, out = bends ? 1.0 : kToUnit;
     result.times = static_cast<float>(times * in * out);
     result.plus = static_cast<float>((tinted(0.5 - truncated) - 0.5) * out);
-    result.bound = static_cast<float>((lifts ? kWhite - 0.5 : -0.5) * out);
+    result.lifts = lifts;
+    result.least = static_cast<float>(-0.5 * out);
+    if (bends) result.least = std::max(result.least, result.times * first.black + result.plus);
+    result.most = static_cast<float>((kWhite - 0.5) * out);
     result.slopeBelow = offset < 0 ? 0.0f : slope(0.0, black);
     result.slopeAbove = slope(kWhite, white);
     return result;
@@ -114,9 +112,9 @@ DeepTone DeepToneOf(const ColourStage& colour, const TintStage& tint) noexcept {
         tone.middle = static_cast<float>(0.5 * kToUnit);
         tone.black = tone.bends ? tone.second.black : static_cast<float>(-0.5 * kToUnit);
         const TintOffsets& offsets = tint.Offsets();
-        tone.tint[0] = TintOf(offsets.red, tint.Gamma());
-        tone.tint[1] = TintOf(offsets.green, tint.Gamma());
-        tone.tint[2] = TintOf(offsets.blue, tint.Gamma());
+        tone.tint[0] = TintOf(offsets.red, tint.Gamma(), tone.first);
+        tone.tint[1] = TintOf(offsets.green, tint.Gamma(), tone.first);
+        tone.tint[2] = TintOf(offsets.blue, tint.Gamma(), tone.first);
     }
     return tone;
 }

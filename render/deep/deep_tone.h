@@ -25,27 +25,26 @@
 namespace velmora::render {
 
 struct DeepTone {
-    // Brightness, flicker and contrast in one line: clamp(times x + plus, least, most).
+    // Brightness, flicker and contrast in one line: times x + plus.
     struct Line {
-        float times, plus, least, most;
+        float times, plus;
+        bool isClamped;    // to 0..1
         bool staysInside;  // takes 0..1 into 0..1
-
-        [[nodiscard]] bool IsClamped() const noexcept { return least == 0.0f; }
     };
     // The saturation's shares.
     struct Mix {
         float own, red, green, blue, plus;
     };
-    // S - 1/2 = max(z (a + b z² + c z⁴ + d z⁶), black) with z = q - 1/2, which is within 4e-7 of the formula. It is t
-    // too high, which the next step takes away.
+    // S - 1/2 = max(z (a + b z² + c z⁴ + d z⁶), black) with z = q - 1/2, which is within 4e-7 of the formula. The
+    // kernels leave the bound to the next step. S is t too high, which the next step takes away.
     struct Gamma {
         float factors[4];
         float black;
     };
+    // max(times z + plus, least); at most `most`, which only matters if it lifts.
     struct Tint {
         bool lifts;  // o > 0
-        float times, plus;
-        float bound;                   // of the result: the most if it lifts, else the least
+        float times, plus, least, most;
         float slopeBelow, slopeAbove;  // of the whole stage at x = 0 and x = 1
     };
 

@@ -9,6 +9,11 @@ inline void Store(float* to, Floats x) noexcept { _mm256_storeu_ps(to, x); }
 
 inline Floats Least(Floats a, Floats b) noexcept { return _mm256_min_ps(a, b); }
 inline Floats Most(Floats a, Floats b) noexcept { return _mm256_max_ps(a, b); }
+// As whole numbers, for which the processor has more units.
+inline Floats Unit(Floats x) noexcept {
+    const __m256i positive = _mm256_max_epi32(_mm256_castps_si256(x), _mm256_setzero_si256());
+    return _mm256_castsi256_ps(_mm256_min_epi32(positive, _mm256_castps_si256(All(1.0f))));
+}
 inline Floats NumberOr0(Floats x) noexcept { return _mm256_and_ps(_mm256_cmp_ps(x, x, _CMP_ORD_Q), x); }
 inline Floats WherePositive(Floats sign, Floats x) noexcept {
     return _mm256_and_ps(_mm256_cmp_ps(sign, _mm256_setzero_ps(), _CMP_GT_OQ), x);

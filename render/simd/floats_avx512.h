@@ -9,6 +9,11 @@ inline void Store(float* to, Floats x) noexcept { _mm512_storeu_ps(to, x); }
 
 inline Floats Least(Floats a, Floats b) noexcept { return _mm512_min_ps(a, b); }
 inline Floats Most(Floats a, Floats b) noexcept { return _mm512_max_ps(a, b); }
+// As whole numbers, for which the processor has more units.
+inline Floats Unit(Floats x) noexcept {
+    const __m512i positive = _mm512_max_epi32(_mm512_castps_si512(x), _mm512_setzero_si512());
+    return _mm512_castsi512_ps(_mm512_min_epi32(positive, _mm512_castps_si512(All(1.0f))));
+}
 inline Floats NumberOr0(Floats x) noexcept {
     return _mm512_maskz_mov_ps(_mm512_cmp_ps_mask(x, x, _CMP_ORD_Q), x);
 }

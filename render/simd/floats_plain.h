@@ -11,6 +11,8 @@ inline void Store(float* to, Floats x) noexcept { *to = x; }
 // The second number if they are equal or one of them is not a number.
 inline Floats Least(Floats a, Floats b) noexcept { return a < b ? a : b; }
 inline Floats Most(Floats a, Floats b) noexcept { return a > b ? a : b; }
+// Clamped to 0..1.
+inline Floats Unit(Floats x) noexcept { return Least(Most(x, All(0.0f)), All(1.0f)); }
 // 0 where x is not a number.
 inline Floats NumberOr0(Floats x) noexcept { return x == x ? x : 0.0f; }
 // x where `sign` is above 0, else 0.

@@ -9,6 +9,7 @@ inline void Store(float* to, Floats x) noexcept { _mm_storeu_ps(to, x); }
 
 inline Floats Least(Floats a, Floats b) noexcept { return _mm_min_ps(a, b); }
 inline Floats Most(Floats a, Floats b) noexcept { return _mm_max_ps(a, b); }
+inline Floats Unit(Floats x) noexcept { return Least(Most(x, All(0.0f)), All(1.0f)); }
 inline Floats NumberOr0(Floats x) noexcept { return _mm_and_ps(_mm_cmpord_ps(x, x), x); }
 inline Floats WherePositive(Floats sign, Floats x) noexcept {
     return _mm_and_ps(_mm_cmpgt_ps(sign, _mm_setzero_ps()), x);
