@@ -32,8 +32,10 @@ bool IsPossible(const OfxRectI& r) {
 
 HostImage::HostImage(const Suites& suites, OfxImageClipHandle clip, OfxTime time) : m_suites(suites) {
     const OfxStatus status = suites.effect->clipGetImage(clip, time, nullptr, &m_handle);
+    if (status != kOfxStatOK) m_handle = nullptr;
     if (status == kOfxStatErrBadHandle || status == kOfxStatErrMemory) throw ActionFailed{status};
-    if (status != kOfxStatOK || m_handle == nullptr) throw ActionFailed{kOfxStatFailed};
+    if (status != kOfxStatOK && status != kOfxStatFailed) throw ActionFailed{kOfxStatFailed};
+    if (m_handle == nullptr) return;
     try {
         Read(Properties(suites, m_handle));
         Check();
@@ -44,7 +46,7 @@ HostImage::HostImage(const Suites& suites, OfxImageClipHandle clip, OfxTime time
 }
 
 HostImage::~HostImage() {
-    m_suites.effect->clipReleaseImage(m_handle);
+    if (m_handle != nullptr) m_suites.effect->clipReleaseImage(m_handle);
 }
 
 void HostImage::Read(const Properties& image) {

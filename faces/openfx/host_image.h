@@ -19,13 +19,14 @@ enum class Depth : std::uint8_t { kByte, kShort, kFloat };
 // clip's `region`. Rows may lie at any address, their samples need not be aligned. Given back in the destructor.
 class HostImage {
   public:
-    // Throws ActionFailed: kOfxStatFailed when the clip has no image at that time, kOfxStatErrImageFormat for one that
-    // cannot be. `clip` lives longer than the image.
+    // Throws ActionFailed, with kOfxStatErrImageFormat for an image that cannot be. `clip` lives longer than the image.
     HostImage(const Suites& suites, OfxImageClipHandle clip, OfxTime time);
     ~HostImage();
     HostImage(const HostImage&) = delete;
     HostImage& operator=(const HostImage&) = delete;
 
+    // False when the clip has no image at that time. It then counts as black and transparent, and its bounds are empty.
+    [[nodiscard]] bool IsThere() const noexcept { return m_handle != nullptr; }
     [[nodiscard]] const OfxRectI& Bounds() const noexcept { return m_bounds; }
     [[nodiscard]] const OfxRectI& Region() const noexcept { return m_region; }
     [[nodiscard]] openfx::Depth Depth() const noexcept { return m_depth; }

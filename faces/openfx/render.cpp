@@ -78,10 +78,12 @@ class FrameRender {
           m_output(instance.Host(), instance.Output(), time),
           m_region(m_source.Region()),
           m_window(Intersection(window, m_output.Bounds())),
-          m_format(m_source, m_values.space) {
+          m_format(m_source.IsThere() ? m_source : m_output, m_values.space) {
+        if (!m_output.IsThere()) throw ActionFailed{kOfxStatFailed};
         const bool isSame =
             m_source.Depth() == m_output.Depth() && m_source.Channels() == m_output.Channels();
-        if (!isSame || m_source.Channels() < 3) throw ActionFailed{kOfxStatErrImageFormat};
+        if ((m_source.IsThere() && !isSame) || m_output.Channels() < 3)
+            throw ActionFailed{kOfxStatErrImageFormat};
         if (OfxImageClipHandle mask = instance.Mask()) m_mask.emplace(instance.Host(), mask, time);
         if (field == kOfxImageFieldLower) m_field = 0;
         if (field == kOfxImageFieldUpper) m_field = 1;
@@ -189,7 +191,7 @@ class FrameRender {
             std::fill_n(share, count, mix);
             return true;
         }
-        // Outside its bounds a mask hides the effect.
+        // Outside its bounds a mask hides the effect, and so does a mask without an image at this time.
         const OfxRectI& bounds = m_mask->Bounds();
         std::fill_n(share, count, 0.0f);
         const int from = std::max(x, bounds.x1), end = std::min(x + count, bounds.x2);
@@ -209,14 +211,23 @@ class FrameRender {
     int m_field = -1;  // 0: even rows, 1: odd rows
 };
 
+// The source's region; nothing when it has no image at that time.
+std::optional<OfxRectD> SourceRegion(const Instance& instance, double time) {
+    OfxRectD region;
+    const OfxStatus status =
+        instance.Host().effect->clipGetRegionOfDefinition(instance.Source(), time, &region);
+    if (status == kOfxStatFailed) return std::nullopt;
+    Require(status);
+    return region;
+}
+
 }  // namespace
 
 OfxStatus AnswerRegionOfDefinition(const Instance& instance, const Properties& in, const Properties& out) {
-    OfxRectD region;
-    const double time = TimeOf(in);
     // Else a mask would add its own.
-    Require(instance.Host().effect->clipGetRegionOfDefinition(instance.Source(), time, &region));
-    out.Set(kOfxImageEffectPropRegionOfDefinition, region);
+    const auto region = SourceRegion(instance, TimeOf(in));
+    if (!region) return kOfxStatReplyDefault;
+    out.Set(kOfxImageEffectPropRegionOfDefinition, *region);
     return kOfxStatOK;
 }
 
@@ -224,9 +235,9 @@ OfxStatus AnswerRegionsOfInterest(Instance& instance, const Properties& in, cons
     const double time = TimeOf(in);
     // A pixel of the other stages needs the same pixel of the source, which is the host's usual answer.
     if (!instance.Session(instance.ValuesAt(time))->NeedsWholePicture()) return kOfxStatReplyDefault;
-    OfxRectD region;
-    Require(instance.Host().effect->clipGetRegionOfDefinition(instance.Source(), time, &region));
-    out.Set((std::string(kOfxImageClipPropRoI_) + kOfxImageEffectSimpleSourceClipName).c_str(), region);
+    const auto region = SourceRegion(instance, time);
+    if (!region) return kOfxStatReplyDefault;
+    out.Set((std::string(kOfxImageClipPropRoI_) + kOfxImageEffectSimpleSourceClipName).c_str(), *region);
     return kOfxStatOK;
 }
 

@@ -57,6 +57,7 @@ constexpr Check kChecks[] = {
     {"openfx-presets",        3, CheckOpenfxPresets,       "a preset sets every parameter in one step; the button draws a seed"},
     {"openfx-identity",       3, CheckOpenfxIdentity,      "neutral values and a mix of 0 leave the source unchanged; which frames vary"},
     {"openfx-mask",           3, CheckOpenfxMask,          "mix and mask, 8-bit and float, also smaller than the picture"},
+    {"openfx-absent",         3, CheckOpenfxAbsent,        "a source or a mask that has no picture at a time"},
     {"openfx-fields",         3, CheckOpenfxFields,        "one field: only its rows are written"},
     {"openfx-tiles",          3, CheckOpenfxTiles,         "every preset by a tile, of the source too where a stage does not need all of it"},
     {"openfx-scales",         3, CheckOpenfxScales,        "render scales and pixels that are not square: regions in canonical coordinates"},

@@ -73,6 +73,7 @@ void CheckOpenfxParts(CheckContext& context);
 void CheckOpenfxRefused(CheckContext& context);
 void CheckOpenfxFields(CheckContext& context);
 void CheckOpenfxMask(CheckContext& context);
+void CheckOpenfxAbsent(CheckContext& context);
 
 // checks_openfx_tiles.cpp
 void CheckOpenfxTiles(CheckContext& context);

@@ -194,7 +194,6 @@ void CheckOpenfxRefused(CheckContext& context) {
         Require(IsOnlyInside(output, output, {}, 0x5A), "writes");
         RequireNothingHeld();
     };
-    refuses("no source", nullptr, &output, kOfxStatFailed);
     refuses("no output", &good, nullptr, kOfxStatFailed);
     const auto refusesShape = [&](const char* what, auto&& change) {
         PictureShape shape = Plain(8, 6);
@@ -207,6 +206,29 @@ void CheckOpenfxRefused(CheckContext& context) {
     refusesShape("alpha alone", [](PictureShape& shape) { shape.components = kOfxImageComponentAlpha; });
     refusesShape("an unknown depth", [](PictureShape& shape) { shape.depth = "OfxBitDepthHalf"; });
     refusesShape("rows that overlap", [](PictureShape& shape) { shape.padding = -8; });
+}
+
+// A clip without a picture at a time counts as black and transparent: nothing to change, or a mask that hides everything.
+void CheckOpenfxAbsent(CheckContext& context) {
+    const OpenfxModule module(context.bundlePath);
+    Busy busy(module, 4, kOfxImageEffectContextGeneral);
+    HostPicture source(Plain(24, 18)), black(Plain(24, 18)), output(Plain(24, 18));
+    source.Paint(context.dice);
+    black.Fill(0);
+    const auto renders = [&](const char* what, const HostPicture& expected) {
+        SetPlace("%s", what);
+        output.Fill(0x5A);
+        busy.instance.Clip("Output").Show(&output);
+        Require(busy.instance.Render(kTime, {2, 3, 20, 15}) == kOfxStatOK, "is not rendered");
+        Require(IsOnlyInside(output, expected, {2, 3, 20, 15}, 0x5A), "a wrong picture");
+        RequireNothingHeld();
+    };
+    busy.instance.Clip("Source").Show(&source);
+    busy.instance.ShowMask(nullptr);
+    busy.instance.Clip("Mask").properties.Put(kOfxImageClipPropConnected, {1});
+    renders("a connected mask without a picture", source);
+    busy.instance.Clip("Source").Show(nullptr);
+    renders("no source", black);
 }
 
 void CheckOpenfxMask(CheckContext& context) {
