@@ -122,7 +122,7 @@ void AddRender(CLI::App& app, TypedOptions& typed) {
         ->type_name("auto|8|16|float")
         ->check(CLI::IsMember({"auto", "8", "16", "float"}))
         ->capture_default_str();
-    render.add_option("--threads,-j", typed.threads, "Frames rendered at once; 0: one per processor")
+    render.add_option("--threads,-j", typed.threads, "Frames rendered at once; 0, and at most: one per processor")
         ->type_name("N")
         ->check(CLI::Range(0, 256))
         ->envname("REELFX_THREADS");

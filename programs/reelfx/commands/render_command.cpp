@@ -148,8 +148,9 @@ class RenderRun {
         ClipSection section(m_reader, m_section);
         BatchStep batch;
         if (m_options.withDigests) {
+            // Results for the writer take memory as well.
             batch = {[&](std::span<PipelineItem* const> items) { m_digests.Compute(items); },
-                     FrameDigests::kBatch};
+                     m_writer ? FrameDigests::kBatch - 1 : FrameDigests::kBatch};
         }
         FramePipeline pipeline([&] { return section.Next(); }, MakeWorkers(), std::move(batch));
         while (const PipelineItemPtr item = pipeline.Next()) {
@@ -214,8 +215,10 @@ class RenderRun {
     [[nodiscard]] unsigned ThreadCount() const {
         // A continuous random sequence needs the frames in order.
         if (m_effects.IsSequence()) return 1;
-        return m_options.threads > 0 ? static_cast<unsigned>(m_options.threads)
-                                     : std::max(1u, std::thread::hardware_concurrency());
+        // A worker without a processor of its own speeds nothing up and holds two pictures.
+        const unsigned processors = std::max(1u, std::thread::hardware_concurrency());
+        return m_options.threads > 0 ? std::min(static_cast<unsigned>(m_options.threads), processors)
+                                     : processors;
     }
 
     std::vector<FramePipeline::Worker> MakeWorkers() {

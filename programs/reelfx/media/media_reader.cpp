@@ -6,6 +6,7 @@
 #include <numeric>
 #include <string>
 #include <string_view>
+#include <thread>
 
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/av_handles.h"
@@ -57,6 +58,17 @@ FramePtr Plain(FramePtr frame) {
         }
     }
     return plain;
+}
+
+bool IsOpaqueBgra(const AVFrame& frame) {
+    if (frame.format != AV_PIX_FMT_BGRA) return false;
+    for (int y = 0; y < frame.height; ++y) {
+        const std::uint8_t* row = frame.data[0] + std::ptrdiff_t{y} * frame.linesize[0];
+        for (int x = 0; x < frame.width; ++x) {
+            if (row[x * 4 + 3] != 0xFF) return false;
+        }
+    }
+    return true;
 }
 
 // The libraries' own decoders of VP8 and VP9 leave out transparency, which these have.
@@ -134,7 +146,8 @@ void MediaReader::OpenDecoder() {
     m_decoder = Allocated<CodecPtr>(avcodec_alloc_context3(codec));
     int error = avcodec_parameters_to_context(m_decoder.get(), m_stream->codecpar);
     m_decoder->pkt_timebase = m_stream->time_base;
-    m_decoder->thread_count = 0;  // one per processor; the decoded frames do not depend on it
+    // The decoded frames do not depend on it. Left to itself, the decoder takes one more, and each holds a frame.
+    m_decoder->thread_count = static_cast<int>(std::clamp(std::thread::hardware_concurrency(), 1U, 16U));
     if (error >= 0) error = avcodec_open2(m_decoder.get(), codec, nullptr);
     if (error < 0) FailReading("cannot be decoded" + ErrorWords(error), error);
 }
@@ -343,8 +356,18 @@ void MediaReader::TakeFrame(FramePtr frame) {
     frame->pts = m_lastPts = pts;
     if (m_firstFrame && (frame->width != m_firstFrame->width || frame->height != m_firstFrame->height))
         m_otherSize = std::to_string(frame->width) + "x" + std::to_string(frame->height);
-    if (!m_firstFrame) m_firstFrame = Allocated<FramePtr>(av_frame_clone(frame.get()));
+    if (!m_firstFrame) KeepFirst(*frame);
     m_items.push_back({std::move(frame), nullptr});
+}
+
+void MediaReader::KeepFirst(const AVFrame& frame) {
+    m_isOpaque = IsOpaqueBgra(frame);
+    FramePtr first = NewFrame();
+    if (av_frame_copy_props(first.get(), &frame) < 0) throw std::bad_alloc();
+    first->width = frame.width;
+    first->height = frame.height;
+    first->format = frame.format;
+    m_firstFrame = std::move(first);
 }
 
 MediaReader::Landing MediaReader::SeekToFrame(std::int64_t pts) {

@@ -59,8 +59,12 @@ class MediaReader {
 
     [[nodiscard]] AVFormatContext& Container() const { return *m_container; }
     [[nodiscard]] AVStream& Picture() const { return *m_stream; }
-    // Size, pixel format and colours are those of the first frame.
+    // Size, pixel format and colours are those of the first frame. Without its pixels, which would take memory to the
+    // end.
     [[nodiscard]] const AVFrame& FirstFrame() const { return *m_firstFrame; }
+    // Every picture of GIF and of raw BGRA has an alpha channel, and few are transparent: of such ones, the first frame is
+    // not.
+    [[nodiscard]] bool IsOpaque() const { return m_isOpaque; }
     // How players turn the picture.
     [[nodiscard]] PictureTurn Turn() const { return TurnOf(*m_stream, *m_firstFrame); }
     [[nodiscard]] AVRational PixelShape() const;  // 0/1 if unknown
@@ -110,6 +114,7 @@ class MediaReader {
     void TakeFrames();
     void TakeUntimed(std::int64_t next);
     void TakeFrame(FramePtr frame);
+    void KeepFirst(const AVFrame& frame);
     [[nodiscard]] std::int64_t TicksPerFrame() const;
 
     InputOptions m_options;
@@ -122,6 +127,7 @@ class MediaReader {
     std::deque<Item> m_items;        // read ahead
     std::deque<FramePtr> m_untimed;  // decoded before any that has a time
     FramePtr m_firstFrame;
+    bool m_isOpaque = false;
     TimeLine m_timeLine;
     std::string m_otherSize;
     std::string m_exif;

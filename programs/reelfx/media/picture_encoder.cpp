@@ -35,18 +35,8 @@ bool IsGrey(AVPixelFormat format) {
     return DescriptorOf(format).nb_components <= 2 && !IsRgb(format);
 }
 
-// Pictures with transparency by their format. GIFs and raw BGRA all have such a format, and few are transparent.
 bool HasAlpha(const MediaReader& source) {
-    const AVFrame& first = source.FirstFrame();
-    const bool carries = CarriesAlpha(static_cast<AVPixelFormat>(first.format));
-    if (first.format != AV_PIX_FMT_BGRA) return carries;
-    for (int y = 0; y < first.height; ++y) {
-        const std::uint8_t* row = first.data[0] + std::ptrdiff_t{y} * first.linesize[0];
-        for (int x = 0; x < first.width; ++x) {
-            if (row[x * 4 + 3] != 0xFF) return true;
-        }
-    }
-    return false;
+    return !source.IsOpaque() && CarriesAlpha(static_cast<AVPixelFormat>(source.FirstFrame().format));
 }
 
 // Encoders' vector code reads whole vectors and blocks of 32 rows.

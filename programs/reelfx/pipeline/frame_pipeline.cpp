@@ -7,10 +7,10 @@ namespace velmora::hosts {
 
 namespace {
 
-// Enough items that no worker waits for another, few enough that large frames fit into memory. Those that wait for a
-// second step are larger, and one worker in five is busy with it.
+// One item waits for the next free worker and one for the reader of results, or several for their second step; more
+// would only hold memory.
 std::size_t CapacityFor(std::size_t workers, const BatchStep& batch) {
-    return batch.work ? std::max(workers + workers / 2 + 2, batch.most) : 2 * workers + 2;
+    return workers + std::max<std::size_t>(2, batch.most);
 }
 
 }  // namespace
@@ -60,18 +60,22 @@ void FramePipeline::Stop() {
 }
 
 void FramePipeline::Fill(const Source& source) {
-    while (PipelineItemPtr item = source()) {
+    for (;;) {
+        {
+            // Before reading: the item read would be one more in memory.
+            std::unique_lock lock(m_mutex);
+            m_changed.wait(lock, [&] { return m_isStopping || !IsFull(); });
+            if (m_isStopping) return;
+        }
+        PipelineItemPtr item = source();
+        if (!item) return;
         const auto slot = std::make_shared<Slot>();
-        const bool hasWork = !item->packet;
+        if (item->packet) slot->stage = Stage::kDone;
         slot->item = std::move(item);
-        if (!hasWork) slot->stage = Stage::kDone;
-        std::unique_lock lock(m_mutex);
-        // Packets are small and many; only frames count against the capacity.
-        const auto isRoom = [&] { return m_isStopping || !hasWork || !IsFull(); };
-        m_changed.wait(lock, isRoom);
-        if (m_isStopping) return;
-        m_slots.push_back(slot);
-        lock.unlock();
+        {
+            const std::lock_guard lock(m_mutex);
+            m_slots.push_back(slot);
+        }
         m_changed.notify_all();
     }
 }

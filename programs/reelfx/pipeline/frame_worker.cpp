@@ -30,10 +30,7 @@ void FrameWorker::Work(PipelineItem& item) {
         m_result = m_job.digests->Take(m_job.size.width, m_job.size.height, m_job.samples);
     }
     BgraPicture& result = Result(item);
-    if (m_job.writer)
-        Replace(item, result);
-    else
-        item.frame.reset();
+    if (m_job.writer) Replace(item, result);
     if (!m_job.digests) return;
     // Pictures in line for their digests and those of workers at rest would otherwise add up.
     BgraPicture& stored = AsStored(result);
@@ -52,11 +49,10 @@ void FrameWorker::Replace(PipelineItem& item, const BgraPicture& result) {
     item.frame = std::move(frame);
 }
 
-BgraPicture& FrameWorker::Result(const PipelineItem& item) {
-    if (!m_job.isMatte) {
-        m_converter.ToPicture(*item.frame, m_source.View());
-        return Apply(item);
-    }
+BgraPicture& FrameWorker::Result(PipelineItem& item) {
+    if (!m_job.isMatte) m_converter.ToPicture(*item.frame, m_source.View());
+    if (!m_job.writer) item.frame.reset();  // the decoder can use its memory again
+    if (!m_job.isMatte) return Apply(item);
     FillMatteGround(m_source);
     BgraPicture& result = Apply(item);
     ReadMatte(result);

@@ -29,7 +29,7 @@ class FrameWorker {
     void Work(PipelineItem& item);
 
   private:
-    BgraPicture& Result(const PipelineItem& item);
+    BgraPicture& Result(PipelineItem& item);
     void Replace(PipelineItem& item, const BgraPicture& result);
     // The result for m_source, turned as the output is.
     BgraPicture& Apply(const PipelineItem& item);

@@ -66,7 +66,7 @@ TEST(FramePipeline, GathersItemsForASecondStep) {
 TEST(FramePipeline, GathersFewerThanAskedRatherThanStop) {
     std::atomic<bool> isLate = false;
     const auto work = [&](PipelineItem& item) {
-        if (item.index == 7) isLate = true;
+        if (item.index == 8) isLate = true;
         while (item.index == 3 && !isLate) std::this_thread::sleep_for(std::chrono::milliseconds(1));
     };
     const auto source = [next = std::int64_t{0}]() mutable -> PipelineItemPtr {
@@ -119,7 +119,7 @@ TEST(FramePipeline, ReadsOnlyALittleAhead) {
         FramePipeline pipeline(endless, {WorkUnevenly});
         for (int i = 0; i < 10; ++i) EXPECT_TRUE(pipeline.Next());
     }  // leaving an endless source must not hang
-    EXPECT_LT(read, 20);
+    EXPECT_LE(read, 10 + 3);  // one in work, one waiting before it and one behind it
 }
 
 TEST(PictureTurn, QuartersGoClockwise) {
