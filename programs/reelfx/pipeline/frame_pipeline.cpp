@@ -43,7 +43,7 @@ void FramePipeline::Start(Source source, std::vector<Worker>& workers) {
             m_fillError = error;
             m_isFilled = true;
         }
-        m_changed.notify_all();
+        WakeAll();
     });
     for (Worker& worker : workers) {
         m_threads.emplace_back([this, work = std::move(worker)] { Work(work); });
@@ -55,8 +55,14 @@ void FramePipeline::Stop() {
         const std::lock_guard lock(m_mutex);
         m_isStopping = true;
     }
-    m_changed.notify_all();
+    WakeAll();
     for (std::thread& thread : m_threads) thread.join();
+}
+
+void FramePipeline::WakeAll() {
+    m_hasPlace.notify_all();
+    m_hasWork.notify_all();
+    m_hasDone.notify_all();
 }
 
 void FramePipeline::Fill(const Source& source) {
@@ -64,19 +70,20 @@ void FramePipeline::Fill(const Source& source) {
         {
             // Before reading: the item read would be one more in memory.
             std::unique_lock lock(m_mutex);
-            m_changed.wait(lock, [&] { return m_isStopping || !IsFull(); });
+            m_hasPlace.wait(lock, [&] { return m_isStopping || !IsFull(); });
             if (m_isStopping) return;
         }
         PipelineItemPtr item = source();
         if (!item) return;
         const auto slot = std::make_shared<Slot>();
-        if (item->packet) slot->stage = Stage::kDone;
+        const bool hasWork = !item->packet;
+        if (!hasWork) slot->stage = Stage::kDone;
         slot->item = std::move(item);
         {
             const std::lock_guard lock(m_mutex);
             m_slots.push_back(slot);
         }
-        m_changed.notify_all();
+        (hasWork ? m_hasWork : m_hasDone).notify_one();
     }
 }
 
@@ -90,6 +97,10 @@ bool FramePipeline::IsFull() const {
     const auto frames =
         std::ranges::count_if(m_slots, [](const auto& each) { return each->item && !each->item->packet; });
     return static_cast<std::size_t>(frames) >= m_capacity;
+}
+
+bool FramePipeline::IsFrontDone() const {
+    return !m_slots.empty() && m_slots.front()->stage == Stage::kDone;
 }
 
 bool FramePipeline::Has(Stage stage) const {
@@ -112,7 +123,7 @@ void FramePipeline::Work(const Worker& worker) {
     for (;;) {
         Slot* slot = nullptr;
         std::vector<Slot*> batch;
-        m_changed.wait(lock, [&] {
+        m_hasWork.wait(lock, [&] {
             batch = NextBatch();
             slot = batch.empty() ? FirstWaiting() : nullptr;
             return m_isStopping || slot || !batch.empty() || (m_isFilled && !Has(Stage::kWorked));
@@ -126,7 +137,7 @@ void FramePipeline::Work(const Worker& worker) {
         lock.lock();
         if (slot) slot->stage = m_batch.work && !slot->error ? Stage::kWorked : Stage::kDone;
         for (Slot* const each : batch) each->stage = Stage::kDone;
-        m_changed.notify_all();
+        if (IsFrontDone()) m_hasDone.notify_one();
     }
 }
 
@@ -151,16 +162,16 @@ void FramePipeline::WorkOn(const std::vector<Slot*>& slots) const {
 
 PipelineItemPtr FramePipeline::Next() {
     std::unique_lock lock(m_mutex);
-    m_changed.wait(lock,
-                   [&] { return m_slots.empty() ? m_isFilled : m_slots.front()->stage == Stage::kDone; });
+    m_hasDone.wait(lock, [&] { return m_slots.empty() ? m_isFilled : IsFrontDone(); });
     if (m_slots.empty()) {
         if (m_fillError) std::rethrow_exception(std::exchange(m_fillError, nullptr));
         return nullptr;
     }
+    const bool wasFull = IsFull();
     const std::shared_ptr<Slot> slot = std::move(m_slots.front());
     m_slots.pop_front();
     lock.unlock();
-    m_changed.notify_all();
+    if (wasFull) m_hasPlace.notify_one();
     if (slot->error) std::rethrow_exception(slot->error);
     return std::move(slot->item);
 }

@@ -68,10 +68,13 @@ class FramePipeline {
     [[nodiscard]] std::vector<Slot*> NextBatch() const;
     [[nodiscard]] bool Has(Stage stage) const;
     [[nodiscard]] bool IsFull() const;
+    [[nodiscard]] bool IsFrontDone() const;
+    void WakeAll();
     [[nodiscard]] Slot* FirstWaiting() const;
 
     std::mutex m_mutex;
-    std::condition_variable m_changed;
+    // One for each kind of thread: a thread that is woken in vain takes a processor from a worker for a moment.
+    std::condition_variable m_hasPlace, m_hasWork, m_hasDone;
     std::deque<std::shared_ptr<Slot>> m_slots;
     BatchStep m_batch;
     std::size_t m_capacity;
