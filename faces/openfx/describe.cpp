@@ -132,23 +132,24 @@ class ParamDefiner {
 void Describe(const Suites& suites, OfxImageEffectHandle descriptor, const effects::EffectTable& effect) {
     const Properties plugin = PropertiesOf(suites, descriptor);
     plugin.Set(kOfxPropLabel, effect.name);
-    plugin.Set(kOfxImageEffectPluginPropGrouping, "Velmora");
+    plugin.Offer(kOfxImageEffectPluginPropGrouping, "Velmora");
     plugin.Offer(kOfxPropPluginDescription, "The look of old film, with the same result in every host.");
     plugin.Set(kOfxImageEffectPropSupportedContexts, kOfxImageEffectContextFilter, 0);
     plugin.Set(kOfxImageEffectPropSupportedContexts, kOfxImageEffectContextGeneral, 1);
     plugin.Set(kOfxImageEffectPropSupportedPixelDepths, kOfxBitDepthFloat, 0);
     plugin.Set(kOfxImageEffectPropSupportedPixelDepths, kOfxBitDepthShort, 1);
     plugin.Set(kOfxImageEffectPropSupportedPixelDepths, kOfxBitDepthByte, 2);
-    plugin.Set(kOfxImageEffectPluginPropSingleInstance, 0);
-    plugin.Set(kOfxImageEffectPluginPropHostFrameThreading, 0);
-    plugin.Set(kOfxImageEffectPluginRenderThreadSafety, kOfxImageEffectRenderFullySafe);
-    plugin.Set(kOfxImageEffectPropSupportsMultiResolution, 1);
+    // Where a host knows none of these, its default is right or at least safe.
+    plugin.Offer(kOfxImageEffectPluginPropSingleInstance, 0);
+    plugin.Offer(kOfxImageEffectPluginPropHostFrameThreading, 0);
+    plugin.Offer(kOfxImageEffectPluginRenderThreadSafety, kOfxImageEffectRenderFullySafe);
+    plugin.Offer(kOfxImageEffectPropSupportsMultiResolution, 1);
     // Diffusion and jitter read the picture far from where they write: with them a tile asks for the whole picture
     // (AnswerRegionsOfInterest).
-    plugin.Set(kOfxImageEffectPropSupportsTiles, 1);
-    plugin.Set(kOfxImageEffectPropTemporalClipAccess, 0);
-    plugin.Set(kOfxImageEffectPluginPropFieldRenderTwiceAlways, 0);
-    plugin.Set(kOfxImageEffectPropSupportsMultipleClipDepths, 0);
+    plugin.Offer(kOfxImageEffectPropSupportsTiles, 1);
+    plugin.Offer(kOfxImageEffectPropTemporalClipAccess, 0);
+    plugin.Offer(kOfxImageEffectPluginPropFieldRenderTwiceAlways, 0);
+    plugin.Offer(kOfxImageEffectPropSupportsMultipleClipDepths, 0);
     plugin.Offer(kOfxImageEffectPropSupportsMultipleClipPARs, 0);
 }
 

@@ -188,20 +188,23 @@ void Instance::SetOwn(std::size_t index, ValueWord stored) const {
 
 namespace {
 
-// One step of the host's undo list. Ends also when a value cannot be set.
+// One step of the host's undo list, if it can make one of several changes. Ends also when a value cannot be set.
 class EditBlock {
   public:
     EditBlock(const Suites& suites, OfxParamSetHandle params, const std::string& name)
-        : m_suites(suites), m_params(params) {
-        Require(suites.parameter->paramEditBegin(params, name.c_str()));
+        : m_suites(suites),
+          m_params(params),
+          m_isOpen(suites.parameter->paramEditBegin(params, name.c_str()) == kOfxStatOK) {}
+    ~EditBlock() {
+        if (m_isOpen) m_suites.parameter->paramEditEnd(m_params);
     }
-    ~EditBlock() { m_suites.parameter->paramEditEnd(m_params); }
     EditBlock(const EditBlock&) = delete;
     EditBlock& operator=(const EditBlock&) = delete;
 
   private:
     const Suites& m_suites;
     OfxParamSetHandle m_params;
+    bool m_isOpen;
 };
 
 }  // namespace

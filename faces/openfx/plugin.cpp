@@ -90,7 +90,7 @@ OfxStatus DoPurge(const Call& call) {
 }
 
 OfxStatus DoClipPreferences(const Call& call) {
-    call.out.Set(kOfxImageEffectFrameVarying, IsFrameVarying(call.effect) ? 1 : 0);
+    call.out.Offer(kOfxImageEffectFrameVarying, IsFrameVarying(call.effect) ? 1 : 0);
     return kOfxStatOK;
 }
 

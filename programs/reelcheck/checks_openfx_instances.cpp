@@ -27,6 +27,11 @@ void CheckOpenfxPresets(CheckContext& context) {
         instance.ChoosePreset(static_cast<std::uint32_t>(table.presetNames.size()) - 1);
         Require(params.openEdits == 1 && params.closedEdits == 1, "a preset is not one step");
         Require(params.setsInside == own, "a preset does not set every parameter once");
+        params.refusesEdits = true;
+        instance.ChoosePreset(0);
+        Require(params.setsInside == 2 * own && params.closedEdits == 1,
+                "a host without steps gets no preset");
+        params.refusesEdits = false;
         for (int draws = 0; draws < 3; ++draws) {
             const double before = instance.Param("seed").values[0];
             Require(instance.Change("newSeed", kOfxChangeUserEdited) == kOfxStatOK,

@@ -122,6 +122,7 @@ class HostParamSet : public Handled {
     PropertySet properties{PropertySet::Of::kParamSet};
     bool isDescriptor = true;
     int openEdits = 0, closedEdits = 0, setsOutside = 0, setsInside = 0;
+    bool refusesEdits = false;
 };
 
 enum class PictureField : std::uint8_t { kNone, kLower, kUpper };

@@ -257,8 +257,9 @@ OfxStatus SetValue(OfxParamHandle handle, ...) {
 OfxStatus EditBegin(OfxParamSetHandle handle, const char*) {
     auto* const set = Handled::Of<HostParamSet>(handle);
     if (set == nullptr) return kOfxStatErrBadHandle;
+    g_edited = set;  // also when refused: what is then set is no fault of the plug-in's
+    if (set->refusesEdits) return kOfxStatErrUnsupported;
     ++set->openEdits;
-    g_edited = set;
     return kOfxStatOK;
 }
 OfxStatus EditEnd(OfxParamSetHandle handle) {
