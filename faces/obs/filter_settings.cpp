@@ -126,7 +126,8 @@ void WriteValue(const FilterDescription& filter, std::uint32_t param, ValueWord 
     const effects::ParamRow& row = filter.effect.params[param];
     const char* key = filter.keys[param].c_str();
     if (row.kind == kKindSlider) {
-        obs_data_set_double(settings, key, ShownNumber(row, std::clamp(value.number, 0.0f, 1.0f)));
+        const float number = value.number > 0.0f ? std::min(value.number, 1.0f) : 0.0f;  // also for NaN
+        obs_data_set_double(settings, key, ShownNumber(row, number));
     } else if (row.kind == kKindColour) {
         obs_data_set_int(settings, key, value.colour | kOpaque);
     } else if (row.kind == kKindCheckBox) {
