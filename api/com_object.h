@@ -13,7 +13,7 @@ namespace velmora {
     return a != nullptr && std::memcmp(a, &b, sizeof(Guid)) == 0;
 }
 
-// One identifier that an object answers to, with the interface that it stands for.
+// An interface of an object, with its identifier.
 struct Interface {
     const Guid* iid;
     void* pointer;
@@ -28,7 +28,7 @@ template <std::size_t kCount>
     return nullptr;
 }
 
-// Stores that interface, or null. Does not count: the caller adds the reference when the result is kStatusOk.
+// Stores that interface, or null. Adds no reference: the caller does, if the result is kStatusOk.
 template <std::size_t kCount>
 [[nodiscard]] Status FindInterface(const Interface (&interfaces)[kCount], const Guid* iid,
                                    void** out) noexcept {
@@ -41,7 +41,7 @@ template <std::size_t kCount>
 class ReferenceCount {
   public:
     std::uint32_t Add() noexcept { return static_cast<std::uint32_t>(m_count.fetch_add(1) + 1); }
-    // The count left; at 0 the caller destroys the object.
+    // Returns the remaining count; at 0 the caller must destroy the object.
     std::uint32_t Drop() noexcept { return static_cast<std::uint32_t>(m_count.fetch_sub(1) - 1); }
 
   private:

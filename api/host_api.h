@@ -203,8 +203,8 @@ static_assert(VM_OFFSET(PresetRecord, values) == 780);
 static_assert(VM_OFFSET(PresetRecord, count) == 1980);
 
 // ---------------------------------------------------------------------------------------------------------
-// Interfaces. None has a destructor in its table: compilers lay destructors out differently. The protected ones below
-// only keep a host from deleting what it must release.
+// Interfaces. None has a destructor in its table, because compilers lay destructors out differently. The protected ones
+// below only keep a host from deleting an object that it must release.
 
 // In its own namespace, so that `using namespace velmora` alongside <windows.h> leaves only one IUnknown, the system's.
 // Both have the same table and the same identifier.
@@ -215,9 +215,9 @@ class IUnknown {
     // Looks up this object's interface `iid`. Stores it in *out with one more reference and returns kStatusOk;
     // otherwise stores null and returns kStatusNoInterface. A null `out` is kStatusFailure.
     virtual Status VM_CALL QueryInterface(const Guid* iid, void** out) = 0;
-    // Returns the new count. [any thread]
+    // Adds a reference and returns the new count. [any thread]
     virtual std::uint32_t VM_CALL AddRef() = 0;
-    // Returns the count left; at 0 the object is gone. [any thread]
+    // Gives a reference back and returns the remaining count; at 0 the object is gone. [any thread]
     virtual std::uint32_t VM_CALL Release() = 0;
 
   protected:
@@ -232,11 +232,11 @@ class IUnknown {
 class IVideoHost : public com::IUnknown {
   public:
     // Writes the value of the effect's parameter `index` into cell->value, in the format of `kind` (ParamKind), and
-    // `kind` into cell->kind. Returns true when there is such a parameter; on false the value is read as whatever the
-    // cell holds (0 when untouched).
+    // `kind` into cell->kind. Returns true if there is such a parameter. After false, the effect uses what the cell holds,
+    // which is 0 unless the host has changed it.
     virtual bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) = 0;
-    // The next four are not called while rendering. An effect's own host interface forwards the first two to the
-    // attached host, answers false to the third and does nothing in the fourth.
+    // The next four are not called while rendering. An effect implements them as a host of its own renderer: it forwards the
+    // first two to the attached host, returns false from the third and does nothing in the fourth.
     virtual bool VM_CALL HostOperation4(std::intptr_t a, std::intptr_t b, std::intptr_t c) = 0;
     virtual std::uint32_t VM_CALL HostOperation5(std::intptr_t a, std::intptr_t b) = 0;
     virtual bool VM_CALL HostOperation6(std::intptr_t a, std::intptr_t b) = 0;
@@ -260,7 +260,7 @@ enum EffectIndex : std::uint32_t {
 // host of the last Process call, so that host must stay alive for as long as such queries are made.
 class IVideoEffect : public com::IUnknown {
   public:
-    // The name shown to the user, for example "Film Look". [any thread]
+    // The name that users see, for example "Film Look". [any thread]
     virtual const char* VM_CALL GetName() = 0;
     // Always 1. [any thread]
     virtual std::int32_t VM_CALL GetKind() = 0;
@@ -356,8 +356,8 @@ class IShellServices {
     // Shows the options dialog modally. 1: the user chose OK; 0: cancelled.
     virtual std::int32_t VM_CALL ShowOptions(void* owner) = 0;
     virtual void VM_CALL ShutDown() = 0;
-    // Opens the help at a numbered topic, in the system's viewer when `externalViewer` is non-zero, else
-    // inside the process. Non-zero when it was started.
+    // Opens the help at a numbered topic: in the system's viewer if `externalViewer` is non-zero, otherwise in a window of
+    // this process. Non-zero if it was opened.
     virtual std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic, std::int32_t externalViewer) = 0;
 
   protected:
@@ -371,7 +371,7 @@ class IEffectLibrary : public com::IUnknown {
     // A new effect with one reference; `index` is an EffectIndex. Null past the last one or when there is not enough
     // memory. It may outlive the library object. [any thread]
     virtual IVideoEffect* VM_CALL CreateEffect(std::uint32_t index) = 0;
-    // Opens the help file at a topic in the system's viewer; non-zero when it was started. [user interface]
+    // Opens the help file at a topic in the system's viewer; non-zero if it was opened. [user interface]
     virtual std::int32_t VM_CALL ShowHelp(void* owner, std::int32_t topic) = 0;
     // Not reference-counted. [any thread]
     virtual IShellServices* VM_CALL GetShellServices() = 0;
@@ -385,7 +385,7 @@ class IEffectLibrary : public com::IUnknown {
 };
 
 // ---------------------------------------------------------------------------------------------------------
-// Base classes for what a host implements. They answer "no" to everything; a host overrides what it can answer.
+// Base classes for what a host implements. They refuse everything; a host overrides what it supports.
 
 // An object that lives as long as its owner: it ignores reference counting and answers to no identifier.
 template <class Interface>

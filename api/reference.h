@@ -1,7 +1,7 @@
 // Holds one reference to a reference-counted object and releases it, so that nobody calls Release by hand.
 //
 // There are two named ways to create one, because a pointer does not show which is right: Adopt for a pointer that came
-// with a reference (from a function that creates objects, or QueryInterface), Share for one that is only lent (an
+// with a reference (from a function that creates objects, or QueryInterface), Share for one that is only borrowed (an
 // argument).
 #pragma once
 

@@ -10,7 +10,7 @@ namespace velmora::support {
 
 inline constexpr wchar_t kBitButtonClass[] = L"Velmora BitButton";
 
-// Registers the class for `module`, which must then be given when a button is made; false when that failed.
+// Registers the class for `module`, which must be passed when a button is created; false if the system refuses.
 // Unregistering fails while buttons exist.
 [[nodiscard]] bool RegisterBitButtonClass(HMODULE module) noexcept;
 bool UnregisterBitButtonClass(HMODULE module) noexcept;

@@ -15,13 +15,13 @@ namespace velmora::support {
 // The preferences, shared by all hosts and kept in the registry.
 class Preferences {
   public:
-    // Reads the registry: on only when the stored text begins with "y".
+    // Reads the registry. The preference is on only if the stored text begins with "y".
     void Read() noexcept;
 
     // Circular knobs are turned by dragging the mouse up and down.
     [[nodiscard]] bool KnobsDragVertical() const noexcept { return m_knobsDragVertical; }
-    // Also stores the choice. If the registry refuses, the user is not bothered: the choice then lasts as long as the
-    // library is loaded.
+    // Also stores the choice. If the registry refuses, there is no message, and the choice lasts as long as the library is
+    // loaded.
     void SetKnobsDragVertical(bool vertical) noexcept;
 
   private:

@@ -1,4 +1,4 @@
-// Without a Windows desktop there are no dialogs and no help control: the services only keep to their interface.
+// Without a Windows desktop there are no dialogs and no help control: the services implement their interface and do nothing.
 #include "desktop/shell_services.h"
 
 namespace velmora::support {

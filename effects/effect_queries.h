@@ -1,5 +1,5 @@
-// What can be asked about an effect, answered from its table: by hosts through the effect objects and the sessions, and by
-// programs and plug-ins that show or look up parameters, presets and menu items by name.
+// Queries about an effect, answered from its table. Hosts reach them through the effect objects and the sessions; programs
+// and plug-ins use them to show parameters, presets and menu items and to find them by name.
 #pragma once
 
 #include <cstdint>
@@ -24,9 +24,9 @@ namespace velmora::effects {
 [[nodiscard]] bool CopyPresetValue(const EffectTable& effect, std::uint32_t preset, std::uint32_t parameter,
                                    PresetCell* cell) noexcept;
 
-// Answers the renderer's request for master setting `index` (0..20) according to the effect's setting map, taking the
-// effect's own parameters from `host`, and stores `kind` in the cell. False, with the cell untouched, without a host or
-// a cell; also false for other indices and when the host has no answer.
+// Answers the renderer's request for master setting `index` (0..20) according to the effect's table, with the effect's own
+// parameters from `host`, and stores `kind` in the cell. False if `host` or `cell` is null (the cell is then unchanged), for
+// other indices, and if the host has no answer.
 [[nodiscard]] bool AnswerMaster(const EffectTable& effect, IVideoHost* host, std::uint32_t index,
                                 ValueCell* cell, std::uint32_t kind);
 
@@ -42,7 +42,7 @@ namespace velmora::effects {
 // "Film Pro" as a part of file names and identifiers: "film_pro".
 [[nodiscard]] std::string IdentifierOf(std::string_view name);
 
-// The preset or menu item of that name by the rule of text/names.h; nothing when there is none.
+// The index of the preset or menu item with that name, matched as text/names.h says; nothing if there is none.
 [[nodiscard]] std::optional<std::uint32_t> FindPreset(const EffectTable& effect, std::string_view name);
 [[nodiscard]] std::optional<std::uint32_t> FindItem(const ParamRow& menu, std::string_view text);
 

@@ -33,12 +33,11 @@ class EffectSession {
     void ApplyPreset(std::uint32_t preset) noexcept;
 
     // From now on every frame's randomness depends only on the seed and the frame number: frames may be rendered in any
-    // order, by any session. With seed 0 scratches and flicker are where the library has them; any other seed moves
-    // them too.
+    // order, by any session. With seed 0, scratches and flicker are those of the library; any other seed changes them too.
     void PinRandom(std::uint32_t seed) noexcept;
     // From now on the random numbers are a running sequence from `state`, as in the library: each frame continues where
-    // the frame before left off, and a frame rendered twice in a row repeats itself. Scratches and flicker are the
-    // library's.
+    // the previous one left off, and a frame rendered twice in a row is the same. Scratches and flicker are those of the
+    // library.
     void StartRandom(std::uint32_t state) noexcept;
     // How many random numbers a frame of this processed width uses with the current values. A host can compute from it
     // the state that a later frame of a sequence starts from.
@@ -59,8 +58,8 @@ class EffectSession {
     // effect; nothing moves the picture or changes its colours.
     void KeepDamageOnly() noexcept { m_options.isDamageOnly = true; }
 
-    // Renders the frame at a clip time: the frame number is seconds * 30, truncated. With `rows`, only these are sure to
-    // be written. False, with nothing written, when a frame record is invalid.
+    // Renders the frame at a clip time: the frame number is seconds * 30, truncated. With `rows`, only those rows are
+    // guaranteed to be written. False, with nothing written, if a frame record is invalid.
     [[nodiscard]] bool Render(const FrameRecord& source, const FrameRecord& destination, double seconds,
                               const render::RowRange& rows = {}) noexcept;
 

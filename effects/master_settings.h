@@ -22,10 +22,10 @@ class MasterSettingsList {
 
     // Adds the 33 entries; false when there is not enough memory (the list is then incomplete and must not be used).
     [[nodiscard]] bool Fill() noexcept;
-    // Describes the k-th exposed entry; false past the last one. Describing an entry exposes it, so walking to the end
-    // exposes all settings.
+    // Describes the k-th exposed entry; false past the last one. Describing an entry exposes it, so a host that describes
+    // all of them exposes all settings.
     bool DescribeExposed(std::uint32_t index, ParamDescriptor& descriptor) noexcept;
-    // Exposes every setting, as that walk does.
+    // Exposes every setting, as describing them all does.
     void ExposeAll() noexcept;
     // Lets every exposed entry read its value from `host`, with a running index from 0.
     void ReadFromHost(IVideoHost& host) noexcept;
@@ -38,8 +38,8 @@ class MasterSettingsList {
         return Find(static_cast<std::uint32_t>(setting), code);
     }
 
-    // Typed getters: they leave the destination alone when there is no such entry. They compute in double precision and
-    // narrow when they write.
+    // Typed getters. If there is no such entry, they leave the destination unchanged. They compute in double precision and
+    // round to float when they write.
     void GetPercentRaw(Master setting, float& value) const noexcept;
     void GetPercentNormalised(Master setting, float& value) const noexcept;  // 0..1 over the range
     void GetPercentSigned(Master setting, float& value) const noexcept;      // 2 * normalised - 1

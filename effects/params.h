@@ -1,5 +1,5 @@
-// The master settings as objects: each can describe itself to a host, read its value from one and return its kind. They
-// live in a MasterSettingsList (effects/master_settings.h) and are overwritten by every frame.
+// The master settings as objects, each of which describes itself to a host and reads its value from one. They belong to a
+// MasterSettingsList (effects/master_settings.h); every frame overwrites their values.
 #pragma once
 
 #include <cstdint>
@@ -18,8 +18,8 @@ enum ParamClassCode : std::uint32_t {
     kClassGroup = 9006,
 };
 
-// Copies a text into a field, stopping after its zero or at the field's end, whichever comes first: a text that fills
-// the field is not terminated. The bytes after the zero are left alone.
+// Copies a text into a field, up to and including its zero or up to the field's end, whichever comes first: a text that
+// fills the field is not terminated. The bytes after the zero stay as they are.
 void CopyBounded(char* field, std::int32_t width, const char* text) noexcept;
 
 // A slider value from a host: NaN reads as 0, other values are clamped to 0..1.

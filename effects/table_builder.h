@@ -1,5 +1,5 @@
-// The vocabulary for writing the effects' tables, and the code that converts them to the stored format: presets and
-// defaults are written as shown to the user, and settings are matched to parameters by name. All of it runs at compile
+// The functions with which the effects' tables are written, and the code that converts them to the stored format. Presets
+// and defaults are written as shown to the user, and settings are matched to parameters by name. All of it runs at compile
 // time, so a mistake in a table (a missing column, a value out of range, an unknown name) does not compile.
 #pragma once
 
@@ -47,7 +47,7 @@ consteval ParamRow Menu(const char* name, std::span<const char* const> items, Pa
     return {name, kKindMenu, 0.0f, 0.0f, {.bits = item}, layout, false, items, 0};
 }
 
-// `presetWord` fills the marker's cell in every preset. It has no meaning; hosts know it, so it is kept.
+// `presetWord` fills the marker's cell in every preset. It has no meaning, but hosts have always seen it, so it stays.
 consteval ParamRow GroupBegin(const char* name, std::uint32_t presetWord, Layout layout) {
     return {name, kKindGroup, 0.0f, 0.0f, {.bits = 0}, layout, false, {}, presetWord};
 }
