@@ -25,6 +25,27 @@ bool AllowsUnload(support::ModuleHandle module) noexcept {
     return canUnload == nullptr || canUnload();
 }
 
+// A module does not want to be freed while another library object uses its texts. The references that this leaves are
+// released when the module next allows it; else it would stay in the process for ever.
+struct KeptModule {
+    support::ModuleHandle module = nullptr;
+    int references = 0;
+};
+constinit KeptModule keptModule;
+
+void Keep(support::ModuleHandle module) noexcept {
+    if (module != keptModule.module) keptModule = {module, 0};
+    ++keptModule.references;
+}
+
+void FreeWithKeptReferences(support::ModuleHandle module) noexcept {
+    if (module != nullptr && module == keptModule.module) {
+        for (; keptModule.references > 0; --keptModule.references) support::UnloadModule(module);
+        keptModule = {};
+    }
+    support::UnloadModule(module);  // also when none is held: freeing null does nothing
+}
+
 // The path of a file in the library's folder; empty when that is unknown.
 std::u16string BesideLibrary(const char16_t* name) noexcept try {
     std::u16string path = support::ModuleFolder(support::OwnModule());
@@ -55,8 +76,11 @@ CRsVelmoraLib::~CRsVelmoraLib() {
 }
 
 bool CRsVelmoraLib::FreeLanguageModule() noexcept {
-    if (m_languageModule != nullptr && !AllowsUnload(m_languageModule)) return false;
-    support::UnloadModule(m_languageModule);  // also when none is held: freeing null does nothing
+    if (m_languageModule != nullptr && !AllowsUnload(m_languageModule)) {
+        Keep(m_languageModule);
+        return false;
+    }
+    FreeWithKeptReferences(m_languageModule);
     m_languageModule = nullptr;
     return true;
 }

@@ -131,6 +131,18 @@ TEST_F(LanguageModule, IsFoundByItsBareNameOnTheSearchPath) {
     opened.library->Release();
 }
 
+TEST_F(LanguageModule, GoesWithTheLastLibraryObject) {
+    PutModule(m_folder);
+    Behave("1", "1");
+    Opened opened(m_folder);
+    IEffectLibrary* other = opened.dll.getEffectsLibrary();
+    opened.library->Release();
+    EXPECT_NE(GetModuleHandleW(L"VMLang.dll"), nullptr);
+    Behave("1", nullptr);
+    other->Release();
+    EXPECT_EQ(GetModuleHandleW(L"VMLang.dll"), nullptr);
+}
+
 TEST_F(LanguageModule, StaysLoadedWhenItAsksToBeKept) {
     PutModule(m_folder);
     Behave("1", "1");
