@@ -119,6 +119,7 @@ TEST_F(PresetSaverTest, CancelIsSilentAndChangesNothing) {
     EXPECT_EQ(Save(&m_library, &m_record), 0);
     EXPECT_EQ(Load(&m_library, &m_record), 0);
     EXPECT_EQ(g_user.shown, kSaveShown + kOpenShown);
+    // NOLINTNEXTLINE(bugprone-suspicious-memory-comparison): every byte, whatever it means
     EXPECT_EQ(std::memcmp(&before, &m_record, sizeof before), 0);
 }
 
@@ -253,6 +254,7 @@ TEST(Compatibility, ComparesNamesAndKinds) {
     std::strcpy(fits.effectName, "Film Look");
     const std::int32_t count = fits.count;
     std::vector<std::uint32_t> kinds;
+    kinds.reserve(static_cast<std::size_t>(count));
     for (std::int32_t i = 0; i < count; ++i) kinds.push_back(fits.values[i].kind);
 
     struct Case {

@@ -46,6 +46,7 @@ Json JsonOf(const CLI::App& app) {
 
 }  // namespace
 
+// NOLINTNEXTLINE(bugprone-exception-escape): an exception fails the build, as it should
 int main() {
     TypedOptions typed;
     CLI::App app;

@@ -60,7 +60,8 @@ Picture Reduced(const Picture& picture, hosts::FrameSize largest) {
                     for (int channel = 0; channel < 4; ++channel) sums[channel] += pixel[channel];
                 }
             }
-            const std::uint64_t count = (bottom - top) * (right - left);
+            // Never 0, as the result is no larger than the picture.
+            const std::uint64_t count = std::max<std::uint64_t>(1, (bottom - top) * (right - left));
             for (int channel = 0; channel < 4; ++channel) {
                 out[channel] = static_cast<std::uint8_t>((sums[channel] + count / 2) / count);
             }
