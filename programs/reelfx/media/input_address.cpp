@@ -1,11 +1,9 @@
 #include "programs/reelfx/media/input_address.h"
 
 #include <algorithm>
-#include <array>
 #include <cctype>
 #include <cstdlib>
 #include <filesystem>
-#include <fstream>
 #include <limits>
 #include <map>
 #include <set>
@@ -64,42 +62,6 @@ void LocateImages(const std::string& pattern, InputAddress& address) {
     address.url = pattern;
     address.format = av_find_input_format("image2");
     address.entries.Set("pattern_type", "glob");
-}
-
-std::uint64_t BigEndian(const std::uint8_t* bytes, int count) {
-    std::uint64_t value = 0;
-    for (int i = 0; i < count; ++i) value = value << 8 | bytes[i];
-    return value;
-}
-
-// An EBML number at `at`, which is moved behind it. All ones mean that it is unknown: 0.
-std::uint64_t EbmlSize(const std::uint8_t* bytes, std::size_t& at) {
-    int length = 1;
-    while (length < 8 && (bytes[at] & (0x80 >> (length - 1))) == 0) ++length;
-    const std::uint64_t mask = (std::uint64_t{1} << (7 * length)) - 1;
-    const std::uint64_t value = BigEndian(bytes + at, length) & mask;
-    at += static_cast<std::size_t>(length);
-    return value == mask ? 0 : value;
-}
-
-std::uint64_t MatroskaLength(const std::uint8_t* head, std::size_t size) {
-    constexpr std::size_t kLongestNumber = 12;
-    if (BigEndian(head, 4) != 0x1A45DFA3) return 0;
-    std::size_t at = 4;
-    const std::uint64_t header = EbmlSize(head, at);
-    if (header > size - at - kLongestNumber) return 0;
-    at += static_cast<std::size_t>(header);
-    if (BigEndian(head + at, 4) != 0x18538067) return 0;
-    at += 4;
-    const std::uint64_t segment = EbmlSize(head, at);
-    return segment == 0 ? 0 : at + segment;
-}
-
-std::uint64_t AviLength(const std::uint8_t* head) {
-    if (BigEndian(head, 4) != 0x52494646) return 0;  // "RIFF"
-    std::uint64_t length = 0;
-    for (int i = 7; i >= 4; --i) length = length << 8 | head[i];
-    return 8 + length;
 }
 
 }  // namespace
@@ -172,26 +134,6 @@ std::string FirstMissingImage(const InputOptions& options) {
     std::int64_t missing = *numbers.begin();
     while (numbers.contains(missing)) ++missing;
     return file(missing);
-}
-
-bool EndsEarly(const std::string& path, const std::string& format) {
-    std::error_code error;
-    if (!fs::is_regular_file(path, error)) return false;
-    const std::uintmax_t size = fs::file_size(path, error);
-    if (error) return false;
-    if (format == "mpegts") {
-        constexpr std::array kPacketSizes = {188, 192,
-                                             204};  // plain, with a time stamp, with error correction
-        return std::ranges::all_of(kPacketSizes,
-                                   [&](auto each) { return size % static_cast<unsigned>(each) != 0; });
-    }
-    std::array<std::uint8_t, 512> head = {};
-    std::ifstream(path, std::ios::binary).read(reinterpret_cast<char*>(head.data()), head.size());
-    const bool isMatroska = format.find("matroska") != std::string::npos;
-    const std::uint64_t stated = isMatroska        ? MatroskaLength(head.data(), head.size())
-                                 : format == "avi" ? AviLength(head.data())
-                                                   : 0;
-    return stated > size;
 }
 
 }  // namespace velmora::hosts

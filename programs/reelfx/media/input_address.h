@@ -39,10 +39,6 @@ bool CanBeReadTwice(const std::string& path);
 // Empty for any other input.
 std::string FirstMissingImage(const InputOptions& options);
 
-// True if a file ends before the length that its own header gives, or inside a packet of a format whose packets have
-// one size. Only for formats whose readers do not report it: Matroska, AVI and MPEG-TS.
-bool EndsEarly(const std::string& path, const std::string& format);
-
 // Standard input, read so that a signal ends the wait (standard_input.cpp).
 
 struct CloseInputStream {

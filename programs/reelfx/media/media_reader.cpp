@@ -1,14 +1,13 @@
 #include "programs/reelfx/media/media_reader.h"
 
 #include <algorithm>
-#include <array>
 #include <cstring>
 #include <numeric>
 #include <string>
-#include <string_view>
 
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/av_handles.h"
+#include "programs/reelfx/media/file_end.h"
 
 namespace velmora::hosts {
 namespace {
@@ -16,20 +15,6 @@ namespace {
 // Packets lie in order of decoding: frames this much later may still be shown earlier.
 constexpr std::size_t kReorderedFrames = 64;
 constexpr double kReorderedSeconds = 5.0;
-
-// True for a JPEG file that is cut off: the decoder fills the missing part with grey. After the start of the picture
-// the bytes of the end marker cannot occur before the end.
-bool LacksEnd(const AVFormatContext& container, const AVPacket& packet) {
-    const std::string_view format = container.iformat->name;
-    const bool isStill = format == "image2" || format == "jpeg_pipe";
-    if (!isStill || container.streams[packet.stream_index]->codecpar->codec_id != AV_CODEC_ID_MJPEG)
-        return false;
-    constexpr std::array<std::uint8_t, 2> kScan = {0xFF, 0xDA}, kEnd = {0xFF, 0xD9};
-    const std::uint8_t* const end = packet.data + packet.size;
-    const std::uint8_t* const scan =
-        std::find_end(packet.data, packet.data + packet.size, kScan.begin(), kScan.end());
-    return scan == end || std::search(scan, end, kEnd.begin(), kEnd.end()) == end;
-}
 
 }  // namespace
 
