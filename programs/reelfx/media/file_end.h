@@ -1,17 +1,21 @@
 // Whether a file ends before what it holds: some decoders fill what is missing with grey or black and report nothing.
 #pragma once
 
+#include <cstdint>
+#include <span>
 #include <string>
 
-struct AVFormatContext;
-struct AVPacket;
+extern "C" {
+#include <libavcodec/codec_id.h>
+}
 
 namespace velmora::hosts {
 
-// True if a file ends before the length that its own header gives, or inside a packet of a format whose packets have
-// one size. Only for formats whose readers do not report it: Matroska, AVI and MPEG-TS.
+// True when the file states a greater length than it has, or lacks the end that its format has. `format` is the name of
+// the demuxer. False for what is no file or cannot be read.
 bool EndsEarly(const std::string& path, const std::string& format);
 
-bool LacksEnd(const AVFormatContext& container, const AVPacket& packet);
+// True for a picture in a file of its own that is cut off: JPEG, OpenEXR, QOI and Sun raster. `data` is the whole file.
+bool LacksEnd(AVCodecID codec, std::span<const std::uint8_t> data);
 
 }  // namespace velmora::hosts

@@ -4,6 +4,7 @@
 #include <cstring>
 #include <numeric>
 #include <string>
+#include <string_view>
 
 #include "programs/reelfx/common/failure.h"
 #include "programs/reelfx/media/av_handles.h"
@@ -15,6 +16,13 @@ namespace {
 // Packets lie in order of decoding: frames this much later may still be shown earlier.
 constexpr std::size_t kReorderedFrames = 64;
 constexpr double kReorderedSeconds = 5.0;
+
+bool IsCutOffPicture(const AVFormatContext& container, const AVPacket& packet) {
+    const std::string_view format = container.iformat->name;
+    const bool isPicture = format == "image2" || format.ends_with("_pipe");
+    const AVCodecID codec = container.streams[packet.stream_index]->codecpar->codec_id;
+    return isPicture && LacksEnd(codec, {packet.data, static_cast<std::size_t>(packet.size)});
+}
 
 }  // namespace
 
@@ -35,13 +43,11 @@ MediaReader::MediaReader(const InputOptions& options) : MediaReader(options, Clo
 void MediaReader::Open(const InputOptions& options) {
     InputAddress address;
     Locate(options, address);
+    if (options.path == "-") m_standardInput = OpenStandardInput();
     AVFormatContext* container = avformat_alloc_context();
     if (!container) throw std::bad_alloc();
     container->interrupt_callback.callback = [](void*) { return Interrupts() > 0 ? 1 : 0; };
-    if (options.path == "-") {
-        m_standardInput = OpenStandardInput();
-        container->pb = m_standardInput.get();
-    }
+    container->pb = m_standardInput.get();
     int error =
         avformat_open_input(&container, address.url.c_str(), address.format, address.entries.Entries());
     if (error < 0) FailReading("cannot be read" + ErrorWords(error), error);
@@ -118,7 +124,9 @@ void MediaReader::ReadMore() {
         return;
     }
     m_timeLine.Mend(*m_container, *packet);
-    m_isLastPartial = (packet->flags & AV_PKT_FLAG_CORRUPT) != 0 || LacksEnd(*m_container, *packet);
+    const bool isCutOff = IsCutOffPicture(*m_container, *packet);
+    if (isCutOff) m_cutOff.push_back(packet->pts == AV_NOPTS_VALUE ? 0 : packet->pts);
+    m_isLastPartial = (packet->flags & AV_PKT_FLAG_CORRUPT) != 0 || isCutOff;
     m_packetsEnd = std::max(m_packetsEnd, packet->pos + packet->size);
     if (packet->pts != AV_NOPTS_VALUE) {
         const double tick = av_q2d(m_container->streams[packet->stream_index]->time_base);
@@ -159,12 +167,12 @@ std::string MediaReader::BreakOffAt(int error) const {
     }
     if (error != AVERROR_EOF) return "breaks off: " + AvText(error);
     AVIOContext* const file = m_container->pb;
+    if (file && file->error < 0) return "breaks off: " + AvText(file->error);
+    if (m_isLastPartial) return "ends inside a frame";
     if (!file) return {};
-    if (file->error < 0) return "breaks off: " + AvText(file->error);
     // This format has nothing after its frames.
     const bool isY4m = std::strcmp(m_container->iformat->name, "yuv4mpegpipe") == 0;
-    if (m_isLastPartial || (isY4m && m_packetsEnd > 0 && avio_tell(file) > m_packetsEnd))
-        return "ends inside a frame";
+    if (isY4m && m_packetsEnd > 0 && avio_tell(file) > m_packetsEnd) return "ends inside a frame";
     const std::int64_t size = avio_size(file);
     for (unsigned i = 0; i < m_container->nb_streams && size > 0; ++i) {
         AVStream* const stream = m_container->streams[i];
@@ -174,6 +182,11 @@ std::string MediaReader::BreakOffAt(int error) const {
     }
     if (EndsEarly(m_options.path, m_container->iformat->name)) return "is cut off";
     return {};
+}
+
+std::int64_t MediaReader::DamagedPackets() const {
+    const bool isBreakOff = m_isLastPartial && !m_cutOff.empty();
+    return m_damaged + std::ssize(m_cutOff) - (isBreakOff ? 1 : 0);
 }
 
 double MediaReader::MissingSeconds() const {
@@ -218,6 +231,7 @@ void MediaReader::Rewind() {
     m_ended = false;
     m_breakOff.clear();
     m_damaged = 0;
+    m_cutOff.clear();
     Open(m_options);
     OpenDecoder();
 }
@@ -283,6 +297,11 @@ std::int64_t MediaReader::FrameCountGuess() const {
         seconds = ContainerEnd() - std::max(start, 0.0);
     }
     return static_cast<std::int64_t>(seconds * av_q2d(FrameRateGuess()) + 0.5);
+}
+
+double MediaReader::PictureSeconds() const {
+    return m_stream->duration > 0 ? static_cast<double>(m_stream->duration) * av_q2d(m_stream->time_base)
+                                  : 0.0;
 }
 
 }  // namespace velmora::hosts

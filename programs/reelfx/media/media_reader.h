@@ -5,6 +5,7 @@
 // Times count in seconds from the presentation of the clip's first frame.
 #pragma once
 
+#include <algorithm>
 #include <deque>
 #include <memory>
 #include <optional>
@@ -74,11 +75,17 @@ class MediaReader {
     [[nodiscard]] AVRational FrameRateGuess() const;
     // The number of frames according to the container; 0 if unknown.
     [[nodiscard]] std::int64_t FrameCountGuess() const;
+    // The picture's length according to the container; 0 if unknown.
+    [[nodiscard]] double PictureSeconds() const;
     // Linear light is converted to display values for the effects, and back for formats that have it.
     [[nodiscard]] bool ConvertsLight() const { return !m_options.keepsLight; }
     [[nodiscard]] const std::string& Name() const { return m_name; }
-    // The number of packets that could not be decoded and were skipped.
-    [[nodiscard]] std::int64_t DamagedPackets() const { return m_damaged; }
+    // The number of packets that could not be decoded and were skipped, and of pictures of a sequence that are cut off.
+    [[nodiscard]] std::int64_t DamagedPackets() const;
+    // True for a frame from a picture file that is cut off; part of it is grey or black.
+    [[nodiscard]] bool IsCutOff(const AVFrame& frame) const {
+        return std::ranges::find(m_cutOff, frame.pts) != m_cutOff.end();
+    }
     // Seconds that are missing compared with the length in the container's header; 0 if nothing is known to
     // be missing.
     [[nodiscard]] double MissingSeconds() const;
@@ -133,8 +140,9 @@ class MediaReader {
     std::string m_exif;
     std::int64_t m_lastPts = AV_NOPTS_VALUE;
     std::int64_t m_damaged = 0;
-    std::int64_t m_packetsEnd = 0;  // position in the file after the last packet
-    double m_secondsEnd = 0.0;      // end of the last packet, in the container's time
+    std::vector<std::int64_t> m_cutOff;  // times of picture files that are cut off
+    std::int64_t m_packetsEnd = 0;       // position in the file after the last packet
+    double m_secondsEnd = 0.0;           // end of the last packet, in the container's time
     bool m_isLastPartial = false;
     bool m_pictureStopped = false;
     bool m_ended = false;

@@ -46,6 +46,7 @@ std::optional<ClipPicture> ClipPictures::Next() {
     if (!item && !m_hasBegun) FailWithoutFrame();
     if (!item) return std::nullopt;
     m_hasBegun = true;
+    if (m_reader.IsCutOff(*item->frame)) throw Failure(kExitInput, m_reader.Name() + ": ends inside a frame");
     const AVFrame& first = m_reader.FirstFrame();
     BgraPicture lying(first.width, first.height);
     PixelConverter().ToBgra(*item->frame, lying);

@@ -200,11 +200,19 @@ class Input(Commands):
         for source in ("-", self.out / "cut.y4m"):
             done = reelfx("frame", source, self.out / "x.png", *DAMAGE, "--frame", 40, input=y4m[:len(y4m) // 2])
             self.check_failed(done, [3], "inside a frame")
-        # Its decoder fills what is missing with grey.
-        photo = self.out / "photo.jpg"
-        ffmpeg("-i", clips.small, "-frames:v", "1", "-q:v", "2", photo)
-        (self.out / "cut.jpg").write_bytes(photo.read_bytes()[:-2000])
-        self.check_failed(reelfx("render", self.out / "cut.jpg", self.out / "x.jpg", *DAMAGE), [3], "inside a frame")
+        # Decoders of pictures fill what is missing with grey or black, and bytes after a picture mean nothing.
+        for ending, cut_at in (("jpg", 0.9), ("exr", 0.9), ("qoi", 0.9), ("sun", 0.9), ("gif", 0.9), ("gif", -1)):
+            with self.subTest(ending=ending):
+                whole, cut = self.out / f"whole.{ending}", self.out / f"part.{ending}"
+                words = "cut off" if ending == "gif" else "inside a frame"
+                ffmpeg("-i", clips.small, "-frames:v", "5" if ending == "gif" else "1", "-y", whole)
+                data = whole.read_bytes()
+                cut.write_bytes(data[:int(len(data) * cut_at) if cut_at > 0 else cut_at])
+                self.check_failed(reelfx("render", cut, "--hash", *DAMAGE), [3], words)
+                if words == "inside a frame":
+                    self.check_failed(reelfx("frame", cut, self.out / "x.png", *DAMAGE), [3], words)
+                whole.write_bytes(data + b"more")
+                self.assertEqual(reelfx("render", whole, "--hash", *DAMAGE).returncode, 0)
         # This container stores its own length, but not where its last frame is.
         film = self.out / "film.mkv"
         ffmpeg("-i", clips.small, "-c", "copy", film)
