@@ -104,7 +104,7 @@ std::vector<std::string> MediaWriter::Notes() const {
 }
 
 std::vector<std::string> MediaWriter::LateNotes() const {
-    std::vector<std::string> notes;
+    std::vector<std::string> notes = m_others ? m_others->LateNotes() : std::vector<std::string>();
     if (m_clock && m_clock->Repeated() + m_clock->LeftOut() > 0) {
         notes.push_back("constant rate: " + std::to_string(m_clock->Repeated()) + " frames are repeated, " +
                         std::to_string(m_clock->LeftOut()) + " are left out");
@@ -215,7 +215,11 @@ void MediaWriter::WritePacket(const AVPacket& packet) {
     if (copy->pts != AV_NOPTS_VALUE) copy->pts -= origin;
     if (copy->dts != AV_NOPTS_VALUE) copy->dts -= origin;
     copy->pos = -1;
-    m_others->Write(*copy, [&](AVPacket& each, const AVStream& to, AVRational base) { Mux(each, to, base); });
+    const double seconds = m_lastPts == AV_NOPTS_VALUE
+                               ? 0.0
+                               : static_cast<double>(m_lastPts) * av_q2d(m_picture->Context().time_base);
+    m_others->Write(*copy, seconds,
+                    [&](AVPacket& each, const AVStream& to, AVRational base) { Mux(each, to, base); });
 }
 
 void MediaWriter::Mux(AVPacket& packet, const AVStream& stream, AVRational timeBase) {

@@ -193,7 +193,7 @@ void OtherStreams::WriteCovers(const Sink& sink) const {
     }
 }
 
-void OtherStreams::Write(const AVPacket& packet, const Sink& sink) {
+void OtherStreams::Write(const AVPacket& packet, double pictureSeconds, const Sink& sink) {
     const auto found = m_streams.find(packet.stream_index);
     if (found == m_streams.end()) return;
     Stream& stream = found->second;
@@ -204,6 +204,7 @@ void OtherStreams::Write(const AVPacket& packet, const Sink& sink) {
     if ((source.disposition & AV_DISPOSITION_ATTACHED_PIC) != 0) return;  // see WriteCovers
     if (stream.transcoder) {
         const AVRational base = stream.transcoder->Encoder().time_base;
+        stream.transcoder->SetPictureEnd(std::max(pictureSeconds, m_source.PictureSeconds()));
         stream.transcoder->Send(&packet, [&](AVPacket& encoded) { sink(encoded, *stream.stream, base); });
     } else if (stream.converter) {
         const auto pass = [&](AVPacket& text) { sink(text, *stream.stream, SubtitleConverter::kTimeBase); };
@@ -242,6 +243,14 @@ std::vector<std::string> OtherStreams::Notes() const {
                         " is left out: " + m_container.oformat->name + " cannot hold it");
     }
     return notes;
+}
+
+std::vector<std::string> OtherStreams::LateNotes() const {
+    const bool isWrong = std::ranges::any_of(m_streams, [](const auto& entry) {
+        return entry.second.transcoder && entry.second.transcoder->HasWrongTimes();
+    });
+    if (!isWrong) return {};
+    return {"the sound has times far behind the picture's end, which are taken as damaged"};
 }
 
 }  // namespace velmora::hosts

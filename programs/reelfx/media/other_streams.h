@@ -25,14 +25,16 @@ class OtherStreams {
 
     // The pictures of covers, which come before all else.
     void WriteCovers(const Sink& sink) const;
-    // `packet` is of the source and has the output's times.
-    void Write(const AVPacket& packet, const Sink& sink);
+    // `packet` is of the source and has the output's times, and the picture has come to `pictureSeconds`.
+    void Write(const AVPacket& packet, double pictureSeconds, const Sink& sink);
     void Finish(const Sink& sink);
 
     // ", audio aac (copied)" for each
     [[nodiscard]] std::string Description() const;
     // What is left out or converted, a phrase each.
     [[nodiscard]] std::vector<std::string> Notes() const;
+    // The same, after the last packet.
+    [[nodiscard]] std::vector<std::string> LateNotes() const;
 
   private:
     struct Stream {

@@ -17,6 +17,9 @@ constexpr int kMxfRate = 48000;  // the only one that the library writes
 constexpr int kQueuePiece = 1024;
 // Containers round times, some to milliseconds. What is missing for longer than this is filled with silence, in seconds.
 constexpr double kLeastGap = 0.05;
+// A longer gap is real only if the picture goes about as far.
+constexpr double kLongGap = 60.0;
+constexpr double kBehindPicture = 5.0;
 
 int NearestRate(const AVCodec& codec, int wanted) {
     if (!codec.supported_samplerates) return wanted;
@@ -132,6 +135,10 @@ void SoundTranscoder::FillGap(std::int64_t pts, const Sink& sink) {
                                    : 0;
     std::int64_t missing = pts - (m_nextPts + av_audio_fifo_size(m_fifo) + delay);
     if (static_cast<double>(missing) < kLeastGap * m_encoder->sample_rate) return;
+    if (IsWrong(pts, missing)) {
+        m_hasWrongTimes = true;
+        return;
+    }
     FlushResampler();
     const FramePtr silence = NewSamples(kQueuePiece);
     av_samples_set_silence(silence->extended_data, 0, kQueuePiece, m_encoder->ch_layout.nb_channels,
@@ -140,6 +147,12 @@ void SoundTranscoder::FillGap(std::int64_t pts, const Sink& sink) {
         Queue(*silence, static_cast<int>(std::min<std::int64_t>(missing, kQueuePiece)));
         EncodeBlocks(sink);
     }
+}
+
+bool SoundTranscoder::IsWrong(std::int64_t pts, std::int64_t missing) const {
+    const double rate = m_encoder->sample_rate;
+    return static_cast<double>(missing) > kLongGap * rate &&
+           static_cast<double>(pts) > (m_pictureEnd + kBehindPicture) * rate;
 }
 
 FramePtr SoundTranscoder::NewSamples(int samples) const {

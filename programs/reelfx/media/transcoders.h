@@ -24,12 +24,18 @@ class SoundTranscoder {
 
     [[nodiscard]] const AVCodecContext& Encoder() const { return *m_encoder; }
 
+    // How far the picture goes as far as known, in seconds of the output. Sound that is much later after a long gap has a
+    // damaged time, and no silence is put before it.
+    void SetPictureEnd(double seconds) { m_pictureEnd = seconds; }
     // A null `packet` ends the stream: the rest goes to the sink.
     void Send(const AVPacket* packet, const Sink& sink);
+    // True when there were damaged times.
+    [[nodiscard]] bool HasWrongTimes() const { return m_hasWrongTimes; }
 
   private:
     void TakeDecoded(const Sink& sink);
     void FillGap(std::int64_t pts, const Sink& sink);
+    [[nodiscard]] bool IsWrong(std::int64_t pts, std::int64_t missing) const;
     void Resample(AVFrame& frame);
     void FlushResampler();
     [[nodiscard]] FramePtr NewSamples(int samples) const;  // in the encoder's format; not set
@@ -43,6 +49,8 @@ class SoundTranscoder {
     ResamplerPtr m_resampler;
     AVAudioFifo* m_fifo = nullptr;
     std::int64_t m_nextPts = AV_NOPTS_VALUE;  // of the oldest sample in the queue, in samples
+    double m_pictureEnd = 0.0;
+    bool m_hasWrongTimes = false;
 };
 
 // Text subtitles, from the format of one container to that of another.

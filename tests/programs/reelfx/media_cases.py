@@ -93,6 +93,7 @@ INPUTS = {
     "grow-b.ts": "-f lavfi -i testsrc=size=128x96:rate=25:duration=1 -c:v mpeg2video -pix_fmt yuv420p "
                  "-output_ts_offset 1",
     "gap.mkv": f"{FLASH} -af \"aresample=44100,aselect='lt(t,0.2)+gt(t,0.7)'\" -c:v libx264 -pix_fmt yuv420p -c:a flac",
+    "wild.mkv": f"{FLASH} -c:v libx264 -pix_fmt yuv420p -c:a flac -bsf:a setts=ts='TS+36000000*gte(N\\,5)'",
     "flash.mov": f"{FLASH} -c:v libx264 -pix_fmt yuv420p -c:a pcm_s16le",
     "edit.mp4": "-ss 0.5 -i {f}/plain.mp4 -c copy",
     "tags.mp4": f"{PICTURE} -c:v libx264 -pix_fmt yuv420p -color_primaries smpte170m -color_trc smpte170m -colorspace "
@@ -238,6 +239,8 @@ CASES = [
     ("aspect", "wide.mp4", render("o.mkv"), {"like input": "v:0.sample_aspect_ratio"}),
     ("odd size", "odd.mkv", render("o.mp4"), {"like input": "v:0.width v:0.height"}),
     *((f"a gap in the sound in {end}", "gap.mkv", render(f"o.{end}", effect=PLAIN), {"step": 0.03}) for end in ("mov", "webm")),
+    ("damaged times of sound", "wild.mkv", render("o.mov", effect=PLAIN),
+     {"seconds": (0.9, 2.2), "says": "far behind the picture"}),
     *((f"flash and beep in {end}", "flash.mov", render(f"o.{end}", effect=PLAIN), {"step": 0.06 if end == "avi" else 0.03})
       for end in ("mp4", "mkv", "mov", "webm", "ts", "avi")),
 ]
