@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstdlib>
+#include <limits>
 #include <map>
 #include <set>
 #include <sstream>
@@ -51,7 +52,8 @@ SectionOptions ReadSection(const TypedOptions& typed) {
         const auto first = ParseInteger(colon == 0 ? "0" : typed.frames.substr(0, colon));
         const std::string endText = colon == std::string::npos ? "?" : typed.frames.substr(colon + 1);
         const auto end = endText.empty() ? std::nullopt : ParseInteger(endText);
-        if (!first || *first < 0 || (!endText.empty() && (!end || *end <= *first))) {
+        const std::int64_t most = end.value_or(std::numeric_limits<std::int64_t>::max());
+        if (!first || *first < 0 || *first >= most || (!endText.empty() && !end)) {
             throw UsageError("--frames takes A:B with A below B, counted from 0, not \"" + typed.frames +
                              '"');
         }

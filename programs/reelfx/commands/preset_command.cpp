@@ -1,5 +1,7 @@
 #include "programs/reelfx/commands/commands.h"
 
+#include <algorithm>
+#include <cctype>
 #include <cstdio>
 #include <filesystem>
 #include <nlohmann/json.hpp>
@@ -12,6 +14,8 @@ namespace {
 
 using Json = nlohmann::ordered_json;
 
+constexpr char kExtension[] = ".fxprel";  // and a letter for the effect
+
 Json JsonOf(const PresetRecord& record, const EffectInfo& effect, const std::vector<Setting>& settings) {
     Json values = Json::array();
     for (const Setting& setting : settings) {
@@ -21,6 +25,18 @@ Json JsonOf(const PresetRecord& record, const EffectInfo& effect, const std::vec
                           {"value", ShownValue(param, setting.value)}});
     }
     return {{"name", PresetName(record)}, {"effect", effect.name}, {"parameters", values}};
+}
+
+// Editors find an effect's presets by the extension.
+void CheckExtension(const std::string& file, const std::string& effect) {
+    const std::vector<EffectInfo>& effects = CoreEffects();
+    const auto found = std::ranges::find(effects, effect, &EffectInfo::name);
+    const std::string own = std::string(kExtension) + static_cast<char>('a' + (found - effects.begin()));
+    std::string given = std::filesystem::path(file).extension().string();
+    std::ranges::transform(given, given.begin(),
+                           [](unsigned char letter) { return static_cast<char>(std::tolower(letter)); });
+    if (given.size() == own.size() && given.starts_with(kExtension) && given != own)
+        throw UsageError(file + ": presets of \"" + effect + "\" have the extension " + own);
 }
 
 }  // namespace
@@ -47,6 +63,7 @@ ExitCode Run(const PresetShowOptions& options) {
 ExitCode Run(const PresetSaveOptions& options) {
     const EffectChoice choice(options.effect);
     if (choice.Fades()) throw UsageError("a preset file cannot hold values that change over time");
+    CheckExtension(options.file, choice.Info().name);
     const auto session = choice.NewSession();
     std::vector<ValueWord> values;
     for (std::uint32_t i = 0; i < choice.Info().params.size(); ++i) values.push_back(session->Value(i));

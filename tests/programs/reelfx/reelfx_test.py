@@ -558,6 +558,8 @@ class Refusing(ReelfxTest):
             (2, ["--effect", "twice", "--then"], (*render, *CAMERA, *CAMERA)),
             (2, ["--effect is missing"], (*render, *CAMERA, "--then", "--mix", "3")),
             (2, ["--random-state", "--then"], (*render, *CAMERA, "--random-state", "1f", "--then", *CAMERA)),
+            (2, ["Film Camera", ".fxprela"], ("preset", "save", self.out / "p.fxprelb", *CAMERA)),
+            (2, ["A:B"], (*render, *CAMERA, "--frames", "9223372036854775807:")),
             (2, ["change over time"], ("preset", "save", self.out / "p", *CAMERA, "-s", "X Jitter=3@5 4@9")),
             (2, ["is the input"], ("render", small, small.parent / "." / ".." / small.parent.name / small.name, *CAMERA, "-y")),
             (2, ["is the input"], ("render", f"file:{small}", links[0], *CAMERA, "-y")),
