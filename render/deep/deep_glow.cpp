@@ -44,7 +44,8 @@ class DeepLayerMaker {
     static constexpr int kMostReduction = 24;
 
     void ReadRow(int reduction, std::int32_t y, const DeepCells& out, std::int32_t outRow) noexcept;
-    void ReadBlocks(int side, std::int32_t y, const DeepCells& out, std::int32_t outRow) noexcept;
+    void ReadBlocks(std::int32_t y, const DeepCells& out, std::int32_t outRow) noexcept;
+    void ReadSmallBlocks(int side, std::int32_t y, const DeepCells& out, std::int32_t outRow) noexcept;
     void BlurAlong(const DeepCells& from, const DeepCells& to, std::int32_t y,
                    const DeepTaps& taps) const noexcept;
     void BlurAcross(const DeepCells& from, const DeepCells& to, const DeepTaps& taps) const noexcept;
@@ -102,7 +103,8 @@ bool DeepLayerMaker::Allocate(GrowingMemory<float>& memory) noexcept {
 // Row `y` of the picture reduced by 2^reduction.
 void DeepLayerMaker::ReadRow(int reduction, std::int32_t y, const DeepCells& out,
                              std::int32_t outRow) noexcept {
-    if (reduction <= 2) return ReadBlocks(1 << reduction, y, out, outRow);
+    if (reduction < 2) return ReadSmallBlocks(1 << reduction, y, out, outRow);
+    if (reduction == 2) return ReadBlocks(y, out, outRow);
     const DeepCells& halves = m_halves[reduction - 1];
     for (std::int32_t i = 0; i < 2; ++i) {
         const std::int32_t lastRow = ReducedSize(m_height, reduction - 1) - 1;
@@ -119,36 +121,48 @@ void DeepLayerMaker::ReadRow(int reduction, std::int32_t y, const DeepCells& out
     }
 }
 
-// Means of blocks of 1, 2 × 2 or 4 × 4 pixels; those at the right and bottom edges repeat the last pixels.
-void DeepLayerMaker::ReadBlocks(int side, std::int32_t y, const DeepCells& out,
-                                std::int32_t outRow) noexcept {
-    DeepBlock sum, row;
+// Means of blocks of 4 × 4 pixels; those at the right and bottom edges repeat the last pixels. Each row is read at a
+// stretch: memory takes twice as long for parts of four rows in turn.
+void DeepLayerMaker::ReadBlocks(std::int32_t y, const DeepCells& out, std::int32_t outRow) noexcept {
+    DeepBlock sums;
+    float* const channels[] = {sums.red, sums.green, sums.blue};
+    for (std::int32_t i = 0; i < 4; ++i) {
+        const auto line =
+            static_cast<std::int32_t>(std::min(std::int64_t{y} * 4 + i, std::int64_t{m_height} - 1));
+        for (std::int32_t from = 0; from < m_width; from += kDeepBlock) {
+            const std::int32_t count = std::min(kDeepBlock, m_width - from), cells = (count + 3) / 4;
+            m_input.ReadSixteenths(line, from, count, sums);
+            for (int c = 0; c < 3; ++c) {
+                float* const target = out.Row(outRow, c) + from / 4;
+                if (i == 0) {
+                    std::copy_n(channels[c], cells, target);
+                } else {
+                    m_kernels.add(target, channels[c], cells);
+                }
+            }
+        }
+    }
+}
+
+// The same of 1 pixel, or 2 × 2: in small pictures only.
+void DeepLayerMaker::ReadSmallBlocks(int side, std::int32_t y, const DeepCells& out,
+                                     std::int32_t outRow) noexcept {
+    DeepBlock rows[2];
     for (std::int32_t from = 0; from < m_width; from += kDeepBlock) {
         const std::int32_t count = std::min(kDeepBlock, m_width - from);
-        const std::int32_t cells = (count + side - 1) / side;
-        for (std::int32_t i = 0; i < side; ++i) {
-            const std::int64_t wanted = std::int64_t{y} * side + i;
-            const auto line = static_cast<std::int32_t>(std::min(wanted, std::int64_t{m_height} - 1));
-            DeepBlock& read = i == 0 ? sum : row;
-            m_input.Read(line, from, count, read);
-            if (i == 0) continue;
-            m_kernels.add(sum.red, row.red, count);
-            m_kernels.add(sum.green, row.green, count);
-            m_kernels.add(sum.blue, row.blue, count);
-        }
-        float* const channels[] = {sum.red, sum.green, sum.blue};
+        for (std::int32_t i = 0; i < side; ++i)
+            m_input.Read(std::min(y * side + i, m_height - 1), from, count, rows[i]);
         for (int c = 0; c < 3; ++c) {
-            float* const channel = channels[c];
-            std::fill(channel + count, channel + cells * side, channel[count - 1]);
             float* const target = out.Row(outRow, c) + from / side;
-            const float times = 1.0f / static_cast<float>(side * side);
-            if (side == 4) {
-                m_kernels.sumFours(channel, target, cells, times);
-            } else if (side == 2) {
-                for (std::int32_t i = 0; i < cells; ++i)
-                    target[i] = (channel[2 * i] + channel[2 * i + 1]) * times;
-            } else {
-                std::copy_n(channel, cells, target);
+            const auto pixel = [&](std::int32_t x, int i) {
+                const DeepBlock& row = rows[i];
+                const float* const channel = c == 0 ? row.red : c == 1 ? row.green : row.blue;
+                return channel[std::min(x, count - 1)];
+            };
+            for (std::int32_t x = 0; x < count; x += side) {
+                target[x / side] =
+                    side == 1 ? pixel(x, 0)
+                              : ((pixel(x, 0) + pixel(x, 1)) + (pixel(x + 1, 0) + pixel(x + 1, 1))) * 0.25f;
             }
         }
     }

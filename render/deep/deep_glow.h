@@ -38,6 +38,9 @@ class DeepBlockReader {
     // Pixels `from` .. `from` + `count` of row `y`, at the start of the block.
     virtual void Read(std::int32_t y, std::int32_t from, std::int32_t count,
                       DeepBlock& block) const noexcept = 0;
+    // Of the same pixels, a sixteenth of the sum of each four. After the last pixel of a row it repeats.
+    virtual void ReadSixteenths(std::int32_t y, std::int32_t from, std::int32_t count,
+                                DeepBlock& block) const noexcept = 0;
 
   protected:
     ~DeepBlockReader() = default;

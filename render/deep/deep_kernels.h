@@ -11,10 +11,10 @@
 
 namespace velmora::render {
 
-// A part of a row on its way through the stages: one plane of floats for each channel, small enough for the
-// first-level cache. Colours are 0 for black and 1 for white, not multiplied by alpha, and may be outside. Never NaN or
-// infinite.
-inline constexpr std::int32_t kDeepBlock = 512;  // pixels; a multiple of the glow's cells
+// A part of a row on its way through the stages: one plane of floats for each channel. It is small enough for the
+// first-level cache, and for reads and writes of memory to go on while a block is worked on. Colours are 0 for black and
+// 1 for white, not multiplied by alpha, and may be outside. Never NaN or infinite.
+inline constexpr std::int32_t kDeepBlock = 256;  // pixels; a multiple of the glow's cells
 struct DeepBlock {
     static constexpr std::int32_t kPad = 16;  // kernels may write whole vectors
 
@@ -37,9 +37,9 @@ struct DeepTaps {
 // Rows of one channel of the glow layer, with padding at both ends. See GlowKernels
 // (render/glow_kernels.h), which do the same in integers.
 struct DeepGlowKernels {
-    // Adds a row; sums each four neighbours of a row.
+    // Adds a row; a sixteenth of the sum of each four neighbours of a row.
     void (*add)(float* out, const float* row, std::int32_t count) noexcept;
-    void (*sumFours)(const float* row, float* out, std::int32_t count, float times) noexcept;
+    void (*sixteenths)(const float* row, float* out, std::int32_t count) noexcept;
     void (*keepHighlights)(float* red, float* green, float* blue, std::int32_t count) noexcept;
     void (*filter)(const float* middle, const float* const* before, const float* const* after, float* out,
                    std::int32_t count, const DeepTaps& taps) noexcept;
@@ -60,8 +60,13 @@ struct DeepKernels {
     // Between pixels and the planes of a block from place `at` on, by DeepSamples and by channels - 3. Loading what is
     // not within 0..1 takes back `isInside`.
     void (*load[2][2])(const void* pixels, DeepBlock& block, std::int32_t at, std::int32_t count) noexcept;
+    // A sixteenth of the sum of each four pixels of four channels, `count` of them from place `at` on. False if they
+    // are of no use, since not all pixels are within 0..1.
+    bool (*loadSixteenths[2])(const void* pixels, DeepBlock& block, std::int32_t at,
+                              std::int32_t count) noexcept;
     void (*store[2][2])(const DeepBlock& block, std::int32_t at, void* pixels, std::int32_t count) noexcept;
-    // Stores the first pixels of a block as four floats at a multiple of 16 bytes, bypassing the caches if the level can.
+    // Stores the first pixels of a block as four floats, bypassing the caches if the level can. `pixels` is at a multiple
+    // of 16 bytes, or better of 64.
     // After the last row of a frame, `endStream` makes them visible to other threads.
     void (*stream)(const DeepBlock& block, void* pixels, std::int32_t count) noexcept;
     void (*endStream)() noexcept;

@@ -41,6 +41,11 @@ bool IsStreamable(const DeepFrame& frame) noexcept {
            static_cast<std::uintptr_t>(frame.destination.rowStep) % kBytes == 0;
 }
 
+// Of four floats, in a line of the caches. Streamed blocks end at the end of a line, so that none is written in parts.
+std::int32_t PixelsIntoLine(const std::uint8_t* pixels) noexcept {
+    return static_cast<std::int32_t>(reinterpret_cast<std::uintptr_t>(pixels) % 64 / 16);
+}
+
 template <typename Change>
 void ChangePixel(DeepBlock& block, std::int32_t x, Change&& change) noexcept {
     change(block.red[x]);
@@ -50,24 +55,58 @@ void ChangePixel(DeepBlock& block, std::int32_t x, Change&& change) noexcept {
 
 }  // namespace
 
+DeepSource::Part DeepSource::PartOf(std::int32_t y, std::int32_t from, std::int32_t count) const noexcept {
+    const std::int32_t row = y - m_jitter.Dy(), shift = m_jitter.Dx();
+    if (row < 0 || row >= m_frame.height) return {count, count, nullptr};
+    const std::int32_t first = std::clamp(shift - from, 0, count);
+    const std::int32_t end = std::clamp(m_frame.width + shift - from, first, count);
+    return {first, end, m_picture.Row(row) + (from + first - shift) * m_frame.format.PixelBytes()};
+}
+
 void DeepSource::Read(std::int32_t y, std::int32_t from, std::int32_t count,
                       DeepBlock& block) const noexcept {
     block.isInside = true;
     const DeepFormat& format = m_frame.format;
-    const std::int32_t row = y - m_jitter.Dy();
-    // The columns of the block that the source has.
-    const std::int32_t shift = m_jitter.Dx();
-    std::int32_t first = std::clamp(shift - from, 0, count);
-    std::int32_t end = std::clamp(m_frame.width + shift - from, first, count);
-    if (row < 0 || row >= m_frame.height) first = end = count;
+    const auto [first, end, pixels] = PartOf(y, from, count);
     if (first != end) {
-        const std::uint8_t* pixels = m_picture.Row(row) + (from + first - shift) * format.PixelBytes();
         m_kernels.load[SamplesOf(format)][ChannelsOf(format)](pixels, block, first, end - first);
         if (format.isPremultiplied) m_kernels.divide(block, first, end - first);
     }
     // After the load, which may write a vector's rest.
     FillBorder(block, 0, first, m_jitter.Border(), format.channels == 4);
     FillBorder(block, end, count - end, m_jitter.Border(), format.channels == 4);
+}
+
+// From place `at` of the block on.
+void DeepSource::SumPixels(std::int32_t y, std::int32_t from, std::int32_t count, DeepBlock& block,
+                           std::int32_t at) const noexcept {
+    if (count <= 0) return;
+    DeepBlock read;
+    Read(y, from, count, read);
+    const std::int32_t sums = (count + 3) / 4;
+    const auto sum = [&](float* channel, float* out) {
+        std::fill(channel + count, channel + 4 * sums, channel[count - 1]);
+        m_kernels.glow.sixteenths(channel, out + at, sums);
+    };
+    sum(read.red, block.red);
+    sum(read.green, block.green);
+    sum(read.blue, block.blue);
+}
+
+// From the left, since each part may write a vector's rest.
+void DeepSource::ReadSixteenths(std::int32_t y, std::int32_t from, std::int32_t count,
+                                DeepBlock& block) const noexcept {
+    const DeepFormat& format = m_frame.format;
+    const Part part = PartOf(y, from, count);
+    const std::int32_t first = (part.first + 3) / 4, sums = part.end / 4 - first;
+    if (format.channels != 4 || format.isPremultiplied || sums <= 0)
+        return SumPixels(y, from, count, block, 0);
+    SumPixels(y, from, 4 * first, block, 0);
+    const std::uint8_t* const pixels = part.pixels + (4 * first - part.first) * format.PixelBytes();
+    if (!m_kernels.loadSixteenths[SamplesOf(format)](pixels, block, first, sums))
+        SumPixels(y, from + 4 * first, 4 * sums, block, first);
+    const std::int32_t done = 4 * (first + sums);
+    SumPixels(y, from + done, count - done, block, first + sums);
 }
 
 DeepRowProgram::DeepRowProgram(const DeepFrame& frame, const FramePlan& plan, DeepGlow& glow,
@@ -109,12 +148,13 @@ void DeepRowProgram::Run(const DeepSource& source, std::int32_t y) const noexcep
     Row row;
     row.y = y;
     for (std::size_t i = 0; i < m_count; ++i) (this->*m_steps[i].begin)(row);
-    for (row.from = m_frame.window.left; row.from < m_frame.window.right; row.from += kDeepBlock) {
-        row.count = std::min(kDeepBlock, m_frame.window.right - row.from);
+    for (row.from = m_frame.window.left; row.from < m_frame.window.right; row.from += row.count) {
+        std::uint8_t* const pixels = m_frame.destination.Row(y) + row.from * format.PixelBytes();
+        const std::int32_t most = m_streams ? kDeepBlock - PixelsIntoLine(pixels) : kDeepBlock;
+        row.count = std::min(most, m_frame.window.right - row.from);
         source.Read(y, row.from, row.count, row.block);
         for (std::size_t i = 0; i < m_count; ++i) (this->*m_steps[i].run)(row);
         if (format.isPremultiplied) m_kernels.multiply(row.block, 0, row.count);
-        std::uint8_t* const pixels = m_frame.destination.Row(y) + row.from * format.PixelBytes();
         if (m_streams) {
             m_kernels.stream(row.block, pixels, row.count);
         } else {

@@ -24,8 +24,19 @@ class DeepSource final : public DeepBlockReader {
 
     void Read(std::int32_t y, std::int32_t from, std::int32_t count,
               DeepBlock& block) const noexcept override;
+    void ReadSixteenths(std::int32_t y, std::int32_t from, std::int32_t count,
+                        DeepBlock& block) const noexcept override;
 
   private:
+    // The columns of a block that the source has, and the first of their pixels.
+    struct Part {
+        std::int32_t first, end;
+        const std::uint8_t* pixels;
+    };
+    [[nodiscard]] Part PartOf(std::int32_t y, std::int32_t from, std::int32_t count) const noexcept;
+    void SumPixels(std::int32_t y, std::int32_t from, std::int32_t count, DeepBlock& block,
+                   std::int32_t at) const noexcept;
+
     const DeepFrame& m_frame;
     const DeepPicture& m_picture;
     const JitterStage& m_jitter;

@@ -77,23 +77,40 @@ inline Floats LoadBoth(const std::uint16_t* from) noexcept {
 inline FourFloats LoadFours(const std::uint16_t* from) noexcept {
     return Transposed({LoadBoth(from), LoadBoth(from + 4), LoadBoth(from + 8), LoadBoth(from + 12)});
 }
-inline void StoreBoth(float* to, Floats x) noexcept {
-    _mm_storeu_ps(to, _mm256_castps256_ps128(x));
-    _mm_storeu_ps(to + 16, _mm256_extractf128_ps(x, 1));
+inline Floats Load8(const float* from) noexcept { return Load(from); }
+inline Floats Load8(const std::uint16_t* from) noexcept {
+    return _mm256_cvtepi32_ps(
+        _mm256_cvtepu16_epi32(_mm_loadu_si128(reinterpret_cast<const __m128i*>(from))));
+}
+template <typename Sample, typename Convert>
+inline FourFloats SumFours(const Sample* from, Convert&& convert) noexcept {
+    const auto halves = [&](int cell) {
+        return convert(Load8(from + 16 * cell)) + convert(Load8(from + 16 * cell + 8));
+    };
+    const auto sums = [&](int cell) {
+        const Floats low = halves(cell), high = halves(cell + 4);
+        return _mm256_permute2f128_ps(low, high, 0x20) + _mm256_permute2f128_ps(low, high, 0x31);
+    };
+    return Transposed({sums(0), sums(1), sums(2), sums(3)});
+}
+inline FourFloats InPixelOrder(const FourFloats& x) noexcept {
+    const FourFloats pixels = Transposed(x);
+    return {_mm256_permute2f128_ps(pixels.a, pixels.b, 0x20), _mm256_permute2f128_ps(pixels.c, pixels.d, 0x20),
+            _mm256_permute2f128_ps(pixels.a, pixels.b, 0x31), _mm256_permute2f128_ps(pixels.c, pixels.d, 0x31)};
 }
 inline void StoreFours(float* to, const FourFloats& x) noexcept {
-    const FourFloats pixels = Transposed(x);
-    StoreBoth(to, pixels.a);
-    StoreBoth(to + 4, pixels.b);
-    StoreBoth(to + 8, pixels.c);
-    StoreBoth(to + 12, pixels.d);
+    const FourFloats pixels = InPixelOrder(x);
+    Store(to, pixels.a);
+    Store(to + 8, pixels.b);
+    Store(to + 16, pixels.c);
+    Store(to + 24, pixels.d);
 }
-// In the order of addresses.
 inline void StreamFours(float* to, const FourFloats& x) noexcept {
-    const FourFloats pixels = Transposed(x);
-    const Floats vectors[] = {pixels.a, pixels.b, pixels.c, pixels.d};
-    for (int i = 0; i < 4; ++i) _mm_stream_ps(to + 4 * i, _mm256_castps256_ps128(vectors[i]));
-    for (int i = 0; i < 4; ++i) _mm_stream_ps(to + 16 + 4 * i, _mm256_extractf128_ps(vectors[i], 1));
+    const FourFloats pixels = InPixelOrder(x);
+    _mm256_stream_ps(to, pixels.a);
+    _mm256_stream_ps(to + 8, pixels.b);
+    _mm256_stream_ps(to + 16, pixels.c);
+    _mm256_stream_ps(to + 24, pixels.d);
 }
 inline void EndStream() noexcept { _mm_sfence(); }
 inline void StoreFours(std::uint16_t* to, const FourFloats& x) noexcept {

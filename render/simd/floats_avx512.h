@@ -90,6 +90,21 @@ inline Floats LoadWords(const std::uint16_t* from) noexcept {
 inline FourFloats LoadFours(const std::uint16_t* from) noexcept {
     return Separated({LoadWords(from), LoadWords(from + 16), LoadWords(from + 32), LoadWords(from + 48)});
 }
+inline Floats Load16(const float* from) noexcept { return Load(from); }
+inline Floats Load16(const std::uint16_t* from) noexcept { return LoadWords(from); }
+template <typename Sample, typename Convert>
+inline FourFloats SumFours(const Sample* from, Convert&& convert) noexcept {
+    const auto halves = [&](int cell) {
+        const Floats first = convert(Load16(from + 16 * cell)), second = convert(Load16(from + 16 * cell + 16));
+        return LowHalves(first, second) + HighHalves(first, second);
+    };
+    const auto sums = [&](int cell) {
+        const Floats first = halves(cell), second = halves(cell + 2);
+        return _mm512_shuffle_f32x4(first, second, _MM_SHUFFLE(2, 0, 2, 0)) +
+               _mm512_shuffle_f32x4(first, second, _MM_SHUFFLE(3, 1, 3, 1));
+    };
+    return Separated({sums(0), sums(4), sums(8), sums(12)});
+}
 inline void StoreFours(float* to, const FourFloats& x) noexcept {
     const FourFloats pixels = Joined(x);
     Store(to, pixels.a);
@@ -97,18 +112,12 @@ inline void StoreFours(float* to, const FourFloats& x) noexcept {
     Store(to + 32, pixels.c);
     Store(to + 48, pixels.d);
 }
-inline void StreamPixels4(float* to, Floats x) noexcept {
-    _mm_stream_ps(to, _mm512_castps512_ps128(x));
-    _mm_stream_ps(to + 4, _mm512_extractf32x4_ps(x, 1));
-    _mm_stream_ps(to + 8, _mm512_extractf32x4_ps(x, 2));
-    _mm_stream_ps(to + 12, _mm512_extractf32x4_ps(x, 3));
-}
 inline void StreamFours(float* to, const FourFloats& x) noexcept {
     const FourFloats pixels = Joined(x);
-    StreamPixels4(to, pixels.a);
-    StreamPixels4(to + 16, pixels.b);
-    StreamPixels4(to + 32, pixels.c);
-    StreamPixels4(to + 48, pixels.d);
+    _mm512_stream_ps(to, pixels.a);
+    _mm512_stream_ps(to + 16, pixels.b);
+    _mm512_stream_ps(to + 32, pixels.c);
+    _mm512_stream_ps(to + 48, pixels.d);
 }
 inline void EndStream() noexcept { _mm_sfence(); }
 inline void StoreWords(std::uint16_t* to, Floats x) noexcept {

@@ -64,6 +64,15 @@ inline void StoreFours(float* to, const FourFloats& x) noexcept {
     to[2] = x.c;
     to[3] = x.d;
 }
+// For each four pixels the sums of their first numbers, of their second, and so on, each number converted.
+template <typename Sample, typename Convert>
+inline FourFloats SumFours(const Sample* from, Convert&& convert) noexcept {
+    const auto sum = [&](int c) {
+        const auto number = [&](int p) { return convert(static_cast<Floats>(from[4 * p + c])); };
+        return (number(0) + number(2)) + (number(1) + number(3));
+    };
+    return {sum(0), sum(1), sum(2), sum(3)};
+}
 // Truncated; within 0..65535.
 inline void StoreFours(std::uint16_t* to, const FourFloats& x) noexcept {
     const auto number = [](float f) { return static_cast<std::uint16_t>(static_cast<std::int32_t>(f)); };
@@ -72,7 +81,7 @@ inline void StoreFours(std::uint16_t* to, const FourFloats& x) noexcept {
     to[2] = number(x.c);
     to[3] = number(x.d);
 }
-// The same for pixels at a multiple of 16 bytes that will not be read again soon.
+// The same for pixels from the start of a line of the caches on that will not be read again soon.
 inline void StreamFours(float* to, const FourFloats& x) noexcept { StoreFours(to, x); }
 inline void EndStream() noexcept {}
 inline Floats LoadBytes(const std::uint8_t* from) noexcept {

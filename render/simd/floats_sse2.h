@@ -56,6 +56,15 @@ inline Floats Load4(const std::uint16_t* from) noexcept {
 inline FourFloats LoadFours(const std::uint16_t* from) noexcept {
     return Transposed({Load4(from), Load4(from + 4), Load4(from + 8), Load4(from + 12)});
 }
+inline Floats Load4(const float* from) noexcept { return Load(from); }
+template <typename Sample, typename Convert>
+inline FourFloats SumFours(const Sample* from, Convert&& convert) noexcept {
+    const auto sum = [&](int cell) {
+        const auto pixel = [&](int p) { return convert(Load4(from + 16 * cell + 4 * p)); };
+        return (pixel(0) + pixel(2)) + (pixel(1) + pixel(3));
+    };
+    return Transposed({sum(0), sum(1), sum(2), sum(3)});
+}
 inline void StoreFours(float* to, const FourFloats& x) noexcept {
     const FourFloats pixels = Transposed(x);
     Store(to, pixels.a);
