@@ -15,7 +15,8 @@
 // Threads. Nothing is locked, and every operation runs on the thread that calls it. The brackets at each operation or
 // interface say what is safe:
 //   [any thread]      at any time, also while other calls run: counting references, constant tables and names
-//   [one at a time]   on any thread, but never two such calls at once in the whole process: frames share one state
+//   [one at a time]   on any thread, but not two such calls at once in the whole process: frames share one state. A frame
+//                     that begins while another one is rendered gets other random damage
 //   [user interface]  on the host's user-interface thread only: dialogs, translated texts, help
 //
 // Frames. The frame number is the clip time in seconds x 30, truncated. It alone identifies a frame: a call with the

@@ -39,9 +39,10 @@ bool VM_CALL CRsVelmoraEffect::GetParamInfo(std::uint32_t index, ParamDescriptor
 bool VM_CALL CRsVelmoraEffect::Process(IVideoHost* host, const FrameRecord* source, void*,
                                        const FrameRecord* destination, const TimingRecord* timing) {
     const FloatGuard guard;
-    const RenderSession session = ProcessSession(m_options);
-    if (host == nullptr || session.settings == nullptr || BuildMode() != kBuildModeReady) return false;
-    return RenderFrame(session, *host, source, destination, timing);
+    if (host == nullptr || BuildMode() != kBuildModeReady) return false;
+    const FrameSession frame(m_options);
+    return frame.Session().settings != nullptr &&
+           RenderFrame(frame.Session(), *host, source, destination, timing);
 }
 
 const char* VM_CALL CRsVelmoraEffect::GetPresetName(std::uint32_t) {

@@ -22,6 +22,7 @@ KeptList* g_currentList = nullptr;
 struct SeededState : render::RenderState {
     SeededState() noexcept { random.Seed(support::TickCount()); }
 } g_state;
+std::atomic_flag g_isRendering;  // with g_state
 
 }  // namespace
 
@@ -56,6 +57,26 @@ MasterSettingsList* CurrentMasterSettings() noexcept {
 
 RenderSession ProcessSession(const render::RenderOptions& options) noexcept {
     return {CurrentMasterSettings(), &g_state, options};
+}
+
+struct FrameSession::Own {
+    MasterSettingsList list;
+    SeededState state;
+};
+
+FrameSession::FrameSession(const render::RenderOptions& options) noexcept {
+    if (!g_isRendering.test_and_set(std::memory_order_acquire)) {
+        m_session = ProcessSession(options);
+        return;
+    }
+    m_own.reset(new (std::nothrow) Own);
+    if (m_own == nullptr || !m_own->list.Fill()) return;
+    m_own->list.ExposeAll();
+    m_session = {.settings = &m_own->list, .state = &m_own->state, .options = options};
+}
+
+FrameSession::~FrameSession() {
+    if (m_session.state == &g_state) g_isRendering.clear(std::memory_order_release);
 }
 
 }  // namespace velmora

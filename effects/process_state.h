@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 
 #include "effects/master_settings.h"
 #include "effects/render_session.h"
@@ -35,5 +36,24 @@ void SetBuildMode(std::int32_t mode) noexcept;
 // The session of all effects created through the library. Its random numbers start from the system's tick
 // count at load, so that damage differs from run to run.
 [[nodiscard]] RenderSession ProcessSession(const render::RenderOptions& options = {}) noexcept;
+
+// The session of one frame: that of the process, or, while another frame has it, one of its own. A host that renders on
+// two threads in spite of the contract then gets other random damage, but no mixture of settings and no damaged memory.
+// Waiting instead would be no help: the other frame may be waiting for this thread, or be further up in this very one.
+class FrameSession {
+  public:
+    explicit FrameSession(const render::RenderOptions& options) noexcept;
+    ~FrameSession();
+    FrameSession(const FrameSession&) = delete;
+    FrameSession& operator=(const FrameSession&) = delete;
+
+    // Without settings when there are none yet, or not enough memory.
+    [[nodiscard]] const RenderSession& Session() const noexcept { return m_session; }
+
+  private:
+    struct Own;
+    std::unique_ptr<Own> m_own;
+    RenderSession m_session;
+};
 
 }  // namespace velmora

@@ -36,6 +36,7 @@ constexpr Check kChecks[] = {
     {"frame-failures",    5, CheckFrameFailures,   "each allocation while rendering a frame fails once"},
     {"preset-failures",   5, CheckPresetFailures,  "each allocation while saving and loading a preset fails once"},
     {"threads",           6, CheckThreads,        "reference counts on several threads at once, frames on one thread after another"},
+    {"frames-at-once",    6, CheckFramesAtOnce,   "frames on several threads at once, against the contract: no crash, no mixed settings"},
     {"random-shapes",     6, CheckRandomShapes,   "random sizes, origins, steps, values and times together"},
     {"converter-shapes",  6, CheckConverterShapes,"random shapes for the converter"},
     {"dialog-failures",   6, CheckDialogFailures,  "each allocation while showing options and help fails once"},

@@ -11,6 +11,7 @@ void CheckReferences(CheckContext& context);
 void CheckNullArguments(CheckContext& context);
 void CheckOutliving(CheckContext& context);
 void CheckThreads(CheckContext& context);
+void CheckFramesAtOnce(CheckContext& context);
 
 // checks_tables.cpp
 void CheckDescriptions(CheckContext& context);

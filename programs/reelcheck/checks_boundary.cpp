@@ -1,5 +1,6 @@
 // The objects: exports, counts, interfaces, null pointers, lifetime, threads.
 
+#include <atomic>
 #include <cstring>
 #include <thread>
 #include <vector>
@@ -179,6 +180,35 @@ void CheckThreads(CheckContext& context) {
         }).join();
         Require(digest == expected, "another thread gets another picture");
     }
+}
+
+// Against the contract. Film Look draws no random numbers, so its pictures are known; Film Pro uses all of the state.
+void CheckFramesAtOnce(CheckContext& context) {
+    const OpenLibrary library(context.libraryPath);
+    const int rounds = context.Rounds(30, 1000);
+    std::atomic<int> wrong = 0;
+    std::vector<std::thread> rendering;
+    for (int i = 0; i < 4; ++i) {
+        rendering.emplace_back([&library, &wrong, rounds, i, dice = Dice(context.dice.Bits(), "")]() mutable {
+            const bool isKnown = i < 2;
+            const Reference<IVideoEffect> effect = library.Effect(isKnown ? 1 : 4);
+            PlayingHost host;
+            if (isKnown) ChoosePreset(host, *effect, static_cast<std::uint32_t>(9 + i));
+            if (!isKnown) ChooseFull(host, EffectFacts::Of(*effect));
+            std::uint64_t first = 0;
+            Frame source(Layout{90 + 37 * i, 40});
+            source.Paint(dice);
+            for (int k = 0; k < rounds; ++k) {
+                Frame destination(Layout{90 + 37 * i, isKnown ? 40 : 1 + k % 40});
+                const bool isDone = Process(*effect, &host, source.Record(), destination.Record(), k);
+                const std::uint64_t digest = destination.Digest();
+                if (k == 0) first = digest;
+                if (!isDone || (isKnown && digest != first)) ++wrong;
+            }
+        });
+    }
+    for (std::thread& thread : rendering) thread.join();
+    Require(wrong == 0, Text("%d wrong frames", wrong.load()).c_str());
 }
 
 }  // namespace velmora::reelcheck
