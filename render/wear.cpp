@@ -21,9 +21,12 @@ WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random&
     stage.m_picture = &WearPicture(settings.wearPattern);
     stage.m_channels = settings.wearChannels;
     stage.m_starts = random;
-    random.Skip(WearStripCount(settings, width));
+    const std::uint32_t strips = WearStripCount(settings, width);
+    random.Skip(strips);
     stage.m_amount = settings.wear;
-    stage.m_factors = factors.Set(*stage.m_picture, stage.m_amount) ? &factors : nullptr;
+    const bool hasFactors =
+        factors.Set(*stage.m_picture, stage.m_amount) && factors.SetStrips(stage.m_starts, strips);
+    stage.m_factors = hasFactors ? &factors : nullptr;
     stage.m_kernels = &kernels;
     return stage;
 }
@@ -35,8 +38,7 @@ void WearStage::ShadeUnder(std::uint8_t byte, Bgra& pixel) const noexcept {
 
 void WearStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     if (m_factors != nullptr) {
-        m_kernels->wear(in, out, width, m_factors->Over(RowsOver(y)),
-                        BlueOnly() ? kBlueChannel : kColourChannels);
+        m_kernels->wear(in, out, width, m_factors->Over(y), BlueOnly() ? kBlueChannel : kColourChannels);
         if (!m_factors->HasOddBytes()) return;
     } else if (in != out) {
         std::copy(in, in + width, out);

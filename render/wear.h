@@ -21,8 +21,8 @@ namespace velmora::render {
 
 // The rows of the wear picture over one row of a frame: one for each strip, from the left.
 //
-// They are drawn again for each row, starting from the frame's first draw. This needs no memory for a strip count that
-// grows with the width, and a draw costs next to nothing compared with a strip's pixels.
+// They are drawn again for each row, starting from the frame's first draw, so that no memory is needed for a strip count
+// that grows with the width. The row kernels read them from WearFactors, which keeps a frame's draws.
 class WearRows {
   public:
     // For row `y` of a frame, under a picture of `height` rows.
@@ -87,7 +87,7 @@ class WearStage {
     const GreyPicture* m_picture = nullptr;
     Random m_starts;
     float m_amount = 0.0f;
-    const WearFactors* m_factors = nullptr;  // null for a picture that is too large for them
+    const WearFactors* m_factors = nullptr;  // null if the picture is too large for them, or memory short
     const Kernels* m_kernels = nullptr;
 };
 

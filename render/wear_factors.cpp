@@ -79,4 +79,13 @@ bool WearFactors::Set(const GreyPicture& picture, float amount) noexcept {
     return true;
 }
 
+bool WearFactors::SetStrips(Random random, std::uint32_t count) noexcept {
+    std::uint16_t* const starts = m_starts.Reserve(std::uint64_t{count} + 1);
+    if (starts == nullptr) return false;
+    WearRows rows(random, m_picture->height, 0);
+    std::generate_n(starts, count, [&rows] { return static_cast<std::uint16_t>(rows.Next()); });
+    starts[count] = 0;
+    return true;
+}
+
 }  // namespace velmora::render

@@ -13,6 +13,7 @@
 #include <cstdint>
 #include <optional>
 
+#include "render/growing_memory.h"
 #include "render/pictures.h"
 #include "render/wear.h"
 
@@ -32,18 +33,26 @@ class WearStrips {
     // A row kernel may read this many numbers before a strip's first one and after its last one.
     static constexpr std::int32_t kPadding = 16;
 
-    // `factors` is a picture of `width` >= kPadding columns, stored row after row without gaps, with padding before the
-    // first row and after the last.
-    WearStrips(const WearRows& rows, const WearFactor* factors, std::int32_t width) noexcept
-        : m_rows(rows), m_factors(factors), m_width(width) {}
+    // `factors` is a picture of `size`, at least kPadding columns wide, stored row after row without gaps, with padding
+    // before the first row and after the last. `starts` are the rows of it that the strips have in row 0 of the frame,
+    // and one more for vectors that reach beyond the last strip; this is row `y`.
+    struct Size {
+        std::int32_t width, height;
+    };
+    WearStrips(const std::uint16_t* starts, std::int32_t y, const WearFactor* factors, Size size) noexcept
+        : m_starts(starts), m_factors(factors), m_size(size), m_down(y % size.height) {}
 
-    [[nodiscard]] std::int32_t Width() const noexcept { return m_width; }
-    const WearFactor* Next() noexcept { return m_factors + m_rows.Next() * m_width; }
+    [[nodiscard]] std::int32_t Width() const noexcept { return m_size.width; }
+    const WearFactor* Next() noexcept {
+        const std::int32_t row = *m_starts++ + m_down;
+        return m_factors + (row < m_size.height ? row : row - m_size.height) * m_size.width;
+    }
 
   private:
-    WearRows m_rows;
+    const std::uint16_t* m_starts;
     const WearFactor* m_factors;
-    std::int32_t m_width;
+    Size m_size;
+    std::int32_t m_down;
 };
 
 // Kept from frame to frame, since the amount seldom changes.
@@ -56,8 +65,15 @@ class WearFactors {
     // kMostPixels pixels or fewer than WearStrips::kPadding columns.
     [[nodiscard]] bool Set(const GreyPicture& picture, float amount) noexcept;
 
-    [[nodiscard]] WearStrips Over(const WearRows& rows) const noexcept {
-        return {rows, m_factors.data() + WearStrips::kPadding, m_picture->width};
+    // Draws where the strips of a frame start: `count` draws. Needs factors. False if there is not enough memory.
+    [[nodiscard]] bool SetStrips(Random random, std::uint32_t count) noexcept;
+
+    // Over row `y` of the frame; needs strips.
+    [[nodiscard]] WearStrips Over(std::int32_t y) const noexcept {
+        return {m_starts.Data(),
+                y,
+                m_factors.data() + WearStrips::kPadding,
+                {m_picture->width, m_picture->height}};
     }
     // Whether the kernels leave out pixels: those under odd bytes.
     [[nodiscard]] bool HasOddBytes() const noexcept { return m_hasOddBytes; }
@@ -67,6 +83,7 @@ class WearFactors {
     const GreyPicture* m_picture = nullptr;
     float m_amount = 0.0f;
     bool m_hasOddBytes = false;
+    GrowingMemory<std::uint16_t> m_starts;
     std::array<bool, 256> m_isOdd{};
     std::array<WearFactor, kMostPixels + 2 * WearStrips::kPadding> m_factors{};
 };

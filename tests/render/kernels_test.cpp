@@ -165,12 +165,14 @@ TEST(Kernels, WearIsThePlainOneOnEveryLevel) {
     for (const std::int32_t stripWidth : {16, 25, 50, 64}) {
         std::vector<WearFactor> factors(static_cast<std::size_t>(kHeight * stripWidth) +
                                         2 * WearStrips::kPadding);
+        std::vector<std::uint16_t> starts(kWidest / 16 + 2);
+        for (std::uint16_t& start : starts) start = static_cast<std::uint16_t>(numbers() % kHeight);
         for (WearFactor& f : factors) {
             f = {static_cast<std::uint16_t>(numbers()), static_cast<std::uint16_t>(numbers() % 256)};
         }
         for (const std::uint32_t channels : {kColourChannels, kBlueChannel}) {
-            const WearStrips strips(WearRows(Random(7), kHeight, 5), factors.data() + WearStrips::kPadding,
-                                    stripWidth);
+            const WearStrips strips(starts.data(), 5, factors.data() + WearStrips::kPadding,
+                                    {stripWidth, kHeight});
             ExpectEqualPixels([&](const Kernels& kernels, const Bgra* in, Bgra* out, std::int32_t width) {
                 kernels.wear(in, out, width, strips, channels);
             });
