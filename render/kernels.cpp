@@ -47,8 +47,8 @@ void ToneRow(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) no
 
 }  // namespace
 
-const Kernels kPlainKernels = {ToneRow,      WearRow,     DrawScratchesPlain, CopyRow, CopyRow,
-                               NothingToEnd, &kPlainGlow, &kPlainYcbcr,       nullptr};
+const Kernels kPlainKernels = {ToneRow,          WearRow,     CopyRow,      CopyRow, NothingToEnd,
+                               &kPlainScratches, &kPlainGlow, &kPlainYcbcr, nullptr};
 
 namespace {
 

@@ -1,8 +1,8 @@
 // The pixel kernels: row operations that exist at several SIMD levels. All levels of a kernel give the same bytes as
 // the plain one.
 //
-// For tone, wear, copies and scratches: `in` and `out` are rows of `width` >= 0 pixels and need no alignment. `in` may
-// be `out` but must not overlap it otherwise. Alpha is copied.
+// For tone, wear and copies: `in` and `out` are rows of `width` >= 0 pixels and need no alignment. `in` may be `out` but
+// must not overlap it otherwise. Alpha is copied.
 #pragma once
 
 #include <array>
@@ -76,8 +76,7 @@ struct GlowKernels;
 struct GlowPlanes;
 struct GlowedTone;
 struct YcbcrKernels;
-struct ScratchLine;
-struct ScratchRowPlace;
+struct ScratchKernels;
 
 struct Kernels {
     // All steps of a tone. Its weight must be in -127..127.
@@ -86,18 +85,16 @@ struct Kernels {
     // 0xFF at each channel to change and 0 at alpha.
     void (*wear)(const Bgra* in, Bgra* out, std::int32_t width, WearStrips strips,
                  std::uint32_t channels) noexcept;
-    // Draws a row's part of some scratches.
-    void (*scratches)(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
-                      const ScratchRowPlace& place) noexcept;
     // Copies a row.
     void (*copy)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
     // Copies a row that will not be read again soon, bypassing the caches if the level can. `in` must not be `out`.
     // After the last row of a frame, `endStream` makes the rows visible to other threads.
     void (*stream)(const Bgra* in, Bgra* out, std::int32_t width) noexcept;
     void (*endStream)() noexcept;
-    const GlowKernels* glow;       // render/glow_kernels.h
-    const YcbcrKernels* ycbcr;     // render/ycbcr.h
-    const GlowedTone* glowedTone;  // null if the level has none
+    const ScratchKernels* scratches;  // render/scratch_span.h
+    const GlowKernels* glow;          // render/glow_kernels.h
+    const YcbcrKernels* ycbcr;        // render/ycbcr.h
+    const GlowedTone* glowedTone;     // null if the level has none
 };
 
 // Glow and tone in one step, for layers in planes (render/glow_kernels.h).
@@ -117,8 +114,7 @@ struct GlowedTone {
 extern const Kernels kPlainKernels;
 extern const GlowKernels kPlainGlow;
 extern const YcbcrKernels kPlainYcbcr;
-void DrawScratchesPlain(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
-                        const ScratchRowPlace& place) noexcept;
+extern const ScratchKernels kPlainScratches;
 
 // Applies a tone's steps in separate passes over a row, which stays in the first-level cache.
 template <typename Tables, typename Mix>
@@ -143,8 +139,7 @@ extern const Kernels kAvx512Kernels;
 
 // Kernels that higher levels share, since longer vectors would not speed them up: a scratch is only a few pixels wide,
 // and the glow layer is a quarter of the picture.
-void DrawScratchesSse2(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
-                       const ScratchRowPlace& place) noexcept;
+extern const ScratchKernels kSse2Scratches;
 // With eight registers, most of a block of channels would be in memory, so that SSSE3 is no gain in 32 bits.
 void ToneRowSse2(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept;
 extern const GlowKernels kAvx2Glow;

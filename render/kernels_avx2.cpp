@@ -10,7 +10,6 @@
 #include <type_traits>
 
 #include "render/glow_kernels.h"
-#include "render/scratch_line.h"
 #include "render/kernels.h"
 #include "render/simd/target.h"
 #include "render/ycbcr.h"
@@ -80,8 +79,8 @@ constexpr GlowedTone kGlowedTone = {SplitGlowAvx2, ToneUnderGlow};
 
 const GlowKernels kAvx2Glow = kGlow;
 
-const Kernels kAvx2Kernels = {ToneRow,   WearRow,    DrawScratchesSse2, CopyRow,     StreamRow,
-                              EndStream, &kAvx2Glow, &kYcbcr,           &kGlowedTone};
+const Kernels kAvx2Kernels = {ToneRow,         WearRow,    CopyRow, StreamRow,   EndStream,
+                              &kSse2Scratches, &kAvx2Glow, &kYcbcr, &kGlowedTone};
 
 }  // namespace velmora::render
 

@@ -10,7 +10,6 @@
 #include <type_traits>
 
 #include "render/glow_kernels.h"
-#include "render/scratch_line.h"
 #include "render/kernels.h"
 #include "render/simd/target.h"
 #include "render/ycbcr.h"
@@ -56,8 +55,8 @@ constexpr GlowedTone kGlowedTone = {SplitGlowAvx2, ToneUnderGlow};
 
 }  // namespace
 
-const Kernels kAvx512Kernels = {ToneRow,   WearRow,    DrawScratchesSse2, CopyRow,     StreamRow,
-                                EndStream, &kAvx2Glow, &kYcbcr,           &kGlowedTone};
+const Kernels kAvx512Kernels = {ToneRow,         WearRow,    CopyRow, StreamRow,   EndStream,
+                                &kSse2Scratches, &kAvx2Glow, &kYcbcr, &kGlowedTone};
 
 }  // namespace velmora::render
 

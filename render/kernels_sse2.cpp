@@ -56,41 +56,18 @@ inline void MixPixels(const Bgra* in, Bgra* out, std::int32_t count, const Lines
 #include "render/simd/glow.inc"
 #include "render/simd/ycbcr.inc"
 #include "render/scratch_rows.inc"
-
-// The pixels of a scratch that is entirely inside the picture (scratch_rows.inc), four at a time. The saturating
-// differences keep the direction, and the alpha of their limits keeps alpha unchanged.
-void DrawSpan(Bgra* span, const std::uint16_t* weights, std::int32_t pixels, std::uint32_t strength,
-              bool isWhite) noexcept {
-    const Vec darkest = All32(static_cast<std::int32_t>(0xFF000000u | kDarkest * 0x010101u));
-    const Vec brightest = All32(kBrightest * 0x010101);
-    const Vec strengths = All16(static_cast<std::int32_t>(strength));
-    for (std::int32_t i = 0; i < pixels; i += kPixels) {
-        const Vec pixel = Load(span + i);
-        const Vec weight = LoadLow64(weights + i);
-        const Vec share = MulHighU16(weight, strengths);
-        const Vec pairs = InterleaveLow16(share, share);
-        const Vec towards = isWhite ? SubSatU8(brightest, pixel) : SubSatU8(pixel, darkest);
-        // The difference in the upper byte: the product's upper half is then 256 times the change.
-        const Vec low = MulHighU16(InterleaveLow8(Zero(), towards), InterleaveLow32(pairs, pairs));
-        const Vec high = MulHighU16(InterleaveHigh8(Zero(), towards), InterleaveHigh32(pairs, pairs));
-        const Vec change = PackU8(ShiftRightU16<8>(low), ShiftRightU16<8>(high));
-        Store(span + i, isWhite ? Add8(pixel, change) : Sub8(pixel, change));
-    }
-}
+#include "render/simd/scratches.inc"
 
 }  // namespace
 
-void DrawScratchesSse2(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
-                       const ScratchRowPlace& place) noexcept {
-    DrawLines(lines, count, row, width, place);
-}
+const ScratchKernels kSse2Scratches = {FindLines, DrawLines};
 
 void ToneRowSse2(const Bgra* in, Bgra* out, std::int32_t width, const Tone& tone) noexcept {
     ToneRow(in, out, width, tone);
 }
 
-const Kernels kSse2Kernels = {ToneRow,   WearRow, DrawScratchesSse2, CopyRow, StreamRow,
-                              EndStream, &kGlow,  &kYcbcr,           nullptr};
+const Kernels kSse2Kernels = {ToneRow,         WearRow, CopyRow, StreamRow, EndStream,
+                              &kSse2Scratches, &kGlow,  &kYcbcr, nullptr};
 
 }  // namespace velmora::render
 

@@ -10,7 +10,6 @@
 #include <type_traits>
 
 #include "render/glow_kernels.h"
-#include "render/scratch_line.h"
 #include "render/kernels.h"
 #include "render/simd/target.h"
 #include "render/ycbcr.h"
@@ -46,8 +45,8 @@ constexpr auto* ToneRow = ToneRowSse2;
 
 }  // namespace
 
-const Kernels kSsse3Kernels = {ToneRow,   WearRow, DrawScratchesSse2, CopyRow, StreamRow,
-                               EndStream, &kGlow,  &kYcbcr,           nullptr};
+const Kernels kSsse3Kernels = {ToneRow,         WearRow, CopyRow, StreamRow, EndStream,
+                               &kSse2Scratches, &kGlow,  &kYcbcr, nullptr};
 
 }  // namespace velmora::render
 

@@ -211,8 +211,9 @@ constexpr ScratchTexture MakeTexture(int softenings) {
     RoughRows rows = MakeRoughRows();
     for (int i = 0; i < softenings; ++i) rows = Softened(rows);
     ScratchTexture texture;
-    for (std::size_t row = 0; row < rows.size(); ++row) {
-        texture.values[row] = static_cast<std::int16_t>(std::clamp(rows[row], -kMostTexture, kMostTexture));
+    for (std::size_t row = 0; row < texture.values.size(); ++row) {
+        texture.values[row] =
+            static_cast<std::int16_t>(std::clamp(rows[row % rows.size()], -kMostTexture, kMostTexture));
     }
     return texture;
 }
@@ -235,7 +236,7 @@ void LayScratch(const ScratchState& scratch, const ScratchView& view, const Scra
     line.isWhite = scratch.isWhite;
     const std::int32_t section = HashAt(scratch.look, kSection) * kScratchSections >> 16;
     line.shapes = &ScratchShapesOf(scratch.isWhite, scratch.profileIndex, section);
-    line.pixels = (*line.shapes)[kScratchWhole].pixels;
+    line.pixels = line.shapes->pixels;
     line.strength = StrengthOf(scratch, view);
     line.roughness = Between(kOne / 4, kOne * 7 / 8, HashAt(scratch.look, kRoughness));
     line.absentLevel = -(line.roughness * (kMostTexture >> 10) >> 5);

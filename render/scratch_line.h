@@ -16,7 +16,9 @@ namespace velmora::render {
 // A roughness that all scratches share: within +-22528 and 0 on average, for any row from 0 on.
 struct ScratchTexture {
     static constexpr std::int32_t kRows = 2048;
-    std::array<std::int16_t, kRows> values{};
+    static constexpr std::int32_t kRepeated =
+        8;  // the first rows again, for reading some at once from any row
+    std::array<std::int16_t, kRows + kRepeated> values{};
 
     [[nodiscard]] std::int32_t At(std::int32_t row) const noexcept {
         return values[static_cast<std::size_t>(row & (kRows - 1))];
@@ -37,7 +39,7 @@ struct ScratchLine {
     bool isWhite = false;
     std::int32_t pixel = 0;
     std::uint32_t strength = 0;    // where the scratch is whole, 0..65535
-    std::int32_t roughness = 0;    // of the level, for a texture of 32768
+    std::int32_t roughness = 0;    // of the level, for a texture of 32768; 0..65534
     std::int32_t absentLevel = 0;  // at or below it the texture makes no row visible
     std::int32_t texture = 0;      // row of the texture at the frame's first row
     const ScratchTexture* rows = nullptr;
@@ -45,7 +47,7 @@ struct ScratchLine {
     std::array<Knot, kSegments + 1> knots;
 };
 
-// A row of the picture between two knots: `part` / 4096 of the way from one to the next.
+// A row of the picture between two knots: `part` / 4096, below 1, of the way from one to the next.
 struct ScratchRowPlace {
     std::int32_t y;
     std::size_t knot;

@@ -53,8 +53,7 @@ constexpr std::int32_t SectionAt(const Section& section, std::int32_t unit, std:
 
 // Each pixel takes the mean of the section over its width, so that a drifting scratch does not shimmer.
 constexpr ScratchShape MakeShape(const ScratchProfile& profile, const Section& section) {
-    ScratchShape shape;
-    shape.pixels = (profile.width + 1 + 3) / 4 * 4;
+    ScratchShape shape{};
     const std::int32_t width = profile.width * kUnits;
     std::array<std::int32_t, kMostScratchPixels * kUnits + 1> sums{};  // of all preceding units
     for (std::int32_t unit = 0; unit < kMostScratchPixels * kUnits; ++unit) {
@@ -67,7 +66,7 @@ constexpr ScratchShape MakeShape(const ScratchProfile& profile, const Section& s
             const std::int32_t from = pixel * kUnits - phase * kUnits / kScratchPhases;
             const std::int32_t sum = sums[static_cast<std::size_t>(std::min(from + kUnits, width))] -
                                      sums[static_cast<std::size_t>(std::clamp(from, 0, width))];
-            shape.weights[static_cast<std::size_t>(phase)][static_cast<std::size_t>(pixel)] =
+            shape[static_cast<std::size_t>(phase)][static_cast<std::size_t>(pixel)] =
                 static_cast<std::uint16_t>(sum * 255 / kUnits);
         }
     }
@@ -94,8 +93,9 @@ constexpr ShapeTable MakeShapes(const ScratchProfile (&profiles)[kScratchProfile
         for (int section = 0; section < kScratchSections; ++section) {
             const Section& whole = (i < kThinScratchProfiles ? kThinSections : kThickSections)[section];
             shapes[static_cast<std::size_t>(i)][static_cast<std::size_t>(section)] = {
-                MakeShape(profiles[i], whole), MakeShape(profiles[i], Narrowed(whole)),
-                MakeShape(profiles[i], Worn(whole))};
+                (profiles[i].width + 1 + 3) / 4 * 4,
+                {MakeShape(profiles[i], whole), MakeShape(profiles[i], Narrowed(whole)),
+                 MakeShape(profiles[i], Worn(whole))}};
         }
     }
     return shapes;

@@ -121,14 +121,18 @@ inline constexpr std::int32_t kScratchSections = 3;  // kinds of cross-section, 
 
 // For a left edge `phase` steps into a pixel: the share of that pixel and of those to its right that the scratch
 // covers, 0..65280 (65536 would be all).
-struct ScratchShape {
-    std::int32_t pixels = 0;  // how many a scratch can touch, rounded up to whole vectors of four
-    std::array<std::array<std::uint16_t, kMostScratchPixels>, kScratchPhases> weights{};
-};
+using ScratchShape = std::array<std::array<std::uint16_t, kMostScratchPixels>, kScratchPhases>;
 
 // Before a scratch breaks off it narrows until only its finest part is left.
-enum ScratchWear : std::size_t { kScratchWhole, kScratchNarrow, kScratchWorn };
-using ScratchShapes = std::array<ScratchShape, 3>;
+struct ScratchShapes {
+    std::int32_t pixels = 0;           // how many a scratch can touch, rounded up to whole vectors of four
+    std::array<ScratchShape, 3> worn;  // whole, narrowed, and its finest part
+
+    // Those of a shape of `worn` and a phase: `place` is the shape times kScratchPhases plus the phase.
+    [[nodiscard]] const std::uint16_t* WeightsAt(std::size_t place) const noexcept {
+        return worn[place / kScratchPhases][place % kScratchPhases].data();
+    }
+};
 
 // The shapes of a profile, 0..kScratchProfiles − 1, with a section of 0..kScratchSections − 1.
 [[nodiscard]] const ScratchShapes& ScratchShapesOf(bool isWhite, std::int32_t profile,

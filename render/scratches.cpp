@@ -17,12 +17,25 @@ void DrawSpan(Bgra* span, const std::uint16_t* weights, std::int32_t pixels, std
     for (std::int32_t i = 0; i < pixels; ++i) DrawPixel(span[i], weights[i], strength, isWhite);
 }
 
+void FindSpans(const ScratchLine& line, const ScratchRows& rows, ScratchSpans& spans) noexcept {
+    for (std::size_t i = 0; i < rows.count; ++i) {
+        ScratchSpan span;
+        const ScratchRowPlace place = {rows.y + static_cast<std::int32_t>(i), rows.knot, rows.parts[i]};
+        const bool isThere = FindSpan(line, place, span);
+        spans.first[i] = span.first;
+        spans.place[i] = isThere ? static_cast<std::uint16_t>(span.place) : ScratchSpans::kNone;
+        spans.strength[i] = static_cast<std::uint16_t>(span.strength);
+    }
+}
+
+void FindLines(const ScratchLine* lines, std::uint32_t count, const ScratchRows& rows,
+               ScratchSpans* spans) noexcept {
+    for (std::uint32_t i = 0; i < count; ++i) FindSpans(lines[i], rows, spans[i]);
+}
+
 }  // namespace
 
-void DrawScratchesPlain(const ScratchLine* lines, std::uint32_t count, Bgra* row, std::int32_t width,
-                        const ScratchRowPlace& place) noexcept {
-    DrawLines(lines, count, row, width, place);
-}
+const ScratchKernels kPlainScratches = {FindLines, DrawLines};
 
 ScratchStage::ScratchStage(const ScratchLine* lines, std::uint32_t count, std::int32_t height,
                            const Kernels& kernels) noexcept
@@ -38,7 +51,22 @@ ScratchRowPlace ScratchStage::PlaceOf(std::int32_t y) const noexcept {
 
 void ScratchStage::Row(const Bgra* in, Bgra* out, std::int32_t width, std::int32_t y) const noexcept {
     if (in != out) std::memcpy(out, in, static_cast<std::size_t>(width) * sizeof(Bgra));
-    m_kernels->scratches(m_lines, m_count, out, width, PlaceOf(y));
+    const std::int32_t first = m_rows.y, end = first + static_cast<std::int32_t>(m_rows.count);
+    if (y < first || y >= end) Find(y);
+    m_kernels->scratches->draw(m_lines, m_spans.data(), m_count, static_cast<std::size_t>(y - m_rows.y), out,
+                               width);
+}
+
+void ScratchStage::Find(std::int32_t y) const noexcept {
+    const ScratchRowPlace first = PlaceOf(y);
+    m_rows.y = y;
+    m_rows.knot = first.knot;
+    m_rows.count = 0;
+    for (ScratchRowPlace next = first; next.knot == first.knot && m_rows.count < ScratchRows::kMost;
+         next = PlaceOf(next.y + 1)) {
+        m_rows.parts[m_rows.count++] = next.part;
+    }
+    m_kernels->scratches->find(m_lines, m_count, m_rows, m_spans.data());
 }
 
 ScratchStage PrepareScratches(const StageSettings& settings, std::int32_t xOffset,

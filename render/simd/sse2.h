@@ -74,6 +74,14 @@ inline void EndStream() noexcept {
     _mm_sfence();
 }
 
+// All bits set where `a` is greater.
+inline Vec Greater16(Vec a, Vec b) noexcept {
+    return _mm_cmpgt_epi16(a, b);
+}
+inline Vec Greater32(Vec a, Vec b) noexcept {
+    return _mm_cmpgt_epi32(a, b);
+}
+
 // 64 bits, and zeros.
 inline Vec LoadLow64(const void* from) noexcept {
     return _mm_loadl_epi64(static_cast<const __m128i*>(from));

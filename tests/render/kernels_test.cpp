@@ -15,7 +15,7 @@
 #include <vector>
 
 #include "render/glow_kernels.h"
-#include "render/scratch_line.h"
+#include "render/scratch_span.h"
 #include "render/image.h"
 #include "render/wear_factors.h"
 #include "render/ycbcr.h"
@@ -207,27 +207,36 @@ TEST(Kernels, ScratchesArePlainOnesOnEveryLevel) {
     const auto below = [&numbers](std::int32_t end) {
         return static_cast<std::int32_t>(numbers() % static_cast<std::uint32_t>(end));
     };
-    for (std::int16_t& value : texture.values) value = static_cast<std::int16_t>(below(45057) - 22528);
+    for (std::size_t row = 0; row < texture.values.size(); ++row) {
+        texture.values[row] = row < ScratchTexture::kRows ? static_cast<std::int16_t>(below(45057) - 22528)
+                                                          : texture.values[row - ScratchTexture::kRows];
+    }
     for (int round = 0; round < 300; ++round) {
         std::vector<ScratchLine> lines(4);
         for (ScratchLine& line : lines) {
             line.isWhite = below(2) == 0;
             line.shapes = &ScratchShapesOf(line.isWhite, below(kScratchProfiles), below(kScratchSections));
-            line.pixels = line.shapes->front().pixels;
+            line.pixels = line.shapes->pixels;
             line.pixel = below(kWidest + 20) - 15;
             line.strength = below(4) == 0 ? 65535 : static_cast<std::uint32_t>(below(65536));
-            line.roughness = below(65536);
+            line.roughness = below(65535);
+            line.absentLevel = -below(20000);
             line.texture = below(ScratchTexture::kRows);
             line.rows = &texture;
             line.shake = below(300);
-            for (ScratchLine::Knot& knot : line.knots) knot = {below(1200) - 600, below(100000)};
+            for (ScratchLine::Knot& knot : line.knots) knot = {below(20000) - 10000, below(135537) - 65536};
         }
-        const ScratchRowPlace place = {below(1080), static_cast<std::size_t>(below(64)), below(4096)};
+        ScratchRows rows = {below(1080), static_cast<std::size_t>(below(64)), ScratchRows::kMost};
+        for (std::int32_t& part : rows.parts) part = below(4096);
+        const auto which = static_cast<std::size_t>(below(ScratchRows::kMost));
         const std::int32_t width = 1 + below(kWidest);
         for (const Bytes& source : Inputs(static_cast<std::size_t>(width) * sizeof(Bgra))) {
             const auto drawn = [&](const Kernels& kernels) {
                 Bytes row = source;
-                kernels.scratches(lines.data(), 4, reinterpret_cast<Bgra*>(row.data()), width, place);
+                std::array<ScratchSpans, 4> spans{};
+                kernels.scratches->find(lines.data(), 4, rows, spans.data());
+                kernels.scratches->draw(lines.data(), spans.data(), 4, which,
+                                        reinterpret_cast<Bgra*>(row.data()), width);
                 return row;
             };
             for (const SimdLevel level : FasterLevels()) {

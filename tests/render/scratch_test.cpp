@@ -330,16 +330,16 @@ TEST(Scratches, CoverAsMuchAtEveryPhaseWithinTheProfile) {
         const bool isWhite = i % 2 != 0;
         const std::int32_t index = i / 2 % kScratchProfiles;
         const ScratchProfile& profile = (isWhite ? kWhiteScratchProfiles : kBlackScratchProfiles)[index];
-        for (const ScratchShape& shape : ScratchShapesOf(isWhite, index, i / 2 / kScratchProfiles)) {
+        for (const ScratchShape& shape : ScratchShapesOf(isWhite, index, i / 2 / kScratchProfiles).worn) {
             const auto sum = [](const auto& weights) {
                 return std::accumulate(weights.begin(), weights.end(), 0);
             };
-            for (const auto& weights : shape.weights) {
-                EXPECT_NEAR(sum(weights), sum(shape.weights[0]), 16);
+            for (const auto& weights : shape) {
+                EXPECT_NEAR(sum(weights), sum(shape[0]), 16);
                 EXPECT_TRUE(std::all_of(weights.begin() + profile.width + 1, weights.end(),
                                         [](std::uint16_t weight) { return weight == 0; }));
             }
-            EXPECT_EQ(shape.weights[0][static_cast<std::size_t>(profile.width)], 0);
+            EXPECT_EQ(shape[0][static_cast<std::size_t>(profile.width)], 0);
         }
     }
 }
