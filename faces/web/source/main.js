@@ -10,7 +10,7 @@ import {Looks} from './looks.js';
 import {Player} from './player.js';
 import {isPresetFileName, readPresetFile} from './preset_file.js';
 import {Renderer} from './renderer.js';
-import {openCamera, openFile, openPicture} from './sources.js';
+import {openCamera, openFile, openPicture, tooLarge} from './sources.js';
 import {Stage} from './stage.js';
 import {Strip} from './strip.js';
 import {language, languages, preferredLanguage, setLanguage, text} from './texts.js';
@@ -193,8 +193,8 @@ class Page {
             await this.player.settled();
             this.wantThumbnails();
             source.play();
-        } catch {
-            say(failure);
+        } catch (error) {
+            say(error.message === tooLarge ? tooLarge : failure);
         }
     }
 

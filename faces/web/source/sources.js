@@ -13,6 +13,7 @@ import {clipSeconds, unknownFacts} from './clip_time.js';
 const stillSeconds = 10;
 const stillRate = 30;
 const mostPixels = 64e6;  // of a picture; the effects hold it twice
+export const tooLarge = 'This picture is too large. The page shows pictures of up to 64 million pixels.';
 
 class Source {
     onFrame = () => {};
@@ -198,7 +199,7 @@ export async function openFile(file) {
     }
     if (bitmap.width * bitmap.height > mostPixels) {
         bitmap.close();
-        throw new Error('the picture is too large');
+        throw new Error(tooLarge);
     }
     return new Still(bitmap, file.name);
 }
