@@ -1,9 +1,11 @@
 #include "programs/reelfx/common/output_place.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <fcntl.h>
+#include <limits>
 #include <string_view>
 #include <utility>
 #include <sys/file.h>
@@ -40,6 +42,7 @@ bool SomethingStandsAt(const std::string& path, std::int64_t firstImage) {
 fs::path FileOf(const std::string& path, std::int64_t first, std::int64_t last) {
     std::error_code ignored;
     char name[4096];
+    last = std::min<std::int64_t>(last, std::numeric_limits<int>::max());  // greater numbers have no names
     for (std::int64_t number = first; number <= last; ++number) {
         if (av_get_frame_filename(name, sizeof name, path.c_str(), static_cast<int>(number)) < 0) break;
         if (fs::exists(name, ignored)) return name;

@@ -594,6 +594,7 @@ class Refusing(ReelfxTest):
             (3, ["no video"], ("render", silent, out, *CAMERA)),
             (3, ["folder"], ("render", clips.root, out, *CAMERA)),
             (3, ["no frame", "41"], (*render, *CAMERA, "--frames", "99:")),
+            (3, ["no frame"], ("render", small, self.out / "i-%d.png", *CAMERA, "--frames", "9223372036854775806:")),
             (3, ["no frame 99"], ("frame", small, self.out / "out.png", *CAMERA, "--frame", "99")),
             (2, ["--all", "folder"], ("sheet", small, self.out / "out.png", "--all")),
             (2, ["--all", "--effect"], ("sheet", small, self.out / "new", "--all", *CAMERA)),
