@@ -15,10 +15,12 @@ constexpr double kHalfLevel = 0.5 / 255.0;
 DeepTone::Line LineOf(const ColourStage& colour) noexcept {
     const double offset = colour.Offset();
     const double gain = colour.Gain().value_or(1.0);
-    const double times = gain * (1.0 - std::abs(offset));
     const double truncated = colour.Gain() ? kHalfLevel : 0.0;
-    const double plus = gain * (std::max(offset, 0.0) - 0.5) + 0.5 - truncated;
-    DeepTone::Line line = {static_cast<float>(times), static_cast<float>(plus), gain > 1.0, false};
+    const bool isClamped = gain > 1.0;
+    const double exact = gain * (std::max(offset, 0.0) - 0.5) + 0.5, rise = gain * (1.0 - std::abs(offset));
+    const double plus = isClamped ? exact - truncated : std::max(exact - truncated, 0.0);
+    const double times = isClamped ? rise : exact + rise - truncated - plus;
+    DeepTone::Line line = {static_cast<float>(times), static_cast<float>(plus), isClamped, false};
     // White stays white to the last bit, so that what follows finds it inside.
     if (!colour.Gain() && offset > 0.0) line.times = 1.0f - line.plus;
     line.staysInside = line.plus >= 0.0f && line.times + line.plus <= 1.0f;

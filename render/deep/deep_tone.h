@@ -2,7 +2,8 @@
 //
 // With x the channel, 0..1, and the plan's values v, g, w, o and gamma:
 //   brightness, flicker   x (1 - |v|) + max(v, 0)
-//   contrast              g (x - 1/2) + 1/2 - t, clamped to 0..1 for g > 1
+//   contrast              g (x - 1/2) + 1/2 - t, clamped to 0..1 for g > 1; else black is at least 0, with a line from
+//                         there to the same white
 //   saturation            ((127 - w) x + w (76 R + 149 G + 30 B) / 256) / 128 - t (1 + w / 128), clamped to 0..1
 //   film gamma            S(q) = gamma (1 - cos(pi q)) / 2 + (1 - gamma) q with q = 255 x / 256, times 256 / 255;
 //                         less t, but at least 0

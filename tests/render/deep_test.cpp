@@ -278,6 +278,22 @@ TEST(DeepLook, IsTheFormulaWithoutSteps) {
     }
 }
 
+// Half a level that 8 bits truncate is more than a slight contrast adds to black.
+TEST(DeepLook, KeepsBlackAtLeast0) {
+    for (const float contrast : {-0.0005f, -0.002f, -0.004f, -0.01f}) {
+        StageSettings settings;
+        settings.contrast = contrast;
+        Deep greys(3, 1, {DeepSamples::kFloat, 3, false});
+        for (std::size_t i = 0; i < greys.samples.size(); ++i)
+            greys.samples[i] = static_cast<float>(i / 3) / 2.0f;
+        const std::vector<float> result = Rendered(greys, settings).samples;
+        EXPECT_GE(result[0], 0.0f) << contrast;
+        EXPECT_LE(result[0], 0.01f) << contrast;
+        EXPECT_NEAR(result[3], 0.5f, 0.51f / 255.0f) << contrast;
+        EXPECT_NEAR(result[0] + result[6], 1.0f, 1.01f / 255.0f) << contrast;
+    }
+}
+
 // Diffusion starts from the picture, so there is no formula of a single pixel. But if a picture's greys rise by a 65535th,
 // no pixel rises by much more than a sixteenth of what it, or one near it, rises by in sixteen such steps.
 TEST(DeepLook, DiffusesWithoutSteps) {
