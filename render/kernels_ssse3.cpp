@@ -20,14 +20,7 @@ VM_BEGIN_TARGET("ssse3")
 namespace velmora::render {
 namespace {
 
-#include "render/simd/sse2.h"
-
-// What SSSE3 adds to the vocabulary of SSE2: byte shuffles.
-//
-// Looks up each block of `indices` (0..15) in the same block of `table`; 0 where an index is negative.
-inline Vec ShuffleBytes(Vec table, Vec indices) noexcept {
-    return _mm_shuffle_epi8(table, indices);
-}
+#include "render/simd/ssse3.h"
 
 #include "render/simd/rows.inc"
 #include "render/simd/wear.inc"

@@ -24,11 +24,13 @@ inline Vec BlockIndex16() noexcept {
     return Zero();
 }
 
+#ifndef VM_SSSE3_SHUFFLES
 // Of each four 16-bit numbers.
 template <int a, int b, int c, int d>
 inline Vec Shuffle16(Vec v) noexcept {
     return _mm_shufflehi_epi16(_mm_shufflelo_epi16(v, _MM_SHUFFLE(d, c, b, a)), _MM_SHUFFLE(d, c, b, a));
 }
+#endif
 // Swaps the two 32-bit numbers of each pair.
 inline Vec SwapPairs32(Vec v) noexcept {
     return _mm_shuffle_epi32(v, _MM_SHUFFLE(2, 3, 0, 1));
@@ -94,10 +96,12 @@ inline Vec LoadBlocks(const void* from, std::ptrdiff_t) noexcept {
 inline Vec LoadPairs64(const void* first, const void* second, std::ptrdiff_t) noexcept {
     return InterleaveLow64(LoadLow64(first), LoadLow64(second));
 }
+#ifndef VM_SSSE3_SHUFFLES
 // Block k: twice the 64 bits from `from` + 8 k bytes.
 inline Vec LoadTwice64(const void* from) noexcept {
     return LoadPairs64(from, from, 0);
 }
+#endif
 // The lower halves of the blocks, one after the other.
 inline void StoreLow64(void* to, Vec v) noexcept {
     _mm_storel_epi64(static_cast<__m128i*>(to), v);
