@@ -143,7 +143,7 @@ LRESULT BitButton::OnMessage(HWND window, UINT message, WPARAM wParam, LPARAM lP
 }
 
 BitButton* ButtonOf(HWND window) noexcept {
-    return reinterpret_cast<BitButton*>(static_cast<LONG_PTR>(GetWindowLongPtrW(window, 0)));
+    return reinterpret_cast<BitButton*>(GetWindowLongPtrW(window, 0));
 }
 
 LRESULT CALLBACK BitButtonProcedure(HWND window, UINT message, WPARAM wParam, LPARAM lParam) noexcept {
@@ -192,7 +192,7 @@ HWND CreateBitButton(const BitButtonDescription& description) noexcept {
     if (window == nullptr) return nullptr;
     button->Attach(window);
     // From here the window owns its record.
-    SetWindowLongPtrW(window, 0, static_cast<LONG>(reinterpret_cast<LONG_PTR>(button.release())));
+    SetWindowLongPtrW(window, 0, reinterpret_cast<LONG_PTR>(button.release()));
     return window;
 }
 

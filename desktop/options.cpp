@@ -125,7 +125,7 @@ void OptionsDialog::Abandon() noexcept {
 
 INT_PTR CALLBACK OptionsDialog::Procedure(HWND window, UINT message, WPARAM wParam, LPARAM lParam) noexcept {
     if (message == WM_INITDIALOG) {
-        SetWindowLongPtrW(window, DWLP_USER, static_cast<LONG>(lParam));
+        SetWindowLongPtrW(window, DWLP_USER, lParam);
         auto* opened = reinterpret_cast<OptionsDialog*>(lParam);
         opened->m_window = window;
         opened->OnOpen();
