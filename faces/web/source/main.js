@@ -8,7 +8,7 @@ import {Controls} from './controls.js';
 import {Keeper} from './keeper.js';
 import {Looks} from './looks.js';
 import {Player} from './player.js';
-import {isPresetFileName, readPresetFile} from './preset_file.js';
+import {isPresetFileName, presetExtension, readPresetFile} from './preset_file.js';
 import {Renderer} from './renderer.js';
 import {openCamera, openFile, openPicture, tooLarge} from './sources.js';
 import {Stage} from './stage.js';
@@ -53,6 +53,7 @@ class Page {
     }
 
     addEffects() {
+        at('file').accept += this.effects.map((_, i) => `,${presetExtension(i)}`).join('');
         this.effects.forEach((effect, i) => {
             const tab = document.createElement('button');
             tab.type = 'button';

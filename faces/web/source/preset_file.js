@@ -5,11 +5,13 @@ const libraryName = 'Velmora Reel Effects';
 const kinds = ['none', 'menu', 'slider', 'colour', 'check', 'group'];
 const mostBytes = 1 << 20;
 
-// Editors know the presets of an effect by the ending.
-export const presetFileName = (name, effect) =>
-    `${name.replace(/[\\/:*?"<>|\x00-\x1f]/g, '_')}.fxprel${'abcde'[effect]}`;
+// Editors know the presets of an effect by the extension, which ends with a letter for the effect's index.
+export const presetExtension = (effect) => `.fxprel${String.fromCharCode('a'.charCodeAt(0) + effect)}`;
 
-export const isPresetFileName = (name) => /\.(fxprel[a-e]|prs)$/i.test(name);
+export const presetFileName = (name, effect) =>
+    name.replace(/[\\/:*?"<>|\x00-\x1f]/g, '_') + presetExtension(effect);
+
+export const isPresetFileName = (name) => /\.(fxprel[a-z]|prs)$/i.test(name);
 
 const escaped = (text) => text.replaceAll('&', '&amp;').replaceAll('<', '&lt;').replaceAll('>', '&gt;')
     .replaceAll('"', '&quot;');
