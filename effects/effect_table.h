@@ -59,5 +59,6 @@ extern const EffectTable kFilmExpress;
 extern const EffectTable kFilmPro;
 inline constexpr std::array<const EffectTable*, 5> kAllEffects = {&kFilmCamera, &kFilmLook, &kFilmDamage,
                                                                   &kFilmExpress, &kFilmPro};
+static_assert(kAllEffects.size() == kEffectCount, "an index for each effect in api/host_api.h");
 
 }  // namespace velmora::effects
