@@ -158,11 +158,14 @@ class EditionTest(unittest.TestCase):
                         self.assertNotIn(word, text.replace("the Windows library", ""), page)
 
 
+NUMBERS = "no one two three four five six seven eight nine ten".split()
+
+
 def documented(parameter):
     """(name, range, default) of a parameter as given on an effect's page."""
     ranges = {"slider": lambda: f"{parameter['minimum']:g} to {parameter['maximum']:g}".replace("-", "\u2212"),
               "colour": lambda: "any colour",
-              "menu": lambda: {7: "seven patterns"}[len(parameter["items"])],
+              "menu": lambda: f"{NUMBERS[len(parameter['items'])]} patterns",
               "check box": lambda: "on or off"}
     start = {"#000000": "black"}.get(parameter["default"], parameter["default"])
     return parameter["name"], ranges[parameter["kind"]](), start

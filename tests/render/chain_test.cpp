@@ -41,7 +41,7 @@ StageSettings AnySettings(Dice& dice) {
     if (dice.Half()) s.contrast = 2.0f * dice.Part() - 1.0f;
     if (dice.Half()) s.filmGamma = dice.Part();
     if (dice.Half()) s.tintRed = dice.Part(), s.tintBlue = dice.Part();
-    if (dice.Half()) s.wear = dice.Part(), s.wearPattern = dice.Whole(2000, 2006);
+    if (dice.Half()) s.wear = dice.Part(), s.wearPattern = dice.Whole(2000, 1999 + kWearPictureCount);
     if (dice.Half()) s.wearChannels = kWearBlueOnly;
     if (dice.Half()) {
         s.scratchKinds = static_cast<std::uint32_t>(dice.Whole(1, 7));

@@ -5,6 +5,7 @@ Written independently of the renderer, pixel by pixel and with exact arithmetic:
 Values are rounded to single precision through packed bytes.
 """
 
+import json
 import math
 import random
 import struct
@@ -209,7 +210,6 @@ PRO_CASES = {
     "tint": {"Tint": 100, "Colour": (0xA4, 0x70, 0x02)},
     "tint the other way": {"Tint": -84, "Colour": (0xEB, 0xA7, 0x5C), "Film Gamma": 52},
     "gamma": {"Film Gamma": 100},
-    "wear": {"Wear": 33, "Pattern": 2},
     "full wear": {"Wear": 100, "Pattern": 4},
     "spots": {"Spots": 100},
     "one spot": {"Spots": 1},
@@ -217,6 +217,9 @@ PRO_CASES = {
                    "Tint": -60, "Saturation": -40, "Brightness": -19, "Contrast": 30, "Film Gamma": 70,
                    "Wear": 56, "Pattern": 6, "Spots": 55},
 }
+PATTERNS = next(parameter["items"] for effect in json.loads(reelfx("list", "--json").stdout)
+                for parameter in effect["parameters"] if parameter["kind"] == "menu")
+PRO_CASES |= {f"wear, {text}": {"Wear": 33, "Pattern": i} for i, text in enumerate(PATTERNS)}
 CASES = [(name, "Film Pro", shown) for name, shown in PRO_CASES.items()] + [
     ("camera", "Film Camera", {"Y Jitter": 4.9, "X Jitter": 10, "Border": (0xC0, 0x40, 0x08), "Flicker": 75,
                                "Flicker Rate": 97}),
@@ -235,7 +238,7 @@ def control(key, value):
     if key in ("Colour", "Border"):
         value = "#%02X%02X%02X" % value
     elif key == "Pattern":
-        value = ("Wavy", "Blotchy", "Grainy", "Fine", "Splotchy", "Lite", "Crackly")[value]
+        value = PATTERNS[value]
     elif value is True:
         value = "on"
     return f"{'Tint' if key == 'Colour' else key}={value}"
