@@ -38,7 +38,7 @@ def main():
         lines = [f'{key}="{text}"\n' for key, text in texts_of(language).items()]
         if any(line.count('"') != 2 for line in lines):
             sys.exit(f"{language.get('code')}: a text holds a quotation mark")
-        for locale in LOCALES[language.get("code")]:
+        for locale in LOCALES.get(language.get("code"), []):
             (folder / f"{locale}.ini").write_text("".join(lines), encoding="utf-8")
 
 
