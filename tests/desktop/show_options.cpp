@@ -1,6 +1,6 @@
 // Shows the options dialog of a library as a host does:   show_options.exe PATH-OF-VMReelEffects.dll
 //
-// For looking at the dialog and for driving it with a real mouse and keyboard (scripts/drive-options). Prints the
+// For looking at the dialog and for driving it with a real mouse and keyboard (scripts/picture-options). Prints the
 // dialog's result and the preference before and after.
 #include <windows.h>
 

@@ -1,5 +1,6 @@
-// The commands of reelfx. Each has a record of what the user asked for and a function Run, which is in the command's own
-// file, such as render_command.cpp. Run throws Failure, or UsageError for what only shows when the command is at work.
+// The commands of reelfx. Each has a record of what the user asked for and a function Run, in a file of its own, such as
+// render_command.cpp, or with those that it resembles, as in picture_commands.cpp. Run throws Failure, or UsageError for
+// what only shows when the command is at work.
 #pragma once
 
 #include <cstdint>
