@@ -95,6 +95,7 @@ struct Kernels {
     const GlowKernels* glow;          // render/glow_kernels.h
     const YcbcrKernels* ycbcr;        // render/ycbcr.h
     const GlowedTone* glowedTone;     // null if the level has none
+    bool tonesShortRows = false;      // `tone` handles a row's end with masks, not through a copy
 };
 
 // Glow and tone in one step, for layers in planes (render/glow_kernels.h).

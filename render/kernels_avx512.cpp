@@ -55,8 +55,8 @@ constexpr GlowedTone kGlowedTone = {SplitGlowAvx2, ToneUnderGlow};
 
 }  // namespace
 
-const Kernels kAvx512Kernels = {ToneRow,         WearRow,    CopyRow, StreamRow,   EndStream,
-                                &kSse2Scratches, &kAvx2Glow, &kYcbcr, &kGlowedTone};
+const Kernels kAvx512Kernels = {ToneRow,         WearRow,    CopyRow, StreamRow,    EndStream,
+                                &kSse2Scratches, &kAvx2Glow, &kYcbcr, &kGlowedTone, kMasks};
 
 }  // namespace velmora::render
 

@@ -113,8 +113,8 @@ bool RowProgram::TonesUnderGlow() const noexcept {
 std::size_t RowProgram::RunFirst(const ShiftedRow& in, Bgra* out, std::int32_t width,
                                  std::int32_t y) const noexcept {
     if (m_glow == nullptr) {
-        FetchParts(in, out, width,
-                   [&](const Bgra* from, Bgra* to, std::int32_t count) { RunTone(from, to, count); });
+        const auto tone = [&](const Bgra* from, Bgra* to, std::int32_t count) { RunTone(from, to, count); };
+        m_kernels.tonesShortRows ? FetchThrough(in, out, width, tone) : FetchParts(in, out, width, tone);
         return 1;
     }
     if (TonesUnderGlow()) {
