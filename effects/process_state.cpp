@@ -22,7 +22,7 @@ KeptList* g_currentList = nullptr;
 struct SeededState : render::RenderState {
     SeededState() noexcept { random.Seed(support::TickCount()); }
 } g_state;
-std::atomic_flag g_isRendering;  // with g_state
+std::atomic<std::uintptr_t> g_rendering{0};  // the thread that renders with g_state, or 0
 
 }  // namespace
 
@@ -65,7 +65,10 @@ struct FrameSession::Own {
 };
 
 FrameSession::FrameSession(const render::RenderOptions& options) noexcept {
-    if (!g_isRendering.test_and_set(std::memory_order_acquire)) {
+    const std::uintptr_t self = support::ThreadId();
+    std::uintptr_t other = 0;
+    m_isOutermost = g_rendering.compare_exchange_strong(other, self, std::memory_order_acquire);
+    if (m_isOutermost || other == self) {
         m_session = ProcessSession(options);
         return;
     }
@@ -76,7 +79,7 @@ FrameSession::FrameSession(const render::RenderOptions& options) noexcept {
 }
 
 FrameSession::~FrameSession() {
-    if (m_session.state == &g_state) g_isRendering.clear(std::memory_order_release);
+    if (m_isOutermost) g_rendering.store(0, std::memory_order_release);
 }
 
 }  // namespace velmora

@@ -37,9 +37,11 @@ void SetBuildMode(std::int32_t mode) noexcept;
 // count at load, so that damage differs from run to run.
 [[nodiscard]] RenderSession ProcessSession(const render::RenderOptions& options = {}) noexcept;
 
-// The session of one frame: that of the process, or, while another frame has it, one of its own. A host that renders on
-// two threads in spite of the contract then gets other random damage, but no mixture of settings and no damaged memory.
-// Waiting instead would be no help: the other frame may be waiting for this thread, or be further up in this very one.
+// The session of one frame: that of the process, or, while a frame on another thread has it, one of its own. A host that
+// renders on two threads in spite of the contract then gets other random damage, but no mixture of settings and no
+// damaged memory. Waiting instead would be no help: the other frame may be waiting for this thread. A host that renders a
+// frame while it answers another frame's request for a value gets the session of the process in both: no pixel is touched
+// before the last answer.
 class FrameSession {
   public:
     explicit FrameSession(const render::RenderOptions& options) noexcept;
@@ -52,6 +54,7 @@ class FrameSession {
 
   private:
     struct Own;
+    bool m_isOutermost = false;
     std::unique_ptr<Own> m_own;
     RenderSession m_session;
 };

@@ -10,6 +10,9 @@ namespace velmora::support {
 // Milliseconds since the system started, modulo 2^32.
 [[nodiscard]] std::uint32_t TickCount() noexcept;
 
+// A number of the calling thread; never 0. Ended threads' numbers are used again.
+[[nodiscard]] std::uintptr_t ThreadId() noexcept;
+
 // A module of the system's loader; null for none.
 using ModuleHandle = void*;
 

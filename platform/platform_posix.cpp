@@ -14,6 +14,11 @@ std::uint32_t TickCount() noexcept {
     return static_cast<std::uint32_t>(std::chrono::duration_cast<std::chrono::milliseconds>(now).count());
 }
 
+std::uintptr_t ThreadId() noexcept {
+    thread_local char own = 0;
+    return reinterpret_cast<std::uintptr_t>(&own);
+}
+
 ModuleHandle OwnModule() noexcept {
     return nullptr;
 }

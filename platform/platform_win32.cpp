@@ -22,6 +22,10 @@ std::uint32_t TickCount() noexcept {
     return GetTickCount();
 }
 
+std::uintptr_t ThreadId() noexcept {
+    return GetCurrentThreadId();
+}
+
 ModuleHandle OwnModule() noexcept {
     return Holding(reinterpret_cast<const void*>(&OwnModule));
 }

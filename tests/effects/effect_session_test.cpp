@@ -5,11 +5,13 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <functional>
 #include <memory>
 #include <set>
 #include <string>
 #include <string_view>
 #include <thread>
+#include <utility>
 #include <vector>
 
 #include "effects/film_effect.h"
@@ -80,6 +82,9 @@ class ProcessWide : public testing::Test {
     static void StartRandom(std::uint32_t state) { ProcessSession().state->random.Seed(state); }
     static Picture RenderedBy(IVideoEffect& effect, std::uint32_t preset, double seconds) {
         PresetHost host(effect, preset);
+        return RenderedFor(effect, host, seconds);
+    }
+    static Picture RenderedFor(IVideoEffect& effect, IVideoHost& host, double seconds) {
         Picture source(7), result;
         const FrameRecord from = source.Record(), to = result.Record();
         const TimingRecord timing = {0.0, 0.0, seconds};
@@ -217,6 +222,40 @@ TEST_F(ProcessWide, EffectObjectsAndSessionsRenderTheSameBytes) {
         }
         effect->Release();
     }
+}
+
+// Renders a frame of its own before it answers anything.
+class NestingHost final : public TestHost {
+  public:
+    NestingHost(PresetHost& answers, std::function<void()> before)
+        : m_answers(answers), m_before(std::move(before)) {}
+    bool VM_CALL GetParamValue(std::uint32_t index, ValueCell* cell, std::uint32_t kind) override {
+        if (m_before) std::exchange(m_before, nullptr)();
+        return m_answers.GetParamValue(index, cell, kind);
+    }
+
+  private:
+    PresetHost& m_answers;
+    std::function<void()> m_before;
+};
+
+// All of a frame's draws come after its last answer, so the nested frame draws first from the same sequence.
+TEST_F(ProcessWide, AFrameInsideAnothersAnswersIsRenderedAsIfBeforeIt) {
+    IVideoEffect* const outer = CreateEffectByIndex(4);
+    IVideoEffect* const nested = CreateEffectByIndex(4);
+    const std::uint32_t preset = PresetNamed(kFilmPro, "Very Old Footage");
+    StartRandom(5);
+    const Picture first = RenderedBy(*nested, preset, SecondsOf(8));
+    const Picture second = RenderedBy(*outer, preset, SecondsOf(3));
+
+    StartRandom(5);
+    Picture firstAgain;
+    PresetHost answers(*outer, preset);
+    NestingHost host(answers, [&] { firstAgain = RenderedBy(*nested, preset, SecondsOf(8)); });
+    EXPECT_EQ(RenderedFor(*outer, host, SecondsOf(3)), second);
+    EXPECT_EQ(firstAgain, first);
+    outer->Release();
+    nested->Release();
 }
 
 // The columns of a grey picture that scratches touch, and how bright the picture is.
