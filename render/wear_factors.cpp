@@ -79,8 +79,12 @@ bool WearFactors::Set(const GreyPicture& picture, float amount) noexcept {
     return true;
 }
 
-bool WearFactors::SetStrips(Random random, std::uint32_t count) noexcept {
-    std::uint16_t* const starts = m_starts.Reserve(std::uint64_t{count} + 1);
+bool WearFactors::SetStrips(Random random, std::int32_t frameWidth) noexcept {
+    const auto width = static_cast<std::uint64_t>(frameWidth);
+    const auto stripWidth = static_cast<std::uint64_t>(m_picture->width);
+    const std::uint64_t count = (width + stripWidth - 1) / stripWidth;
+    // Enough for the narrowest strips: no new memory when the pattern changes.
+    std::uint16_t* const starts = m_starts.Reserve(width / WearStrips::kPadding + 2);
     if (starts == nullptr) return false;
     WearRows rows(random, m_picture->height, 0);
     std::generate_n(starts, count, [&rows] { return static_cast<std::uint16_t>(rows.Next()); });
