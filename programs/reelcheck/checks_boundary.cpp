@@ -187,8 +187,10 @@ void CheckFramesAtOnce(CheckContext& context) {
     const OpenLibrary library(context.libraryPath);
     const int rounds = context.Rounds(30, 1000);
     std::atomic<int> wrong = 0;
+    constexpr int kThreads = 4;
     std::vector<std::thread> rendering;
-    for (int i = 0; i < 4; ++i) {
+    rendering.reserve(kThreads);
+    for (int i = 0; i < kThreads; ++i) {
         rendering.emplace_back([&library, &wrong, rounds, i, dice = Dice(context.dice.Bits(), "")]() mutable {
             const bool isKnown = i < 2;
             const Reference<IVideoEffect> effect = library.Effect(isKnown ? 1 : 4);
