@@ -1,5 +1,6 @@
 // The gain from more workers in reelfx: "Film Pro" on frames in memory, through reelfx's pipeline but without decoding
-// and encoding. Copies of the frames, through the same pipeline, show what the memory allows. Prints a Markdown table.
+// and encoding. Threads that share the frames without a pipeline, and copies of the frames, show what the machine allows.
+// Prints a Markdown table.
 
 #include <algorithm>
 #include <chrono>
@@ -9,6 +10,7 @@
 #include <iterator>
 #include <memory>
 #include <stdexcept>
+#include <thread>
 #include <vector>
 
 #include "programs/common/frame_pool.h"
@@ -18,7 +20,7 @@
 namespace velmora::bench {
 namespace {
 
-constexpr int kFrames = 150;
+constexpr int kFrames = 300;
 constexpr int kRounds = 9;
 
 hosts::FramePipeline::Worker RenderWorker(FramePool& pool, const BenchCase& test) {
@@ -40,23 +42,55 @@ hosts::FramePipeline::Worker CopyWorker(FramePool& pool) {
 
 using MakeWorker = std::function<hosts::FramePipeline::Worker()>;
 
-// Frames per second, from the start of the first frame to the end of the last.
-double FramesPerSecond(const MakeWorker& makeWorker, std::size_t workerCount) {
+std::vector<hosts::FramePipeline::Worker> MakeWorkers(const MakeWorker& makeWorker, std::size_t count) {
     std::vector<hosts::FramePipeline::Worker> workers;
-    for (std::size_t i = 0; i < workerCount; ++i) workers.push_back(makeWorker());
+    for (std::size_t i = 0; i < count; ++i) workers.push_back(makeWorker());
+    return workers;
+}
+
+void Place(hosts::PipelineItem& item, int frame) {
+    item.index = frame;
+    item.seconds = 1.0 + frame / 30.0;
+}
+
+// Frames per second, from the start of the first frame to the end of the last.
+double FramesPerSecond(const std::function<void()>& work) {
+    const auto start = std::chrono::steady_clock::now();
+    work();
+    return kFrames / std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+}
+
+double RateInPipeline(std::vector<hosts::FramePipeline::Worker> workers) {
     int next = 0;
     const auto source = [&next]() -> hosts::PipelineItemPtr {
         if (next == kFrames) return nullptr;
         auto item = std::make_unique<hosts::PipelineItem>();
-        item->index = next;
-        item->seconds = 1.0 + next++ / 30.0;
+        Place(*item, next++);
         return item;
     };
-    const auto start = std::chrono::steady_clock::now();
-    hosts::FramePipeline pipeline(source, std::move(workers));
-    while (pipeline.Next()) {
-    }
-    return kFrames / std::chrono::duration<double>(std::chrono::steady_clock::now() - start).count();
+    return FramesPerSecond([&] {
+        hosts::FramePipeline pipeline(source, std::move(workers));
+        while (pipeline.Next()) {
+        }
+    });
+}
+
+// Every worker has a thread and its share of the frames, and never waits.
+double RateOfThreads(const std::vector<hosts::FramePipeline::Worker>& workers) {
+    return FramesPerSecond([&] {
+        std::vector<std::thread> threads;
+        for (std::size_t first = 0; first < workers.size(); ++first) {
+            threads.emplace_back([&workers, first] {
+                hosts::PipelineItem item;
+                const auto step = static_cast<int>(workers.size());
+                for (auto frame = static_cast<int>(first); frame < kFrames; frame += step) {
+                    Place(item, frame);
+                    workers[first](item);
+                }
+            });
+        }
+        for (std::thread& thread : threads) thread.join();
+    });
 }
 
 // The upper quartile, which is close to the rate on an idle machine.
@@ -67,23 +101,27 @@ double Typical(std::vector<double> values) {
 
 void PrintRows(const char* work, PictureSize size, const MakeWorker& makeWorker) {
     constexpr std::size_t kWorkers[] = {1, 2, 4};
-    std::vector<double> rates[std::size(kWorkers)];
+    std::vector<double> rates[std::size(kWorkers)], threadRates[std::size(kWorkers)];
     const int rounds = size.width == kFullHd.width ? kRounds : kRounds / 2;
     for (int round = 0; round < rounds; ++round) {
-        for (std::size_t i = 0; i < std::size(kWorkers); ++i)
-            rates[i].push_back(FramesPerSecond(makeWorker, kWorkers[i]));
+        for (std::size_t i = 0; i < std::size(kWorkers); ++i) {
+            rates[i].push_back(RateInPipeline(MakeWorkers(makeWorker, kWorkers[i])));
+            threadRates[i].push_back(RateOfThreads(MakeWorkers(makeWorker, kWorkers[i])));
+        }
     }
-    const double alone = Typical(rates[0]);
     for (std::size_t i = 0; i < std::size(kWorkers); ++i) {
-        const double rate = Typical(rates[i]);
-        std::printf("| %s, %dx%d | %zu | %.0f | %.2f |\n", work, size.width, size.height, kWorkers[i], rate,
-                    rate / alone);
+        const double rate = Typical(rates[i]), threadRate = Typical(threadRates[i]);
+        std::printf("| %s, %dx%d | %zu | %.0f | %.2f | %.0f | %.2f |\n", work, size.width, size.height,
+                    kWorkers[i], rate, rate / Typical(rates[0]), threadRate,
+                    threadRate / Typical(threadRates[0]));
     }
 }
 
 void PrintTable() {
     const BenchCase& test = EverythingCase();
-    std::printf("| work | workers | frames a second | x one worker (two: goal 1.9) |\n|---|---|---|---|\n");
+    std::printf(
+        "| work | workers | frames a second | x one (two: goal 1.9) | without a pipeline | x one |\n");
+    std::printf("|---|---|---|---|---|---|\n");
     for (const PictureSize size : {kFullHd, kUltraHd}) {
         FramePool pool(size);
         PrintRows(test.name, size, [&] { return RenderWorker(pool, test); });
