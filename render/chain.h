@@ -5,9 +5,12 @@
 //   kIsDamage              whether it is part of a film's damage rather than of its look,
 //   Draws(settings, width) how many numbers of the frame sequence it takes; the same in all frames with the same
 //                          settings and width.
-// To add a stage, add a member and a line here in the right place, its preparation in renderer.cpp and its work on a
+// To add a stage, add a member and name it in kStages in the right place, its preparation in renderer.cpp and its work on a
 // row in row_program.h.
 #pragma once
+
+#include <cstddef>
+#include <tuple>
 
 #include "render/colour.h"
 #include "render/glow.h"
@@ -30,16 +33,16 @@ struct FramePlan {
     SpotStage spots;
 };
 
+// In the chain's order.
+inline constexpr auto kStages =
+    std::make_tuple(&FramePlan::jitter, &FramePlan::glow, &FramePlan::colour, &FramePlan::tint,
+                    &FramePlan::wear, &FramePlan::scratches, &FramePlan::spots);
+inline constexpr std::size_t kStageCount = std::tuple_size_v<decltype(kStages)>;
+
 // Calls visit(stage) for each stage of a plan, in the chain's order.
 template <typename Plan, typename Visit>
 void ForEachStage(Plan& plan, Visit&& visit) {
-    visit(plan.jitter);
-    visit(plan.glow);
-    visit(plan.colour);
-    visit(plan.tint);
-    visit(plan.wear);
-    visit(plan.scratches);
-    visit(plan.spots);
+    std::apply([&](const auto... stage) { (visit(plan.*stage), ...); }, kStages);
 }
 
 }  // namespace velmora::render

@@ -41,7 +41,6 @@ class RowProgram {
         void (*run)(const RowProgram& program, const void* stage, const Bgra* in, Bgra* out,
                     std::int32_t width, std::int32_t y);
     };
-    static constexpr std::size_t kMostSteps = 8;
 
     void Add(const JitterStage&) noexcept {}                        // rows come in shifted
     void Add(const GlowStage& stage) noexcept { m_glow = &stage; }  // always the first step
@@ -64,7 +63,7 @@ class RowProgram {
     void RunTone(const Bgra* in, Bgra* out, std::int32_t width) const noexcept;
 
     const Kernels& m_kernels;
-    std::array<Step, kMostSteps> m_steps{};
+    std::array<Step, kStageCount> m_steps{};  // a stage adds one at most
     std::size_t m_count = 0;
     const GlowStage* m_glow = nullptr;
     Tone m_tone;             // of colour and tint, which are neighbours

@@ -21,10 +21,11 @@ WearStage PrepareWear(const StageSettings& settings, std::int32_t width, Random&
     stage.m_picture = &WearPicture(settings.wearPattern);
     stage.m_channels = settings.wearChannels;
     stage.m_starts = random;
-    random.Skip(WearStripCount(settings, width));
+    const std::uint32_t strips = WearStripCount(settings, width);
+    random.Skip(strips);
     stage.m_amount = settings.wear;
     const bool hasFactors =
-        factors.Set(*stage.m_picture, stage.m_amount) && factors.SetStrips(stage.m_starts, width);
+        factors.Set(*stage.m_picture, stage.m_amount) && factors.SetStrips(stage.m_starts, strips, width);
     stage.m_factors = hasFactors ? &factors : nullptr;
     stage.m_kernels = &kernels;
     return stage;

@@ -79,12 +79,10 @@ bool WearFactors::Set(const GreyPicture& picture, float amount) noexcept {
     return true;
 }
 
-bool WearFactors::SetStrips(Random random, std::int32_t frameWidth) noexcept {
-    const auto width = static_cast<std::uint64_t>(frameWidth);
-    const auto stripWidth = static_cast<std::uint64_t>(m_picture->width);
-    const std::uint64_t count = (width + stripWidth - 1) / stripWidth;
+bool WearFactors::SetStrips(Random random, std::uint32_t count, std::int32_t frameWidth) noexcept {
     // Enough for the narrowest strips: no new memory when the pattern changes.
-    std::uint16_t* const starts = m_starts.Reserve(width / WearStrips::kPadding + 2);
+    const auto most = static_cast<std::uint64_t>(frameWidth / WearStrips::kPadding) + 1;
+    std::uint16_t* const starts = m_starts.Reserve(most + 1);
     if (starts == nullptr) return false;
     WearRows rows(random, m_picture->height, 0);
     std::generate_n(starts, count, [&rows] { return static_cast<std::uint16_t>(rows.Next()); });

@@ -65,9 +65,9 @@ class WearFactors {
     // kMostPixels pixels or fewer than WearStrips::kPadding columns.
     [[nodiscard]] bool Set(const GreyPicture& picture, float amount) noexcept;
 
-    // Draws where the strips of a frame start, one draw each. Needs factors. False if there is not enough memory. Allocates
-    // only for a frame wider than those before.
-    [[nodiscard]] bool SetStrips(Random random, std::int32_t frameWidth) noexcept;
+    // Draws where the `count` strips of a frame start, one draw each. Needs factors. False if there is not enough memory.
+    // Allocates only for a frame wider than those before.
+    [[nodiscard]] bool SetStrips(Random random, std::uint32_t count, std::int32_t frameWidth) noexcept;
 
     // Over row `y` of the frame; needs strips.
     [[nodiscard]] WearStrips Over(std::int32_t y) const noexcept {

@@ -72,7 +72,6 @@ class DeepRowProgram {
         void (DeepRowProgram::*begin)(Row&) const noexcept;  // once for each row
         void (DeepRowProgram::*run)(Row&) const noexcept;    // for each block, from the left
     };
-    static constexpr std::size_t kMostSteps = 6;
 
     void Add(const JitterStage&) noexcept {}  // rows come in shifted
     void Add(const GlowStage&) noexcept;
@@ -100,7 +99,7 @@ class DeepRowProgram {
     bool m_streams;
     DeepTone m_tone;  // of colour and tint, which are neighbours
     bool m_hasTone = false;
-    std::array<Step, kMostSteps> m_steps{};
+    std::array<Step, kStageCount> m_steps{};  // a stage adds one at most
     std::size_t m_count = 0;
 };
 
