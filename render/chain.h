@@ -5,7 +5,7 @@
 //   kIsDamage              whether it is part of a film's damage rather than of its look,
 //   Draws(settings, width) how many numbers of the frame sequence it takes; the same in all frames with the same
 //                          settings and width.
-// To add a stage, add a member and name it in kStages in the right place, its preparation in renderer.cpp and its work on a
+// To add a stage, add a member, its name in kStages in the right place, its preparation in renderer.cpp and its work on a
 // row in row_program.h.
 #pragma once
 
